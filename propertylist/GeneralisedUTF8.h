@@ -1,0 +1,93 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <cstring>
+#include <string>
+#include <string_view>
+
+namespace accounts {
+
+/// One code point at the beginning of a text, with the number of bytes it takes: 0 when the bytes
+/// are no well-formed sequence.
+struct DecodedCodePoint {
+  char32_t value = 0;
+  std::size_t length = 0;
+};
+
+constexpr bool isSurrogate(char32_t codePoint) {
+  return codePoint >= 0xD800 && codePoint <= 0xDFFF;
+}
+constexpr bool isHighSurrogate(char32_t codePoint) {
+  return codePoint >= 0xD800 && codePoint <= 0xDBFF;
+}
+constexpr bool isLowSurrogate(char32_t codePoint) {
+  return codePoint >= 0xDC00 && codePoint <= 0xDFFF;
+}
+
+/// Whether every byte is below 0x80. Looks at eight at a time.
+inline bool isASCII(std::string_view text) {
+  constexpr std::uint64_t kHighBits = 0x8080808080808080;
+  std::uint64_t united = 0;
+  while (text.size() >= sizeof united) {
+    std::uint64_t word;
+    std::memcpy(&word, text.data(), sizeof word);
+    united |= word;
+    text.remove_prefix(sizeof word);
+  }
+  for (const char character : text) {
+    united |= static_cast<unsigned char>(character);
+  }
+  return (united & kHighBits) == 0;
+}
+
+/// Decodes the first code point of a text that is not empty. Generalised UTF-8 is UTF-8 that also
+/// knows the three-byte sequences of unpaired surrogates; overlong sequences and values above
+/// U+10FFFF are ill-formed in it too.
+inline DecodedCodePoint decodeCodePoint(std::string_view text) {
+  const auto byteAt = [&](std::size_t index) { return static_cast<unsigned char>(text[index]); };
+  const auto isContinuation = [&](std::size_t index) {
+    return index < text.size() && (byteAt(index) & 0xC0) == 0x80;
+  };
+  const char32_t first = byteAt(0);
+  if (first < 0x80) {
+    return {first, 1};
+  }
+  if (first >= 0xC2 && first <= 0xDF && isContinuation(1)) {
+    return {(first & 0x1F) << 6 | (byteAt(1) & 0x3FU), 2};
+  }
+  if (first >= 0xE0 && first <= 0xEF && isContinuation(1) && isContinuation(2)) {
+    const char32_t value = (first & 0x0F) << 12 | (byteAt(1) & 0x3FU) << 6 | (byteAt(2) & 0x3FU);
+    return {value, value >= 0x800 ? 3U : 0U};
+  }
+  if (first >= 0xF0 && first <= 0xF4 && isContinuation(1) && isContinuation(2) &&
+      isContinuation(3)) {
+    const char32_t value = (first & 0x07) << 18 | (byteAt(1) & 0x3FU) << 12 |
+                           (byteAt(2) & 0x3FU) << 6 | (byteAt(3) & 0x3FU);
+    return {value, value >= 0x10000 && value <= 0x10FFFF ? 4U : 0U};
+  }
+  return {};
+}
+
+/// Appends a code point, surrogates included, as generalised UTF-8.
+inline void appendCodePoint(std::string& text, char32_t codePoint) {
+  const auto append = [&](char32_t byte) { text.push_back(static_cast<char>(byte)); };
+  if (codePoint < 0x80) {
+    append(codePoint);
+    return;
+  }
+  if (codePoint < 0x800) {
+    append(0xC0 | codePoint >> 6);
+  } else {
+    if (codePoint < 0x10000) {
+      append(0xE0 | codePoint >> 12);
+    } else {
+      append(0xF0 | codePoint >> 18);
+      append(0x80 | (codePoint >> 12 & 0x3F));
+    }
+    append(0x80 | (codePoint >> 6 & 0x3F));
+  }
+  append(0x80 | (codePoint & 0x3F));
+}
+
+}  // namespace accounts

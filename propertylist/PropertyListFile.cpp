@@ -1,0 +1,17 @@
+#include "propertylist/PropertyListFile.h"
+
+#include "propertylist/BinaryPropertyList.h"
+#include "propertylist/XMLPropertyList.h"
+
+namespace accounts {
+
+std::optional<PropertyValue> readPropertyList(std::string_view bytes, PropertyListError& error) {
+  if (bytes.empty()) {
+    error.text = "property list: the file is empty";
+    return std::nullopt;
+  }
+  return isBinaryPropertyList(bytes) ? readBinaryPropertyList(bytes, error)
+                                     : readXMLPropertyList(bytes, error);
+}
+
+}  // namespace accounts

@@ -1,0 +1,32 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+
+namespace accounts {
+
+/// How deep containers may stand in each other; a scalar alone has depth 0, an array of scalars 1.
+/// Account files need fewer than ten. The bound is low enough for everything that walks a value
+/// (comparison, description, destruction) to recurse safely on a small thread stack.
+inline constexpr std::size_t kMaximumNestingDepth = 512;
+
+/// How many objects a binary file may list. Four times what 100,000 accounts with 40 values each
+/// need if no two values are equal; the tables for as many still fit a small machine's memory.
+inline constexpr std::size_t kMaximumObjectCount = std::size_t{1} << 24;
+
+/// How many values a property list may stand for, where a child that several containers share
+/// counts each time it is reached: a file of a few hundred bytes can stand for billions, and
+/// whoever walks the value would never come to an end. A text or data counts once more for every
+/// `kBytesPerExpandedValue` bytes, since a long one can be reached many times as well; so does a
+/// key.
+inline constexpr std::uint64_t kMaximumExpandedValueCount = std::uint64_t{1} << 24;
+
+/// See `kMaximumExpandedValueCount`: together they hold the texts of one value to a gibibyte.
+inline constexpr std::uint64_t kBytesPerExpandedValue = 64;
+
+/// What a text or data of some length adds to the expanded count beyond the value itself.
+constexpr std::uint64_t expandedCountOfBytes(std::size_t length) {
+  return length / kBytesPerExpandedValue;
+}
+
+}  // namespace accounts

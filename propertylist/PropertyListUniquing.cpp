@@ -1,0 +1,50 @@
+#include "propertylist/PropertyListUniquing.h"
+
+#include <chrono>
+#include <utility>
+
+namespace accounts {
+
+namespace {
+
+/// Tables grow by four: those outgrown on the way then take a third of the last one's memory, not
+/// as much again.
+constexpr std::size_t kGrowth = 4;
+
+}  // namespace
+
+KeyedHash::KeyedHash() {
+  // Where this object stands in memory and the time of the call: nobody who prepares a file knows
+  // either. Odd, because a factor of 0 would hash everything to 0.
+  constexpr std::uint64_t kMixer = 0xD1B54A32D192ED03;
+  const auto address = static_cast<std::uint64_t>(reinterpret_cast<std::uintptr_t>(this));
+  const auto time =
+      static_cast<std::uint64_t>(std::chrono::steady_clock::now().time_since_epoch().count());
+  first_ = fold(address ^ kMixer, time | 1) | 1;
+  second_ = fold(time ^ kMixer, first_ ^ kMixer) | 1;
+}
+
+void ContentTable::grow() {
+  const std::vector<Slot> old = std::exchange(slots_, std::vector<Slot>(kGrowth * slots_.size()));
+  const std::size_t mask = slots_.size() - 1;
+  for (const Slot& slot : old) {
+    if (slot.numberPlusOne != 0) {
+      std::size_t place = slot.hash & mask;
+      while (slots_[place].numberPlusOne != 0) {
+        place = (place + 1) & mask;
+      }
+      slots_[place] = slot;
+    }
+  }
+}
+
+void IdentityTable::grow() {
+  const std::vector<Slot> old = std::exchange(slots_, std::vector<Slot>(kGrowth * slots_.size()));
+  for (const Slot& slot : old) {
+    if (slot.identity != nullptr) {
+      slots_[placeOf(slot.identity)] = slot;
+    }
+  }
+}
+
+}  // namespace accounts

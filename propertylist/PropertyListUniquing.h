@@ -1,0 +1,163 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <cstring>
+#include <optional>
+#include <string_view>
+#include <vector>
+
+/// The tables by which readers and writers find what they have met already. Nothing that can be
+/// seen depends on the order in them.
+namespace accounts {
+
+inline constexpr std::size_t kInitialSlotCount = 256;
+
+/// Hashes bytes under a key that differs from object to object, so that nobody can prepare contents
+/// that all collide.
+class KeyedHash {
+ public:
+  KeyedHash();
+
+  [[nodiscard]] std::uint32_t operator()(std::string_view bytes) const {
+    const char* place = bytes.data();
+    const std::size_t size = bytes.size();
+    // The size counts too, so that the words at the end may overlap.
+    std::uint64_t state = first_ ^ size;
+    if (size > 16) {
+      for (std::size_t left = size; left > 16; left -= 16, place += 16) {
+        state = fold(word<std::uint64_t>(place) ^ second_, word<std::uint64_t>(place + 8) ^ state);
+      }
+      place = bytes.data() + size;
+      state =
+          fold(word<std::uint64_t>(place - 16) ^ second_, word<std::uint64_t>(place - 8) ^ state);
+    } else if (size >= 8) {
+      state =
+          fold(word<std::uint64_t>(place) ^ second_, word<std::uint64_t>(place + size - 8) ^ state);
+    } else if (size >= 4) {
+      state =
+          fold(word<std::uint32_t>(place) ^ second_, word<std::uint32_t>(place + size - 4) ^ state);
+    } else if (size > 0) {
+      const auto byte = [&](std::size_t index) { return static_cast<unsigned char>(place[index]); };
+      const std::uint64_t few = byte(0) | byte(size / 2) << 8 | byte(size - 1) << 16;
+      state = fold(few ^ second_, state);
+    }
+    return static_cast<std::uint32_t>(fold(state, first_));
+  }
+
+  [[nodiscard]] std::uint32_t operator()(std::uint64_t number) const {
+    return static_cast<std::uint32_t>(fold(fold(number ^ first_, second_), first_));
+  }
+
+ private:
+  template <class Word>
+  static std::uint64_t word(const char* place) {
+    Word result;
+    std::memcpy(&result, place, sizeof result);
+    return result;
+  }
+
+  /// Both halves of the product, so that every bit of the factors has an effect on the result.
+  static std::uint64_t fold(std::uint64_t left, std::uint64_t right) {
+    __extension__ using Product = unsigned __int128;
+    const Product product = static_cast<Product>(left) * right;
+    return static_cast<std::uint64_t>(product) ^ static_cast<std::uint64_t>(product >> 64);
+  }
+
+  std::uint64_t first_;
+  std::uint64_t second_;
+};
+
+/// Finds numbers by the hash of a content that the caller keeps.
+class ContentTable {
+ public:
+  /// Says that a hash will be looked for soon: memory then has its answer ready. Worth it for
+  /// several hashes in a row, since a table of many entries is not in the nearest cache.
+  void announce(std::uint32_t hash) const {
+    __builtin_prefetch(slots_.data() + (hash & (slots_.size() - 1)));
+  }
+
+  /// The number under this hash of which `hasContent(number)` is true. If there is none, adds
+  /// `newNumber` and returns it.
+  template <class HasContent>
+  std::uint32_t findOrAdd(std::uint32_t hash, std::uint32_t newNumber,
+                          const HasContent& hasContent) {
+    if (4 * (count_ + 1) > 3 * slots_.size()) {
+      grow();
+    }
+    const std::size_t mask = slots_.size() - 1;
+    std::size_t place = hash & mask;
+    for (; slots_[place].numberPlusOne != 0; place = (place + 1) & mask) {
+      if (slots_[place].hash == hash && hasContent(slots_[place].numberPlusOne - 1)) {
+        return slots_[place].numberPlusOne - 1;
+      }
+    }
+    slots_[place] = {hash, newNumber + 1};
+    ++count_;
+    return newNumber;
+  }
+
+ private:
+  struct Slot {
+    std::uint32_t hash = 0;
+    /// 0 marks a free slot.
+    std::uint32_t numberPlusOne = 0;
+  };
+  void grow();
+
+  /// Their number is a power of two.
+  std::vector<Slot> slots_ = std::vector<Slot>(kInitialSlotCount);
+  std::size_t count_ = 0;
+};
+
+/// Finds numbers by the address of a node.
+class IdentityTable {
+ public:
+  /// As `ContentTable::announce`.
+  void announce(const void* identity) const {
+    __builtin_prefetch(slots_.data() + firstPlaceOf(identity));
+  }
+
+  [[nodiscard]] std::optional<std::uint32_t> find(const void* identity) const {
+    const Slot& slot = slots_[placeOf(identity)];
+    return slot.identity != nullptr ? std::optional(slot.number) : std::nullopt;
+  }
+
+  /// Adds an address that is not null and not in the table.
+  void add(const void* identity, std::uint32_t number) {
+    if (2 * (count_ + 1) > slots_.size()) {
+      grow();
+    }
+    slots_[placeOf(identity)] = {identity, number};
+    ++count_;
+  }
+
+ private:
+  struct Slot {
+    const void* identity = nullptr;
+    std::uint32_t number = 0;
+  };
+
+  [[nodiscard]] std::size_t firstPlaceOf(const void* identity) const {
+    constexpr std::uint64_t kOddConstant = 0x9E3779B97F4A7C15;
+    const std::uint64_t hash = reinterpret_cast<std::uintptr_t>(identity) * kOddConstant;
+    return (hash >> 32) & (slots_.size() - 1);
+  }
+
+  /// The address's place, or the free place where it belongs.
+  [[nodiscard]] std::size_t placeOf(const void* identity) const {
+    const std::size_t mask = slots_.size() - 1;
+    std::size_t place = firstPlaceOf(identity);
+    while (slots_[place].identity != nullptr && slots_[place].identity != identity) {
+      place = (place + 1) & mask;
+    }
+    return place;
+  }
+  void grow();
+
+  /// Their number is a power of two.
+  std::vector<Slot> slots_ = std::vector<Slot>(kInitialSlotCount);
+  std::size_t count_ = 0;
+};
+
+}  // namespace accounts

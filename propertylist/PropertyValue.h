@@ -1,0 +1,306 @@
+#pragma once
+
+#include <concepts>
+#include <cstdint>
+#include <initializer_list>
+#include <optional>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+#include "propertylist/SharedNode.h"
+#include "propertylist/Text.h"
+
+namespace accounts {
+
+class PropertyValue;
+struct PropertyEntry;
+
+/// The kinds of value that a property list holds. Boolean is a kind of its own: the integer 1 is
+/// not true.
+enum class PropertyKind : std::uint8_t {
+  Dictionary,
+  Array,
+  String,
+  Integer,
+  Real,
+  Boolean,
+  Date,
+  Data
+};
+
+/// A point in time, kept bit for bit as it was read.
+struct PropertyDate {
+  /// Seconds since 2001-01-01T00:00:00Z; fractions, infinities and NaN included.
+  double secondsSinceReferenceDate = 0;
+};
+
+/// Opaque bytes.
+struct PropertyData {
+  PropertyData() = default;
+  explicit PropertyData(std::string_view content) : bytes(content) {}
+  explicit PropertyData(SharedBytes content) : bytes(std::move(content)) {}
+  SharedBytes bytes;
+};
+
+/// An ordered list of values. A value type: a copy is O(1), and a change to one copy is never seen
+/// by another.
+class PropertyArray {
+ public:
+  PropertyArray() = default;
+  PropertyArray(std::initializer_list<PropertyValue> values);
+  explicit PropertyArray(std::vector<PropertyValue> values);
+
+  [[nodiscard]] std::size_t size() const;
+  [[nodiscard]] bool empty() const { return size() == 0; }
+  /// The element at an index, which must be below size().
+  [[nodiscard]] const PropertyValue& at(std::size_t index) const;
+  [[nodiscard]] const PropertyValue* begin() const;
+  [[nodiscard]] const PropertyValue* end() const;
+  /// True when an element is the given text.
+  [[nodiscard]] bool containsText(std::string_view text) const;
+
+  void append(PropertyValue value);
+  /// Puts a value in the place of the one at an index, which must be below size().
+  void replace(std::size_t index, PropertyValue value);
+  /// Removes every element that is the given text.
+  void removeText(std::string_view text);
+
+  /// True when both share the same elements in memory: equal without a comparison.
+  [[nodiscard]] bool isSameAs(const PropertyArray& other) const {
+    return node_.get() == other.node_.get();
+  }
+  [[nodiscard]] const void* identity() const { return node_.get(); }
+  /// True when there is content that another handle holds too.
+  [[nodiscard]] bool isShared() const { return node_.isShared(); }
+
+  /// Deep equality, in order.
+  friend bool operator==(const PropertyArray& left, const PropertyArray& right);
+
+ private:
+  friend class SharedNode<PropertyArray>;
+  friend class PropertyContent;
+  struct Node;
+  std::vector<PropertyValue>& elementsToChange();
+  [[nodiscard]] Node* node() const;
+  static void destroyNode(SharedNodeBase* node);
+  SharedNode<PropertyArray> node_;
+};
+
+/// Values by text key, in the order of the keys' bytes. A value type: a copy is O(1), and a change
+/// to one copy is never seen by another. Looking a key up is O(log n).
+class PropertyDictionary {
+ public:
+  PropertyDictionary() = default;
+  PropertyDictionary(std::initializer_list<PropertyEntry> entries);
+  /// Takes entries in any order, in O(n log n); of entries with the same key the last one holds.
+  explicit PropertyDictionary(std::vector<PropertyEntry> entries);
+  /// Takes entries whose keys are known to be all different and in order, and spares the look.
+  static PropertyDictionary ofOrderedEntries(std::vector<PropertyEntry> entries);
+  /// Whether entries are as `ofOrderedEntries` needs them.
+  [[nodiscard]] static bool areOrdered(const std::vector<PropertyEntry>& entries);
+
+  [[nodiscard]] std::size_t size() const;
+  [[nodiscard]] bool empty() const { return size() == 0; }
+  /// The entries in key order.
+  [[nodiscard]] const PropertyEntry* begin() const;
+  [[nodiscard]] const PropertyEntry* end() const;
+
+  /// The value under a key, null for none; valid until the dictionary changes or goes.
+  [[nodiscard]] const PropertyValue* find(std::string_view key) const;
+  [[nodiscard]] bool contains(std::string_view key) const { return find(key) != nullptr; }
+  /// The text, array or dictionary under a key; none when there is no value or one of another kind.
+  [[nodiscard]] std::optional<Text> textForKey(std::string_view key) const;
+  [[nodiscard]] std::optional<PropertyArray> arrayForKey(std::string_view key) const;
+  [[nodiscard]] std::optional<PropertyDictionary> dictionaryForKey(std::string_view key) const;
+
+  void set(Text key, PropertyValue value);
+  void remove(std::string_view key);
+  /// Removes the value under a key and returns it; none when there was none.
+  std::optional<PropertyValue> take(std::string_view key);
+
+  /// True when both share the same entries in memory: equal without a comparison.
+  [[nodiscard]] bool isSameAs(const PropertyDictionary& other) const {
+    return node_.get() == other.node_.get();
+  }
+  [[nodiscard]] const void* identity() const { return node_.get(); }
+  /// True when there is content that another handle holds too.
+  [[nodiscard]] bool isShared() const { return node_.isShared(); }
+
+  /// Deep equality.
+  friend bool operator==(const PropertyDictionary& left, const PropertyDictionary& right);
+
+ private:
+  friend class SharedNode<PropertyDictionary>;
+  friend class PropertyContent;
+  struct Node;
+  std::vector<PropertyEntry>& entriesToChange();
+  [[nodiscard]] Node* node() const;
+  static void destroyNode(SharedNodeBase* node);
+  SharedNode<PropertyDictionary> node_;
+};
+
+/// What a value holds: a variant that knows that every kind is either a plain number or one handle
+/// to a shared node, so that moving takes no look at the kind and copying only one. Reading a file
+/// takes a seventh more instructions with std::variant in its place.
+class PropertyContent {
+ public:
+  /// Those that hold a node come first.
+  enum class Form : std::uint8_t {
+    Dictionary,
+    Array,
+    Text,
+    Data,
+    Signed,
+    LargeUnsigned,
+    Real,
+    Boolean,
+    Date
+  };
+
+  explicit PropertyContent(PropertyDictionary content)
+      : form_(Form::Dictionary), dictionary(std::move(content)) {}
+  explicit PropertyContent(PropertyArray content) : form_(Form::Array), array(std::move(content)) {}
+  explicit PropertyContent(Text content) : form_(Form::Text), text(std::move(content)) {}
+  explicit PropertyContent(PropertyData content) : form_(Form::Data), data(std::move(content)) {}
+  explicit PropertyContent(std::int64_t content) : form_(Form::Signed), signedInteger(content) {}
+  explicit PropertyContent(std::uint64_t content)
+      : form_(Form::LargeUnsigned), unsignedInteger(content) {}
+  explicit PropertyContent(double content) : form_(Form::Real), real(content) {}
+  explicit PropertyContent(bool content) : form_(Form::Boolean), bits_(0) { boolean = content; }
+  explicit PropertyContent(PropertyDate content) : form_(Form::Date), date(content) {}
+
+  PropertyContent(const PropertyContent& other) : form_(other.form_), bits_(other.bits_) {
+    if (holdsNode()) {
+      node_->retain();
+    }
+  }
+  PropertyContent(PropertyContent&& other) noexcept
+      : form_(std::exchange(other.form_, Form::Signed)), bits_(other.bits_) {}
+  PropertyContent& operator=(PropertyContent other) noexcept {
+    std::swap(form_, other.form_);
+    std::swap(bits_, other.bits_);
+    return *this;
+  }
+  ~PropertyContent() {
+    if (holdsNode() && node_->releaseIsLast()) {
+      destroyNode();
+    }
+  }
+
+  [[nodiscard]] Form form() const { return form_; }
+
+ private:
+  [[nodiscard]] bool holdsNode() const { return form_ <= Form::Data && node_ != nullptr; }
+  void destroyNode();
+
+  Form form_;
+
+ public:
+  /// Which of them there is, the form says.
+  union {
+    PropertyDictionary dictionary;
+    PropertyArray array;
+    Text text;
+    PropertyData data;
+    std::int64_t signedInteger;
+    std::uint64_t unsignedInteger;
+    double real;
+    bool boolean;
+    PropertyDate date;
+    /// Whatever there is as plain bits, or as the node of one of the first four.
+    std::uint64_t bits_;
+    SharedNodeBase* node_;
+  };
+};
+
+/// One value of a property list, of any kind. Copying is O(1). Equality is deep, takes a shortcut
+/// where two values share memory, and compares reals and dates by their bits, so that NaN equals
+/// itself and a value that was written and read again equals the original. Values of different
+/// kinds are never equal.
+class PropertyValue {
+ public:
+  PropertyValue(PropertyDictionary dictionary) : content_(std::move(dictionary)) {}
+  PropertyValue(PropertyArray array) : content_(std::move(array)) {}
+  PropertyValue(Text text) : content_(std::move(text)) {}
+  PropertyValue(std::string_view text) : content_(Text(text)) {}
+  PropertyValue(const std::string& text) : content_(Text(text)) {}
+  PropertyValue(const char* text) : content_(Text(text)) {}
+  PropertyValue(PropertyDate date) : content_(date) {}
+  PropertyValue(PropertyData data) : content_(std::move(data)) {}
+  // A template, so that no pointer becomes a boolean by an implicit conversion.
+  template <std::same_as<bool> Boolean>
+  PropertyValue(Boolean boolean) : content_(boolean) {}
+  template <std::signed_integral Signed>
+  PropertyValue(Signed integer) : content_(std::int64_t{integer}) {}
+  template <std::unsigned_integral Unsigned>
+  requires(!std::same_as<Unsigned, bool>) PropertyValue(Unsigned integer)
+      : content_(contentOf(integer)) {}
+  template <std::floating_point Real>
+  PropertyValue(Real real) : content_(static_cast<double>(real)) {}
+
+  [[nodiscard]] PropertyKind kind() const;
+
+  /// The content as one kind; null or none when the value is of another.
+  [[nodiscard]] const PropertyDictionary* asDictionary() const {
+    return content_.form() == Form::Dictionary ? &content_.dictionary : nullptr;
+  }
+  [[nodiscard]] const PropertyArray* asArray() const {
+    return content_.form() == Form::Array ? &content_.array : nullptr;
+  }
+  [[nodiscard]] const Text* asText() const {
+    return content_.form() == Form::Text ? &content_.text : nullptr;
+  }
+  [[nodiscard]] const PropertyData* asData() const {
+    return content_.form() == Form::Data ? &content_.data : nullptr;
+  }
+  [[nodiscard]] const PropertyDate* asDate() const {
+    return content_.form() == Form::Date ? &content_.date : nullptr;
+  }
+  [[nodiscard]] const double* asReal() const {
+    return content_.form() == Form::Real ? &content_.real : nullptr;
+  }
+  [[nodiscard]] const bool* asBoolean() const {
+    return content_.form() == Form::Boolean ? &content_.boolean : nullptr;
+  }
+  /// An integer from -2^63 to 2^63-1; null for any other value, a larger integer included.
+  [[nodiscard]] const std::int64_t* asSigned() const {
+    return content_.form() == Form::Signed ? &content_.signedInteger : nullptr;
+  }
+  /// An integer from 2^63 to 2^64-1; null for any other value, a smaller integer included.
+  [[nodiscard]] const std::uint64_t* asLargeUnsigned() const {
+    return content_.form() == Form::LargeUnsigned ? &content_.unsignedInteger : nullptr;
+  }
+
+  /// The value read as an integer: the integer part of a number (held to the range of 64 signed
+  /// bits, 0 for NaN), 0 or 1 of a boolean, the leading decimal integer of a text (blanks first
+  /// skipped, an optional sign, 0 if there is none). None for any other kind.
+  [[nodiscard]] std::optional<std::int64_t> integerValue() const;
+
+  /// The value read as a boolean: a boolean itself; a number unless it is 0; a text when, after
+  /// blanks, an optional sign and zeros, its next character is one of Y y T t 1 to 9. None for any
+  /// other kind.
+  [[nodiscard]] std::optional<bool> booleanValue() const;
+
+  friend bool operator==(const PropertyValue& left, const PropertyValue& right);
+
+ private:
+  using Form = PropertyContent::Form;
+
+  // Integers that fit are always held signed, so that equal numbers have one form.
+  static PropertyContent contentOf(std::uint64_t integer) {
+    constexpr std::uint64_t kTwoToThe63 = std::uint64_t{1} << 63;
+    return integer < kTwoToThe63 ? PropertyContent(static_cast<std::int64_t>(integer))
+                                 : PropertyContent(integer);
+  }
+
+  PropertyContent content_;
+};
+
+/// One key of a dictionary with its value.
+struct PropertyEntry {
+  Text key;
+  PropertyValue value;
+};
+
+}  // namespace accounts

@@ -1,0 +1,52 @@
+#include "propertylist/PropertyListFile.h"
+
+#include <gtest/gtest.h>
+
+#include "PropertyListTesting.h"
+
+namespace accounts {
+namespace {
+
+using testing::contains;
+
+std::string errorOfReading(std::string_view bytes) {
+  PropertyListError error;
+  EXPECT_FALSE(readPropertyList(bytes, error));
+  return error.text;
+}
+
+TEST(PropertyListFile, ABinaryFileIsRead) {
+  PropertyListError error;
+
+  EXPECT_EQ(readPropertyList(testing::writeBinary(PropertyArray{1}), error),
+            PropertyValue(PropertyArray{1}));
+}
+
+TEST(PropertyListFile, AnXMLFileIsRead) {
+  PropertyListError error;
+
+  EXPECT_EQ(readPropertyList(testing::inPropertyList("<array><integer>1</integer></array>"), error),
+            PropertyValue(PropertyArray{1}));
+}
+
+TEST(PropertyListFile, AnXMLFileMayBeginWithAByteOrderMark) {
+  PropertyListError error;
+
+  EXPECT_EQ(readPropertyList("\xEF\xBB\xBF<plist><true/></plist>", error), PropertyValue(true));
+}
+
+TEST(PropertyListFile, AFileOfZeroBytesIsAnError) {
+  EXPECT_EQ(errorOfReading(""), "property list: the file is empty");
+}
+
+TEST(PropertyListFile, AFileInNeitherFormatIsAnError) {
+  EXPECT_TRUE(contains(errorOfReading("{ \"a\" = 1; }"), "not well-formed"));
+  EXPECT_TRUE(contains(errorOfReading(std::string(100, '\0')), "XML property list: "));
+}
+
+TEST(PropertyListFile, ADamagedBinaryFileIsReportedAsBinary) {
+  EXPECT_TRUE(contains(errorOfReading("bplist00"), "binary property list: "));
+}
+
+}  // namespace
+}  // namespace accounts

@@ -1,0 +1,55 @@
+#include "PropertyListTesting.h"
+
+#include <bit>
+#include <limits>
+
+namespace accounts::testing {
+
+PropertyValue valueOfEveryKind() {
+  using namespace std::string_literals;
+  return PropertyDictionary{
+      {"", "value under an empty key"},
+      {"array", PropertyArray{1, "two", 3.5, PropertyArray{}}},
+      {"data", PropertyData("\x00\x01\xFE\xFF"s)},
+      {"data, empty", PropertyData()},
+      {"data, like a text", PropertyData("text")},
+      {"date", PropertyDate{326'000'000}},
+      {"date, before the reference", PropertyDate{-0.25}},
+      {"dictionary", PropertyDictionary{{"inner", PropertyDictionary{}}}},
+      {"false", false},
+      {"integer, largest signed", std::numeric_limits<std::int64_t>::max()},
+      {"integer, largest unsigned", std::numeric_limits<std::uint64_t>::max()},
+      {"integer, of one byte", 255},
+      {"integer, of two bytes", 65535},
+      {"integer, of four bytes", 4294967295U},
+      {"integer, smallest", std::numeric_limits<std::int64_t>::min()},
+      {"integer, zero", 0},
+      {"real", -12.75},
+      {"real, one", 1.0},
+      {"real, smallest", std::numeric_limits<double>::denorm_min()},
+      {"text", "text"},
+      {"text, beyond the basic plane", "\xF0\x9F\x98\x80"},
+      {"text, empty", ""},
+      {"text, long", std::string(70'000, 'x')},
+      {"text, not ASCII", "B\xC3\xBCro \xE2\x82\xAC"},
+      {"text, of fifteen characters", "123456789012345"},
+      {"text, with a NUL", "a\0b"s},
+      {"true", true}};
+}
+
+PropertyValue nestedArrays(std::size_t depth) {
+  PropertyArray array;
+  for (std::size_t level = 1; level < depth; ++level) {
+    array = PropertyArray{array};
+  }
+  return array;
+}
+
+::testing::AssertionResult contains(std::string_view text, std::string_view part) {
+  if (text.find(part) != std::string_view::npos) {
+    return ::testing::AssertionSuccess();
+  }
+  return ::testing::AssertionFailure() << "\"" << text << "\" does not contain \"" << part << "\"";
+}
+
+}  // namespace accounts::testing

@@ -1,0 +1,129 @@
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "propertylist/BinaryPropertyList.h"
+#include "propertylist/XMLPropertyList.h"
+
+namespace accounts::testing {
+
+/// Makes binary property lists object by object, right ones and wrong ones.
+class BinaryFile {
+ public:
+  /// Adds an object as it stands in the file; returns its number.
+  std::size_t add(std::string_view encoded) {
+    offsets_.push_back(bytes_.size());
+    bytes_.append(encoded);
+    return offsets_.size() - 1;
+  }
+
+  /// Adds an array or dictionary with the given marker, whose references are one byte each.
+  std::size_t addContainer(char marker, const std::vector<std::size_t>& references) {
+    std::string encoded(1, marker);
+    for (const std::size_t reference : references) {
+      encoded.push_back(static_cast<char>(reference));
+    }
+    return add(encoded);
+  }
+
+  void setOffset(std::size_t object, std::uint64_t offset) { offsets_.at(object) = offset; }
+  void setTopObject(std::uint64_t object) { topObject_ = object; }
+  void setReferenceSize(std::size_t size) { referenceSize_ = size; }
+  void setOffsetSize(std::size_t size) { offsetSize_ = size; }
+
+  /// The file, its top object the last one added unless another was set.
+  [[nodiscard]] std::string build() const {
+    std::string file = bytes_;
+    for (const std::uint64_t offset : offsets_) {
+      appendNumber(file, offset, offsetSize_);
+    }
+    file.append(6, '\0');
+    file.push_back(static_cast<char>(offsetSize_));
+    file.push_back(static_cast<char>(referenceSize_));
+    appendNumber(file, offsets_.size(), 8);
+    appendNumber(file, topObject_ != kLastObject ? topObject_ : offsets_.size() - 1, 8);
+    appendNumber(file, bytes_.size(), 8);
+    return file;
+  }
+
+  static void appendNumber(std::string& bytes, std::uint64_t number, std::size_t size) {
+    while (size > 0) {
+      --size;
+      bytes.push_back(size < 8 ? static_cast<char>(number >> (8 * size) & 0xFF) : '\0');
+    }
+  }
+
+ private:
+  static constexpr std::uint64_t kLastObject = ~std::uint64_t{0};
+
+  std::string bytes_ = "bplist00";
+  std::vector<std::uint64_t> offsets_;
+  std::uint64_t topObject_ = kLastObject;
+  std::size_t referenceSize_ = 1;
+  std::size_t offsetSize_ = 8;
+};
+
+/// A file whose only object is the given one.
+inline std::string fileWithObject(std::string_view encoded) {
+  BinaryFile file;
+  file.add(encoded);
+  return file.build();
+}
+
+/// The value of a file that must be readable.
+inline PropertyValue readBinary(std::string_view bytes) {
+  PropertyListError error;
+  std::optional<PropertyValue> value = readBinaryPropertyList(bytes, error);
+  EXPECT_TRUE(value) << error.text;
+  return value ? *value : PropertyValue("unreadable");
+}
+
+/// The error of a file that must not be readable.
+inline std::string errorOfReadingBinary(std::string_view bytes) {
+  PropertyListError error;
+  const std::optional<PropertyValue> value = readBinaryPropertyList(bytes, error);
+  EXPECT_FALSE(value);
+  return error.text;
+}
+
+inline std::string writeBinary(const PropertyValue& value) {
+  PropertyListError error;
+  std::optional<std::string> bytes = writeBinaryPropertyList(value, error);
+  EXPECT_TRUE(bytes) << error.text;
+  return bytes.value_or("");
+}
+
+inline std::string inPropertyList(std::string_view content) {
+  return "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<plist version=\"1.0\">" +
+         std::string(content) + "</plist>\n";
+}
+
+inline PropertyValue readXML(std::string_view bytes) {
+  PropertyListError error;
+  std::optional<PropertyValue> value = readXMLPropertyList(bytes, error);
+  EXPECT_TRUE(value) << error.text;
+  return value ? *value : PropertyValue("unreadable");
+}
+
+inline std::string errorOfReadingXML(std::string_view bytes) {
+  PropertyListError error;
+  const std::optional<PropertyValue> value = readXMLPropertyList(bytes, error);
+  EXPECT_FALSE(value);
+  return error.text;
+}
+
+/// A value with every kind in it, the awkward ones of each too.
+PropertyValue valueOfEveryKind();
+
+/// An array in an array and so on; `depth` 1 is an empty array alone.
+PropertyValue nestedArrays(std::size_t depth);
+
+/// Passes when the text contains the part; prints both otherwise.
+::testing::AssertionResult contains(std::string_view text, std::string_view part);
+
+}  // namespace accounts::testing
