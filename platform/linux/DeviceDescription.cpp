@@ -1,0 +1,126 @@
+#include "platform/linux/DeviceDescription.h"
+
+#include <cstdint>
+#include <string_view>
+
+#include "platform/linux/DictionaryFile.h"
+
+namespace accounts {
+namespace {
+
+constexpr std::string_view kDeviceInfo = "DeviceInfo";
+constexpr std::string_view kProfileRestrictions = "ProfileRestrictions";
+constexpr std::string_view kPairingValues = "PairingValues";
+constexpr std::string_view kExternalSyncSources = "ExternalSyncSources";
+constexpr std::string_view kSources = "Sources";
+constexpr std::string_view kError = "Error";
+constexpr std::string_view kCloudAccount = "CloudAccount";
+
+struct RestrictionKey {
+  RestrictedFeature feature;
+  std::string_view key;
+};
+
+constexpr std::array<RestrictionKey, kRestrictedFeatureCount> kRestrictionKeys = {{
+    {RestrictedFeature::CloudDocumentSync, "allowCloudDocumentSync"},
+    {RestrictedFeature::PhotoStream, "allowPhotoStream"},
+    {RestrictedFeature::SharedPhotoStreams, "allowSharedPhotoStreams"},
+    {RestrictedFeature::CloudBackup, "allowCloudBackup"},
+    {RestrictedFeature::CardsAndPassesWhileLocked, "allowCardsAndPassesWhileLocked"},
+}};
+
+struct SyncDataTypeKey {
+  SyncDataType dataType;
+  std::string_view key;
+};
+
+constexpr std::array<SyncDataTypeKey, kSyncDataTypeCount> kSyncDataTypeKeys = {{
+    {SyncDataType::Bookmarks, "Bookmarks"},
+    {SyncDataType::Calendars, "Calendars"},
+    {SyncDataType::Contacts, "Contacts"},
+    {SyncDataType::Notes, "Notes"},
+}};
+
+struct CloudAccountKey {
+  std::string_view key;
+  std::string DeviceDescription::*text;
+};
+
+constexpr CloudAccountKey kCloudAccountKeys[] = {
+    {"StatusKey", &DeviceDescription::cloudStatusKey},
+    {"PrimaryAccountKey", &DeviceDescription::cloudPrimaryAccountKey},
+    {"DisplayName", &DeviceDescription::cloudAccountTypeDisplayName},
+};
+
+PropertyDictionary dictionaryOrEmpty(const PropertyDictionary& dictionary, std::string_view key) {
+  return dictionary.dictionaryForKey(key).value_or(PropertyDictionary());
+}
+
+RestrictionAnswer restrictionAnswer(const PropertyValue* value) {
+  const std::optional<std::int64_t> number = value != nullptr ? value->integerValue() : 0;
+  for (const RestrictionAnswer answer :
+       {RestrictionAnswer::ExplicitlyAllowed, RestrictionAnswer::ExplicitlyNotAllowed}) {
+    if (number == static_cast<std::int64_t>(answer)) {
+      return answer;
+    }
+  }
+  return RestrictionAnswer::NoSetting;
+}
+
+ExternalSyncSourcesAnswer syncSourcesAnswer(const PropertyDictionary& dictionary) {
+  ExternalSyncSourcesAnswer answer;
+  answer.sources = dictionary.arrayForKey(kSources);
+  if (const auto error = dictionary.textForKey(kError)) {
+    answer.error = error->string();
+  }
+  return answer;
+}
+
+std::optional<DeviceDescription> describe(const std::optional<PropertyDictionary>& dictionary) {
+  return dictionary ? std::optional(deviceDescriptionFromDictionary(*dictionary)) : std::nullopt;
+}
+
+}  // namespace
+
+DeviceDescription deviceDescriptionFromDictionary(const PropertyDictionary& dictionary) {
+  DeviceDescription description;
+  description.deviceInfo = dictionaryOrEmpty(dictionary, kDeviceInfo);
+  description.pairingValues = dictionary.dictionaryForKey(kPairingValues);
+
+  const PropertyDictionary restrictions = dictionaryOrEmpty(dictionary, kProfileRestrictions);
+  for (const auto& [feature, key] : kRestrictionKeys) {
+    description.profileRestrictions[static_cast<std::size_t>(feature)] =
+        restrictionAnswer(restrictions.find(key));
+  }
+  const PropertyDictionary syncSources = dictionaryOrEmpty(dictionary, kExternalSyncSources);
+  for (const auto& [dataType, key] : kSyncDataTypeKeys) {
+    description.externalSyncSources[static_cast<std::size_t>(dataType)] =
+        syncSourcesAnswer(dictionaryOrEmpty(syncSources, key));
+  }
+  const PropertyDictionary cloudAccount = dictionaryOrEmpty(dictionary, kCloudAccount);
+  for (const auto& [key, text] : kCloudAccountKeys) {
+    if (const auto given = cloudAccount.textForKey(key)) {
+      description.*text = given->string();
+    }
+  }
+  return description;
+}
+
+std::optional<DeviceDescription> readDeviceDescription(const DeviceRoot& root, PathError& error) {
+  PathError failure;
+  const auto dictionary = readDictionaryFile(root, kDeviceDescriptionPath, failure);
+  if (!dictionary && failure.isMissing()) {
+    return DeviceDescription();
+  }
+  if (!dictionary) {
+    error = failure;
+  }
+  return describe(dictionary);
+}
+
+std::optional<DeviceDescription> readHostDeviceDescription(const std::string& path,
+                                                           PathError& error) {
+  return describe(readHostDictionaryFile(path, error));
+}
+
+}  // namespace accounts

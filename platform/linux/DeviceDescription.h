@@ -1,0 +1,50 @@
+#pragma once
+
+#include <array>
+#include <optional>
+#include <string>
+
+#include "platform/ExternalSyncSources.h"
+#include "platform/ProfileRestrictions.h"
+#include "platform/linux/DeviceRoot.h"
+#include "platform/linux/PathError.h"
+#include "propertylist/PropertyValue.h"
+
+namespace accounts {
+
+inline constexpr std::size_t kRestrictedFeatureCount = 5;
+inline constexpr std::size_t kSyncDataTypeCount = 4;
+
+/// What the services of a device answer, for a device whose services do not run: an image. As it
+/// stands here, no service has an answer.
+struct DeviceDescription {
+  /// Answers by question.
+  PropertyDictionary deviceInfo;
+  /// By RestrictedFeature.
+  std::array<RestrictionAnswer, kRestrictedFeatureCount> profileRestrictions = {};
+  /// Domain to dictionary of key to value; none when the pairing service cannot be reached.
+  std::optional<PropertyDictionary> pairingValues;
+  /// By SyncDataType.
+  std::array<ExternalSyncSourcesAnswer, kSyncDataTypeCount> externalSyncSources;
+  std::string cloudStatusKey = "status";
+  std::string cloudPrimaryAccountKey = "primaryAccount";
+  std::string cloudAccountTypeDisplayName = "Stratix";
+};
+
+/// Where a device holds its own description.
+inline constexpr std::string_view kDeviceDescriptionPath = "/etc/device.plist";
+
+/// The description that a dictionary holds. Keys that are missing or of the wrong kind leave their
+/// defaults; other keys are ignored.
+DeviceDescription deviceDescriptionFromDictionary(const PropertyDictionary& dictionary);
+
+/// The description that the device holds itself, at kDeviceDescriptionPath. One that is missing is
+/// a description without answers. None, with `error` set, when it cannot be read as a dictionary.
+std::optional<DeviceDescription> readDeviceDescription(const DeviceRoot& root, PathError& error);
+
+/// The description in a file of the host. None, with `error` set, when the file is missing
+/// (`error.isMissing()`) or cannot be read as a dictionary.
+std::optional<DeviceDescription> readHostDeviceDescription(const std::string& path,
+                                                           PathError& error);
+
+}  // namespace accounts

@@ -1,0 +1,122 @@
+#include "platform/linux/DeviceRoot.h"
+
+#include <fcntl.h>
+#include <linux/openat2.h>
+#include <sys/stat.h>
+#include <sys/syscall.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstdint>
+#include <utility>
+
+#include "platform/linux/DevicePath.h"
+#include "platform/linux/FileContents.h"
+
+namespace accounts {
+namespace {
+
+// The kernel gives EAGAIN when something was renamed while it resolved a "..", which passes.
+constexpr int kMostAttempts = 1000;
+
+int openBeneath(int directory, const std::string& path, int flags) {
+  open_how how = {};
+  how.flags = static_cast<std::uint64_t>(flags | O_CLOEXEC);
+  how.resolve = RESOLVE_IN_ROOT | RESOLVE_NO_MAGICLINKS;
+  long number = -1;
+  for (int attempt = 0; attempt < kMostAttempts; ++attempt) {
+    number = ::syscall(SYS_openat2, directory, path.c_str(), &how, sizeof how);
+    if (number >= 0 || (errno != EAGAIN && errno != EINTR)) {
+      break;
+    }
+  }
+  return static_cast<int>(number);
+}
+
+bool isRootOfTheSystem(const FileDescriptor& directory) {
+  struct stat opened = {};
+  struct stat system = {};
+  return ::fstat(directory.number(), &opened) == 0 && ::stat("/", &system) == 0 &&
+         opened.st_dev == system.st_dev && opened.st_ino == system.st_ino;
+}
+
+}  // namespace
+
+std::optional<DeviceRoot> DeviceRoot::openRoot(const std::string& hostDirectory, PathError& error) {
+  const int number = ::open(hostDirectory.c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC);
+  if (number < 0) {
+    error = pathError("open the device root", hostDirectory, errno);
+    return std::nullopt;
+  }
+  FileDescriptor directory(number);
+  const int probe = openBeneath(directory.number(), "/", O_PATH | O_DIRECTORY);
+  if (probe < 0) {
+    error = pathError("resolve paths beneath the device root", hostDirectory, errno);
+    error.text += " (openat2, of Linux 5.6 or later, is needed)";
+    return std::nullopt;
+  }
+  ::close(probe);
+  const bool isSystemRoot = isRootOfTheSystem(directory);
+  return DeviceRoot(std::move(directory), isSystemRoot);
+}
+
+std::optional<FileDescriptor> DeviceRoot::open(std::string_view path, int flags,
+                                               PathError& error) const {
+  if (path.find('\0') != std::string_view::npos) {
+    error = pathError("open", path, EINVAL);
+    return std::nullopt;
+  }
+  const int number = openBeneath(directory_.number(), std::string(path), flags);
+  if (number < 0) {
+    error = pathError("open", path, errno);
+    return std::nullopt;
+  }
+  return FileDescriptor(number);
+}
+
+std::optional<FileDescriptor> DeviceRoot::openIfRegular(std::string_view path, int flags,
+                                                        PathError& error) const {
+  auto file = open(path, flags, error);
+  if (!file) {
+    return std::nullopt;
+  }
+  const auto status = fileStatus(*file, path, error);
+  if (!status) {
+    return std::nullopt;
+  }
+  if (!S_ISREG(status->st_mode)) {
+    error = notRegularError("open", path, status->st_mode);
+    return std::nullopt;
+  }
+  return file;
+}
+
+std::optional<FileDescriptor> DeviceRoot::openRegularFile(std::string_view path,
+                                                          PathError& error) const {
+  // First for its path alone: opening a device can already have an effect.
+  if (!openIfRegular(path, O_PATH, error)) {
+    return std::nullopt;
+  }
+  return openIfRegular(path, O_RDONLY | O_NONBLOCK | O_NOCTTY, error);
+}
+
+std::optional<std::string> DeviceRoot::readFile(std::string_view path, PathError& error) const {
+  const auto file = openRegularFile(path, error);
+  return file ? readContents(*file, path, error) : std::nullopt;
+}
+
+std::optional<DirectoryEntry> DeviceRoot::locate(std::string_view path, PathError& error) const {
+  const SplitPath split = splitPath(path);
+  if (split.name.empty() || split.name == "." || split.name == ".." ||
+      split.name.find('\0') != std::string_view::npos) {
+    error = pathError("find a name in", path, EINVAL);
+    return std::nullopt;
+  }
+  auto directory = open(split.directory, O_PATH | O_DIRECTORY, error);
+  if (!directory) {
+    return std::nullopt;
+  }
+  return DirectoryEntry(std::move(*directory), std::string(split.name), std::string(path));
+}
+
+}  // namespace accounts

@@ -1,0 +1,21 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "platform/linux/DeviceRoot.h"
+#include "platform/linux/PathError.h"
+#include "propertylist/PropertyValue.h"
+
+namespace accounts {
+
+/// The dictionary that a property-list file of the device holds. None, with `error` set, when the
+/// file is missing (`error.isMissing()`), cannot be read, is malformed or holds something else.
+std::optional<PropertyDictionary> readDictionaryFile(const DeviceRoot& root, std::string_view path,
+                                                     PathError& error);
+
+/// The same for a file of the host, outside any device root.
+std::optional<PropertyDictionary> readHostDictionaryFile(const std::string& path, PathError& error);
+
+}  // namespace accounts

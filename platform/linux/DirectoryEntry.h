@@ -1,0 +1,52 @@
+#pragma once
+
+#include <sys/types.h>
+
+#include <optional>
+#include <string>
+
+#include "platform/linux/FileDescriptor.h"
+#include "platform/linux/PathError.h"
+
+namespace accounts {
+
+/// A name in an open directory: where operations on names (creating, removing, renaming) act. No
+/// operation here follows a symbolic link at the name itself, so none leaves the directory.
+class DirectoryEntry {
+ public:
+  /// `directory` may be open for its path alone. `name` is one component, neither "." nor "..".
+  /// `path` is the device path of the entry, for error texts.
+  DirectoryEntry(FileDescriptor directory, std::string name, std::string path);
+
+  [[nodiscard]] int directory() const { return directory_.number(); }
+  [[nodiscard]] const char* name() const { return name_.c_str(); }
+  [[nodiscard]] const std::string& path() const { return path_; }
+
+  /// Opens the regular file of this name with open's `flags`, without waiting. None, with `error`
+  /// set, when it is missing, may not be opened or is anything but a regular file.
+  [[nodiscard]] std::optional<FileDescriptor> openRegularFile(int flags, PathError& error) const;
+
+  /// Creates a file of this name with the given permission bits (less the process's mask), open for
+  /// reading and writing. None, with `error` set, when anything exists there or creating fails.
+  [[nodiscard]] std::optional<FileDescriptor> createFile(mode_t permissions,
+                                                         PathError& error) const;
+
+  /// Creates a directory of this name with exactly the given permission bits. Returns whether it
+  /// did; after a failure, which `error` explains, there is no new directory.
+  [[nodiscard]] bool createDirectory(mode_t permissions, PathError& error) const;
+
+  /// Removes the file or symbolic link of this name, never a directory. Returns 0 or the error
+  /// number.
+  [[nodiscard]] int remove() const;
+
+  /// Opens the directory that holds the name so that it can be flushed; none, with `error` set,
+  /// when it may not be read.
+  [[nodiscard]] std::optional<FileDescriptor> openDirectory(PathError& error) const;
+
+ private:
+  FileDescriptor directory_;
+  std::string name_;
+  std::string path_;
+};
+
+}  // namespace accounts

@@ -1,0 +1,132 @@
+#include "platform/linux/FileContents.h"
+
+#include <fcntl.h>
+#include <poll.h>
+#include <unistd.h>
+
+#include <array>
+#include <cerrno>
+
+namespace accounts {
+namespace {
+
+constexpr std::size_t kBlockSize = std::size_t{64} << 10;
+
+// Passes the bytes of an open file to `take` block by block; `take` returns whether to go on.
+template <class Take>
+bool readBlocks(const FileDescriptor& file, std::string_view path, PathError& error, Take take) {
+  const auto status = fileStatus(file, path, error);
+  if (!status) {
+    return false;
+  }
+  // Seen before anything is read; the count below is for files that grow or hide their size.
+  if (status->st_size > static_cast<off_t>(kLargestFileSize)) {
+    error = pathError("read", path, EFBIG);
+    return false;
+  }
+  std::array<char, kBlockSize> block;
+  std::size_t total = 0;
+  for (;;) {
+    const ssize_t count = ::read(file.number(), block.data(), block.size());
+    if (count < 0 && errno == EINTR) {
+      continue;
+    }
+    if (count < 0) {
+      error = pathError("read", path, errno);
+      return false;
+    }
+    if (count == 0) {
+      return true;
+    }
+    total += static_cast<std::size_t>(count);
+    if (total > kLargestFileSize) {
+      error = pathError("read", path, EFBIG);
+      return false;
+    }
+    if (!take(std::string_view(block.data(), static_cast<std::size_t>(count)))) {
+      return false;
+    }
+  }
+}
+
+}  // namespace
+
+std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_view path,
+                                      PathError& error) {
+  struct stat status = {};
+  if (::fstat(file.number(), &status) != 0) {
+    error = pathError("examine", path, errno);
+    return std::nullopt;
+  }
+  return status;
+}
+
+std::optional<std::string> readContents(const FileDescriptor& file, std::string_view path,
+                                        PathError& error) {
+  std::string contents;
+  const bool read = readBlocks(file, path, error, [&](std::string_view block) {
+    contents.append(block);
+    return true;
+  });
+  if (!read) {
+    return std::nullopt;
+  }
+  return contents;
+}
+
+std::optional<std::string> readHostFile(const std::string& path, PathError& error) {
+  const int number = ::open(path.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC | O_NOCTTY);
+  if (number < 0) {
+    error = pathError("open", path, errno);
+    return std::nullopt;
+  }
+  const FileDescriptor file(number);
+  const auto status = fileStatus(file, path, error);
+  if (!status) {
+    return std::nullopt;
+  }
+  if (!S_ISREG(status->st_mode)) {
+    error = notRegularError("read", path, status->st_mode);
+    return std::nullopt;
+  }
+  return readContents(file, path, error);
+}
+
+int writeAll(int descriptor, std::string_view bytes) {
+  while (!bytes.empty()) {
+    const ssize_t count = ::write(descriptor, bytes.data(), bytes.size());
+    if (count >= 0) {
+      bytes.remove_prefix(static_cast<std::size_t>(count));
+    } else if (errno == EAGAIN) {
+      // Standard error may be a pipe that another program made non-blocking.
+      pollfd writable = {descriptor, POLLOUT, 0};
+      ::poll(&writable, 1, -1);
+    } else if (errno != EINTR) {
+      return errno;
+    }
+  }
+  return 0;
+}
+
+bool copyContents(const FileDescriptor& source, std::string_view sourcePath,
+                  const FileDescriptor& destination, std::string_view destinationPath,
+                  PathError& error) {
+  return readBlocks(source, sourcePath, error, [&](std::string_view block) {
+    const int number = writeAll(destination.number(), block);
+    if (number != 0) {
+      error = pathError("write", destinationPath, number);
+    }
+    return number == 0;
+  });
+}
+
+int flush(const FileDescriptor& file) {
+  while (::fsync(file.number()) != 0) {
+    if (errno != EINTR) {
+      return errno;
+    }
+  }
+  return 0;
+}
+
+}  // namespace accounts

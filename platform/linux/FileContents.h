@@ -1,0 +1,44 @@
+#pragma once
+
+#include <cstddef>
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "platform/linux/FileDescriptor.h"
+#include "platform/linux/PathError.h"
+
+namespace accounts {
+
+/// No file larger than this is read or copied. Settings files hold kilobytes; a larger one, such as
+/// a sparse file of terabytes in a damaged image, would only use up the machine's memory or disk.
+inline constexpr std::size_t kLargestFileSize = std::size_t{256} << 20;
+
+/// What stat says of an open file; none, with `error` set, when it says nothing.
+std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_view path,
+                                      PathError& error);
+
+/// The bytes of an open regular file from its position to its end. None, with `error` set, when
+/// reading fails or there are more than kLargestFileSize. `path` is for the error's text.
+std::optional<std::string> readContents(const FileDescriptor& file, std::string_view path,
+                                        PathError& error);
+
+/// The bytes of a regular file of the host, outside any device root. None, with `error` set, when
+/// it is missing, unreadable, too large or no regular file; opening never waits.
+std::optional<std::string> readHostFile(const std::string& path, PathError& error);
+
+/// Writes all bytes to an open file, waiting for it where it must, and returns 0 or the error
+/// number. A part may have been written after a failure.
+int writeAll(int descriptor, std::string_view bytes);
+
+/// Copies the bytes of one open regular file to another; at most kLargestFileSize. Returns whether
+/// it did; `error` says why not.
+bool copyContents(const FileDescriptor& source, std::string_view sourcePath,
+                  const FileDescriptor& destination, std::string_view destinationPath,
+                  PathError& error);
+
+/// Waits until the contents of an open file or directory are on the medium, and returns 0 or the
+/// error number.
+int flush(const FileDescriptor& file);
+
+}  // namespace accounts

@@ -1,0 +1,47 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "platform/FileSystem.h"
+#include "platform/linux/DeviceRoot.h"
+#include "platform/linux/OwnerNames.h"
+
+namespace accounts {
+
+/// The files beneath a device root. Symbolic links in the directories of a path are followed
+/// beneath the root; a link in the place of the file itself is followed only where a file is looked
+/// at or copied from. Files that are made can be read by their owner alone. Only regular files are
+/// read, written, moved and given away; nothing else is waited for.
+class LinuxFileSystem final : public FileSystem {
+ public:
+  /// Temporary files go to `temporaryDirectory`, a device path; it is made when first needed, its
+  /// parent must exist. `root` must outlive this.
+  LinuxFileSystem(const DeviceRoot& root, std::string temporaryDirectory);
+
+  bool fileExists(std::string_view path) override;
+  bool isDirectory(std::string_view path) override;
+
+  /// The copy gets the permission bits of its source. Files above kLargestFileSize are not copied.
+  Result copyFile(std::string_view source, std::string_view destination) override;
+  Result removeFile(std::string_view path) override;
+  Result createFile(std::string_view path, std::string_view contents) override;
+  Result createDirectoryWithIntermediates(std::string_view path, unsigned permissions) override;
+
+  std::optional<std::string> makeTemporaryFile() override;
+  Result writeFile(std::string_view path, std::string_view contents) override;
+  Result writeFileAtomically(std::string_view path, std::string_view contents) override;
+  Result setOwnerAndGroup(std::string_view path, std::string_view ownerName,
+                          std::string_view groupName) override;
+  /// When only flushing the destination's directory fails, the file has been moved although the
+  /// result is a failure: the move may not outlive a power cut.
+  Result renameFile(std::string_view source, std::string_view destination) override;
+
+ private:
+  const DeviceRoot& root_;
+  OwnerNames ownerNames_;
+  std::string temporaryDirectory_;
+};
+
+}  // namespace accounts

@@ -1,0 +1,11 @@
+#include "platform/linux/LinuxMailDirectory.h"
+
+#include "platform/linux/DevicePath.h"
+
+namespace accounts {
+
+std::string LinuxMailDirectory::path() {
+  return joinedPath(home_.path(), "Library/Mail");
+}
+
+}  // namespace accounts

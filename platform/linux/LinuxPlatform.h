@@ -1,0 +1,79 @@
+#pragma once
+
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include "platform/Platform.h"
+#include "platform/linux/DeviceRoot.h"
+#include "platform/linux/LinuxFileSystem.h"
+#include "platform/linux/LinuxPropertyLists.h"
+#include "platform/linux/RecordingCloudTabService.h"
+#include "platform/linux/RecordingPreferencesBroadcast.h"
+
+namespace accounts {
+
+/// What a Linux platform is made from. Paths belong to the machine that the program runs on, except
+/// those called device paths, which start at the root of the device.
+struct LinuxPlatformOptions {
+  /// The directory that holds the device; "/" for the running one.
+  std::string rootDirectory;
+  /// An absolute device path.
+  std::string homeDirectory = "/var/mobile";
+  /// An absolute device path; none for "tmp" in the home directory.
+  std::optional<std::string> temporaryDirectory;
+  /// The Resources directory of the plug-in's bundle.
+  std::string bundleResourcesDirectory;
+  /// The device description; none for the device's own, if it has one.
+  std::optional<std::string> deviceDescriptionFile;
+  /// The file that lines of log channels are appended to, "-" for standard error; none keeps them
+  /// off.
+  std::optional<std::string> channel;
+};
+
+/// What stands in the way of a platform.
+struct LinuxPlatformError {
+  enum class Kind : std::uint8_t {
+    /// An option cannot be used, such as a home directory that is no absolute path.
+    UnusableOption,
+    /// The root, the device description or the bundle's resources are missing or unreadable.
+    MissingInput,
+    /// The channel's file cannot be created or written.
+    CannotCreate,
+    /// The system lacks what the platform needs.
+    InputOutput
+  };
+  Kind kind = Kind::InputOutput;
+  /// One line for a person, without a full stop.
+  std::string text;
+};
+
+/// One Linux implementation of each interface of the platform, on one device root. Making it
+/// changes nothing beneath the root.
+class LinuxPlatform {
+ public:
+  /// Null, with `error` set, when it cannot be made.
+  static std::unique_ptr<LinuxPlatform> create(const LinuxPlatformOptions& options,
+                                               LinuxPlatformError& error);
+  ~LinuxPlatform();
+
+  /// Valid as long as this object.
+  [[nodiscard]] Platform& platform();
+
+  [[nodiscard]] const RecordingPreferencesBroadcast& preferencesBroadcast() const;
+  [[nodiscard]] const RecordingCloudTabService& cloudTabService() const;
+
+  /// What a program needs beneath the root beyond the interfaces of the platform.
+  [[nodiscard]] const DeviceRoot& root() const;
+  [[nodiscard]] LinuxFileSystem& fileSystem();
+  [[nodiscard]] LinuxPropertyLists& propertyLists();
+
+ private:
+  struct Parts;
+  explicit LinuxPlatform(std::unique_ptr<Parts> parts);
+
+  std::unique_ptr<Parts> parts_;
+};
+
+}  // namespace accounts

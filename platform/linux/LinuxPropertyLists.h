@@ -1,0 +1,29 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "platform/PropertyLists.h"
+#include "platform/linux/DeviceRoot.h"
+#include "platform/linux/PathError.h"
+
+namespace accounts {
+
+/// The property-list files beneath a device root, which must outlive this.
+class LinuxPropertyLists final : public PropertyLists {
+ public:
+  explicit LinuxPropertyLists(const DeviceRoot& root) : root_(root) {}
+
+  std::optional<PropertyDictionary> readDictionary(std::string_view path) override;
+  Result serializeBinary(const PropertyValue& value, std::string& bytes) override;
+
+  /// Like `readDictionary`, and says in `error` why there is none: `error.isMissing()` tells a
+  /// missing file from an unreadable one.
+  std::optional<PropertyDictionary> readDictionary(std::string_view path, PathError& error);
+
+ private:
+  const DeviceRoot& root_;
+};
+
+}  // namespace accounts

@@ -1,0 +1,114 @@
+#include "platform/linux/OwnerNames.h"
+
+#include <grp.h>
+#include <pwd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <charconv>
+#include <limits>
+#include <vector>
+
+namespace accounts {
+namespace {
+
+constexpr std::string_view kUserDatabase = "/etc/passwd";
+constexpr std::string_view kGroupDatabase = "/etc/group";
+
+// The largest number means "leave as it is" to chown, so that no user or group can have it.
+constexpr std::uint32_t kNoIdentifier = std::numeric_limits<std::uint32_t>::max();
+
+// Larger than any entry that a person maintains; a group's entry lists its members.
+constexpr std::size_t kFirstBufferSize = 4096;
+constexpr std::size_t kLargestBufferSize = std::size_t{16} << 20;
+
+std::string_view takeUpTo(std::string_view& rest, char separator) {
+  const std::string_view taken = rest.substr(0, rest.find(separator));
+  rest.remove_prefix(std::min(rest.size(), taken.size() + 1));
+  return taken;
+}
+
+std::optional<std::uint32_t> parseIdentifier(std::string_view text) {
+  std::uint32_t number = 0;
+  const char* end = text.data() + text.size();
+  const auto result = std::from_chars(text.data(), end, number);
+  if (result.ec != std::errc() || result.ptr != end || number == kNoIdentifier) {
+    return std::nullopt;
+  }
+  return number;
+}
+
+PathError unknownName(std::string_view database, std::string_view name) {
+  return pathError(std::string("find \"").append(name).append("\" in"), database,
+                   "There is no usable entry");
+}
+
+// Asks one of the C library's two lookups, which share their shape, with a buffer that grows until
+// the entry fits.
+template <class Entry, class LookUp, class Number>
+std::optional<std::uint32_t> askNameService(LookUp lookUp, Number Entry::*number,
+                                            std::string_view database, const std::string& name,
+                                            PathError& error) {
+  for (std::size_t size = kFirstBufferSize; size <= kLargestBufferSize; size *= 2) {
+    std::vector<char> buffer(size);
+    Entry entry = {};
+    Entry* found = nullptr;
+    const int failure = lookUp(name.c_str(), &entry, buffer.data(), buffer.size(), &found);
+    if (failure == ERANGE) {
+      continue;
+    }
+    if (found == nullptr) {
+      error = unknownName(database, name);
+      return std::nullopt;
+    }
+    return entry.*number;
+  }
+  error = pathError("read the entry \"" + name + "\" of", database, ERANGE);
+  return std::nullopt;
+}
+
+}  // namespace
+
+std::optional<std::uint32_t> identifierInDatabase(std::string_view database,
+                                                  std::string_view name) {
+  while (!name.empty() && !database.empty()) {
+    std::string_view line = takeUpTo(database, '\n');
+    if (takeUpTo(line, ':') != name) {
+      continue;
+    }
+    takeUpTo(line, ':');  // the password
+    if (const auto identifier = parseIdentifier(takeUpTo(line, ':'))) {
+      return identifier;
+    }
+  }
+  return std::nullopt;
+}
+
+std::optional<std::uint32_t> OwnerNames::lookUp(std::string_view databasePath,
+                                                const std::string& name, PathError& error) const {
+  const auto database = root_.readFile(databasePath, error);
+  if (!database) {
+    return std::nullopt;
+  }
+  const auto identifier = identifierInDatabase(*database, name);
+  if (!identifier) {
+    error = unknownName(databasePath, name);
+  }
+  return identifier;
+}
+
+std::optional<std::uint32_t> OwnerNames::userIdentifier(const std::string& name,
+                                                        PathError& error) const {
+  return root_.isSystemRoot()
+             ? askNameService<passwd>(::getpwnam_r, &passwd::pw_uid, kUserDatabase, name, error)
+             : lookUp(kUserDatabase, name, error);
+}
+
+std::optional<std::uint32_t> OwnerNames::groupIdentifier(const std::string& name,
+                                                         PathError& error) const {
+  return root_.isSystemRoot()
+             ? askNameService<group>(::getgrnam_r, &group::gr_gid, kGroupDatabase, name, error)
+             : lookUp(kGroupDatabase, name, error);
+}
+
+}  // namespace accounts

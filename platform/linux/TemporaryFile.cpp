@@ -1,0 +1,60 @@
+#include "platform/linux/TemporaryFile.h"
+
+#include <sys/random.h>
+#include <sys/stat.h>
+
+#include <array>
+#include <cerrno>
+#include <cstdint>
+#include <utility>
+
+#include "platform/linux/DevicePath.h"
+
+namespace accounts {
+namespace {
+
+constexpr mode_t kOwnerReadsAndWrites = 0600;
+
+// With 64 random bits a name is never taken by chance; a few attempts are more than enough.
+constexpr int kMostAttempts = 16;
+
+std::optional<std::string> uniqueName() {
+  std::array<std::uint8_t, 8> bytes;
+  if (::getrandom(bytes.data(), bytes.size(), 0) != static_cast<ssize_t>(bytes.size())) {
+    return std::nullopt;
+  }
+  constexpr std::string_view kDigits = "0123456789abcdef";
+  std::string name(kTemporaryFilePrefix);
+  for (const std::uint8_t byte : bytes) {
+    name += kDigits[byte >> 4];
+    name += kDigits[byte & 0x0f];
+  }
+  return name;
+}
+
+}  // namespace
+
+std::optional<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::string_view directory,
+                                                 PathError& error) {
+  for (int attempt = 0; attempt < kMostAttempts; ++attempt) {
+    const auto name = uniqueName();
+    if (!name) {
+      error = pathError("make a temporary name in", directory, errno);
+      return std::nullopt;
+    }
+    auto entry = root.locate(joinedPath(directory, *name), error);
+    if (!entry) {
+      return std::nullopt;
+    }
+    auto file = entry->createFile(kOwnerReadsAndWrites, error);
+    if (file) {
+      return TemporaryFile{std::move(*entry), std::move(*file)};
+    }
+    if (error.number != EEXIST) {
+      return std::nullopt;
+    }
+  }
+  return std::nullopt;
+}
+
+}  // namespace accounts

@@ -1,0 +1,29 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "platform/linux/DeviceRoot.h"
+#include "platform/linux/DirectoryEntry.h"
+#include "platform/linux/FileDescriptor.h"
+#include "platform/linux/PathError.h"
+
+namespace accounts {
+
+/// How the names of all temporary files begin, so that what a killed run left behind can be told
+/// from everything else.
+inline constexpr std::string_view kTemporaryFilePrefix = ".accounts-migration-";
+
+/// A new, empty file with a unique name, readable and writable by its owner alone.
+struct TemporaryFile {
+  DirectoryEntry entry;
+  FileDescriptor file;
+};
+
+/// Makes a temporary file in a directory that exists. None, with `error` set, when it cannot be
+/// made.
+std::optional<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::string_view directory,
+                                                 PathError& error);
+
+}  // namespace accounts

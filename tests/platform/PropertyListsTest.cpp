@@ -1,0 +1,95 @@
+#include <gtest/gtest.h>
+
+#include "platform/linux/LinuxPropertyLists.h"
+#include "propertylist/PropertyListLimits.h"
+#include "tests/platform/DeviceFixture.h"
+
+namespace accounts {
+namespace {
+
+namespace fs = std::filesystem;
+
+class PropertyListsTest : public DeviceFixture {
+ protected:
+  DeviceRoot root = openImage();
+  LinuxPropertyLists propertyLists{root};
+  PathError error;
+};
+
+TEST_F(PropertyListsTest, AnXMLFileIsRead) {
+  makeFile("/file.plist", xmlDictionary("<key>Version</key><integer>12</integer>"));
+  const auto dictionary = propertyLists.readDictionary("/file.plist");
+  ASSERT_TRUE(dictionary);
+  EXPECT_EQ(*dictionary, (PropertyDictionary{{"Version", 12}}));
+}
+
+TEST_F(PropertyListsTest, ABinaryFileThatWasWrittenHereIsRead) {
+  const PropertyDictionary original = {{"Accounts", PropertyArray{"one", 2, true}}};
+  std::string bytes;
+  ASSERT_TRUE(propertyLists.serializeBinary(original, bytes));
+  makeFile("/file.plist", bytes);
+  const auto dictionary = propertyLists.readDictionary("/file.plist");
+  ASSERT_TRUE(dictionary);
+  EXPECT_EQ(*dictionary, original);
+}
+
+TEST_F(PropertyListsTest, AMissingFileIsToldFromAnUnreadableOne) {
+  makeFile("/malformed.plist", "bplist00 and no more");
+  EXPECT_FALSE(propertyLists.readDictionary("/missing.plist", error));
+  EXPECT_TRUE(error.isMissing());
+  EXPECT_FALSE(propertyLists.readDictionary("/malformed.plist", error));
+  EXPECT_FALSE(error.isMissing());
+}
+
+TEST_F(PropertyListsTest, TheErrorOfAMalformedFileNamesItsPath) {
+  makeFile("/malformed.plist", "no property list");
+  EXPECT_FALSE(propertyLists.readDictionary("/malformed.plist", error));
+  EXPECT_TRUE(error.text.starts_with("Cannot read the property list /malformed.plist: "))
+      << error.text;
+}
+
+TEST_F(PropertyListsTest, AnEmptyFileHoldsNoDictionary) {
+  makeFile("/empty.plist", "");
+  EXPECT_FALSE(propertyLists.readDictionary("/empty.plist"));
+}
+
+TEST_F(PropertyListsTest, AFileThatHoldsSomethingElseHoldsNoDictionary) {
+  makeFile("/array.plist", xmlPropertyList("<array/>"));
+  EXPECT_FALSE(propertyLists.readDictionary("/array.plist", error));
+  EXPECT_EQ(error.text, "Cannot read the property list /array.plist: Its root is not a dictionary");
+  EXPECT_FALSE(error.isMissing());
+}
+
+TEST_F(PropertyListsTest, AFileWithoutReadPermissionHoldsNoDictionary) {
+  makeFile("/file.plist", xmlDictionary(""));
+  fs::permissions(onHost("/file.plist"), fs::perms::none);
+  const WithoutPrivileges restricted;
+  EXPECT_FALSE(propertyLists.readDictionary("/file.plist", error));
+  EXPECT_EQ(error.text, "Cannot open /file.plist: Permission denied");
+}
+
+TEST_F(PropertyListsTest, ANamedPipeHoldsNoDictionaryAndIsNotWaitedFor) {
+  makeNamedPipe("/file.plist");
+  EXPECT_FALSE(propertyLists.readDictionary("/file.plist"));
+}
+
+TEST_F(PropertyListsTest, AFileOutsideTheRootIsNotReadThroughALink) {
+  makeHostFile(outside() / "file.plist", xmlDictionary(""));
+  makeLink("/file.plist", outside() / "file.plist");
+  EXPECT_FALSE(propertyLists.readDictionary("/file.plist"));
+}
+
+TEST_F(PropertyListsTest, AValueNestedTooDeeplyIsNotSerialised) {
+  PropertyValue value = "leaf";
+  for (std::size_t depth = 0; depth <= kMaximumNestingDepth; ++depth) {
+    value = PropertyArray{value};
+  }
+  std::string bytes = "left over";
+  const Result result = propertyLists.serializeBinary(value, bytes);
+  ASSERT_FALSE(result);
+  EXPECT_FALSE(result.error().empty());
+  EXPECT_TRUE(bytes.empty());
+}
+
+}  // namespace
+}  // namespace accounts
