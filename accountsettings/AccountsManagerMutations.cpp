@@ -1,0 +1,119 @@
+#include <algorithm>
+#include <iterator>
+#include <utility>
+
+#include "accountsettings/AccountsManager.h"
+#include "accountsettings/ChildPlacement.h"
+#include "accountsettings/Log.h"
+
+// A caller may well pass a reference out of the store's own list. So whatever an operation still
+// needs of an account after it has changed the list, it takes a reference of its own to first.
+
+namespace accounts {
+
+namespace {
+
+std::optional<PropertyDictionary> propertiesToLog(const BasicAccountReference& account) {
+  return account ? std::optional(account->properties()) : std::nullopt;
+}
+
+}  // namespace
+
+void AccountsManager::updateAccount(const BasicAccountReference& account) {
+  logToChannel("-[AccountsManager updateAccount:]", "Updating account: %@",
+               [&] { return logArguments(propertiesToLog(account)); });
+  const BasicAccountReference updated = account;
+  const std::optional<Text> identifier = updated->identifier();
+  if (identifier && _orderedTopLevelAccounts.replaceAll(*identifier, updated)) {
+    _topLevelAccountsByID.set(*identifier, updated);
+    _loadChildrenFromAccount(updated);
+  }
+}
+
+void AccountsManager::insertAccount(const BasicAccountReference& account) {
+  logToChannel("-[AccountsManager insertAccount:]", "Inserting account: %@",
+               [&] { return logArguments(propertiesToLog(account)); });
+  const BasicAccountReference inserted = account;
+  const std::optional<Text> identifier = inserted->identifier();
+  if (!identifier || !_topLevelAccountsByID.contains(*identifier)) {
+    _takeIn(inserted);
+  }
+}
+
+void AccountsManager::deleteAccount(const BasicAccountReference& account) {
+  logToChannel("-[AccountsManager deleteAccount:]", "Deleting account: %@",
+               [&] { return logArguments(propertiesToLog(account)); });
+  const std::optional<Text> identifier = account ? account->identifier() : std::nullopt;
+  if (identifier) {
+    _removeChildrenForAccountWithIdentifier(identifier);
+    _topLevelAccountsByID.remove(*identifier);
+    _orderedTopLevelAccounts.removeLast(*identifier);
+  }
+}
+
+void AccountsManager::deleteAccountWithIdentifier(std::string_view identifier) {
+  const BasicAccountReference* account = _topLevelAccountsByID.find(identifier);
+  deleteAccount(account != nullptr ? BasicAccountReference(*account) : nullptr);
+}
+
+void AccountsManager::replaceAccount_withAccount(const BasicAccountReference& oldAccount,
+                                                 const BasicAccountReference& newAccount) {
+  const std::optional<Text> oldIdentifier = oldAccount->identifier();
+  // NOLINTNEXTLINE(performance-unnecessary-copy-initialization): see above.
+  const BasicAccountReference replacement = newAccount;
+  _removeChildrenForAccountWithIdentifier(oldIdentifier);
+  if (oldIdentifier) {
+    _topLevelAccountsByID.remove(*oldIdentifier);
+  }
+  if (!_orderedTopLevelAccounts.replaceFirst(oldAccount, replacement)) {
+    failAssertion("-[AccountsManager replaceAccount:withAccount:]", sourceFile,
+                  "The account to replace is not in the store");
+  }
+  // Kept on purpose: the new account is not indexed by its identifier. Lookups and insertions do
+  // not see it before the store is loaded again, and callers may rely on that.
+  _loadChildrenFromAccount(replacement);
+}
+
+void AccountsManager::removeChildWithIdentifier_fromAccount(std::string_view identifier,
+                                                            const BasicAccountReference& parent) {
+  if (const std::optional<PropertyArray> children =
+          parent->arrayPropertyForKey(kAccountChildAccounts)) {
+    std::vector<PropertyValue> others;
+    others.reserve(children->size());
+    std::copy_if(children->begin(), children->end(), std::back_inserter(others),
+                 [&](const PropertyValue& element) {
+                   const std::optional<Text> candidate = identifierOfChildElement(element);
+                   return !candidate || *candidate != identifier;
+                 });
+    parent->setAccountProperty_forKey(PropertyArray(std::move(others)), kAccountChildAccounts);
+  }
+  _loadChildrenFromAccount(parent);
+}
+
+void AccountsManager::addChild_toAccount(const BasicAccountReference& child,
+                                         const BasicAccountReference& parent) {
+  PropertyArray children =
+      parent->arrayPropertyForKey(kAccountChildAccounts).value_or(PropertyArray());
+  children.append(child->properties());
+  parent->setAccountProperty_forKey(std::move(children), kAccountChildAccounts);
+  _loadChildrenFromAccount(parent);
+}
+
+void AccountsManager::_removeChildrenForAccountWithIdentifier(
+    const std::optional<Text>& parentIdentifier) {
+  const auto entry = parentIdentifier ? _childIdentifiersByParentID.find(*parentIdentifier)
+                                      : _childIdentifiersByParentID.end();
+  if (entry == _childIdentifiersByParentID.end()) {
+    return;
+  }
+  for (const Text& child : entry->second) {
+    const Text* parent = _childAccountIDToParentAccountID.find(child);
+    if (parent != nullptr && *parent == *parentIdentifier) {
+      _childAccountIDToParentAccountID.remove(child);
+      _childAccountsByID.remove(child);
+    }
+  }
+  _childIdentifiersByParentID.erase(entry);
+}
+
+}  // namespace accounts

@@ -1,0 +1,87 @@
+#include "accountsettings/BasicAccount.h"
+
+#include "accountsettings/Log.h"
+#include "accountsettings/Process.h"
+
+namespace accounts {
+
+namespace {
+
+constexpr std::string_view sourceFileName = "BasicAccount";
+
+std::optional<Text> textOrNone(std::optional<std::string_view> text) {
+  return text ? std::optional<Text>(*text) : std::nullopt;
+}
+
+}  // namespace
+
+BasicAccountReference BasicAccount::initWithProperties(const PropertyDictionary& properties) {
+  const BasicAccountReference account(new BasicAccount());
+  return account->acceptProperties(properties) ? account : nullptr;
+}
+
+bool BasicAccount::acceptProperties(const PropertyDictionary& properties) {
+  static constexpr std::string_view operation = "-[BasicAccount initWithProperties:]";
+  const std::optional<Text> type = properties.textForKey(kAccountType);
+  const std::optional<Text> accountClass = properties.textForKey(kAccountClass);
+  const bool isValidType = _isValidAccountType(type);
+  if (!isValidType) {
+    logToChannel(operation, "Invalid account type: %@", [&] { return logArguments(type); });
+  }
+  if (!accountClass || accountClass->empty()) {
+    logToChannel(operation, "Missing account class.");
+    return false;
+  }
+  if (!isValidType) {
+    return false;
+  }
+  _originalProperties = properties;
+  _properties = properties;
+  if (!_properties.textForKey(kAccountIdentifier)) {
+    if (const std::optional<Text> identifier = createNewAccountUID()) {
+      _properties.set(kAccountIdentifier, *identifier);
+      if (!_properties.textForKey(kAccountSyncIdentifier)) {
+        _properties.set(kAccountSyncIdentifier, *identifier);
+      }
+    }
+  }
+  return true;
+}
+
+BasicAccountReference BasicAccount::_initWithType_class(
+    std::optional<std::string_view> type, std::optional<std::string_view> accountClass) {
+  static constexpr std::string_view operation = "-[BasicAccount _initWithType:class:]";
+  if (!accountClass || accountClass->empty()) {
+    failAssertion(operation, sourceFileName, "The account class is required.");
+  }
+  if (!_isValidAccountType(type)) {
+    failAssertion(operation, sourceFileName, "The account type (%@) is not supported",
+                  {textOrNone(type)});
+  }
+  PropertyDictionary properties = {{kAccountType, *type}, {kAccountClass, *accountClass}};
+  if (const std::optional<Text> identifier = createNewAccountUID()) {
+    properties.set(kAccountIdentifier, *identifier);
+    properties.set(kAccountSyncIdentifier, *identifier);
+  }
+  return initWithProperties(properties);
+}
+
+BasicAccountReference BasicAccount::init() {
+  failAssertion("-[BasicAccount init]", sourceFileName, "Don't use this method");
+}
+
+BasicAccountReference BasicAccount::accountWithType_class(
+    std::optional<std::string_view> type, std::optional<std::string_view> accountClass) {
+  return _initWithType_class(type, accountClass);
+}
+
+BasicAccountReference BasicAccount::accountWithProperties(const PropertyDictionary& properties) {
+  return initWithProperties(properties);
+}
+
+std::optional<Text> BasicAccount::createNewAccountUID() {
+  const std::optional<std::string> uuid = Process::current().platform.uuidGenerator.randomUUID();
+  return uuid ? std::optional<Text>(*uuid) : std::nullopt;
+}
+
+}  // namespace accounts

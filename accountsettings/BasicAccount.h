@@ -1,0 +1,167 @@
+#pragma once
+
+#include <memory>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <unordered_set>
+
+#include "accountsettings/AccountVocabulary.h"
+#include "propertylist/PropertyValue.h"
+
+namespace accounts {
+
+class BasicAccount;
+/// A record as stores, parents and callers share it.
+using BasicAccountReference = std::shared_ptr<BasicAccount>;
+
+/// The record of one account: its account dictionary, the rules that decide which dataclasses it
+/// supports, is provisioned for and has enabled, its parent, and a snapshot of the dictionary as
+/// last loaded or saved. Operations whose names begin with an underscore are for this system's own
+/// use. Not for use by several threads at once.
+class BasicAccount {
+ public:
+  BasicAccount(const BasicAccount&) = delete;
+  BasicAccount& operator=(const BasicAccount&) = delete;
+  virtual ~BasicAccount() = default;
+
+  // Creation (BasicAccount.cpp)
+
+  /// A record made from an account dictionary, which also becomes its snapshot. A dictionary
+  /// without a text under "Identifier" gets a fresh one. Null, with a channel line, for an unknown
+  /// account type or a missing class.
+  static BasicAccountReference initWithProperties(const PropertyDictionary& properties);
+  /// A record of a type and a class with a fresh identifier. An unknown type or an empty class is a
+  /// fatal assertion.
+  static BasicAccountReference _initWithType_class(std::optional<std::string_view> type,
+                                                   std::optional<std::string_view> accountClass);
+  /// Forbidden: a fatal assertion.
+  [[noreturn]] static BasicAccountReference init();
+  static BasicAccountReference accountWithType_class(std::optional<std::string_view> type,
+                                                     std::optional<std::string_view> accountClass);
+  static BasicAccountReference accountWithProperties(const PropertyDictionary& properties);
+  /// The text of a fresh random UUID; none when the platform cannot make one.
+  static std::optional<Text> createNewAccountUID();
+
+  // Account types and dataclasses in general (BasicAccountConfiguration.cpp)
+
+  /// Loads the account-types table once. Every operation that reads the table calls it first. A
+  /// missing or unreadable resource is a fatal assertion.
+  static void initialize();
+  /// Whether the device runs several programs at once; only then may accounts support notes.
+  static bool isMultitaskingEnabled();
+  /// The fourteen dataclasses in canonical order; always the same object.
+  static const PropertyArray& allSupportedDataclasses();
+  /// The dataclasses of a type in the order its configuration lists them; none for an unknown type.
+  static std::optional<PropertyArray> supportedDataclassesForAccountType(std::string_view type);
+  /// The actions offered when a dataclass is switched on (off) for a type; none for an unknown
+  /// type.
+  static std::optional<PropertyArray> userActionsToEnableDataclass_forAccountType(
+      std::string_view dataclass, std::string_view type);
+  static std::optional<PropertyArray> userActionsToDisableDataclass_forAccountType(
+      std::string_view dataclass, std::string_view type);
+  /// The actions without the last "Keep Local Data".
+  static PropertyArray removeActionsIncompatibleWithSingleStoreDataclass(
+      const PropertyArray& actions);
+  /// The actions offered when an account of a type is deleted; none for an unknown type.
+  static std::optional<PropertyArray> deleteAccountActionsForAccountType(std::string_view type);
+  /// False for an unknown type or dataclass, like the answers below.
+  static bool showRemindersSeparatelyForAccountType(std::string_view type);
+  static bool multipleStoresSupportedByDataclass(std::string_view dataclass);
+  static bool displayToggleForDataclass(std::string_view dataclass);
+  static bool userConfirmationIsRequiredByDataclass(std::string_view dataclass);
+  /// Whether a text is a type that the configuration knows; false for none and for the empty text.
+  static bool _isValidAccountType(std::optional<std::string_view> type);
+  /// The dataclass configuration, read afresh; none when it is missing or unreadable.
+  static std::optional<PropertyDictionary> _dataclassesProperties();
+
+  // Properties (BasicAccountProperties.cpp)
+
+  /// The account's own value for a key, else its parent's; none when neither has one.
+  [[nodiscard]] std::optional<PropertyValue> accountPropertyForKey(std::string_view key) const;
+  /// The same, if the value found is a text (an array, a dictionary); none otherwise.
+  [[nodiscard]] std::optional<Text> textPropertyForKey(std::string_view key) const;
+  [[nodiscard]] std::optional<PropertyArray> arrayPropertyForKey(std::string_view key) const;
+  [[nodiscard]] std::optional<PropertyDictionary> dictionaryPropertyForKey(
+      std::string_view key) const;
+  /// The value found for a key, read as a boolean (an integer); none when there is none or it
+  /// cannot be read so.
+  [[nodiscard]] std::optional<bool> booleanPropertyForKey(std::string_view key) const;
+  [[nodiscard]] std::optional<std::int64_t> integerPropertyForKey(std::string_view key) const;
+
+  /// Stores an own value; none removes the key. "Class" and "Type" cannot be changed so: they are
+  /// silently left.
+  void setAccountProperty_forKey(std::optional<PropertyValue> value, std::string_view key);
+  /// Stores an own value under any key, "Class" and "Type" included; none removes the key.
+  void _forcedSetAccountProperty_forKey(std::optional<PropertyValue> value, std::string_view key);
+  void removeAccountPropertyForKey(std::string_view key);
+
+  /// The live own dictionary; the reference stays valid, and changes, as long as the record lives.
+  [[nodiscard]] const PropertyDictionary& properties() const { return _properties; }
+  /// The dictionary that the store writes.
+  [[nodiscard]] virtual PropertyDictionary propertiesToSave() const { return _properties; }
+  [[nodiscard]] const std::optional<PropertyDictionary>& originalProperties() const {
+    return _originalProperties;
+  }
+  /// Takes a new snapshot.
+  void setOriginalProperties(std::optional<PropertyDictionary> properties);
+
+  /// The texts under "Type", "Identifier", "Sync Identifier", "Class", "DisplayName", "Type String"
+  /// and "Short Type String", own or inherited; none when there is no text.
+  [[nodiscard]] std::optional<Text> type() const;
+  [[nodiscard]] virtual std::optional<Text> identifier() const;
+  [[nodiscard]] virtual std::optional<Text> syncStoreIdentifier() const;
+  [[nodiscard]] std::optional<Text> accountClass() const;
+  [[nodiscard]] virtual std::optional<Text> displayName() const;
+  [[nodiscard]] std::optional<Text> typeString() const;
+  [[nodiscard]] std::optional<Text> shortTypeString() const;
+
+  /// Changes "Class"; the class that the account already has changes nothing.
+  void setAccountClass(std::string_view accountClass);
+  /// Changes the own "DisplayName"; the name already stored there changes nothing.
+  void setDisplayName(std::optional<Text> displayName);
+
+  [[nodiscard]] const BasicAccountReference& parentAccount() const { return _parentAccount; }
+  void setParentAccount(BasicAccountReference parent);
+  /// The parent's identifier; none without a parent.
+  [[nodiscard]] std::optional<Text> parentAccountIdentifier() const;
+
+  // Dataclasses of this account, in canonical order (BasicAccountDataclasses.cpp)
+
+  /// What the account's type supports; empty for an unknown type.
+  [[nodiscard]] PropertyArray supportedDataclasses() const;
+  /// What the account is set up for, as far as it is supported and no profile hides it.
+  [[nodiscard]] PropertyArray provisionedDataclasses() const;
+  /// What the user has switched on, as far as it is provisioned; none when no list is stored. A
+  /// child whose parent has enabled dataclasses has its parent's.
+  [[nodiscard]] std::optional<PropertyArray> enabledDataclasses() const;
+  [[nodiscard]] bool isEnabledForDataclass(std::string_view dataclass) const;
+  /// Switches a dataclass on or off; one that the type does not support is silently left.
+  void setEnabled_forDataclass(bool enabled, std::string_view dataclass);
+  /// Switches exactly these dataclasses on, unsupported ones dropped. An empty list leaves no list
+  /// stored.
+  void setEnabledForDataclasses(const PropertyArray& dataclasses);
+  /// Switches a dataclass on or off, supported or not.
+  void _forcedSetEnabled_forDataclass(bool enabled, std::string_view dataclass);
+  /// The texts of a list with the canonical dataclasses first, in their order and once each, then
+  /// all others in theirs.
+  static PropertyArray _orderedDataclasses(const std::optional<PropertyArray>& dataclasses);
+  /// The dataclasses that configuration profiles hide, asked afresh on every call.
+  static PropertyArray _profileRestrictedDataclasses();
+
+ protected:
+  BasicAccount() = default;
+  /// Does the work of initWithProperties() on a new record. False when the dictionary is not
+  /// accepted.
+  [[nodiscard]] bool acceptProperties(const PropertyDictionary& properties);
+
+ private:
+  /// Told after every change of an own value.
+  static void noteChangeOfKey(std::string_view key);
+
+  std::optional<PropertyDictionary> _originalProperties;
+  PropertyDictionary _properties;
+  BasicAccountReference _parentAccount;
+};
+
+}  // namespace accounts

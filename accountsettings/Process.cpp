@@ -1,0 +1,33 @@
+#include "accountsettings/Process.h"
+
+#include <atomic>
+#include <cstdlib>
+
+namespace accounts {
+
+namespace {
+
+// The one mutable static of the system: everything else that belongs to the process hangs from it.
+std::atomic<Process*> newestProcess = nullptr;
+
+}  // namespace
+
+Process::Process(Platform& platformOfTheProcess)
+    : platform(platformOfTheProcess), previous_(newestProcess) {
+  newestProcess = this;
+}
+
+Process::~Process() {
+  newestProcess = previous_;
+}
+
+Process& Process::current() {
+  Process* process = newestProcess;
+  if (process == nullptr) {
+    // A programming error that no log can take: the console log is reached through the process.
+    std::abort();
+  }
+  return *process;
+}
+
+}  // namespace accounts

@@ -1,0 +1,192 @@
+#include "tests/accountsettings/StoreFixture.h"
+
+namespace accounts {
+namespace {
+
+class AccountsManagerReplacement : public StoreFixture {
+ protected:
+  /// A record of a child account whose parent has an identifier.
+  static BasicAccountReference childOf(std::string_view parentIdentifier,
+                                       const AccountDictionary& child) {
+    BasicAccountReference record = child.record();
+    record->setParentAccount(mail(parentIdentifier).record());
+    return record;
+  }
+  /// The identifiers of the children in the properties of a top-level account.
+  static std::string storedChildren(const AccountsManager& store, std::string_view identifier) {
+    return identifiersOf(store.accountWithIdentifier(identifier)
+                             ->arrayPropertyForKey(kAccountChildAccounts)
+                             .value_or(PropertyArray()));
+  }
+};
+
+TEST_F(AccountsManagerReplacement,
+       AnAccountOfTheTypeWithAnotherIdentifierLeavesAndTheNewOneIsTheLast) {
+  const Store store = storeOf({mail("A"), onMyDevice("B"), exchange("E")});
+  const BasicAccountReference account = onMyDevice("new").record();
+  store->replaceAccountsWithTypes_withAccounts({kOnMyDeviceAccountType}, {account});
+  EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A E new");
+  EXPECT_EQ(store->accountWithIdentifier("new"), account);
+  EXPECT_EQ(store->accountWithIdentifier("B"), nullptr);
+  EXPECT_EQ(
+      takeLines(),
+      Lines{
+          R"(-[AccountsManager replaceAccountsWithTypes:withAccounts:] (N) "Replacing accounts")"});
+}
+
+TEST_F(AccountsManagerReplacement, AnAccountWithTheSameIdentifierKeepsItsPlace) {
+  const Store store = storeOf({mail("A"), onMyDevice("B"), exchange("E")});
+  const BasicAccountReference account = onMyDevice("B").record();
+  store->replaceAccountsWithTypes_withAccounts({kOnMyDeviceAccountType}, {account});
+  EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A B E");
+  EXPECT_EQ(store->allBasicAccounts()[1], account);
+  EXPECT_EQ(store->accountWithIdentifier("B"), account);
+}
+
+TEST_F(AccountsManagerReplacement, AnAccountOfAnotherTypeIsReplacedByIdentifierToo) {
+  const Store store = storeOf({exchange("A"), mail("B")});
+  store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, {mail("A").record()});
+  EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A");
+  EXPECT_EQ(store->allBasicAccounts().front()->type(), Text(kMailAccountType));
+}
+
+TEST_F(AccountsManagerReplacement, AnEmptyListRemovesTheAccountsOfTheTypesAndTheirChildren) {
+  const Store store = storeOf({mail("A").withChildren({calDAV("c")}),
+                               exchange("B").withChildren({calDAV("d")}), mail("C"), calDAV("D")});
+  store->replaceAccountsWithTypes_withAccounts({kMailAccountType, kCalDAVAccountType}, {});
+  EXPECT_EQ(identifiersOf(store->allBasicSyncableAccounts()), "B d");
+  EXPECT_EQ(store->accountWithIdentifier("A"), nullptr);
+  EXPECT_EQ(store->accountWithIdentifier("c"), nullptr);
+}
+
+TEST_F(AccountsManagerReplacement, WithoutTypesAndAccountsNothingChanges) {
+  const Store store = storeOf({mail("A").withChildren({calDAV("c")}), exchange("B")});
+  const AccountsManager::Accounts before = store->allBasicAccounts();
+  store->replaceAccountsWithTypes_withAccounts({}, {});
+  EXPECT_EQ(store->allBasicAccounts(), before);
+  EXPECT_EQ(childrenOf(*store), "c");
+}
+
+TEST_F(AccountsManagerReplacement, NewAccountsAreAppendedInTheirOwnOrder) {
+  const Store store = storeOf({exchange("E"), mail("B")});
+  store->replaceAccountsWithTypes_withAccounts(
+      {kMailAccountType}, {mail("Z").record(), mail("B").record(), mail("Y").record()});
+  EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "E B Z Y");
+}
+
+TEST_F(AccountsManagerReplacement, TheStoresOwnListCanBeGivenBack) {
+  const Store store = storeOf({mail("A"), exchange("B")});
+  store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, store->allBasicAccounts());
+  EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A B");
+}
+
+TEST_F(AccountsManagerReplacement,
+       OfTwoNewAccountsWithOneIdentifierTheLaterTakesThePlaceAndTheOtherIsAppended) {
+  const Store store = storeOf({mail("A"), mail("B")});
+  const BasicAccountReference first = mail("A").record();
+  const BasicAccountReference second = exchange("A").record();
+  store->replaceAccountsWithTypes_withAccounts({}, {first, second});
+  EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A B A");
+  EXPECT_EQ(store->allBasicAccounts().front(), second);
+  EXPECT_EQ(store->allBasicAccounts().back(), first);
+  EXPECT_EQ(store->accountWithIdentifier("A"), first);
+}
+
+TEST_F(AccountsManagerReplacement,
+       EveryPlaceOfAnIdentifierIsTakenAndTheNewAccountIsNotAppendedAgain) {
+  const Store store = storeOf({mail("A"), mail("B"), exchange("A")});
+  const BasicAccountReference account = mail("A").record();
+  store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, {account});
+  EXPECT_EQ(store->allBasicAccounts(), (AccountsManager::Accounts{account, account}));
+}
+
+TEST_F(AccountsManagerReplacement, OfKeptAccountsWithOneIdentifierTheFirstIsFound) {
+  const Store store = storeOf({exchange("A"), exchange("A")});
+  store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, {});
+  EXPECT_EQ(store->accountWithIdentifier("A"), store->allBasicAccounts().front());
+}
+
+TEST_F(AccountsManagerReplacement, AReplacedAccountsChildrenAreThoseOfTheNewOne) {
+  const Store store = storeOf({mail("A").withChildren({calDAV("c"), calDAV("d")})});
+  store->replaceAccountsWithTypes_withAccounts(
+      {kMailAccountType}, {mail("A").withChildren({calDAV("d"), calDAV("e")}).record()});
+  EXPECT_EQ(childrenOf(*store), "d e");
+  EXPECT_EQ(store->accountWithIdentifier("c"), nullptr);
+}
+
+TEST_F(AccountsManagerReplacement, AnAccountThatReplaceAccountPutInIsFoundFromThenOn) {
+  const Store store = storeOf({mail("A")});
+  store->replaceAccount_withAccount(store->accountWithIdentifier("A"), mail("Q").record());
+  store->replaceAccountsWithTypes_withAccounts({kExchangeAccountType}, {});
+  EXPECT_EQ(store->accountWithIdentifier("Q"), store->allBasicAccounts().front());
+}
+
+TEST_F(AccountsManagerReplacement, ANewChildGoesToItsParent) {
+  const Store store = storeOf({mail("A").withChildren({calDAV("c")}), exchange("B")});
+  store->replaceAccountsWithTypes_withAccounts({}, {childOf("A", calDAV("d"))});
+  EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A B");
+  EXPECT_EQ(storedChildren(*store, "A"), "c d");
+  EXPECT_EQ(childrenOf(*store), "c d");
+}
+
+TEST_F(AccountsManagerReplacement, AChildThatIsThereIsReplacedByTheNewOne) {
+  const Store store = storeOf({mail("A").withChildren({calDAV("c"), calDAV("d")})});
+  store->replaceAccountsWithTypes_withAccounts(
+      {}, {childOf("A", calDAV("c").with(kAccountDisplayName, "new"))});
+  EXPECT_EQ(store->accountWithIdentifier("A")->properties(),
+            PropertyDictionary(mail("A").withChildren(
+                {calDAV("d"), calDAV("c").with(kAccountDisplayName, "new")})));
+}
+
+TEST_F(AccountsManagerReplacement, AChildThatGoesToAnotherParentLeavesItsOldOne) {
+  const Store store = storeOf({mail("A").withChildren({calDAV("c")}), exchange("B")});
+  store->replaceAccountsWithTypes_withAccounts({}, {childOf("B", calDAV("c"))});
+  EXPECT_EQ(storedChildren(*store, "A"), "");
+  EXPECT_EQ(storedChildren(*store, "B"), "c");
+  EXPECT_EQ(identifiersOf({store->accountWithIdentifier("c")}), "B");
+}
+
+TEST_F(AccountsManagerReplacement, AChildLeavesTheRecordThatTookItsOldParentsPlace) {
+  const Store store = storeOf({mail("A"), exchange("B")});
+  store->replaceAccountsWithTypes_withAccounts(
+      {kMailAccountType},
+      {mail("A").withChildren({calDAV("c")}).record(), childOf("B", calDAV("c"))});
+  EXPECT_EQ(storedChildren(*store, "A"), "");
+  EXPECT_EQ(storedChildren(*store, "B"), "c");
+}
+
+TEST_F(AccountsManagerReplacement, OfTwoNewChildrenWithOneIdentifierTheLaterStays) {
+  const Store store = storeOf({mail("A"), exchange("B")});
+  store->replaceAccountsWithTypes_withAccounts(
+      {}, {childOf("A", calDAV("c")), childOf("B", calDAV("c")), childOf("A", calDAV("c"))});
+  EXPECT_EQ(storedChildren(*store, "A"), "c");
+  EXPECT_EQ(storedChildren(*store, "B"), "");
+  EXPECT_EQ(identifiersOf({store->accountWithIdentifier("c")}), "A");
+}
+
+TEST_F(AccountsManagerReplacement, AParentMayBeAmongTheNewAccountsBeforeItsChild) {
+  const Store store = storeOf({mail("A").withChildren({calDAV("c")})});
+  store->replaceAccountsWithTypes_withAccounts({},
+                                               {exchange("N").record(), childOf("N", calDAV("c"))});
+  EXPECT_EQ(storedChildren(*store, "A"), "");
+  EXPECT_EQ(storedChildren(*store, "N"), "c");
+  EXPECT_EQ(identifiersOf({store->accountWithIdentifier("c")}), "N");
+}
+
+TEST_F(AccountsManagerReplacement,
+       AChildOfAnAccountThatIsNotInTheStoreLeavesItsParentAndIsAddedNowhere) {
+  const Store store = storeOf({mail("A").withChildren({calDAV("c")})});
+  store->replaceAccountsWithTypes_withAccounts({}, {childOf("elsewhere", calDAV("c"))});
+  EXPECT_EQ(identifiersOf(store->allBasicSyncableAccounts()), "A");
+  EXPECT_EQ(storedChildren(*store, "A"), "");
+}
+
+TEST_F(AccountsManagerReplacement, AParentWhoseChildrenStayIsLeftAsItIs) {
+  const AccountDictionary untouched = mail("A").withChildren({calDAV("c"), 17});
+  const Store store = storeOf({untouched, exchange("B")});
+  store->replaceAccountsWithTypes_withAccounts({}, {childOf("B", calDAV("d"))});
+  EXPECT_EQ(store->accountWithIdentifier("A")->properties(), PropertyDictionary(untouched));
+}
+
+}  // namespace
+}  // namespace accounts

@@ -1,0 +1,184 @@
+#include <gtest/gtest.h>
+
+#include "tests/accountsettings/TestRecords.h"
+
+namespace accounts {
+namespace {
+
+using Lines = std::vector<std::string>;
+
+constexpr const char* firstUUID = "00000000-0000-0000-0000-000000000001";
+
+const PropertyDictionary complete = {
+    {kAccountType, "Mail"}, {kAccountClass, "IMAPAccount"}, {kAccountIdentifier, "mail-1"}};
+
+PropertyDictionary completeWithout(std::string_view key) {
+  PropertyDictionary properties = complete;
+  properties.remove(key);
+  return properties;
+}
+
+TEST(BasicAccountCreation, ACompleteDictionaryBecomesTheRecordAsItIs) {
+  FakeProcess device;
+  const BasicAccountReference account = BasicAccount::initWithProperties(complete);
+  EXPECT_EQ(account->properties(), complete);
+  EXPECT_EQ(account->parentAccount(), nullptr);
+}
+
+TEST(BasicAccountCreation, ADictionaryWithAnIdentifierGetsNoSyncIdentifier) {
+  FakeProcess device;
+  const BasicAccountReference account = BasicAccount::initWithProperties(complete);
+  EXPECT_FALSE(account->properties().contains(kAccountSyncIdentifier));
+  EXPECT_EQ(account->syncStoreIdentifier(), std::nullopt);
+}
+
+TEST(BasicAccountCreation, ADictionaryWithoutIdentifierGetsAFreshOneForSyncingToo) {
+  FakeProcess device;
+  const auto account = BasicAccount::initWithProperties(completeWithout(kAccountIdentifier));
+  EXPECT_EQ(account->identifier(), firstUUID);
+  EXPECT_EQ(account->syncStoreIdentifier(), firstUUID);
+}
+
+TEST(BasicAccountCreation, AnExistingSyncIdentifierIsKeptBesideAFreshIdentifier) {
+  FakeProcess device;
+  const auto account = BasicAccount::initWithProperties(
+      with(completeWithout(kAccountIdentifier), {{kAccountSyncIdentifier, "sync-1"}}));
+  EXPECT_EQ(account->identifier(), firstUUID);
+  EXPECT_EQ(account->syncStoreIdentifier(), "sync-1");
+}
+
+TEST(BasicAccountCreation, AnIdentifierThatIsNoTextIsReplaced) {
+  FakeProcess device;
+  const auto account = BasicAccount::initWithProperties(with(complete, {{kAccountIdentifier, 17}}));
+  EXPECT_EQ(account->identifier(), firstUUID);
+}
+
+TEST(BasicAccountCreation, AnEmptyIdentifierIsKept) {
+  FakeProcess device;
+  const auto account = BasicAccount::initWithProperties(with(complete, {{kAccountIdentifier, ""}}));
+  EXPECT_EQ(account->identifier(), "");
+}
+
+TEST(BasicAccountCreation, WithoutAUUIDTheRecordHasNoIdentifier) {
+  FakeProcess device;
+  device.uuidGenerator.canGenerate = false;
+  const auto account = BasicAccount::initWithProperties(completeWithout(kAccountIdentifier));
+  EXPECT_EQ(account->identifier(), std::nullopt);
+  EXPECT_EQ(account->properties(), completeWithout(kAccountIdentifier));
+}
+
+TEST(BasicAccountCreation, TheSnapshotIsTheDictionaryAsGiven) {
+  FakeProcess device;
+  const PropertyDictionary given = completeWithout(kAccountIdentifier);
+  const auto account = BasicAccount::initWithProperties(given);
+  EXPECT_EQ(account->originalProperties(), given);
+}
+
+TEST(BasicAccountCreation, ALaterChangeLeavesTheSnapshot) {
+  FakeProcess device;
+  const auto account = BasicAccount::initWithProperties(complete);
+  account->setDisplayName("Home");
+  EXPECT_EQ(account->originalProperties(), complete);
+}
+
+TEST(BasicAccountCreation, MakingARecordChangesNoIdentifierOfAnother) {
+  FakeProcess device;
+  BasicAccount::initWithProperties(completeWithout(kAccountIdentifier));
+  EXPECT_EQ(device.process.identifierChanges, 0U);
+}
+
+TEST(BasicAccountCreation, AnUnknownTypeIsRejectedAndNamed) {
+  FakeProcess device;
+  EXPECT_EQ(BasicAccount::initWithProperties(with(complete, {{kAccountType, "X"}})), nullptr);
+  EXPECT_EQ(device.logSystem.channel.linesWithoutNumbers(),
+            Lines{"-[BasicAccount initWithProperties:] (N) \"Invalid account type: X\""});
+}
+
+TEST(BasicAccountCreation, AMissingTypeIsRejectedAsAnAbsentOne) {
+  FakeProcess device;
+  EXPECT_EQ(BasicAccount::initWithProperties(completeWithout(kAccountType)), nullptr);
+  EXPECT_EQ(device.logSystem.channel.linesWithoutNumbers(),
+            Lines{"-[BasicAccount initWithProperties:] (N) \"Invalid account type: (null)\""});
+}
+
+TEST(BasicAccountCreation, AClassThatIsMissingEmptyOrNoTextIsRejected) {
+  for (const PropertyDictionary& properties :
+       {completeWithout(kAccountClass), with(complete, {{kAccountClass, ""}}),
+        with(complete, {{kAccountClass, 1}})}) {
+    FakeProcess device;
+    EXPECT_EQ(BasicAccount::initWithProperties(properties), nullptr);
+    EXPECT_EQ(device.logSystem.channel.linesWithoutNumbers(),
+              Lines{"-[BasicAccount initWithProperties:] (N) \"Missing account class.\""});
+  }
+}
+
+TEST(BasicAccountCreation, BothFaultsOfOneDictionaryAreReported) {
+  FakeProcess device;
+  EXPECT_EQ(BasicAccount::initWithProperties({{kAccountType, "X"}}), nullptr);
+  EXPECT_EQ(device.logSystem.channel.linesWithoutNumbers(),
+            (Lines{"-[BasicAccount initWithProperties:] (N) \"Invalid account type: X\"",
+                   "-[BasicAccount initWithProperties:] (N) \"Missing account class.\""}));
+}
+
+TEST(BasicAccountCreation, AnAcceptedDictionaryIsNotReported) {
+  FakeProcess device;
+  BasicAccount::initWithProperties(complete);
+  EXPECT_EQ(device.logSystem.channel.lines, Lines{});
+}
+
+TEST(BasicAccountCreation, ATypeAndAClassAreEnoughForARecord) {
+  FakeProcess device;
+  const auto account = BasicAccount::accountWithType_class("CalDAV", "MobileCalDAVAccount");
+  EXPECT_EQ(described(account->properties()),
+            R"({"Class":"MobileCalDAVAccount",)"
+            R"("Identifier":"00000000-0000-0000-0000-000000000001",)"
+            R"("Sync Identifier":"00000000-0000-0000-0000-000000000001","Type":"CalDAV"})");
+}
+
+TEST(BasicAccountCreation, TheFactoryOfADictionaryRejectsWhatTheInitialiserRejects) {
+  FakeProcess device;
+  EXPECT_NE(BasicAccount::accountWithProperties(complete), nullptr);
+  EXPECT_EQ(BasicAccount::accountWithProperties({}), nullptr);
+}
+
+TEST(BasicAccountCreationDeathTest, ATypeWithoutClassIsAProgrammingError) {
+  FakeProcess device;
+  EXPECT_DEATH(BasicAccount::_initWithType_class("Mail", std::nullopt),
+               "The account class is required\\.");
+  EXPECT_DEATH(BasicAccount::_initWithType_class("Mail", ""), "The account class is required\\.");
+}
+
+TEST(BasicAccountCreationDeathTest, AnUnknownTypeIsAProgrammingError) {
+  FakeProcess device;
+  EXPECT_DEATH(BasicAccount::_initWithType_class("X", "IMAPAccount"),
+               R"(The account type \(X\) is not supported)");
+  EXPECT_DEATH(BasicAccount::_initWithType_class(std::nullopt, "IMAPAccount"),
+               R"(The account type \(\(null\)\) is not supported)");
+}
+
+TEST(BasicAccountCreationDeathTest, TheClassIsAskedForBeforeTheType) {
+  FakeProcess device;
+  EXPECT_DEATH(BasicAccount::_initWithType_class("X", ""), "The account class is required\\.");
+}
+
+TEST(BasicAccountCreationDeathTest, ThePlainInitialiserIsForbidden) {
+  FakeProcess device;
+  EXPECT_DEATH(BasicAccount::init(), "Don't use this method");
+}
+
+TEST(AccountIdentifiers, EachIsAFreshUUID) {
+  FakeProcess device;
+  const std::optional<Text> first = BasicAccount::createNewAccountUID();
+  const std::optional<Text> second = BasicAccount::createNewAccountUID();
+  EXPECT_EQ(first, firstUUID);
+  EXPECT_NE(first, second);
+}
+
+TEST(AccountIdentifiers, ThereIsNoneWhenNoneCanBeMade) {
+  FakeProcess device;
+  device.uuidGenerator.canGenerate = false;
+  EXPECT_EQ(BasicAccount::createNewAccountUID(), std::nullopt);
+}
+
+}  // namespace
+}  // namespace accounts

@@ -1,0 +1,214 @@
+#include "tests/fakes/FakeFileSystem.h"
+
+#include <algorithm>
+
+namespace accounts {
+
+namespace {
+
+constexpr std::string_view kTemporaryNameBeginning = "temporary-";
+
+std::string parentOf(std::string_view path) {
+  const std::size_t separator = path.rfind('/');
+  return separator == 0 || separator == path.npos ? "/" : std::string(path.substr(0, separator));
+}
+
+Result noSuchFile(std::string_view path) {
+  return Result::failure(std::string(path) + ": No such file or directory");
+}
+
+std::string words(std::string_view verb, std::string_view path) {
+  return std::string(verb) + " " + std::string(path);
+}
+
+std::string words(std::string_view verb, std::string_view source, std::string_view destination) {
+  return words(verb, source) + " -> " + std::string(destination);
+}
+
+}  // namespace
+
+void FakeFileSystem::addDirectory(std::string_view path) {
+  if (directories.emplace(path, 0755).second) {
+    addDirectory(parentOf(path));
+  }
+}
+
+void FakeFileSystem::addFile(std::string_view path, std::string_view contents) {
+  addDirectory(parentOf(path));
+  files[std::string(path)].contents = contents;
+}
+
+std::optional<std::string> FakeFileSystem::contentsOf(std::string_view path) const {
+  const auto file = files.find(path);
+  return file != files.end() ? std::optional(file->second.contents) : std::nullopt;
+}
+
+std::vector<std::string> FakeFileSystem::temporaryFiles() const {
+  std::vector<std::string> result;
+  for (const auto& [path, file] : files) {
+    if (path.find(kTemporaryNameBeginning) != path.npos) {
+      result.push_back(path);
+    }
+  }
+  return result;
+}
+
+void FakeFileSystem::removeFaults() {
+  failingBeginnings_.clear();
+  failAt_.reset();
+  failFrom_.reset();
+  stopBefore_.reset();
+  stopAfter_.reset();
+}
+
+Result FakeFileSystem::perform(const std::string& line, const std::function<Result()>& operation) {
+  const std::size_t number = operationCount_++;
+  if (number == stopBefore_) {
+    throw WorldStopped();
+  }
+  journal_.push_back(line);
+  const bool isFailing =
+      number == failAt_ || (failFrom_ && number >= *failFrom_) ||
+      std::any_of(failingBeginnings_.begin(), failingBeginnings_.end(),
+                  [&](const std::string& beginning) { return line.starts_with(beginning); });
+  Result result = isFailing ? Result::failure(line + ": Input/output error") : operation();
+  if (number == stopAfter_) {
+    throw WorldStopped();
+  }
+  return result;
+}
+
+bool FakeFileSystem::parentExists(std::string_view path) const {
+  return directories.contains(parentOf(path));
+}
+
+Result FakeFileSystem::put(std::string_view path, std::string_view contents) {
+  if (!parentExists(path)) {
+    return noSuchFile(path);
+  }
+  if (directories.contains(path)) {
+    return Result::failure(std::string(path) + ": Is a directory");
+  }
+  files[std::string(path)].contents = contents;
+  return Result::success();
+}
+
+std::optional<std::string> FakeFileSystem::read(std::string_view path) {
+  std::optional<std::string> contents;
+  const Result result = perform(words("read", path), [&] {
+    contents = contentsOf(path);
+    return contents ? Result::success() : noSuchFile(path);
+  });
+  return result ? contents : std::nullopt;
+}
+
+bool FakeFileSystem::fileExists(std::string_view path) {
+  return static_cast<bool>(perform(words("exists", path), [&] {
+    return files.contains(path) || directories.contains(path) ? Result::success()
+                                                              : noSuchFile(path);
+  }));
+}
+
+bool FakeFileSystem::isDirectory(std::string_view path) {
+  return static_cast<bool>(perform(words("isDirectory", path), [&] {
+    return directories.contains(path) ? Result::success() : noSuchFile(path);
+  }));
+}
+
+Result FakeFileSystem::copyFile(std::string_view source, std::string_view destination) {
+  return perform(words("copy", source, destination), [&] {
+    const auto file = files.find(source);
+    if (file == files.end()) {
+      return noSuchFile(source);
+    }
+    if (files.contains(destination) || directories.contains(destination)) {
+      return Result::failure(std::string(destination) + ": File exists");
+    }
+    return put(destination, std::string(file->second.contents));
+  });
+}
+
+Result FakeFileSystem::removeFile(std::string_view path) {
+  return perform(words("remove", path), [&] {
+    if (directories.contains(path)) {
+      return Result::failure(std::string(path) + ": Is a directory");
+    }
+    const auto file = files.find(path);
+    if (file == files.end()) {
+      return noSuchFile(path);
+    }
+    files.erase(file);
+    return Result::success();
+  });
+}
+
+Result FakeFileSystem::createFile(std::string_view path, std::string_view contents) {
+  return perform(words("create", path), [&] { return put(path, contents); });
+}
+
+Result FakeFileSystem::createDirectoryWithIntermediates(std::string_view path,
+                                                        unsigned permissions) {
+  return perform(words("createDirectory", path), [&] {
+    if (files.contains(path) || directories.contains(path)) {
+      return Result::failure(std::string(path) + ": File exists");
+    }
+    addDirectory(path);
+    directories[std::string(path)] = permissions;
+    return Result::success();
+  });
+}
+
+std::optional<std::string> FakeFileSystem::makeTemporaryFile() {
+  std::string path = temporaryDirectory + "/" + std::string(kTemporaryNameBeginning) +
+                     std::to_string(temporaryFileCount_++);
+  const Result result = perform("makeTemporary", [&] {
+    Result made = put(path, "");
+    if (made) {
+      files[path].permissions = 0600;
+    }
+    return made;
+  });
+  return result ? std::optional(path) : std::nullopt;
+}
+
+Result FakeFileSystem::writeFile(std::string_view path, std::string_view contents) {
+  return perform(words("write", path), [&] { return put(path, contents); });
+}
+
+Result FakeFileSystem::writeFileAtomically(std::string_view path, std::string_view contents) {
+  return perform(words("writeAtomically", path), [&] { return put(path, contents); });
+}
+
+Result FakeFileSystem::setOwnerAndGroup(std::string_view path, std::string_view ownerName,
+                                        std::string_view groupName) {
+  return perform(words("setOwner", path), [&] {
+    const auto file = files.find(path);
+    if (file == files.end()) {
+      return noSuchFile(path);
+    }
+    if (!accountNames.contains(ownerName) || !accountNames.contains(groupName)) {
+      return Result::failure(std::string(path) + ": no such user or group");
+    }
+    file->second.owner = ownerName;
+    file->second.group = groupName;
+    return Result::success();
+  });
+}
+
+Result FakeFileSystem::renameFile(std::string_view source, std::string_view destination) {
+  return perform(words("rename", source, destination), [&] {
+    const auto file = files.find(source);
+    if (file == files.end() || !parentExists(destination)) {
+      return noSuchFile(source);
+    }
+    if (directories.contains(destination)) {
+      return Result::failure(std::string(destination) + ": Is a directory");
+    }
+    FakeFile moved = std::move(file->second);
+    files.erase(file);
+    files.insert_or_assign(std::string(destination), std::move(moved));
+    return Result::success();
+  });
+}
+
+}  // namespace accounts
