@@ -1,0 +1,109 @@
+#include "migrator/AccountsDataMigrator.h"
+
+#include <utility>
+
+#include "accountsettings/Log.h"
+#include "accountsettings/Paths.h"
+#include "accountsettings/Process.h"
+
+namespace accounts {
+
+namespace {
+
+constexpr std::string_view mailApplication = "com.quarx.mobilemail";
+constexpr std::string_view mailAccountsPreference = "MailAccounts";
+
+void tellMailApplication(Platform& platform) {
+  // The file is often absent; a failure to remove it has no consequence.
+  static_cast<void>(platform.fileSystem.removeFile(
+      pathByAppending(platform.mailDirectory.path(), "AutoFetchEnabled")));
+  platform.preferencesBroadcast.announceChange(mailApplication, mailAccountsPreference);
+}
+
+}  // namespace
+
+/// Which migrations a device needs.
+struct AccountsDataMigrator::Needs {
+  bool oldMailAccounts = false;
+  bool oldDAAccounts = false;
+  bool newAccountSettings = false;
+
+  [[nodiscard]] bool legacyStores() const { return oldDAAccounts || oldMailAccounts; }
+  [[nodiscard]] bool any() const { return legacyStores() || newAccountSettings; }
+};
+
+std::string AccountsDataMigrator::dataClassName() {
+  return "accounts";
+}
+
+bool AccountsDataMigrator::performMigration() {
+  std::unique_ptr<NamedLock> lock = AccountsManager::createAndLockMigrationLock();
+  const bool succeeded = lock != nullptr && executeMigrationSteps();
+  AccountsManager::releaseMigrationLock(std::move(lock));
+  return succeeded;
+}
+
+bool AccountsDataMigrator::executeMigrationSteps() {
+  AccountsManager::_setShouldSkipNotifications(true);
+  _copyAsideAccountsPlist();
+
+  if (_failedToRemoveOldAccountsInfo()) {
+    // Kept on purpose: the "!." ending is what engineers search device logs for.
+    logToConsole("Detected that a removal old accounts info was in progress. Early return!.");
+    static_cast<void>(_removeOldAccountsInfo());
+    // Kept on purpose: notifications stay switched off on this path; the process ends after it, and
+    // nothing that it did is an account change to be told.
+    return true;
+  }
+
+  Needs needs;
+  AccountsManager::shouldMigrateOldMailAccounts_oldDAAccounts_newAccountSettings(
+      &needs.oldMailAccounts, &needs.oldDAAccounts, &needs.newAccountSettings);
+
+  std::unique_ptr<AccountsManager> store = AccountsManager::initInsideOfMigration();
+  const bool succeeded = !needs.any() || runMigrations(*store, needs);
+
+  // Kept on purpose: a store whose upgrade failed is stamped and saved as well, so that the device
+  // keeps what was achieved; the legacy stores then stay.
+  store->setDataVersion(AccountsManager::currentVersion());
+  store->saveAllAccounts();
+  store.reset();
+
+  if (succeeded) {
+    finishSuccessfulMigration(needs);
+  }
+  AccountsManager::_setShouldSkipNotifications(false);
+  return succeeded;
+}
+
+bool AccountsDataMigrator::runMigrations(AccountsManager& store, const Needs& needs) {
+  _collatedMigrationData.reset();
+  if (_saveMigrationInformation()) {
+    _collatedMigrationData.emplace();
+  }
+  logToConsole("Migrating accounts");
+
+  // Kept on purpose: a conversion's failure is not the migration's. It has been logged, and the
+  // upgrade chain's result alone decides; combining the results would keep a device with one broken
+  // legacy description from ever finishing.
+  if (needs.oldDAAccounts) {
+    static_cast<void>(_migrateDAAccounts(store));
+  }
+  if (needs.oldMailAccounts) {
+    static_cast<void>(_migrateMailAccounts(store));
+  }
+  return _migrateNewAccountsInfo(store);
+}
+
+void AccountsDataMigrator::finishSuccessfulMigration(const Needs& needs) {
+  if (needs.legacyStores()) {
+    // Its failures are logged where they happen; the accounts are carried over already.
+    static_cast<void>(_removeOldAccountsInfo());
+  }
+  if (_saveMigrationInformation()) {
+    _saveCollatedMigrationInformation();
+  }
+  tellMailApplication(Process::current().platform);
+}
+
+}  // namespace accounts

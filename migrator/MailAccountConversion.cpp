@@ -1,0 +1,177 @@
+#include <algorithm>
+#include <array>
+
+#include "accountsettings/ASRuntimeFixMailAccount.h"
+#include "accountsettings/Log.h"
+#include "accountsettings/Process.h"
+#include "migrator/AccountsDataMigrator.h"
+#include "migrator/LegacyDescriptions.h"
+#include "migrator/MailAccountClasses.h"
+
+bool _UseGoogleMail() {
+  accounts::Process& process = accounts::Process::current();
+  return process.usesGoogleMail.get([&process] {
+    const std::optional<accounts::PropertyValue> answer =
+        process.platform.deviceInfoService.copyAnswer("RegionalBehaviorGoogleMail");
+    return answer && answer->booleanValue().value_or(false);
+  });
+}
+
+namespace accounts {
+
+namespace {
+
+constexpr std::string_view conversionOperation =
+    "-[AccountsDataMigrator(Internal) _migrateMailAccounts:]";
+
+const std::array<LegacyKey, 3> mailKeys = {{
+    {"AccountType", kAccountClass},
+    {"AccountName", kAccountDisplayName},
+    {"uniqueId", kAccountIdentifier},
+}};
+
+/// What a legacy mail account class stands for.
+struct MailAccountKind {
+  std::string_view accountClass;
+  std::string_view type;
+  std::string_view typeString;
+};
+
+const std::array<MailAccountKind, 8> mailAccountKinds = {{
+    {gmailAccountClass, kGmailAccountType, "Gmail"},
+    {marrowAccountClass, kVelmoraAccountType, "Velmora"},
+    {velmoraAccountClass, kVelmoraAccountType, "Velmora"},
+    {tolvaneIMAPAccountClass, kTolvaneIMAPAccountType, "Stratix"},
+    // The service's name ends with the left-to-right mark U+200E.
+    {yahooAccountClass, kYahooAccountType, "Yahoo!\xE2\x80\x8E"},
+    {dataAccessMailAccountClass, kExchangeAccountType, "Exchange ActiveSync"},
+    {deliveryAccountClass, kSMTPAccountType, "Account"},
+    {smtpAccountClass, kSMTPAccountType, "Account"},
+}};
+const MailAccountKind anyOtherMailAccountKind = {{}, kMailAccountType, "Account"};
+constexpr std::string_view gmailTypeStringInGoogleMailRegions = "Google Mail";
+
+const MailAccountKind& kindOfMailAccountClass(std::string_view accountClass) {
+  const auto* const kind =
+      std::ranges::find(mailAccountKinds, accountClass, &MailAccountKind::accountClass);
+  return kind != mailAccountKinds.end() ? *kind : anyOtherMailAccountKind;
+}
+
+/// The hosted service's accounts are stored by the bare user name.
+void cutUsernameBeforeDomain(PropertyDictionary& properties) {
+  const std::optional<Text> username = properties.textForKey(kAccountUsername);
+  if (username) {
+    properties.set(kAccountUsername, username->view().substr(0, username->view().find('@')));
+  }
+}
+
+}  // namespace
+
+PropertyDictionary accountPropertiesOfMailDescription(const PropertyDictionary& description,
+                                                      std::string_view type) {
+  PropertyDictionary properties = description;
+  moveLegacyKeys(properties, mailKeys);
+  properties.set(kAccountType, type);
+
+  std::optional<Text> accountClass = properties.textForKey(kAccountClass);
+  if (!accountClass && type == kSMTPAccountType) {
+    accountClass = smtpAccountClass;
+    properties.set(kAccountClass, *accountClass);
+  }
+  if (accountClass) {
+    using Migrator = AccountsDataMigrator;
+    properties.set(kAccountTypeString,
+                   Migrator::_accountTypeStringForMailAccountClass(*accountClass));
+    properties.set(kAccountShortTypeString,
+                   Migrator::_accountShortTypeStringForMailAccountClass(*accountClass));
+    properties.set(kAccountType, Migrator::_accountTypeForMailAccountClass(*accountClass));
+  }
+  if (properties.textForKey(kAccountType) == kVelmoraAccountType) {
+    cutUsernameBeforeDomain(properties);
+  }
+  return properties;
+}
+
+bool AccountsDataMigrator::_migrateMailAccounts(AccountsManager& store) {
+  const std::string path = mailAccountsPath();
+  const std::optional<PropertyDictionary> file =
+      Process::current().platform.propertyLists.readDictionary(path);
+  const PropertyDictionary legacyAccounts = file.value_or(PropertyDictionary());
+  if (!legacyAccounts.empty()) {
+    _foundOldMailAccountsToMigrate = true;
+  }
+  collect("OldMailAccounts", file);
+
+  const bool converted = replaceMailAccounts(store, legacyAccounts);
+  removeOriginalBeside(path);
+  return converted;
+}
+
+bool AccountsDataMigrator::replaceMailAccounts(AccountsManager& store,
+                                               const PropertyDictionary& legacyAccounts) {
+  const auto converted = [&](std::string_view key, std::string_view type,
+                             std::string_view failureLine) {
+    return convertDescriptions(legacyAccounts.arrayForKey(key).value_or(PropertyArray()),
+                               conversionOperation, failureLine,
+                               [&](const PropertyDictionary& description) {
+                                 return _convertMailAccountDescription_type(description, type);
+                               });
+  };
+  const std::optional<AccountsManager::Accounts> outgoing =
+      converted("DeliveryAccounts", kSMTPAccountType,
+                "%s. Could not convert the description for the delivery account %@");
+  if (!outgoing) {
+    return false;
+  }
+  const std::optional<AccountsManager::Accounts> incoming =
+      converted("MailAccounts", kMailAccountType,
+                "%s. Could not convert the description for the incoming account %@");
+  if (!incoming) {
+    return false;
+  }
+  store.replaceAccountsWithTypes_withAccounts({kSMTPAccountType}, *outgoing);
+  // Kept on purpose: the incoming records are of several types by now, yet only accounts of type
+  // "Mail" give way to them: accounts of the other types that the file holds are another store's.
+  store.replaceAccountsWithTypes_withAccounts({kMailAccountType}, *incoming);
+  return true;
+}
+
+BasicAccountReference AccountsDataMigrator::_convertMailAccountDescription_type(
+    const PropertyDictionary& description, std::string_view type) {
+  const PropertyDictionary properties = accountPropertiesOfMailDescription(description, type);
+  BasicAccountReference record = BasicAccount::initWithProperties(properties);
+  if (record == nullptr) {
+    return nullptr;
+  }
+  std::optional<Text> syncIdentifier = properties.textForKey(kAccountIdentifier);
+  if (!syncIdentifier) {
+    syncIdentifier = BasicAccount::createNewAccountUID();
+  }
+  if (syncIdentifier) {
+    record->setAccountProperty_forKey(*syncIdentifier, kAccountSyncIdentifier);
+  }
+  if (record->accountClass() == genericMailAccountClass) {
+    reportMailAccountClassFound();
+  }
+  return record;
+}
+
+std::string_view AccountsDataMigrator::_accountTypeForMailAccountClass(
+    std::string_view accountClass) {
+  return kindOfMailAccountClass(accountClass).type;
+}
+
+std::string_view AccountsDataMigrator::_accountTypeStringForMailAccountClass(
+    std::string_view accountClass) {
+  return _accountShortTypeStringForMailAccountClass(accountClass);
+}
+
+std::string_view AccountsDataMigrator::_accountShortTypeStringForMailAccountClass(
+    std::string_view accountClass) {
+  if (accountClass == gmailAccountClass && _UseGoogleMail()) {
+    return gmailTypeStringInGoogleMailRegions;
+  }
+  return kindOfMailAccountClass(accountClass).typeString;
+}
+
+}  // namespace accounts

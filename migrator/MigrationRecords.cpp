@@ -1,0 +1,156 @@
+#include "accountsettings/Log.h"
+#include "accountsettings/Paths.h"
+#include "accountsettings/Process.h"
+#include "migrator/AccountsDataMigrator.h"
+
+namespace accounts {
+
+namespace {
+
+constexpr std::string_view removalOperation =
+    "-[AccountsDataMigrator(Internal) _removeOldAccountsInfo]";
+constexpr std::string_view loggingPreferences = "com.quarx.accountsettings-logging";
+constexpr std::string_view saveInformationPreference = "ASSaveMigrationInformation";
+constexpr std::string_view sentinelContents = "Old Account Information Removal Sentinel";
+constexpr unsigned informationDirectoryPermissions = 0777;
+
+// Kept on purpose: the second "M" and the "S" give the month again and tenths of a second where
+// minutes and seconds were meant. Tools that collect these files know the names as they are.
+constexpr std::string_view informationDatePattern = "Y-M-d-H-M-S";
+
+// Kept on purpose: one letter short of "Account". Readers of information files look for this key.
+constexpr std::string_view newAccountSettingsKey = "NewAccounSettings";
+
+std::string pathInHomeLibrary(std::string_view pathInLibrary) {
+  const std::string home = Process::current().platform.homeDirectory.path();
+  return pathByAppending(pathByAppending(home, "Library"), pathInLibrary);
+}
+
+void logRemovalFailure(const std::string& path, const Result& removal) {
+  logToConsole("%s. Could not delete %@. Error = %@", {removalOperation, path, removal.error()});
+}
+
+/// Sees to it that the directory of migration-information files exists. False, with a console line,
+/// when it does not.
+bool makeInformationDirectory(FileSystem& files, const std::string& directory) {
+  if (!files.fileExists(directory)) {
+    const Result creation =
+        files.createDirectoryWithIntermediates(directory, informationDirectoryPermissions);
+    if (!creation) {
+      logToConsole(
+          "AccountMigration warning: Could not create the directory to store migration information "
+          "at %@ [Error = %@]",
+          {directory, creation.error()});
+    }
+    return static_cast<bool>(creation);
+  }
+  if (!files.isDirectory(directory)) {
+    // Kept on purpose: this line begins with "AccountMigrator", the one above with
+    // "AccountMigration"; searches of device logs rely on both.
+    logToConsole("AccountMigrator warning: %@ already exists and is not a directory", {directory});
+    return false;
+  }
+  return true;
+}
+
+}  // namespace
+
+void AccountsDataMigrator::_copyAsideAccountsPlist() {
+  Platform& platform = Process::current().platform;
+  const std::string source = AccountsManager::fullPathToAccountSettingsPlist();
+  const std::string directory = pathByAppending(platform.sharedResources.sharedResourcesDirectory(),
+                                                "Library/Logs/CrashReporter");
+  const std::string destination = pathByAppending(directory, lastPathComponent(source));
+
+  if (platform.fileSystem.fileExists(destination) && !platform.fileSystem.removeFile(destination)) {
+    logToConsole("Couldn't remove existing accountsettings copy at %@", {destination});
+  }
+  const Result copy = platform.fileSystem.copyFile(source, destination);
+  if (!copy) {
+    logToConsole("Error trying to save an accountsettings plist copy: %@", {copy.error()});
+  }
+}
+
+bool AccountsDataMigrator::_saveMigrationInformation() {
+  Process& process = Process::current();
+  return process.savesMigrationInformation.get([&process] {
+    PreferenceDomain& preferences = process.platform.preferenceDomain;
+    preferences.synchronize(loggingPreferences);
+    const std::optional<PropertyValue> value =
+        preferences.copyValue(saveInformationPreference, loggingPreferences);
+    return value && value->booleanValue().value_or(false);
+  });
+}
+
+void AccountsDataMigrator::collect(std::string_view key,
+                                   const std::optional<PropertyDictionary>& contents) {
+  if (_saveMigrationInformation() && _collatedMigrationData) {
+    _collatedMigrationData->set(key, contents.value_or(PropertyDictionary()));
+  }
+}
+
+std::string AccountsDataMigrator::_absolutePathToOldAccountsInfoRemovalSentinel() {
+  return pathInHomeLibrary("Preferences/.removingOldAccounts");
+}
+
+bool AccountsDataMigrator::_failedToRemoveOldAccountsInfo() {
+  return Process::current().platform.fileSystem.fileExists(
+      _absolutePathToOldAccountsInfoRemovalSentinel());
+}
+
+bool AccountsDataMigrator::_removeOldAccountsInfo() {
+  FileSystem& files = Process::current().platform.fileSystem;
+  const std::string sentinel = _absolutePathToOldAccountsInfoRemovalSentinel();
+  if (!files.fileExists(sentinel)) {
+    // Without the sentinel the removal is merely not protected against an interruption.
+    static_cast<void>(files.createFile(sentinel, sentinelContents));
+  }
+
+  const std::string exchangePath = daAccountPath();
+  const Result exchangeRemoval = files.removeFile(exchangePath);
+  const bool foundExchangeFileStays = !exchangeRemoval && _foundOldDAAccountsToMigrate;
+  if (foundExchangeFileStays) {
+    logRemovalFailure(exchangePath, exchangeRemoval);
+  } else {
+    const std::string mailPath = mailAccountsPath();
+    const Result mailRemoval = files.removeFile(mailPath);
+    if (!mailRemoval && _foundOldMailAccountsToMigrate) {
+      logRemovalFailure(mailPath, mailRemoval);
+    }
+  }
+
+  const Result sentinelRemoval = files.removeFile(sentinel);
+  if (!sentinelRemoval) {
+    logRemovalFailure(sentinel, sentinelRemoval);
+  }
+  // Kept on purpose: after a migration of mail accounts alone there is no Exchange file to remove,
+  // and this is false although nothing went wrong. No caller looks at it.
+  return static_cast<bool>(exchangeRemoval);
+}
+
+void AccountsDataMigrator::_saveCollatedMigrationInformation() {
+  Platform& platform = Process::current().platform;
+  logToConsole("Saving collated migration information");
+  if (_collatedMigrationData) {
+    _collatedMigrationData->set(
+        newAccountSettingsKey,
+        platform.propertyLists.readDictionary(AccountsManager::fullPathToAccountSettingsPlist())
+            .value_or(PropertyDictionary()));
+  }
+
+  const std::string directory = pathInHomeLibrary("Logs/CrashReporter/AccountMigration");
+  if (!makeInformationDirectory(platform.fileSystem, directory) || !_collatedMigrationData) {
+    return;
+  }
+  // Kept on purpose: ".txt" for a binary property list; the name is what collectors look for.
+  const std::string name = "AccountMigrationInformation-" +
+                           platform.dateFormatter.currentDate(informationDatePattern) + ".txt";
+  std::string bytes;
+  if (platform.propertyLists.serializeBinary(*_collatedMigrationData, bytes)) {
+    // The file is a help for engineers: a migration never fails for want of it, nor reports it.
+    static_cast<void>(
+        platform.fileSystem.writeFileAtomically(pathByAppending(directory, name), bytes));
+  }
+}
+
+}  // namespace accounts

@@ -1,0 +1,34 @@
+#include "migrator/URLEscaping.h"
+
+namespace accounts {
+
+namespace {
+
+/// The legal characters of a URL without those that structure it or escape others: "@", "?", "/",
+/// "#", "[", "]" and "%".
+constexpr std::string_view standingCharacters =
+    "abcdefghijklmnopqrstuvwxyz"
+    "ABCDEFGHIJKLMNOPQRSTUVWXYZ"
+    "0123456789"
+    "-_.~!*'();:&=+$,";
+constexpr std::string_view hexadecimalDigits = "0123456789ABCDEF";
+
+}  // namespace
+
+std::string urlEscapedComponent(std::string_view text) {
+  std::string escaped;
+  escaped.reserve(text.size());
+  for (const char character : text) {
+    if (standingCharacters.find(character) != std::string_view::npos) {
+      escaped += character;
+    } else {
+      const auto byte = static_cast<unsigned char>(character);
+      escaped += '%';
+      escaped += hexadecimalDigits[byte >> 4];
+      escaped += hexadecimalDigits[byte & 0xF];
+    }
+  }
+  return escaped;
+}
+
+}  // namespace accounts

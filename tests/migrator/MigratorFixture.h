@@ -1,0 +1,156 @@
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <initializer_list>
+#include <memory>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+#include "accountsettings/AccountsManager.h"
+#include "migrator/AccountsDataMigrator.h"
+#include "propertylist/Description.h"
+#include "tests/fakes/FakePlatform.h"
+
+namespace accounts {
+
+inline void PrintTo(const PropertyValue& value, std::ostream* output) {
+  std::string description;
+  appendDescription(description, value);
+  *output << description;
+}
+inline void PrintTo(const PropertyDictionary& dictionary, std::ostream* output) {
+  PrintTo(PropertyValue(dictionary), output);
+}
+
+using Lines = std::vector<std::string>;
+using TextList = std::vector<std::string>;
+
+/// The texts of a list; none for none.
+inline std::optional<TextList> texts(const std::optional<PropertyArray>& list) {
+  if (!list) {
+    return std::nullopt;
+  }
+  TextList result;
+  for (const PropertyValue& value : *list) {
+    result.push_back(value.asText() != nullptr ? value.asText()->string() : "(no text)");
+  }
+  return result;
+}
+
+/// Dataclasses by their constants, as a list of texts.
+inline std::optional<TextList> dataclasses(std::initializer_list<std::string_view> names) {
+  return TextList(names.begin(), names.end());
+}
+
+/// An account dictionary in one line: `anAccount("A", kMailAccountType, "IMAPAccount")`.
+class AccountBuilder {
+ public:
+  explicit AccountBuilder(PropertyDictionary properties) : properties_(std::move(properties)) {}
+
+  AccountBuilder& with(std::string_view key, PropertyValue value) {
+    properties_.set(key, std::move(value));
+    return *this;
+  }
+  AccountBuilder& without(std::string_view key) {
+    properties_.remove(key);
+    return *this;
+  }
+  AccountBuilder& enabledFor(std::initializer_list<std::string_view> names) {
+    return with(kAccountEnabledDataclasses, listOf(names));
+  }
+  AccountBuilder& provisionedFor(std::initializer_list<std::string_view> names) {
+    return with(kAccountProvisionedDataclasses, listOf(names));
+  }
+  AccountBuilder& withChildren(std::initializer_list<AccountBuilder> children) {
+    return with(kAccountChildAccounts,
+                PropertyArray(std::vector<PropertyValue>(children.begin(), children.end())));
+  }
+
+  operator PropertyDictionary() const { return properties_; }
+  operator PropertyValue() const { return properties_; }
+
+ private:
+  static PropertyArray listOf(std::initializer_list<std::string_view> names) {
+    return PropertyArray(std::vector<PropertyValue>(names.begin(), names.end()));
+  }
+  PropertyDictionary properties_;
+};
+
+inline AccountBuilder anAccount(std::string_view identifier, std::string_view type,
+                                std::string_view accountClass) {
+  return AccountBuilder(
+      {{kAccountIdentifier, identifier}, {kAccountType, type}, {kAccountClass, accountClass}});
+}
+
+/// A device, a migrator and a store that a test fills.
+class MigratorTest : public testing::Test {
+ protected:
+  MigratorTest() { device.consoleLog.alsoStandardError = false; }
+
+  /// Puts accounts into the store, in order; no file is involved.
+  void openStoreWith(std::initializer_list<AccountBuilder> accounts) {
+    store = AccountsManager::initWithAccounsInfoArray(
+        PropertyArray(std::vector<PropertyValue>(accounts.begin(), accounts.end())));
+  }
+  /// Writes an account settings file.
+  void addSettingsFile(PropertyValue version, std::initializer_list<AccountBuilder> accounts) {
+    device.addPropertyList(
+        kSettingsPath,
+        PropertyDictionary{{kPlistVersionKey, std::move(version)},
+                           {kPlistAccountsKey, PropertyArray(std::vector<PropertyValue>(
+                                                   accounts.begin(), accounts.end()))}});
+  }
+  void setMigrationInformationPreference(PropertyValue value) {
+    device.preferenceDomain.values.insert_or_assign(
+        {"com.quarx.accountsettings-logging", "ASSaveMigrationInformation"}, std::move(value));
+  }
+  void switchMigrationInformationOn() { setMigrationInformationPreference(true); }
+
+  /// The account at a position of the store.
+  BasicAccount& account(std::size_t position) { return *store->allBasicAccounts().at(position); }
+  /// The identifiers of the store's accounts, in order.
+  TextList identifiers() const {
+    TextList result;
+    for (const BasicAccountReference& each : store->allBasicAccounts()) {
+      result.push_back(each->identifier().value_or(Text("(none)")).string());
+    }
+    return result;
+  }
+  /// The enabled dataclasses as they are stored, whatever the type supports.
+  std::optional<TextList> storedEnabled(std::size_t position) {
+    return texts(account(position).properties().arrayForKey(kAccountEnabledDataclasses));
+  }
+  /// The children's dictionaries of the account at a position.
+  PropertyArray children(std::size_t position) {
+    return account(position)
+        .properties()
+        .arrayForKey(kAccountChildAccounts)
+        .value_or(PropertyArray());
+  }
+
+  [[nodiscard]] const Lines& console() const { return device.consoleLog.lines; }
+  /// How often the account settings file was written.
+  [[nodiscard]] std::ptrdiff_t saves() const {
+    return std::ranges::count_if(device.journal, [](const std::string& line) {
+      return line.starts_with("rename ") && line.ends_with(kSettingsPath);
+    });
+  }
+  [[nodiscard]] std::optional<PropertyDictionary> settingsFile() const {
+    return device.dictionaryAt(kSettingsPath);
+  }
+  [[nodiscard]] bool exists(std::string_view path) const {
+    return device.fileSystem.files.contains(path);
+  }
+
+  FakeProcess device;
+  AccountsDataMigrator migrator;
+  std::unique_ptr<AccountsManager> store =
+      AccountsManager::initWithAccounsInfoArray(PropertyArray());
+};
+
+}  // namespace accounts
