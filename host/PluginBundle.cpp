@@ -1,0 +1,67 @@
+#include "host/PluginBundle.h"
+
+#include <dlfcn.h>
+
+#include <string>
+#include <system_error>
+
+namespace accounts {
+namespace {
+
+constexpr const char* kBundleName = "accounts.migrator";
+constexpr const char* kPluginName = "AccountsDataMigrator.so";
+constexpr const char* kEntryPointName = "CreateMigrationPlugin";
+using EntryPoint = MigrationPluginBase*(Platform&);
+
+HostError missing(const std::string& message) {
+  return HostError{ExitStatus::MissingInput, message};
+}
+
+/// The directory of the running program; empty when the system does not tell.
+std::filesystem::path programDirectory() {
+  std::error_code error;
+  return std::filesystem::read_symlink("/proc/self/exe", error).parent_path();
+}
+
+}  // namespace
+
+std::filesystem::path PluginBundle::plugin() const {
+  return path_ / kPluginName;
+}
+
+std::variant<PluginBundle, HostError> PluginBundle::find(
+    const std::optional<std::filesystem::path>& path) {
+  // Absolute, because dlopen would search its own directories for a bare file name.
+  std::error_code error;
+  PluginBundle bundle(
+      std::filesystem::absolute(path.value_or(programDirectory() / kBundleName), error));
+  if (!std::filesystem::is_directory(bundle.path_, error)) {
+    return missing("No bundle at " + bundle.path_.string());
+  }
+  if (!std::filesystem::is_regular_file(bundle.plugin(), error)) {
+    return missing("No " + std::string(kPluginName) + " in the bundle " + bundle.path_.string());
+  }
+  return bundle;
+}
+
+std::variant<std::unique_ptr<MigrationPluginBase>, HostError> PluginBundle::makePlugin(
+    Platform& platform) const {
+  // Never closed: objects of the plug-in may live as long as the process.
+  void* const library = dlopen(plugin().c_str(), RTLD_NOW | RTLD_LOCAL);
+  if (library == nullptr) {
+    return missing("The plug-in cannot be loaded: " + std::string(dlerror()));
+  }
+  // dlsym() gives functions as object pointers; POSIX promises that this conversion works.
+  auto* const entryPoint = reinterpret_cast<EntryPoint*>(dlsym(library, kEntryPointName));
+  if (entryPoint == nullptr) {
+    return missing("The plug-in has no entry point " + std::string(kEntryPointName) + ": " +
+                   plugin().string());
+  }
+  std::unique_ptr<MigrationPluginBase> instance(entryPoint(platform));
+  if (instance == nullptr) {
+    return HostError{ExitStatus::PluginEnded, "The plug-in made no instance of its class"};
+  }
+  return instance;
+}
+
+}  // namespace accounts

@@ -1,0 +1,38 @@
+#pragma once
+
+#include <filesystem>
+#include <memory>
+#include <optional>
+#include <variant>
+
+#include "host/HostError.h"
+#include "platform/MigrationPluginBase.h"
+#include "platform/Platform.h"
+
+namespace accounts {
+
+/// A plug-in bundle: a directory with the plug-in and its resources.
+class PluginBundle {
+ public:
+  /// The bundle at a path, or the one beside the running program. Nothing is loaded yet. An error
+  /// when there is no such directory or no plug-in in it.
+  static std::variant<PluginBundle, HostError> find(
+      const std::optional<std::filesystem::path>& path);
+
+  [[nodiscard]] const std::filesystem::path& path() const { return path_; }
+  [[nodiscard]] std::filesystem::path resourcesDirectory() const { return path_ / "Resources"; }
+
+  /// Loads the plug-in into this process, for good, and makes one instance of its principal class.
+  /// The platform must stay alive as long as the process. An error when the plug-in cannot be
+  /// loaded, has no entry point or makes no instance.
+  [[nodiscard]] std::variant<std::unique_ptr<MigrationPluginBase>, HostError> makePlugin(
+      Platform& platform) const;
+
+ private:
+  explicit PluginBundle(std::filesystem::path path) : path_(std::move(path)) {}
+  [[nodiscard]] std::filesystem::path plugin() const;
+
+  std::filesystem::path path_;
+};
+
+}  // namespace accounts

@@ -1,0 +1,104 @@
+#include "host/RunReport.h"
+
+#include <nlohmann/json.hpp>
+
+#include "propertylist/Description.h"
+
+namespace accounts {
+namespace {
+
+// Keys that a person reads first stand first.
+using JSON = nlohmann::ordered_json;
+
+constexpr const char* kRootKey = "root";
+constexpr const char* kDataClassNameKey = "dataClassName";
+constexpr const char* kResultKey = "result";
+constexpr const char* kBroadcastsKey = "broadcasts";
+constexpr const char* kApplicationKey = "application";
+constexpr const char* kPreferenceKey = "key";
+constexpr const char* kCloudTabAnnouncementsKey = "cloudTabAnnouncements";
+constexpr const char* kExitStatusKey = "exitStatus";
+constexpr const char* kErrorKey = "error";
+
+JSON textOrNull(const std::optional<std::string>& text) {
+  return text ? JSON(*text) : JSON(nullptr);
+}
+
+std::optional<std::string> optionalText(const JSON& object, const char* key) {
+  const auto found = object.find(key);
+  return found != object.end() && found->is_string() ? std::optional(found->get<std::string>())
+                                                     : std::nullopt;
+}
+
+std::string escaped(const std::string& text) {
+  std::string line;
+  appendEscapedText(line, text);
+  return line;
+}
+
+}  // namespace
+
+void setError(RunReport& report, const HostError& error) {
+  report.exitStatus = error.exitStatus;
+  report.error = error.message;
+}
+
+std::string jsonText(const RunReport& report) {
+  JSON broadcasts = JSON::array();
+  for (const PreferencesChange& broadcast : report.broadcasts) {
+    broadcasts.push_back(
+        {{kApplicationKey, broadcast.application}, {kPreferenceKey, broadcast.key}});
+  }
+  JSON object = {{kRootKey, textOrNull(report.root)},
+                 {kDataClassNameKey, textOrNull(report.dataClassName)},
+                 {kResultKey, report.result},
+                 {kBroadcastsKey, std::move(broadcasts)},
+                 {kCloudTabAnnouncementsKey, report.cloudTabAnnouncements},
+                 {kExitStatusKey, static_cast<int>(report.exitStatus)}};
+  if (report.error) {
+    object[kErrorKey] = *report.error;
+  }
+  constexpr int onOneLine = -1;
+  constexpr bool keepUnicode = false;
+  return object.dump(onOneLine, ' ', keepUnicode, JSON::error_handler_t::replace);
+}
+
+std::optional<RunReport> reportFromJSONText(const std::string& text) {
+  try {
+    const JSON object = JSON::parse(text);
+    RunReport report;
+    report.root = optionalText(object, kRootKey);
+    report.dataClassName = optionalText(object, kDataClassNameKey);
+    report.result = object.at(kResultKey).get<bool>();
+    for (const JSON& broadcast : object.at(kBroadcastsKey)) {
+      report.broadcasts.push_back({broadcast.at(kApplicationKey).get<std::string>(),
+                                   broadcast.at(kPreferenceKey).get<std::string>()});
+    }
+    report.cloudTabAnnouncements = object.at(kCloudTabAnnouncementsKey).get<std::size_t>();
+    report.exitStatus = static_cast<ExitStatus>(object.at(kExitStatusKey).get<int>());
+    report.error = optionalText(object, kErrorKey);
+    return report;
+  } catch (const JSON::exception&) {
+    return std::nullopt;
+  }
+}
+
+std::string summaryText(const RunReport& report) {
+  if (!report.dataClassName) {
+    return "";
+  }
+  std::string summary = (report.result ? "Migrated the " : "Failed to migrate the ") +
+                        escaped(*report.dataClassName) + " of " +
+                        escaped(report.root.value_or("")) + ".\n";
+  for (const PreferencesChange& broadcast : report.broadcasts) {
+    summary += "  Told " + escaped(broadcast.application) + " that its " + escaped(broadcast.key) +
+               " changed.\n";
+  }
+  if (report.cloudTabAnnouncements > 0) {
+    summary += "  Announced cloud tabs, " + std::to_string(report.cloudTabAnnouncements) +
+               (report.cloudTabAnnouncements == 1 ? " time.\n" : " times.\n");
+  }
+  return summary;
+}
+
+}  // namespace accounts

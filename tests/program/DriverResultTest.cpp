@@ -1,0 +1,155 @@
+#include <fcntl.h>
+#include <sys/file.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <filesystem>
+#include <fstream>
+#include <future>
+#include <thread>
+
+#include "tests/program/DeviceRootFixture.h"
+
+namespace accounts {
+namespace {
+
+/// Whether the system's list of file locks has one on a file, held or waited for.
+bool isListed(ino_t inode, bool waiting) {
+  std::ifstream locks("/proc/locks");
+  for (std::string line; std::getline(locks, line);) {
+    const bool waits = line.find("->") != std::string::npos;
+    if (waits == waiting && line.find(":" + std::to_string(inode) + " ") != std::string::npos) {
+      return true;
+    }
+  }
+  return false;
+}
+
+/// The result that the host sees of each kind of migration.
+class DriverResult : public DeviceRootFixture {
+ protected:
+  /// The migration fails at once because its lock cannot be made, and changes nothing.
+  void expectNoLock() const {
+    write(kSettingsPath, accountSettings(11));
+    const std::string settingsBefore = readText(kSettingsPath);
+
+    const ProgramResult result = migrate({"--json"});
+
+    EXPECT_EQ(result.exitStatus, 1);
+    EXPECT_EQ(onlyObject(result)["result"], false);
+    EXPECT_EQ(onlyObject(result)["broadcasts"], nlohmann::json::array());
+    EXPECT_EQ(result.errorLines().size(), 1U) << result.errors;
+    EXPECT_EQ(readText(kSettingsPath), settingsBefore);
+    EXPECT_FALSE(exists(kSettingsCopyPath));
+  }
+};
+
+TEST_F(DriverResult, WithoutADirectoryForTheLockItIsFalse) {
+  std::filesystem::remove(onThisMachine("/tmp"));
+
+  expectNoLock();
+}
+
+TEST_F(DriverResult, WithASymbolicLinkForALockItIsFalse) {
+  writeText("/tmp/elsewhere", "");
+  std::filesystem::create_symlink("elsewhere", onThisMachine(kLockPath));
+
+  expectNoLock();
+}
+
+TEST_F(DriverResult, WithADirectoryForALockItIsFalse) {
+  std::filesystem::create_directory(onThisMachine(kLockPath));
+
+  expectNoLock();
+}
+
+TEST_F(DriverResult, WithTheLockOfAFinishedMigrationItIsTrue) {
+  writeText(kLockPath, "left by somebody");
+
+  EXPECT_EQ(migrate().exitStatus, 0);
+  EXPECT_EQ(readText(kLockPath), "left by somebody");
+}
+
+TEST_F(DriverResult, WhileAnotherProcessHoldsTheLockItIsWaitedFor) {
+  constexpr mode_t ownerOnly = 0600;
+  const int lock = open(onThisMachine(kLockPath).c_str(), O_CREAT | O_RDWR | O_CLOEXEC, ownerOnly);
+  struct stat information {};
+  ASSERT_EQ(fstat(lock, &information), 0);
+  ASSERT_EQ(flock(lock, LOCK_EX), 0);
+  if (!isListed(information.st_ino, false)) {
+    close(lock);
+    GTEST_SKIP() << "This system does not list its file locks.";
+  }
+
+  std::future<ProgramResult> result = std::async(std::launch::async, [this] { return migrate(); });
+  while (!isListed(information.st_ino, true)) {
+    std::this_thread::yield();
+  }
+
+  EXPECT_FALSE(exists(kSettingsPath));
+  close(lock);
+  EXPECT_EQ(result.get().exitStatus, 0);
+  EXPECT_TRUE(exists(kSettingsPath));
+}
+
+TEST_F(DriverResult, AfterAnInterruptedRemovalItIsTrueAndOnlyTheRemovalIsFinished) {
+  writeText(kSentinelPath, "Old Account Information Removal Sentinel");
+  write(kSettingsPath, accountSettings(3));
+  write(kLegacyMailPath, PropertyDictionary{{"MailAccounts", PropertyArray{}}});
+  const std::string settingsBefore = readText(kSettingsPath);
+
+  const ProgramResult result = migrate({"--json"});
+
+  EXPECT_EQ(result.exitStatus, 0);
+  EXPECT_TRUE(result.hasErrorLine(
+      "Detected that a removal old accounts info was in progress. Early return!."));
+  EXPECT_EQ(onlyObject(result)["broadcasts"], nlohmann::json::array());
+  EXPECT_FALSE(exists(kLegacyMailPath));
+  EXPECT_FALSE(exists(kSentinelPath));
+  EXPECT_EQ(readText(kSettingsPath), settingsBefore);
+}
+
+TEST_F(DriverResult, WithNothingToMigrateItIsTrueAndTheFileIsWrittenAgain) {
+  write(kSettingsPath, accountSettings(20));
+  writeText("/var/mobile/Library/Mail/AutoFetchEnabled", "");
+
+  const ProgramResult result = migrate();
+
+  EXPECT_EQ(result.exitStatus, 0);
+  EXPECT_EQ(result.errors, "");
+  EXPECT_EQ(readDictionary(kSettingsPath), accountSettings(12));
+  EXPECT_FALSE(exists("/var/mobile/Library/Mail/AutoFetchEnabled"));
+}
+
+TEST_F(DriverResult, OnANewDeviceItIsTrueAndAnEmptyFileIsWritten) {
+  const ProgramResult result = migrate();
+
+  EXPECT_EQ(result.exitStatus, 0);
+  EXPECT_EQ(readDictionary(kSettingsPath), accountSettings(12));
+}
+
+TEST_F(DriverResult, WithAnOldSettingsFileItIsThatOfTheUpgradeChain) {
+  write(kSettingsPath, accountSettings(3));
+
+  const ProgramResult result = migrate();
+
+  EXPECT_EQ(result.exitStatus, 0);
+  EXPECT_TRUE(result.hasErrorLine("Migrating accounts"));
+  EXPECT_EQ(readDictionary(kSettingsPath), accountSettings(12));
+}
+
+TEST_F(DriverResult, AFailedConversionIsNotTheResultOfTheMigration) {
+  write(kLegacyExchangePath,
+        PropertyDictionary{{"DAAccountsKey", PropertyArray{PropertyDictionary{}}}});
+
+  const ProgramResult result = migrate();
+
+  EXPECT_EQ(result.exitStatus, 0);
+  EXPECT_NE(result.errors.find("Could not convert the description for the Exchange account"),
+            std::string::npos)
+      << result.errors;
+  EXPECT_FALSE(exists(kLegacyExchangePath));
+}
+
+}  // namespace
+}  // namespace accounts

@@ -1,0 +1,140 @@
+#include "tests/program/DeviceRootFixture.h"
+
+namespace accounts {
+namespace {
+
+constexpr int kMissingInput = 66;
+constexpr int kCannotCreate = 73;
+constexpr int kInputOutputError = 74;
+
+/// Errors of the host's own, with a device that a migration would change.
+class HostError : public DeviceRootFixture {
+ protected:
+  HostError() { write(kSettingsPath, accountSettings(11)); }
+
+  /// The run ends with this status and one line that names the cause, and the device is untouched.
+  void expectUntouched(const std::vector<std::string>& arguments, int exitStatus,
+                       const std::string& naming) {
+    const std::vector<std::string> filesBefore = files();
+    const std::string settingsBefore = readText(kSettingsPath);
+
+    const ProgramResult result = migrate(arguments);
+
+    EXPECT_EQ(result.exitStatus, exitStatus);
+    EXPECT_EQ(result.output, "");
+    ASSERT_EQ(result.errorLines().size(), 1U) << result.errors;
+    EXPECT_TRUE(result.errors.starts_with("migration-host: ")) << result.errors;
+    EXPECT_NE(result.errors.find(naming), std::string::npos) << result.errors;
+    EXPECT_EQ(files(), filesBefore);
+    EXPECT_EQ(readText(kSettingsPath), settingsBefore);
+  }
+};
+
+TEST_F(HostError, AMissingRootIsNamed) {
+  const std::string missing = onThisMachine("/missing").string();
+
+  const ProgramResult result =
+      runProgram({.program = MIGRATION_HOST, .arguments = {"run", "--root", missing}});
+
+  EXPECT_EQ(result.exitStatus, kMissingInput);
+  ASSERT_EQ(result.errorLines().size(), 1U) << result.errors;
+  EXPECT_NE(result.errors.find(missing), std::string::npos) << result.errors;
+}
+
+TEST_F(HostError, ARootThatIsAFileIsNoRoot) {
+  const std::string file = onThisMachine(kSettingsPath).string();
+
+  const ProgramResult result =
+      runProgram({.program = MIGRATION_HOST, .arguments = {"run", "--root", file}});
+
+  EXPECT_EQ(result.exitStatus, kMissingInput);
+  EXPECT_EQ(result.errorLines().size(), 1U) << result.errors;
+}
+
+TEST_F(HostError, AMissingRootIsReportedAsAnObjectToo) {
+  const std::string missing = onThisMachine("/missing").string();
+
+  const ProgramResult result =
+      runProgram({.program = MIGRATION_HOST, .arguments = {"run", "--root", missing, "--json"}});
+
+  const nlohmann::json object = onlyObject(result);
+  EXPECT_EQ(object["root"], missing);
+  EXPECT_EQ(object["result"], false);
+  EXPECT_EQ(object["broadcasts"], nlohmann::json::array());
+  EXPECT_EQ(object["cloudTabAnnouncements"], 0);
+  EXPECT_EQ(object["exitStatus"], kMissingInput);
+  EXPECT_TRUE(object["error"].is_string());
+}
+
+TEST_F(HostError, ANamedDeviceDescriptionMustExist) {
+  expectUntouched({"--device", onThisMachine("/missing.plist").string()}, kMissingInput,
+                  "missing.plist");
+}
+
+TEST_F(HostError, ANamedDeviceDescriptionMustBeReadable) {
+  writeText("/broken.plist", "this is no property list");
+
+  expectUntouched({"--device", onThisMachine("/broken.plist").string()}, kMissingInput,
+                  "broken.plist");
+}
+
+TEST_F(HostError, ADeviceDescriptionMustBeADictionary) {
+  write("/array.plist", PropertyArray{"CPUArchitecture"});
+
+  expectUntouched({"--device", onThisMachine("/array.plist").string()}, kMissingInput,
+                  "array.plist");
+}
+
+TEST_F(HostError, TheRootsOwnDeviceDescriptionMustBeReadable) {
+  writeText(kDevicePropertyListPath, "<plist><dict>");
+
+  expectUntouched({}, kMissingInput, "device.plist");
+}
+
+TEST_F(HostError, TheRootsOwnDeviceDescriptionMayBeMissing) {
+  EXPECT_EQ(migrate().exitStatus, 0);
+}
+
+TEST_F(HostError, AMissingBundleIsNamed) {
+  expectUntouched({"--plugin", onThisMachine("/other.migrator").string()}, kMissingInput,
+                  "other.migrator");
+}
+
+TEST_F(HostError, ABundleWithoutAPluginIsNamed) {
+  std::filesystem::create_directory(onThisMachine("/empty.migrator"));
+
+  expectUntouched({"--plugin", onThisMachine("/empty.migrator").string()}, kMissingInput,
+                  "empty.migrator");
+}
+
+TEST_F(HostError, APluginThatIsNoSharedObjectCannotBeLoaded) {
+  writeText("/broken.migrator/AccountsDataMigrator.so", "no shared object");
+  std::filesystem::create_directory(onThisMachine("/broken.migrator/Resources"));
+
+  expectUntouched({"--plugin", onThisMachine("/broken.migrator").string()}, kMissingInput,
+                  "broken.migrator");
+}
+
+TEST_F(HostError, APluginWithoutAnEntryPointCannotBeLoaded) {
+  expectUntouched({"--plugin", EMPTY_BUNDLE}, kMissingInput, "CreateMigrationPlugin");
+}
+
+TEST_F(HostError, AChannelThatCannotBeCreatedIsNamed) {
+  expectUntouched({"--channel", onThisMachine("/missing/channel.log").string()}, kCannotCreate,
+                  "channel.log");
+}
+
+TEST_F(HostError, AFullStandardOutputIsAnError) {
+  ProgramCall call = migrationCall({"--json"});
+  call.outputFile = "/dev/full";
+
+  const ProgramResult result = runProgram(call);
+
+  EXPECT_EQ(result.exitStatus, kInputOutputError);
+  EXPECT_TRUE(
+      result.hasErrorLine("migration-host: The result cannot be written to standard output"))
+      << result.errors;
+}
+
+}  // namespace
+}  // namespace accounts

@@ -1,0 +1,91 @@
+#include "tests/program/RunProgram.h"
+
+#include <fcntl.h>
+#include <grp.h>
+#include <sys/mman.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <array>
+#include <cstdlib>
+#include <sstream>
+
+namespace accounts {
+namespace {
+
+constexpr int kCannotStart = 127;
+
+std::vector<std::string> linesOf(const std::string& text) {
+  std::vector<std::string> lines;
+  std::istringstream stream(text);
+  for (std::string line; std::getline(stream, line);) {
+    lines.push_back(line);
+  }
+  return lines;
+}
+
+std::string contentsOf(int file) {
+  std::string text;
+  std::array<char, 4096> part{};
+  ssize_t count = 0;
+  while ((count = pread(file, part.data(), part.size(), static_cast<off_t>(text.size()))) > 0) {
+    text.append(part.data(), static_cast<std::size_t>(count));
+  }
+  close(file);
+  return text;
+}
+
+bool becomeUser(uid_t user) {
+  return setgroups(0, nullptr) == 0 && setgid(user) == 0 && setuid(user) == 0;
+}
+
+[[noreturn]] void startProgram(const ProgramCall& call, int output, int errors) {
+  dup2(open("/dev/null", O_RDONLY | O_CLOEXEC), STDIN_FILENO);
+  const int outputFile =
+      call.outputFile ? open(call.outputFile->c_str(), O_WRONLY | O_CLOEXEC) : output;
+  dup2(outputFile, STDOUT_FILENO);
+  dup2(errors, STDERR_FILENO);
+  for (const auto& [name, value] : call.environment) {
+    setenv(name.c_str(), value.c_str(), 1);
+  }
+  std::vector<char*> arguments{const_cast<char*>(call.program.c_str())};
+  for (const std::string& argument : call.arguments) {
+    arguments.push_back(const_cast<char*>(argument.c_str()));
+  }
+  arguments.push_back(nullptr);
+  if (!call.user || becomeUser(*call.user)) {
+    execvp(call.program.c_str(), arguments.data());
+  }
+  _exit(kCannotStart);
+}
+
+}  // namespace
+
+std::vector<std::string> ProgramResult::outputLines() const {
+  return linesOf(output);
+}
+
+std::vector<std::string> ProgramResult::errorLines() const {
+  return linesOf(errors);
+}
+
+bool ProgramResult::hasErrorLine(const std::string& line) const {
+  const std::vector<std::string> lines = errorLines();
+  return std::find(lines.begin(), lines.end(), line) != lines.end();
+}
+
+ProgramResult runProgram(const ProgramCall& call) {
+  const int output = memfd_create("output", MFD_CLOEXEC);
+  const int errors = memfd_create("errors", MFD_CLOEXEC);
+  const pid_t child = fork();
+  if (child == 0) {
+    startProgram(call, output, errors);
+  }
+  int status = 0;
+  waitpid(child, &status, 0);
+  return ProgramResult{WIFSIGNALED(status) ? -WTERMSIG(status) : WEXITSTATUS(status),
+                       contentsOf(output), contentsOf(errors)};
+}
+
+}  // namespace accounts

@@ -1,0 +1,41 @@
+#pragma once
+
+#include <sys/types.h>
+#include <map>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace accounts {
+
+/// How a program is to be run.
+struct ProgramCall {
+  std::string program;
+  std::vector<std::string> arguments;
+  /// Set in the program's environment in addition to the test's own.
+  std::map<std::string, std::string> environment = {};
+  /// The user that the program runs as, with the group of the same number and no others; none for
+  /// the test's own. Needs a test that is run by root.
+  std::optional<uid_t> user = {};
+  /// Where standard output goes instead of into the result.
+  std::optional<std::string> outputFile = {};
+};
+
+/// What a program left behind when it ended.
+struct ProgramResult {
+  /// Its exit status; the number of the signal that ended it, negative, when one did.
+  int exitStatus = 0;
+  std::string output;
+  std::string errors;
+
+  /// The lines of standard output and of standard error, without their ends.
+  [[nodiscard]] std::vector<std::string> outputLines() const;
+  [[nodiscard]] std::vector<std::string> errorLines() const;
+  /// Whether standard error has exactly this line.
+  [[nodiscard]] bool hasErrorLine(const std::string& line) const;
+};
+
+/// Runs a program to its end, standard input being empty.
+ProgramResult runProgram(const ProgramCall& call);
+
+}  // namespace accounts
