@@ -1,0 +1,131 @@
+// How fast property lists are read and written. Build with the release preset, then
+//   build/release/propertylist_bench
+// Bytes per second are those of the file, so that the figures can be set beside copying it.
+
+#include <benchmark/benchmark.h>
+#include <expat.h>
+
+#include <cstring>
+#include <string>
+#include <vector>
+
+#include "AccountsCorpus.h"
+#include "propertylist/BinaryPropertyList.h"
+#include "propertylist/XMLPropertyList.h"
+
+namespace accounts::bench {
+namespace {
+
+const PropertyValue& corpus() {
+  static const PropertyValue value = accountsCorpus(10'000);
+  return value;
+}
+
+const std::string& binaryFile() {
+  static const std::string file = [] {
+    PropertyListError error;
+    return writeBinaryPropertyList(corpus(), error).value();
+  }();
+  return file;
+}
+
+const std::string& xmlFile() {
+  static const std::string file = xmlOf(corpus());
+  return file;
+}
+
+void countBytes(benchmark::State& state, std::size_t size) {
+  state.SetBytesProcessed(state.iterations() * static_cast<std::int64_t>(size));
+  state.counters["fileBytes"] = static_cast<double>(size);
+}
+
+void copyBytes(benchmark::State& state) {
+  const std::string& file = binaryFile();
+  std::vector<char> target(file.size());
+  for (auto _ : state) {
+    std::memcpy(target.data(), file.data(), file.size());
+    benchmark::ClobberMemory();
+  }
+  countBytes(state, file.size());
+}
+BENCHMARK(copyBytes)->Unit(benchmark::kMillisecond);
+
+void readBinary(benchmark::State& state) {
+  PropertyListError error;
+  for (auto _ : state) {
+    std::optional<PropertyValue> value = readBinaryPropertyList(binaryFile(), error);
+    benchmark::DoNotOptimize(value);
+    state.PauseTiming();
+    value.reset();
+    state.ResumeTiming();
+  }
+  countBytes(state, binaryFile().size());
+}
+BENCHMARK(readBinary)->Unit(benchmark::kMillisecond);
+
+void readBinaryAndLetGo(benchmark::State& state) {
+  PropertyListError error;
+  for (auto _ : state) {
+    std::optional<PropertyValue> value = readBinaryPropertyList(binaryFile(), error);
+    benchmark::DoNotOptimize(value);
+  }
+  countBytes(state, binaryFile().size());
+}
+BENCHMARK(readBinaryAndLetGo)->Unit(benchmark::kMillisecond);
+
+void writeValue(benchmark::State& state, const PropertyValue& value) {
+  PropertyListError error;
+  for (auto _ : state) {
+    std::optional<std::string> file = writeBinaryPropertyList(value, error);
+    benchmark::DoNotOptimize(file);
+  }
+  countBytes(state, binaryFile().size());
+}
+
+// Equal texts share their memory, as after reading a file.
+void writeBinaryAfterReading(benchmark::State& state) {
+  PropertyListError error;
+  writeValue(state, readBinaryPropertyList(binaryFile(), error).value());
+}
+BENCHMARK(writeBinaryAfterReading)->Unit(benchmark::kMillisecond);
+
+// Every text has memory of its own, keys too.
+void writeBinaryBuiltInMemory(benchmark::State& state) {
+  writeValue(state, corpus());
+}
+BENCHMARK(writeBinaryBuiltInMemory)->Unit(benchmark::kMillisecond);
+
+void readXML(benchmark::State& state) {
+  PropertyListError error;
+  for (auto _ : state) {
+    std::optional<PropertyValue> value = readXMLPropertyList(xmlFile(), error);
+    benchmark::DoNotOptimize(value);
+    state.PauseTiming();
+    value.reset();
+    state.ResumeTiming();
+  }
+  countBytes(state, xmlFile().size());
+}
+BENCHMARK(readXML)->Unit(benchmark::kMillisecond);
+
+// What expat takes to deliver the same file's events to somebody who does nothing with them.
+void expatAlone(benchmark::State& state) {
+  for (auto _ : state) {
+    const XML_Parser parser = XML_ParserCreate(nullptr);
+    XML_SetElementHandler(
+        parser, [](void*, const char*, const char**) {}, [](void*, const char*) {});
+    XML_SetCharacterDataHandler(parser, [](void*, const char*, int) {});
+    const std::string& file = xmlFile();
+    const XML_Status status =
+        XML_Parse(parser, file.data(), static_cast<int>(file.size()), /*isFinal=*/1);
+    benchmark::DoNotOptimize(status);
+    XML_ParserFree(parser);
+  }
+  countBytes(state, xmlFile().size());
+}
+BENCHMARK(expatAlone)->Unit(benchmark::kMillisecond);
+
+}  // namespace
+}  // namespace accounts::bench
+
+BENCHMARK_MAIN();
