@@ -102,9 +102,12 @@ void AccountsManager::_loadChildrenFromAccount(const BasicAccountReference& acco
                    "Ignoring unknown child account with properties %@",
                    [&] { return logArguments(element); });
     } else if (parentIdentifier) {
+      const Text* indexedParent = _childAccountIDToParentAccountID.find(*identifier);
+      if (indexedParent == nullptr || *indexedParent != *parentIdentifier) {
+        _childIdentifiersByParentID[*parentIdentifier].push_back(*identifier);
+      }
       _childAccountsByID.set(*identifier, child);
       _childAccountIDToParentAccountID.set(*identifier, *parentIdentifier);
-      _childIdentifiersByParentID[*parentIdentifier].push_back(*identifier);
     }
   }
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <map>
 #include <memory>
 #include <optional>
 #include <string>
@@ -25,6 +26,9 @@ std::string accountSettingsAccountsPath();
 }
 
 namespace accounts {
+
+/// What happened to an account between two saves. The numbers are those of change records.
+enum class AccountChangeType : std::int32_t { Added = 0, Modified = 1, Deleted = 2 };
 
 /// The account-settings store: the accounts of the account settings file in memory, to be looked
 /// up, changed and saved. All changes stay in memory until saveAllAccounts(). Nothing reports an
@@ -109,6 +113,48 @@ class AccountsManager {
       const PropertyDictionary& inMemory, const std::optional<PropertyDictionary>& original,
       const std::optional<PropertyDictionary>& onDisk);
 
+  // Full accounts (AccountsManagerFullAccounts.cpp). A full account that cannot be made is a fatal
+  // assertion.
+
+  /// The full account of the first account of type "OnMyDevice", which is created, in memory, if
+  /// the store has none. Never null.
+  FullAccountReference fullDeviceLocalAccount();
+  /// The full account of the top-level account with an identifier, else of the child with it; null
+  /// for no, an empty or an unknown identifier. The loader may be null.
+  [[nodiscard]] FullAccountReference fullAccountWithIdentifier_loader(
+      std::optional<std::string_view> identifier, FullAccountLoader* loader) const;
+  /// The full accounts of these types in store order, each top-level account followed by its
+  /// children.
+  [[nodiscard]] std::vector<FullAccountReference> accountsWithTypes(const Types& types) const;
+  [[nodiscard]] std::vector<FullAccountReference> accountsWithTypes_withLoader(
+      const Types& types, FullAccountLoader* loader) const;
+  /// The full accounts of the types "Mail", "Velmora", "Gmail" and "Yahoo".
+  [[nodiscard]] std::vector<FullAccountReference> allMailAccounts() const;
+
+  // Change notifications (AccountsManagerNotifications.cpp). An error in the account-creation map,
+  // a framework that cannot be loaded and a class that cannot be found are fatal assertions.
+
+  /// The names of the notifier classes that a change of a dataclass concerns, in the map's order,
+  /// duplicates kept; their frameworks are loaded.
+  static std::vector<Text> _notifierClassNamesForAccountType_dataclass(std::string_view type,
+                                                                       std::string_view dataclass);
+  /// Tells the notifiers concerned that a dataclass of an account is about to change, or did.
+  static void accountWillChange_forDataclass(const BasicAccount& account,
+                                             std::string_view dataclass);
+  static void accountDidChange_forDataclass(const BasicAccount& account,
+                                            std::string_view dataclass);
+  /// The localised name of a group of accounts; only subscribed calendars have one.
+  static std::optional<std::string> displayNameForGroupOfAccountType_forBeginningOfSentence(
+      std::string_view type, bool beginningOfSentence);
+  /// Change records by the name of the notifier class that receives them.
+  using NotificationBatch = std::map<Text, std::vector<PropertyValue>, std::less<>>;
+  /// Adds a record of a change for each notifier class that it concerns. The original properties
+  /// are none for an added account, the current ones none for a deleted one.
+  static void _addNotificationToDictionary_forChangeType_originalProperties_currentProperties(
+      NotificationBatch& batch, AccountChangeType changeType,
+      const std::optional<PropertyDictionary>& original,
+      const std::optional<PropertyDictionary>& current);
+
   // Migration support (AccountsManagerMigrationSupport.cpp)
 
   /// Makes the migration lock and takes it, waiting while another process holds it. Null when no
@@ -170,6 +216,8 @@ class AccountsManager {
   // Saving
   /// Runs the fixers on all top-level accounts; whether one of them changed something.
   bool _fixAccountsBeforeSaving();
+  /// Tells every notifier class, in one call each, what changed since the baseline was taken.
+  void _sendNotificationsForChangedAccounts() const;
   /// The contents of the file to write: all top-level accounts, merged with the file as it is now.
   [[nodiscard]] PropertyDictionary _mergedRoot() const;
 

@@ -96,6 +96,7 @@ void AccountsManager::saveAllAccounts() {
   // Kept on purpose: while notifications are skipped the baseline stays, so that the next save that
   // notifies reports every change since the last one that did.
   if (isSaved && !Process::current().shouldSkipNotifications) {
+    _sendNotificationsForChangedAccounts();
     _setOriginalAccountDictionaries();
   }
 }

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <functional>
 #include <memory>
 #include <optional>
 #include <string>
@@ -7,6 +8,7 @@
 #include <unordered_set>
 
 #include "accountsettings/AccountVocabulary.h"
+#include "platform/AccountFramework.h"
 #include "propertylist/PropertyValue.h"
 
 namespace accounts {
@@ -19,11 +21,11 @@ using BasicAccountReference = std::shared_ptr<BasicAccount>;
 /// supports, is provisioned for and has enabled, its parent, and a snapshot of the dictionary as
 /// last loaded or saved. Operations whose names begin with an underscore are for this system's own
 /// use. Not for use by several threads at once.
-class BasicAccount {
+class BasicAccount : public AccountRecord, public std::enable_shared_from_this<BasicAccount> {
  public:
   BasicAccount(const BasicAccount&) = delete;
   BasicAccount& operator=(const BasicAccount&) = delete;
-  virtual ~BasicAccount() = default;
+  ~BasicAccount() override = default;
 
   // Creation (BasicAccount.cpp)
 
@@ -78,7 +80,8 @@ class BasicAccount {
   // Properties (BasicAccountProperties.cpp)
 
   /// The account's own value for a key, else its parent's; none when neither has one.
-  [[nodiscard]] std::optional<PropertyValue> accountPropertyForKey(std::string_view key) const;
+  [[nodiscard]] std::optional<PropertyValue> accountPropertyForKey(
+      std::string_view key) const override;
   /// The same, if the value found is a text (an array, a dictionary); none otherwise.
   [[nodiscard]] std::optional<Text> textPropertyForKey(std::string_view key) const;
   [[nodiscard]] std::optional<PropertyArray> arrayPropertyForKey(std::string_view key) const;
@@ -97,7 +100,7 @@ class BasicAccount {
   void removeAccountPropertyForKey(std::string_view key);
 
   /// The live own dictionary; the reference stays valid, and changes, as long as the record lives.
-  [[nodiscard]] const PropertyDictionary& properties() const { return _properties; }
+  [[nodiscard]] const PropertyDictionary& properties() const override { return _properties; }
   /// The dictionary that the store writes.
   [[nodiscard]] virtual PropertyDictionary propertiesToSave() const { return _properties; }
   [[nodiscard]] const std::optional<PropertyDictionary>& originalProperties() const {
@@ -108,8 +111,8 @@ class BasicAccount {
 
   /// The texts under "Type", "Identifier", "Sync Identifier", "Class", "DisplayName", "Type String"
   /// and "Short Type String", own or inherited; none when there is no text.
-  [[nodiscard]] std::optional<Text> type() const;
-  [[nodiscard]] virtual std::optional<Text> identifier() const;
+  [[nodiscard]] std::optional<Text> type() const override;
+  [[nodiscard]] std::optional<Text> identifier() const override;
   [[nodiscard]] virtual std::optional<Text> syncStoreIdentifier() const;
   [[nodiscard]] std::optional<Text> accountClass() const;
   [[nodiscard]] virtual std::optional<Text> displayName() const;
@@ -149,6 +152,46 @@ class BasicAccount {
   /// The dataclasses that configuration profiles hide, asked afresh on every call.
   static PropertyArray _profileRestrictedDataclasses();
 
+  // Full and sync accounts, made by the classes that the account-creation map names
+  // (BasicAccountCreators.cpp). An error in the map, a framework that cannot be loaded and a full
+  // account that cannot be made are fatal assertions.
+
+  /// The account-creation map, read once; none when the resource is missing or unreadable.
+  static const std::optional<PropertyDictionary>& _accountCreationMap();
+  /// The account-creation map, read afresh.
+  static std::optional<PropertyDictionary> _creatorsInfo();
+  /// The name of the class that makes companions of a kind ("FullAccount", "SyncAccount") for a
+  /// type, its framework being loaded; none when the type has no creator of the kind. A loader,
+  /// null for none, may load the framework of a full account itself.
+  std::optional<Text> _creatorClassNameForAccountType_creatorType_loader(
+      std::string_view type, std::string_view creatorType, FullAccountLoader* loader) const;
+  std::optional<Text> fullAccountCreatorClassNameForAccountType_loader(
+      std::string_view type, FullAccountLoader* loader) const;
+  std::optional<Text> syncAccountCreatorClassNameForAccountType(std::string_view type) const;
+
+  /// The full account, made on the first call and then always the same; never null.
+  FullAccountReference fullAccountUsingLoader(FullAccountLoader* loader);
+  void setFullAccount(FullAccountReference account);
+  /// The sync account, made on the first call that succeeds; null, with a channel line unless the
+  /// type has no sync accounts, when it cannot be made.
+  SyncAccountReference _cachedSyncAccount();
+
+  /// Forwarded to the sync account, whose answer is the result; none without a sync account.
+  std::optional<PropertyValue> refreshContainerWithIdentifier_forDataclass_isUserRequested(
+      std::string_view identifier, std::string_view dataclass, bool isUserRequested);
+  std::optional<PropertyValue> refreshContainerListForDataclass_isUserRequested(
+      std::string_view dataclass, bool isUserRequested);
+  std::optional<PropertyValue> refreshContainersForDataclass_isUserRequested(
+      std::string_view dataclass, bool isUserRequested);
+  /// The same, not requested by the user.
+  std::optional<PropertyValue> refreshContainerWithIdentifier_forDataclass(
+      std::string_view identifier, std::string_view dataclass);
+  std::optional<PropertyValue> refreshContainerListForDataclass(std::string_view dataclass);
+  std::optional<PropertyValue> refreshContainersForDataclass(std::string_view dataclass);
+  /// Renews nothing: calls the handler at once, once, with the result code 3.
+  static void renewAccountCredentialsWithHandler(
+      const std::function<void(int resultCode)>& handler);
+
  protected:
   BasicAccount() = default;
   /// Does the work of initWithProperties() on a new record. False when the dictionary is not
@@ -161,6 +204,8 @@ class BasicAccount {
 
   std::optional<PropertyDictionary> _originalProperties;
   PropertyDictionary _properties;
+  FullAccountReference _fullAccount;
+  SyncAccountReference _syncAccount;
   BasicAccountReference _parentAccount;
 };
 

@@ -105,6 +105,23 @@ std::shared_ptr<DeviceLocalAccount> DeviceLocalAccount::accountWithProperties(
   return initWithProperties(properties);
 }
 
+void DeviceLocalAccount::registerClass(ClassRegistry& registry) {
+  AccountClass accountClass;
+  accountClass.accountWithBasicAccount = [](const AccountRecordReference& record) {
+    return accountWithBasicAccount(*record);
+  };
+  registry.registerClass(std::string(_identifier()), std::move(accountClass));
+}
+
+std::shared_ptr<DeviceLocalAccount> DeviceLocalAccount::accountWithBasicAccount(
+    const AccountRecord& record) {
+  return initWithProperties(record.properties());
+}
+
+void DeviceLocalAccount::setParentAccount(AccountRecordReference parent) {
+  setParentAccount(std::dynamic_pointer_cast<BasicAccount>(parent));
+}
+
 std::optional<Text> DeviceLocalAccount::identifier() const {
   return Text(_identifier());
 }

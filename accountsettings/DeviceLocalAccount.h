@@ -6,13 +6,22 @@ namespace accounts {
 
 /// The built-in account for data that is kept on the device itself or that comes over a cable from
 /// a computer.
-class DeviceLocalAccount : public BasicAccount {
+class DeviceLocalAccount : public BasicAccount, public FullAccount {
  public:
+  /// Makes the class known by its name, as the full-account class of its own type.
+  static void registerClass(ClassRegistry& registry);
+  /// A new record with the properties of another one; null when they are not accepted.
+  static std::shared_ptr<DeviceLocalAccount> accountWithBasicAccount(const AccountRecord& record);
+
   /// As BasicAccount's operations of these names, giving a DeviceLocalAccount.
   static std::shared_ptr<DeviceLocalAccount> initWithProperties(
       const PropertyDictionary& properties);
   static std::shared_ptr<DeviceLocalAccount> accountWithProperties(
       const PropertyDictionary& properties);
+
+  using BasicAccount::setParentAccount;
+  /// As a full account: takes the parent if it is a record of the store.
+  void setParentAccount(AccountRecordReference parent) override;
 
   /// Always "DeviceLocalAccount", whatever the dictionary holds.
   [[nodiscard]] std::optional<Text> identifier() const override;

@@ -3,6 +3,8 @@
 #include <atomic>
 #include <cstdlib>
 
+#include "accountsettings/DeviceLocalAccount.h"
+
 namespace accounts {
 
 namespace {
@@ -15,6 +17,7 @@ std::atomic<Process*> newestProcess = nullptr;
 Process::Process(Platform& platformOfTheProcess)
     : platform(platformOfTheProcess), previous_(newestProcess) {
   newestProcess = this;
+  DeviceLocalAccount::registerClass(platform.frameworkLoader.classes());
 }
 
 Process::~Process() {

@@ -49,6 +49,7 @@ class Process {
   Once<PropertyDictionary> accountTypesTable;
   Once<std::optional<PropertyDictionary>> dataclassesTable;
   Once<PropertyArray> canonicalDataclasses;
+  Once<std::optional<PropertyDictionary>> accountCreationMap;
   Once<MailServices> mailServices;
   Once<MailDirectoryMarkers> mailDirectoryMarkers;
   Once<bool> usesGoogleMail;

@@ -1,7 +1,6 @@
 #include "host/ChildProcess.h"
 
 #include <fcntl.h>
-#include <csignal>
 #include <sys/mman.h>
 #include <sys/prctl.h>
 #include <sys/wait.h>
@@ -9,6 +8,7 @@
 
 #include <array>
 #include <cerrno>
+#include <csignal>
 #include <cstdlib>
 #include <cstring>
 #include <string_view>

@@ -1,7 +1,7 @@
 #include <fcntl.h>
-#include <csignal>
 #include <unistd.h>
 
+#include <csignal>
 #include <iostream>
 #include <string>
 #include <variant>

@@ -8,6 +8,7 @@
 #include "platform/DeviceInfoService.h"
 #include "platform/ExternalSyncSources.h"
 #include "platform/FileSystem.h"
+#include "platform/FrameworkLoader.h"
 #include "platform/HomeDirectory.h"
 #include "platform/LocalizedStrings.h"
 #include "platform/LogSystem.h"
@@ -33,6 +34,7 @@ struct Platform {
   DeviceInfoService& deviceInfoService;
   ExternalSyncSources& externalSyncSources;
   FileSystem& fileSystem;
+  FrameworkLoader& frameworkLoader;
   HomeDirectory& homeDirectory;
   LocalizedStrings& localizedStrings;
   LogSystem& logSystem;

@@ -26,6 +26,9 @@ class FileDescriptor {
 
   [[nodiscard]] int number() const { return number_; }
 
+  /// Gives the descriptor up without closing it.
+  int release() { return std::exchange(number_, kNone); }
+
  private:
   static constexpr int kNone = -1;
   int number_;

@@ -17,6 +17,7 @@
 #include "platform/linux/LinuxBundleResources.h"
 #include "platform/linux/LinuxConsoleLog.h"
 #include "platform/linux/LinuxDateFormatter.h"
+#include "platform/linux/LinuxFrameworkLoader.h"
 #include "platform/linux/LinuxHomeDirectory.h"
 #include "platform/linux/LinuxLocalizedStrings.h"
 #include "platform/linux/LinuxLogSystem.h"
@@ -69,6 +70,7 @@ struct LinuxPlatform::Parts {
         fileSystem(root, options.temporaryDirectory.value_or(
                              joinedPath(options.homeDirectory, kTemporaryDirectoryInHome))),
         propertyLists(root),
+        frameworkLoader(root),
         homeDirectory(options.homeDirectory),
         mailDirectory(homeDirectory),
         preferenceDomain(propertyLists, homeDirectory),
@@ -86,6 +88,7 @@ struct LinuxPlatform::Parts {
   const DeviceDescription description;
   LinuxFileSystem fileSystem;
   LinuxPropertyLists propertyLists;
+  LinuxFrameworkLoader frameworkLoader;
   LinuxHomeDirectory homeDirectory;
   LinuxMailDirectory mailDirectory;
   LinuxPreferenceDomain preferenceDomain;
@@ -111,6 +114,7 @@ struct LinuxPlatform::Parts {
                        .deviceInfoService = deviceInfoService,
                        .externalSyncSources = externalSyncSources,
                        .fileSystem = fileSystem,
+                       .frameworkLoader = frameworkLoader,
                        .homeDirectory = homeDirectory,
                        .localizedStrings = localizedStrings,
                        .logSystem = logSystem,

@@ -94,8 +94,8 @@ TEST(BundledAccountTypes, EveryActionIsAKnownOne) {
 TEST(BundledAccountTypes, EveryDataclassThatCanBeSwitchedOffersAnAction) {
   FakeProcess device;
   for (const std::string_view* type : allTypes) {
-    for (const PropertyValue& dataclass :
-         *BasicAccount::supportedDataclassesForAccountType(*type)) {
+    const PropertyArray supported = BasicAccount::supportedDataclassesForAccountType(*type).value();
+    for (const PropertyValue& dataclass : supported) {
       const std::string_view name = *dataclass.asText();
       EXPECT_FALSE(BasicAccount::userActionsToEnableDataclass_forAccountType(name, *type)->empty())
           << *type << " " << name;

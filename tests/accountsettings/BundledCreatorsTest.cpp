@@ -78,8 +78,9 @@ TEST_F(BundledCreators, EachSupportedDataclassOfATypeHasOneNotifier) {
   for (const auto& [type, entries] : creators) {
     PropertyArray notified;
     for (const PropertyDictionary& description : descriptions(entries, "NotifierAccount")) {
-      for (const PropertyValue& dataclass :
-           *description.arrayForKey(kAccountSupportedDataclasses)) {
+      const PropertyArray dataclasses =
+          description.arrayForKey(kAccountSupportedDataclasses).value();
+      for (const PropertyValue& dataclass : dataclasses) {
         notified.append(dataclass);
       }
     }

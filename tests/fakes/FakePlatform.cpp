@@ -6,13 +6,11 @@
 namespace accounts {
 
 FakePlatform::FakePlatform()
-    : platform{bundleResources,     cloudAccountService, cloudTabService,
-               consoleLog,          dateFormatter,       deviceInfoService,
-               externalSyncSources, fileSystem,          homeDirectory,
-               localizedStrings,    logSystem,           mailDirectory,
-               pairingValueStore,   preferenceDomain,    preferencesBroadcast,
-               profileRestrictions, propertyLists,       sharedResources,
-               uuidGenerator} {
+    : platform{bundleResources,     cloudAccountService, cloudTabService,     consoleLog,
+               dateFormatter,       deviceInfoService,   externalSyncSources, fileSystem,
+               frameworkLoader,     homeDirectory,       localizedStrings,    logSystem,
+               mailDirectory,       pairingValueStore,   preferenceDomain,    preferencesBroadcast,
+               profileRestrictions, propertyLists,       sharedResources,     uuidGenerator} {
   for (const std::string_view path :
        {"/tmp", "/var/mobile/tmp", "/var/mobile/Library/Preferences", "/var/mobile/Library/Mail",
         "/var/mobile/Library/Logs/CrashReporter"}) {

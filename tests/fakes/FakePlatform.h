@@ -25,6 +25,7 @@ class FakePlatform {
   FakeDeviceInfoService deviceInfoService;
   FakeExternalSyncSources externalSyncSources;
   FakeFileSystem fileSystem{journal};
+  FakeFrameworkLoader frameworkLoader;
   FakeHomeDirectory homeDirectory;
   FakeLocalizedStrings localizedStrings;
   FakeLogSystem logSystem;

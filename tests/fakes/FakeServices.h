@@ -11,6 +11,7 @@
 
 #include "platform/Platform.h"
 #include "tests/fakes/FakeFileSystem.h"
+#include "tests/fakes/FakeFrameworkLoader.h"
 
 namespace accounts {
 

@@ -90,7 +90,11 @@ inline AccountBuilder anAccount(std::string_view identifier, std::string_view ty
 /// A device, a migrator and a store that a test fills.
 class MigratorTest : public testing::Test {
  protected:
-  MigratorTest() { device.consoleLog.alsoStandardError = false; }
+  MigratorTest() {
+    device.consoleLog.alsoStandardError = false;
+    // As in a migration: no test of a step may depend on notifiers.
+    AccountsManager::_setShouldSkipNotifications(true);
+  }
 
   /// Puts accounts into the store, in order; no file is involved.
   void openStoreWith(std::initializer_list<AccountBuilder> accounts) {

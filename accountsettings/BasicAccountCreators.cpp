@@ -1,0 +1,204 @@
+#include "accountsettings/BasicAccount.h"
+#include "accountsettings/CreatorFrameworks.h"
+#include "accountsettings/Log.h"
+#include "accountsettings/Process.h"
+
+namespace accounts {
+
+namespace {
+
+constexpr std::string_view kSourceFile = "BasicAccount";
+constexpr std::string_view kFullAccountCreator = "FullAccount";
+constexpr std::string_view kSyncAccountCreator = "SyncAccount";
+
+constexpr std::string_view kCreatorClassNameOperation =
+    "-[BasicAccount _creatorClassNameForAccountType:creatorType:loader:]";
+constexpr std::string_view kFullAccountOperation = "-[BasicAccount fullAccountUsingLoader:]";
+constexpr std::string_view kSyncAccountOperation = "-[BasicAccount(Internal) _cachedSyncAccount]";
+
+/// What the credentials handler is told: its meaning is the caller's framework's.
+constexpr int kCredentialsNotRenewed = 3;
+
+const AccountClass* classNamed(std::string_view name) {
+  return Process::current().platform.frameworkLoader.classes().classNamed(name);
+}
+
+}  // namespace
+
+std::optional<PropertyDictionary> BasicAccount::_creatorsInfo() {
+  return Process::current().platform.bundleResources.readPropertyList("AccountCreators");
+}
+
+const std::optional<PropertyDictionary>& BasicAccount::_accountCreationMap() {
+  return Process::current().accountCreationMap.get(_creatorsInfo);
+}
+
+std::optional<Text> BasicAccount::_creatorClassNameForAccountType_creatorType_loader(
+    std::string_view type, std::string_view creatorType, FullAccountLoader* loader) const {
+  const std::optional<PropertyDictionary>& map = _accountCreationMap();
+  const std::optional<PropertyArray> creators = map ? map->arrayForKey(type) : std::nullopt;
+  if (!creators) {
+    failAssertion(
+        kCreatorClassNameOperation, kSourceFile,
+        "Malformed AccountCreators information. Could not find the information for the type %@",
+        {type});
+  }
+  std::optional<Text> className;
+  // Kept on purpose: the walk goes on after a match, so that every framework of the kind is loaded
+  // and the last class named is the one used.
+  for (const PropertyValue& element : *creators) {
+    const PropertyDictionary* creator = element.asDictionary();
+    if (creator == nullptr || creator->textForKey(kCreatorTypeKey) != creatorType) {
+      continue;
+    }
+    const std::optional<PropertyDictionary> description =
+        creator->dictionaryForKey(kCreatorDescriptionKey);
+    if (!description) {
+      failAssertion(kCreatorClassNameOperation, kSourceFile,
+                    "Malformed AccountCreators information. Could not find the description for the "
+                    "%@ with type %@",
+                    {creatorType, type});
+    }
+    const bool loaderHasLoaded = loader != nullptr && creatorType == kFullAccountCreator &&
+                                 loader->loadBundleForAccountWithProperties(properties());
+    if (!loaderHasLoaded) {
+      const std::optional<Text> framework = description->textForKey(kCreatorFrameworkKey);
+      if (!framework) {
+        failAssertion(kCreatorClassNameOperation, kSourceFile,
+                      "Malformed AccountCreators information. Could not find the path to the "
+                      "framework for the %@ with type %@",
+                      {creatorType, type});
+      }
+      loadCreatorFramework(*framework, kCreatorClassNameOperation, kSourceFile);
+    }
+    className = description->textForKey(kCreatorClassKey);
+    if (!className || className->empty()) {
+      failAssertion(kCreatorClassNameOperation, kSourceFile,
+                    "Malformed AccountCreators information. Could not find the name of the class "
+                    "that creates %@ with the type %@",
+                    {creatorType, type});
+    }
+  }
+  return className;
+}
+
+std::optional<Text> BasicAccount::fullAccountCreatorClassNameForAccountType_loader(
+    std::string_view type, FullAccountLoader* loader) const {
+  return _creatorClassNameForAccountType_creatorType_loader(type, kFullAccountCreator, loader);
+}
+
+std::optional<Text> BasicAccount::syncAccountCreatorClassNameForAccountType(
+    std::string_view type) const {
+  return _creatorClassNameForAccountType_creatorType_loader(type, kSyncAccountCreator, nullptr);
+}
+
+FullAccountReference BasicAccount::fullAccountUsingLoader(FullAccountLoader* loader) {
+  if (_fullAccount != nullptr) {
+    return _fullAccount;
+  }
+  const Text accountType = type().value_or(Text());
+  const std::optional<Text> className =
+      fullAccountCreatorClassNameForAccountType_loader(accountType, loader);
+  const AccountClass* creator = className ? classNamed(*className) : nullptr;
+  if (creator == nullptr) {
+    failAssertion(kFullAccountOperation, kSourceFile,
+                  "The framework/bundle where %@ is defined has not been loaded", {className});
+  }
+  FullAccountReference account;
+  if (creator->classForAccountType) {
+    const AccountClass* accountClass = creator->classForAccountType(accountType);
+    if (accountClass != nullptr && accountClass->initWithProperties) {
+      account = accountClass->initWithProperties(properties());
+    }
+  } else if (creator->accountWithBasicAccount) {
+    account = creator->accountWithBasicAccount(shared_from_this());
+  }
+  if (account == nullptr) {
+    failAssertion(kFullAccountOperation, kSourceFile,
+                  "Could not create the account with class %@ and id %@",
+                  {className, identifier()});
+  }
+  account->setParentAccount(_parentAccount);
+  setFullAccount(account);
+  return _fullAccount;
+}
+
+void BasicAccount::setFullAccount(FullAccountReference account) {
+  _fullAccount = std::move(account);
+}
+
+SyncAccountReference BasicAccount::_cachedSyncAccount() {
+  if (_syncAccount != nullptr) {
+    return _syncAccount;
+  }
+  const std::optional<Text> className =
+      syncAccountCreatorClassNameForAccountType(type().value_or(Text()));
+  if (!className) {
+    return nullptr;
+  }
+  const AccountClass* creator = classNamed(*className);
+  if (creator == nullptr) {
+    logToChannel(kSyncAccountOperation,
+                 "ERROR: The framework/bundle where %@ is defined has not been loaded, so there is "
+                 "no syncable account for basic account with properties %@",
+                 [&] { return logArguments(className, properties()); });
+    return nullptr;
+  }
+  // A failed attempt is not remembered: the next call tries again.
+  if (creator->accountToRefreshForBasicAccount) {
+    _syncAccount = creator->accountToRefreshForBasicAccount(shared_from_this());
+  }
+  if (_syncAccount == nullptr) {
+    logToChannel(kSyncAccountOperation,
+                 "ERROR: Could not create the account with class %@ and id %@",
+                 [&] { return logArguments(className, identifier()); });
+  }
+  return _syncAccount;
+}
+
+std::optional<PropertyValue>
+BasicAccount::refreshContainerWithIdentifier_forDataclass_isUserRequested(
+    std::string_view identifier, std::string_view dataclass, bool isUserRequested) {
+  const SyncAccountReference account = _cachedSyncAccount();
+  return account != nullptr ? account->refreshContainerWithIdentifier_forDataclass_isUserRequested(
+                                  identifier, dataclass, isUserRequested)
+                            : std::nullopt;
+}
+
+std::optional<PropertyValue> BasicAccount::refreshContainerListForDataclass_isUserRequested(
+    std::string_view dataclass, bool isUserRequested) {
+  const SyncAccountReference account = _cachedSyncAccount();
+  return account != nullptr
+             ? account->refreshContainerListForDataclass_isUserRequested(dataclass, isUserRequested)
+             : std::nullopt;
+}
+
+std::optional<PropertyValue> BasicAccount::refreshContainersForDataclass_isUserRequested(
+    std::string_view dataclass, bool isUserRequested) {
+  const SyncAccountReference account = _cachedSyncAccount();
+  return account != nullptr
+             ? account->refreshContainersForDataclass_isUserRequested(dataclass, isUserRequested)
+             : std::nullopt;
+}
+
+std::optional<PropertyValue> BasicAccount::refreshContainerWithIdentifier_forDataclass(
+    std::string_view identifier, std::string_view dataclass) {
+  return refreshContainerWithIdentifier_forDataclass_isUserRequested(identifier, dataclass, false);
+}
+
+std::optional<PropertyValue> BasicAccount::refreshContainerListForDataclass(
+    std::string_view dataclass) {
+  return refreshContainerListForDataclass_isUserRequested(dataclass, false);
+}
+
+std::optional<PropertyValue> BasicAccount::refreshContainersForDataclass(
+    std::string_view dataclass) {
+  return refreshContainersForDataclass_isUserRequested(dataclass, false);
+}
+
+void BasicAccount::renewAccountCredentialsWithHandler(
+    const std::function<void(int resultCode)>& handler) {
+  handler(kCredentialsNotRenewed);
+}
+
+}  // namespace accounts

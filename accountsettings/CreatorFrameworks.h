@@ -1,0 +1,19 @@
+#pragma once
+
+#include <string_view>
+
+namespace accounts {
+
+// Keys of a creator entry in the account-creation map, and of its description.
+inline constexpr std::string_view kCreatorTypeKey = "Type";
+inline constexpr std::string_view kCreatorDescriptionKey = "Description";
+inline constexpr std::string_view kCreatorFrameworkKey = "Framework";
+inline constexpr std::string_view kCreatorClassKey = "Class";
+
+/// Loads the framework at a path beneath the system root, so that the class of a creator or
+/// notifier can be found by name. A framework that cannot be loaded is a fatal assertion in the
+/// given operation and source file.
+void loadCreatorFramework(std::string_view relativePath, std::string_view operation,
+                          std::string_view sourceFile);
+
+}  // namespace accounts

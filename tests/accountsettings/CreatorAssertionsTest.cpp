@@ -1,0 +1,79 @@
+#include "tests/accountsettings/CreatorsFixture.h"
+
+// A broken account-creation map is a programming error: it ends the process, and its text tells the
+// engineer where to look.
+
+namespace accounts {
+namespace {
+
+class CreatorAssertionsDeathTest : public CreatorsTest {
+ protected:
+  /// Expects that a full account for the type "Mail" ends the process with a text.
+  void expectDeathOfFullAccount(const std::string& text) {
+    const BasicAccountReference record = account("A", kMailAccountType);
+    EXPECT_EXIT(static_cast<void>(record->fullAccountUsingLoader(nullptr)),
+                testing::KilledBySignal(SIGABRT), testing::HasSubstr(text));
+  }
+};
+
+TEST_F(CreatorAssertionsDeathTest, ATypeWithoutEntryInTheMap) {
+  setCreators({});
+  expectDeathOfFullAccount(
+      "Malformed AccountCreators information. Could not find the information for the type Mail\n");
+}
+
+TEST_F(CreatorAssertionsDeathTest, ACreatorWithoutDescription) {
+  setCreators({{"Mail", PropertyArray{PropertyDictionary{{"Type", "FullAccount"}}}}});
+  expectDeathOfFullAccount(
+      "Malformed AccountCreators information. Could not find the description for the FullAccount "
+      "with type Mail\n");
+}
+
+TEST_F(CreatorAssertionsDeathTest, ADescriptionWithoutFramework) {
+  setCreators({{"Mail", PropertyArray{creatorEntry("FullAccount", {{"Class", "Creator"}})}}});
+  expectDeathOfFullAccount(
+      "Malformed AccountCreators information. Could not find the path to the framework for the "
+      "FullAccount with type Mail\n");
+}
+
+TEST_F(CreatorAssertionsDeathTest, AFrameworkThatCannotBeLoaded) {
+  setCreators({{"Mail", PropertyArray{fullAccountCreator("Lib/Mail.so", "Creator")}}});
+  frameworkLoader.errors["/Lib/Mail.so"] = "undefined symbol: start";
+  expectDeathOfFullAccount(
+      "Could not load the account creator framework /Lib/Mail.so. Error undefined symbol: start\n");
+}
+
+TEST_F(CreatorAssertionsDeathTest, ADescriptionWithAnEmptyClassName) {
+  setCreators({{"Mail", PropertyArray{fullAccountCreator("Mail.so", "")}}});
+  expectDeathOfFullAccount(
+      "Malformed AccountCreators information. Could not find the name of the class that creates "
+      "FullAccount with the type Mail\n");
+}
+
+TEST_F(CreatorAssertionsDeathTest, AClassThatTheFrameworkDoesNotBring) {
+  setCreators({{"Mail", PropertyArray{fullAccountCreator("Mail.so", "Creator")}}});
+  expectDeathOfFullAccount("The framework/bundle where Creator is defined has not been loaded\n");
+}
+
+TEST_F(CreatorAssertionsDeathTest, AClassThatMakesNoFullAccounts) {
+  setCreators({{"Mail", PropertyArray{fullAccountCreator("Mail.so", "Creator")}}});
+  frameworkLoader.registerClass("Creator", AccountClass());
+  expectDeathOfFullAccount("Could not create the account with class Creator and id A\n");
+}
+
+TEST_F(CreatorAssertionsDeathTest, AClassThatNamesNoneForTheType) {
+  setCreators({{"Mail", PropertyArray{fullAccountCreator("Mail.so", "Creator")}}});
+  AccountClass creator;
+  creator.classForAccountType = [](std::string_view) { return nullptr; };
+  frameworkLoader.registerClass("Creator", creator);
+  expectDeathOfFullAccount("Could not create the account with class Creator and id A\n");
+}
+
+TEST_F(CreatorAssertionsDeathTest, TheTextNamesTheOperationAndTheSourceFile) {
+  setCreators({});
+  expectDeathOfFullAccount(
+      "-[BasicAccount _creatorClassNameForAccountType:creatorType:loader:], BasicAccount: ");
+}
+
+}  // namespace
+}  // namespace accounts
