@@ -1,7 +1,7 @@
 #include <algorithm>
 
+#include "accountsettings/AccountCreators.h"
 #include "accountsettings/AccountsManager.h"
-#include "accountsettings/CreatorFrameworks.h"
 #include "accountsettings/Log.h"
 #include "accountsettings/Process.h"
 
@@ -114,16 +114,9 @@ void callNotifiers(const BasicAccount& account, std::string_view dataclass,
 
 std::vector<Text> AccountsManager::_notifierClassNamesForAccountType_dataclass(
     std::string_view type, std::string_view dataclass) {
-  const DictionaryOrNone& map = BasicAccount::_accountCreationMap();
-  const std::optional<PropertyArray> creators = map ? map->arrayForKey(type) : std::nullopt;
-  if (!creators) {
-    failAssertion(
-        kNotifierClassNamesOperation, kSourceFile,
-        "Malformed AccountCreators information. Could not find the information for the type %@",
-        {type});
-  }
   std::vector<Text> classNames;
-  for (const PropertyValue& element : *creators) {
+  for (const PropertyValue& element :
+       creatorEntriesForType(type, kNotifierClassNamesOperation, kSourceFile)) {
     const PropertyDictionary* creator = element.asDictionary();
     if (creator == nullptr || creator->textForKey(kCreatorTypeKey) != kNotifierCreator) {
       continue;

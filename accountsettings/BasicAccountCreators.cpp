@@ -1,5 +1,5 @@
+#include "accountsettings/AccountCreators.h"
 #include "accountsettings/BasicAccount.h"
-#include "accountsettings/CreatorFrameworks.h"
 #include "accountsettings/Log.h"
 #include "accountsettings/Process.h"
 
@@ -35,18 +35,11 @@ const std::optional<PropertyDictionary>& BasicAccount::_accountCreationMap() {
 
 std::optional<Text> BasicAccount::_creatorClassNameForAccountType_creatorType_loader(
     std::string_view type, std::string_view creatorType, FullAccountLoader* loader) const {
-  const std::optional<PropertyDictionary>& map = _accountCreationMap();
-  const std::optional<PropertyArray> creators = map ? map->arrayForKey(type) : std::nullopt;
-  if (!creators) {
-    failAssertion(
-        kCreatorClassNameOperation, kSourceFile,
-        "Malformed AccountCreators information. Could not find the information for the type %@",
-        {type});
-  }
   std::optional<Text> className;
   // Kept on purpose: the walk goes on after a match, so that every framework of the kind is loaded
   // and the last class named is the one used.
-  for (const PropertyValue& element : *creators) {
+  for (const PropertyValue& element :
+       creatorEntriesForType(type, kCreatorClassNameOperation, kSourceFile)) {
     const PropertyDictionary* creator = element.asDictionary();
     if (creator == nullptr || creator->textForKey(kCreatorTypeKey) != creatorType) {
       continue;

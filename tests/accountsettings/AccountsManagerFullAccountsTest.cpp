@@ -93,18 +93,12 @@ TEST_F(FullAccountsOfStoreTest, AChildThatWentToAnotherParentIsGivenOutUnderThat
 }
 
 TEST_F(FullAccountsOfStoreTest, ALoaderIsAskedForEachAccount) {
-  struct Loader : FullAccountLoader {
-    int calls = 0;
-    bool loadBundleForAccountWithProperties(const PropertyDictionary&) override {
-      ++calls;
-      return true;
-    }
-  } loader;
+  RecordingLoader loader;
   store_->insertAccount(account("A", kMailAccountType));
   store_->insertAccount(account("B", kMailAccountType));
 
   EXPECT_EQ(store_->accountsWithTypes_withLoader({kMailAccountType}, &loader).size(), 2U);
-  EXPECT_EQ(loader.calls, 2);
+  EXPECT_EQ(loader.asked.size(), 2U);
 }
 
 TEST_F(FullAccountsOfStoreTest, MailAccountsAreThoseOfFourTypes) {

@@ -67,6 +67,17 @@ inline BasicAccountReference account(std::string_view identifier, std::string_vi
   return BasicAccount::initWithProperties(more);
 }
 
+/// A caller's loader that remembers what it was asked.
+struct RecordingLoader : FullAccountLoader {
+  bool hasLoaded = true;
+  std::vector<PropertyDictionary> asked;
+
+  bool loadBundleForAccountWithProperties(const PropertyDictionary& properties) override {
+    asked.push_back(properties);
+    return hasLoaded;
+  }
+};
+
 /// A device whose account-creation map a test gives.
 class CreatorsTest : public testing::Test, protected FakeProcess {
  protected:

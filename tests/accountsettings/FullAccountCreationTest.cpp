@@ -90,13 +90,7 @@ TEST_F(FullAccountCreationTest, TheDeviceLocalAccountsClassIsTheSystemsOwn) {
 }
 
 TEST_F(FullAccountCreationTest, ALoaderThatHasLoadedTheFrameworkKeepsTheMapsFromBeingLoaded) {
-  struct Loader : FullAccountLoader {
-    PropertyDictionary asked;
-    bool loadBundleForAccountWithProperties(const PropertyDictionary& properties) override {
-      asked = properties;
-      return true;
-    }
-  } loader;
+  RecordingLoader loader;
   setCreators({{"Mail", PropertyArray{fullAccountCreator("Mail.so", "MailCreator")}}});
   frameworkLoader.registerClass("MailCreator", classMakingAccountsFromRecords());
   const BasicAccountReference record = account("A", kMailAccountType);
@@ -104,14 +98,13 @@ TEST_F(FullAccountCreationTest, ALoaderThatHasLoadedTheFrameworkKeepsTheMapsFrom
   const FullAccountReference made = record->fullAccountUsingLoader(&loader);
 
   EXPECT_NE(made, nullptr) << "the class name still comes from the map";
-  EXPECT_EQ(loader.asked, record->properties());
+  EXPECT_EQ(loader.asked, std::vector<PropertyDictionary>{record->properties()});
   EXPECT_TRUE(frameworkLoader.loads.empty());
 }
 
 TEST_F(FullAccountCreationTest, ALoaderThatHasNotLoadedTheFrameworkLeavesItToTheMap) {
-  struct Loader : FullAccountLoader {
-    bool loadBundleForAccountWithProperties(const PropertyDictionary&) override { return false; }
-  } loader;
+  RecordingLoader loader;
+  loader.hasLoaded = false;
   setCreators({{"Mail", PropertyArray{fullAccountCreator("Mail.so", "MailCreator")}}});
   frameworkLoader.frameworks["/Mail.so"] = {{"MailCreator", classMakingAccountsFromRecords()}};
 

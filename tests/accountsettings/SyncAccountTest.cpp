@@ -110,18 +110,12 @@ TEST_F(SyncAccountTest, AFailedAttemptIsLoggedAndMadeAgainTheNextTime) {
 }
 
 TEST_F(SyncAccountTest, TheLookupNeverAsksALoader) {
-  struct Loader : FullAccountLoader {
-    int calls = 0;
-    bool loadBundleForAccountWithProperties(const PropertyDictionary&) override {
-      ++calls;
-      return true;
-    }
-  } loader;
+  RecordingLoader loader;
 
   EXPECT_EQ(
       record_->_creatorClassNameForAccountType_creatorType_loader("Mail", "SyncAccount", &loader),
       "MailSync");
-  EXPECT_EQ(loader.calls, 0);
+  EXPECT_TRUE(loader.asked.empty());
   EXPECT_EQ(frameworkLoader.loads, std::vector<std::string>{"/Mail.so"});
 }
 

@@ -2,6 +2,8 @@
 
 #include <string_view>
 
+#include "propertylist/PropertyValue.h"
+
 namespace accounts {
 
 // Keys of a creator entry in the account-creation map, and of its description.
@@ -9,6 +11,11 @@ inline constexpr std::string_view kCreatorTypeKey = "Type";
 inline constexpr std::string_view kCreatorDescriptionKey = "Description";
 inline constexpr std::string_view kCreatorFrameworkKey = "Framework";
 inline constexpr std::string_view kCreatorClassKey = "Class";
+
+/// The creator entries of an account type in the account-creation map. A type without an entry is a
+/// fatal assertion in the given operation and source file.
+PropertyArray creatorEntriesForType(std::string_view type, std::string_view operation,
+                                    std::string_view sourceFile);
 
 /// Loads the framework at a path beneath the system root, so that the class of a creator or
 /// notifier can be found by name. A framework that cannot be loaded is a fatal assertion in the

@@ -1,10 +1,24 @@
-#include "accountsettings/CreatorFrameworks.h"
+#include "accountsettings/AccountCreators.h"
 
+#include "accountsettings/BasicAccount.h"
 #include "accountsettings/Log.h"
 #include "accountsettings/Paths.h"
 #include "accountsettings/Process.h"
 
 namespace accounts {
+
+PropertyArray creatorEntriesForType(std::string_view type, std::string_view operation,
+                                    std::string_view sourceFile) {
+  const std::optional<PropertyDictionary>& map = BasicAccount::_accountCreationMap();
+  std::optional<PropertyArray> entries = map ? map->arrayForKey(type) : std::nullopt;
+  if (!entries) {
+    failAssertion(
+        operation, sourceFile,
+        "Malformed AccountCreators information. Could not find the information for the type %@",
+        {type});
+  }
+  return *std::move(entries);
+}
 
 void loadCreatorFramework(std::string_view relativePath, std::string_view operation,
                           std::string_view sourceFile) {
