@@ -9,7 +9,8 @@ namespace accounts {
 
 namespace {
 
-// The one mutable static of the system: everything else that belongs to the process hangs from it.
+// Everything that belongs to the process hangs from this; the plug-in's entry point owns the
+// process that it makes, and there is no other mutable static.
 std::atomic<Process*> newestProcess = nullptr;
 
 }  // namespace

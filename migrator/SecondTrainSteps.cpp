@@ -61,8 +61,12 @@ PropertyDictionary parentProperties(const BasicAccount& hosted) {
   for (const std::string_view key : copiedKeys) {
     copyProperty(hosted, key, properties);
   }
+  // Own values only: a record that stands in several places of the store is wrapped once for each,
+  // and would otherwise take over what its previous parents hold, itself included.
   for (const std::string_view key : movedKeys) {
-    copyProperty(hosted, key, properties);
+    if (const PropertyValue* value = hosted.properties().find(key)) {
+      properties.set(key, *value);
+    }
   }
   return properties;
 }

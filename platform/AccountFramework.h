@@ -27,7 +27,8 @@ class AccountRecord {
 };
 using AccountRecordReference = std::shared_ptr<AccountRecord>;
 
-/// The object that speaks to an account's server.
+/// The object that speaks to an account's server. The record owns it: one that keeps its record
+/// keeps a weak reference, or neither is ever freed.
 class FullAccount {
  public:
   virtual ~FullAccount() = default;
@@ -39,7 +40,8 @@ class FullAccount {
 using FullAccountReference = std::shared_ptr<FullAccount>;
 
 /// The object that refreshes an account's containers (mailboxes, calendars, ...). What a refresh
-/// gives back is passed on to the caller unchanged.
+/// gives back is passed on to the caller unchanged. The record owns it, as it owns the full
+/// account.
 class SyncAccount {
  public:
   virtual ~SyncAccount() = default;

@@ -29,7 +29,7 @@ class ExampleFullAccount : public FullAccount {
 /// asked.
 class ExampleSyncAccount : public SyncAccount {
  public:
-  explicit ExampleSyncAccount(AccountRecordReference record) : record_(std::move(record)) {}
+  explicit ExampleSyncAccount(const AccountRecordReference& record) : record_(record) {}
 
   std::optional<PropertyValue> refreshContainerWithIdentifier_forDataclass_isUserRequested(
       std::string_view identifier, std::string_view dataclass, bool isUserRequested) override {
@@ -47,13 +47,15 @@ class ExampleSyncAccount : public SyncAccount {
  private:
   [[nodiscard]] PropertyValue sentence(std::string_view what, std::string_view dataclass,
                                        bool isUserRequested) const {
-    std::string text = record_->identifier().value_or(Text()).string();
+    const AccountRecordReference record = record_.lock();
+    std::string text = (record ? record->identifier() : std::nullopt).value_or(Text()).string();
     text.append(": ").append(what).append(" of ").append(dataclass);
     text.append(isUserRequested ? ", asked for by the user" : ", asked for by the system");
     return PropertyValue(text);
   }
 
-  AccountRecordReference record_;
+  // Weak, because the record owns this object.
+  std::weak_ptr<AccountRecord> record_;
 };
 
 /// A full-account class that instantiates itself for every account type.

@@ -20,7 +20,7 @@ class FullAccountsOfStoreTest : public CreatorsTest {
   }
 
   static std::string identifierOf(const FullAccountReference& account) {
-    return dynamic_cast<RecordedFullAccount&>(*account).record->identifier()->string();
+    return dynamic_cast<RecordedFullAccount&>(*account).record.lock()->identifier()->string();
   }
 
   static std::vector<std::string> identifiersOf(const std::vector<FullAccountReference>& accounts) {

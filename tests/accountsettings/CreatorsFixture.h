@@ -16,7 +16,8 @@ namespace accounts {
 /// A full account that remembers what it was given.
 struct RecordedFullAccount : FullAccount {
   PropertyDictionary properties;
-  AccountRecordReference record;
+  // Weak, because the record owns this object.
+  std::weak_ptr<AccountRecord> record;
   AccountRecordReference parent;
   int parentCalls = 0;
 

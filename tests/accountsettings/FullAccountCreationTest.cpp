@@ -27,7 +27,7 @@ TEST_F(FullAccountCreationTest, AClassThatNamesAnotherForTheTypeHasThatOneInstan
 
   EXPECT_EQ(typeAsked, "Mail");
   EXPECT_EQ(dynamic_cast<RecordedFullAccount&>(*made).properties, record->properties());
-  EXPECT_EQ(dynamic_cast<RecordedFullAccount&>(*made).record, nullptr)
+  EXPECT_EQ(dynamic_cast<RecordedFullAccount&>(*made).record.lock(), nullptr)
       << "the second choice is not asked";
 }
 
@@ -38,7 +38,7 @@ TEST_F(FullAccountCreationTest, AClassWithTheSecondChoiceAloneMakesTheAccountFro
 
   const FullAccountReference made = record->fullAccountUsingLoader(nullptr);
 
-  EXPECT_EQ(dynamic_cast<RecordedFullAccount&>(*made).record, record);
+  EXPECT_EQ(dynamic_cast<RecordedFullAccount&>(*made).record.lock(), record);
 }
 
 TEST_F(FullAccountCreationTest, TheNewAccountIsToldItsRecordsParentOnce) {

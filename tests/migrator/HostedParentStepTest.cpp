@@ -132,6 +132,16 @@ TEST_F(HostedParentStepTest, AnAbsentIsActiveCountsAsInactiveForTheParentAccount
   EXPECT_FALSE(account(0).isEnabledForDataclass(kAccountDataclassMail));
 }
 
+TEST_F(HostedParentStepTest, ARecordInSeveralPlacesIsTheOnlyChildOfEachOfItsParents) {
+  openStoreWith({hosted(), hosted()});
+  store->updateAccount(store->allBasicAccounts().back());
+
+  migrator._migrateAccountsFrom8B117(*store);
+
+  EXPECT_EQ(children(0).size(), 1u);
+  EXPECT_EQ(children(1).size(), 1u);
+}
+
 TEST_F(HostedParentStepTest, AnInactiveAccountsParentGetsNoMail) {
   runStepOn(hosted().with("IsActive", false).enabledFor({kAccountDataclassNotes}));
 
