@@ -33,4 +33,8 @@ void loadCreatorFramework(std::string_view relativePath, std::string_view operat
   }
 }
 
+const AccountClass* creatorClassNamed(std::string_view name) {
+  return Process::current().platform.frameworkLoader.classes().classNamed(name);
+}
+
 }  // namespace accounts

@@ -2,6 +2,7 @@
 
 #include <string_view>
 
+#include "platform/AccountFramework.h"
 #include "propertylist/PropertyValue.h"
 
 namespace accounts {
@@ -22,5 +23,9 @@ PropertyArray creatorEntriesForType(std::string_view type, std::string_view oper
 /// given operation and source file.
 void loadCreatorFramework(std::string_view relativePath, std::string_view operation,
                           std::string_view sourceFile);
+
+/// The class of a creator or notifier that the loaded frameworks, or the system itself, made known
+/// under a name; null for none.
+const AccountClass* creatorClassNamed(std::string_view name);
 
 }  // namespace accounts

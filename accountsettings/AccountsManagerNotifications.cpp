@@ -23,8 +23,7 @@ constexpr std::string_view kSendOperation =
     "-[AccountsManager _sendNotificationsForChangedAccounts]";
 
 const AccountClass& notifierClassNamed(std::string_view name, std::string_view operation) {
-  const AccountClass* notifier =
-      Process::current().platform.frameworkLoader.classes().classNamed(name);
+  const AccountClass* notifier = creatorClassNamed(name);
   if (notifier == nullptr) {
     failAssertion(operation, kSourceFile, "Could not find a class for class name %@", {name});
   }

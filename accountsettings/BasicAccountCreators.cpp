@@ -19,10 +19,6 @@ constexpr std::string_view kSyncAccountOperation = "-[BasicAccount(Internal) _ca
 /// What the credentials handler is told: its meaning is the caller's framework's.
 constexpr int kCredentialsNotRenewed = 3;
 
-const AccountClass* classNamed(std::string_view name) {
-  return Process::current().platform.frameworkLoader.classes().classNamed(name);
-}
-
 }  // namespace
 
 std::optional<PropertyDictionary> BasicAccount::_creatorsInfo() {
@@ -92,7 +88,7 @@ FullAccountReference BasicAccount::fullAccountUsingLoader(FullAccountLoader* loa
   const Text accountType = type().value_or(Text());
   const std::optional<Text> className =
       fullAccountCreatorClassNameForAccountType_loader(accountType, loader);
-  const AccountClass* creator = className ? classNamed(*className) : nullptr;
+  const AccountClass* creator = className ? creatorClassNamed(*className) : nullptr;
   if (creator == nullptr) {
     failAssertion(kFullAccountOperation, kSourceFile,
                   "The framework/bundle where %@ is defined has not been loaded", {className});
@@ -129,7 +125,7 @@ SyncAccountReference BasicAccount::_cachedSyncAccount() {
   if (!className) {
     return nullptr;
   }
-  const AccountClass* creator = classNamed(*className);
+  const AccountClass* creator = creatorClassNamed(*className);
   if (creator == nullptr) {
     logToChannel(kSyncAccountOperation,
                  "ERROR: The framework/bundle where %@ is defined has not been loaded, so there is "
