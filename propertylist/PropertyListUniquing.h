@@ -38,7 +38,9 @@ class KeyedHash {
       state =
           fold(word<std::uint32_t>(place) ^ second_, word<std::uint32_t>(place + size - 4) ^ state);
     } else if (size > 0) {
-      const auto byte = [&](std::size_t index) { return static_cast<unsigned char>(place[index]); };
+      const auto byte = [&](std::size_t index) {
+        return std::uint64_t{static_cast<unsigned char>(place[index])};
+      };
       const std::uint64_t few = byte(0) | byte(size / 2) << 8 | byte(size - 1) << 16;
       state = fold(few ^ second_, state);
     }

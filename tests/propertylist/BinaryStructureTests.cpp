@@ -45,7 +45,7 @@ TEST(BinaryStructure, ReferencesAndOffsetsMayHaveAnySizeUpToEight) {
 }
 
 TEST(BinaryStructure, ReferencesOrOffsetsOfNoByteOrMoreThanEightAreRefused) {
-  for (const std::size_t size : {0, 9, 255}) {
+  for (const std::size_t size : {0U, 9U, 255U}) {
     BinaryFile references;
     references.add("\x50");
     references.setReferenceSize(size);

@@ -40,7 +40,7 @@ PropertyValue valueOfEveryKind() {
 PropertyValue nestedArrays(std::size_t depth) {
   PropertyArray array;
   for (std::size_t level = 1; level < depth; ++level) {
-    array = PropertyArray{array};
+    array = PropertyArray{PropertyValue(array)};
   }
   return array;
 }
