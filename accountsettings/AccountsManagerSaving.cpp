@@ -15,9 +15,10 @@ constexpr std::string_view saveOperation = "-[AccountsManager saveAllAccounts]";
 /// The user and the group that the account settings file belongs to.
 constexpr std::string_view fileOwner = "mobile";
 
-/// The bytes of the account settings file; none, with a channel line, when they cannot be made.
-std::optional<std::string> serialize(const PropertyDictionary& root) {
-  std::string bytes;
+/// The bytes of the account settings file, valid until the platform's property lists are used
+/// again; none, with a channel line, when they cannot be made.
+std::optional<std::string_view> serialize(const PropertyDictionary& root) {
+  std::string_view bytes;
   const Result serialization =
       Process::current().platform.propertyLists.serializeBinary(root, bytes);
   if (!serialization || bytes.empty()) {
@@ -30,7 +31,7 @@ std::optional<std::string> serialize(const PropertyDictionary& root) {
 }
 
 /// Fills the temporary file and moves it over the account settings file. False when a step fails.
-bool writeThroughTemporaryFile(const std::optional<std::string>& bytes,
+bool writeThroughTemporaryFile(std::optional<std::string_view> bytes,
                                const std::string& temporaryPath, const std::string& path) {
   FileSystem& fileSystem = Process::current().platform.fileSystem;
   if (!bytes || !fileSystem.writeFile(temporaryPath, *bytes)) {
@@ -50,7 +51,7 @@ bool writeThroughTemporaryFile(const std::optional<std::string>& bytes,
 /// that fails.
 bool writeSettingsFile(const PropertyDictionary& root) {
   FileSystem& fileSystem = Process::current().platform.fileSystem;
-  const std::optional<std::string> bytes = serialize(root);
+  const std::optional<std::string_view> bytes = serialize(root);
   const std::string path = AccountsManager::fullPathToAccountSettingsPlist();
   const std::optional<std::string> temporaryPath = fileSystem.makeTemporaryFile();
   if (temporaryPath && writeThroughTemporaryFile(bytes, *temporaryPath, path)) {
@@ -118,20 +119,42 @@ bool AccountsManager::_fixAccountsBeforeSaving() {
   return fixersChangedAccounts;
 }
 
-PropertyDictionary AccountsManager::_mergedRoot() const {
-  const std::unique_ptr<AccountsManager> onDisk = initInsideOfMigration();
-  std::vector<PropertyValue> mergedAccounts;
-  mergedAccounts.reserve(_orderedTopLevelAccounts.size());
+std::vector<std::optional<PropertyDictionary>> AccountsManager::_onDiskProperties() const {
+  // Of the accounts on disk only the top-level ones are needed, unless one is looked for that is
+  // not among them. What else there is of a store could be seen in the channel's lines alone.
+  const bool isWatched = _ASLogSystem()->isEnabled();
+  std::unique_ptr<AccountsManager> onDisk =
+      _initFromFile(isWatched ? Extent::Whole : Extent::TopLevelAccounts);
+  bool hasChildren = isWatched;
+  std::vector<std::optional<PropertyDictionary>> result;
+  result.reserve(_orderedTopLevelAccounts.size());
   for (const BasicAccountReference& account : _orderedTopLevelAccounts.accounts()) {
     const std::optional<Text> identifier = account->identifier();
+    if (!hasChildren && identifier && !onDisk->_topLevelAccountsByID.contains(*identifier)) {
+      for (const BasicAccountReference& parent : onDisk->_orderedTopLevelAccounts.accounts()) {
+        onDisk->_loadChildrenFromAccount(parent);
+      }
+      hasChildren = true;
+    }
     const BasicAccountReference diskAccount =
         identifier ? onDisk->accountWithIdentifier(*identifier) : nullptr;
+    result.push_back(diskAccount ? std::optional(diskAccount->propertiesToSave()) : std::nullopt);
+  }
+  return result;
+}
+
+PropertyDictionary AccountsManager::_mergedRoot() const {
+  const std::vector<std::optional<PropertyDictionary>> onDisk = _onDiskProperties();
+  const Accounts& accounts = _orderedTopLevelAccounts.accounts();
+  std::vector<PropertyValue> mergedAccounts;
+  mergedAccounts.reserve(accounts.size());
+  for (std::size_t index = 0; index < accounts.size(); ++index) {
+    const BasicAccount& account = *accounts[index];
     PropertyDictionary merged = mergeInMemoryProperties_originalProperties_onDiskProperties(
-        account->propertiesToSave(), account->originalProperties(),
-        diskAccount ? std::optional(diskAccount->propertiesToSave()) : std::nullopt);
+        account.propertiesToSave(), account.originalProperties(), onDisk[index]);
     logToChannel(
         saveOperation, "Calculated Properties - Type: %@, Properties: %@, Dataclasses: %@",
-        [&] { return logArguments(account->type(), merged, account->enabledDataclasses()); });
+        [&] { return logArguments(account.type(), merged, account.enabledDataclasses()); });
     mergedAccounts.emplace_back(std::move(merged));
   }
   // Kept on purpose: the version of this code, whatever dataVersion() says, since what is written

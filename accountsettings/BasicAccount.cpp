@@ -16,7 +16,9 @@ std::optional<Text> textOrNone(std::optional<std::string_view> text) {
 }  // namespace
 
 BasicAccountReference BasicAccount::initWithProperties(const PropertyDictionary& properties) {
-  const BasicAccountReference account(new BasicAccount());
+  // Only the class itself may call its constructor; a record shares its memory with its counts.
+  struct Record final : BasicAccount {};
+  const BasicAccountReference account = std::make_shared<Record>();
   return account->acceptProperties(properties) ? account : nullptr;
 }
 

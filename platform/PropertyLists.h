@@ -1,7 +1,6 @@
 #pragma once
 
 #include <optional>
-#include <string>
 #include <string_view>
 
 #include "platform/Result.h"
@@ -19,9 +18,10 @@ class PropertyLists {
   /// dictionary.
   virtual std::optional<PropertyDictionary> readDictionary(std::string_view path) = 0;
 
-  /// Writes a value in the binary format to `bytes`. Fails, leaving `bytes` empty, for a value that
-  /// no reader would take back (one nested too deeply).
-  virtual Result serializeBinary(const PropertyValue& value, std::string& bytes) = 0;
+  /// Writes a value in the binary format and gives the bytes, which are valid until the next call
+  /// of an operation. Fails, leaving `bytes` empty, for a value that no reader would take back (one
+  /// nested too deeply).
+  virtual Result serializeBinary(const PropertyValue& value, std::string_view& bytes) = 0;
 };
 
 }  // namespace accounts

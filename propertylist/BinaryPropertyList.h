@@ -1,5 +1,6 @@
 #pragma once
 
+#include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -18,10 +19,33 @@ bool isBinaryPropertyList(std::string_view bytes);
 std::optional<PropertyValue> readBinaryPropertyList(std::string_view bytes,
                                                     PropertyListError& error);
 
-/// A value as a binary property list, each distinct scalar written once. The same value always
-/// gives the same bytes. None, with `error` saying why, for a value that the reader would not take
-/// back.
+/// A value as a binary property list, each distinct scalar and container written once. The same
+/// value always gives the same bytes. None, with `error` saying why, for a value that the reader
+/// would not take back.
 std::optional<std::string> writeBinaryPropertyList(const PropertyValue& value,
                                                    PropertyListError& error);
+
+namespace binaryplist {
+class Catalogue;
+}
+
+/// Writes values that have most of their parts in common, such as the stages of one file: it
+/// remembers what it has met, so that a part in the same memory as before costs little more than
+/// the copying of its bytes. The bytes are those of `writeBinaryPropertyList`. It keeps the value
+/// that it wrote last alive, and the texts and data of earlier ones.
+class BinaryPropertyListWriter {
+ public:
+  BinaryPropertyListWriter();
+  BinaryPropertyListWriter(const BinaryPropertyListWriter&) = delete;
+  BinaryPropertyListWriter& operator=(const BinaryPropertyListWriter&) = delete;
+  ~BinaryPropertyListWriter();
+
+  /// See `writeBinaryPropertyList`.
+  std::optional<std::string> write(const PropertyValue& value, PropertyListError& error);
+
+ private:
+  std::unique_ptr<binaryplist::Catalogue> catalogue_;
+  std::optional<PropertyValue> lastValue_;
+};
 
 }  // namespace accounts

@@ -4,8 +4,8 @@
 #include <type_traits>
 
 #include "propertylist/BinaryPropertyList.h"
+#include "propertylist/BinaryPropertyListCatalogue.h"
 #include "propertylist/BinaryPropertyListFormat.h"
-#include "propertylist/BinaryPropertyListPlan.h"
 #include "propertylist/GeneralisedUTF8.h"
 
 namespace accounts {
@@ -56,12 +56,12 @@ std::size_t unitCountOf(std::string_view text) {
   return count;
 }
 
-std::size_t sizeOf(const PlannedScalar& scalar) {
-  switch (scalar.kind) {
+std::size_t sizeOf(const CatalogueScalar& scalar) {
+  switch (scalar.kind()) {
     case ScalarKind::Boolean:
       return 1;
     case ScalarKind::SignedInteger:
-      return 1 + sizeOfInteger(scalar.bits);
+      return 1 + sizeOfInteger(scalar.bits());
     case ScalarKind::LargeInteger:
       return 17;
     case ScalarKind::Real:
@@ -73,7 +73,7 @@ std::size_t sizeOf(const PlannedScalar& scalar) {
     }
     case ScalarKind::Data:
     case ScalarKind::ASCIIText:
-      return sizeOfHead(scalar.byteCount) + scalar.byteCount;
+      return sizeOfHead(scalar.byteCount()) + scalar.byteCount();
   }
   return 0;
 }
@@ -123,31 +123,31 @@ class Output {
     }
   }
 
-  void putScalar(const PlannedScalar& scalar) {
-    switch (scalar.kind) {
+  void putScalar(const CatalogueScalar& scalar) {
+    switch (scalar.kind()) {
       case ScalarKind::Boolean:
-        return putByte(scalar.bits != 0 ? kMarkerOfTrue : kMarkerOfFalse);
+        return putByte(scalar.bits() != 0 ? kMarkerOfTrue : kMarkerOfFalse);
       case ScalarKind::SignedInteger: {
-        const std::size_t size = sizeOfInteger(scalar.bits);
+        const std::size_t size = sizeOfInteger(scalar.bits());
         putByte(numberMarker(Kind::Integer, size));
-        return putNumber(scalar.bits, size);
+        return putNumber(scalar.bits(), size);
       }
       case ScalarKind::LargeInteger:
         // Eight bytes are signed; a larger number takes sixteen.
         putByte(numberMarker(Kind::Integer, 16));
         putNumber<8>(0);
-        return putNumber<8>(scalar.bits);
+        return putNumber<8>(scalar.bits());
       case ScalarKind::Real:
         putByte(numberMarker(Kind::Real, 8));
-        return putNumber<8>(scalar.bits);
+        return putNumber<8>(scalar.bits());
       case ScalarKind::Date:
         putByte(kMarkerOfDate);
-        return putNumber<8>(scalar.bits);
+        return putNumber<8>(scalar.bits());
       case ScalarKind::Data:
-        putHead(Kind::Data, scalar.byteCount);
+        putHead(Kind::Data, scalar.byteCount());
         return putBytes(scalar.view());
       case ScalarKind::ASCIIText:
-        putHead(Kind::ASCIIText, scalar.byteCount);
+        putHead(Kind::ASCIIText, scalar.byteCount());
         return putBytes(scalar.view());
       case ScalarKind::UTF16Text:
         putHead(Kind::UTF16Text, unitCountOf(scalar.view()));
@@ -159,32 +159,92 @@ class Output {
   char* place_;
 };
 
-/// A planned file: containers come first in the count of objects, the outermost as 0, and scalars
+/// The order in which the parts of one value stand in a file: that in which a walk over the value
+/// leaves them, whatever else the catalogue holds.
+class FileOrder {
+ public:
+  FileOrder(const Catalogue& catalogue, Catalogue::Reference top)
+      : catalogue_(catalogue),
+        scalarNumbers_(catalogue.scalarCount(), kNone),
+        containerNumbers_(catalogue.containerCount(), kNone) {
+    visit(top);
+  }
+
+  /// The catalogue's numbers of what the file holds; the outermost container comes last.
+  [[nodiscard]] const std::vector<Catalogue::Reference>& scalars() const { return scalars_; }
+  [[nodiscard]] const std::vector<Catalogue::Reference>& containers() const { return containers_; }
+  [[nodiscard]] std::size_t objectCount() const { return scalars_.size() + containers_.size(); }
+
+  /// The object number in the file: containers come first, the outermost as 0.
+  [[nodiscard]] std::uint32_t numberInFile(Catalogue::Reference reference) const {
+    const auto containerCount = static_cast<std::uint32_t>(containers_.size());
+    return (reference & Catalogue::kContainerBit) != 0
+               ? containerCount - 1 - containerNumbers_[reference & ~Catalogue::kContainerBit]
+               : containerCount + scalarNumbers_[reference];
+  }
+
+ private:
+  static constexpr Catalogue::Reference kNone = UINT32_MAX;
+
+  /// The recursion is as deep as the value, which the catalogue has bounded.
+  void visit(Catalogue::Reference reference) {
+    if ((reference & Catalogue::kContainerBit) == 0) {
+      leave(reference, scalarNumbers_, scalars_);
+      return;
+    }
+    const Catalogue::Reference container = reference & ~Catalogue::kContainerBit;
+    if (containerNumbers_[container] != kNone) {
+      return;
+    }
+    for (const Catalogue::Reference child :
+         catalogue_.referencesOf(catalogue_.container(container))) {
+      visit(child);
+    }
+    leave(container, containerNumbers_, containers_);
+  }
+
+  static void leave(Catalogue::Reference object, std::vector<Catalogue::Reference>& numbers,
+                    std::vector<Catalogue::Reference>& order) {
+    if (numbers[object] == kNone) {
+      numbers[object] = static_cast<Catalogue::Reference>(order.size());
+      order.push_back(object);
+    }
+  }
+
+  const Catalogue& catalogue_;
+  std::vector<Catalogue::Reference> scalarNumbers_;
+  std::vector<Catalogue::Reference> containerNumbers_;
+  std::vector<Catalogue::Reference> scalars_;
+  std::vector<Catalogue::Reference> containers_;
+};
+
+/// A file to be: containers come first in the count of objects, the outermost as 0, and scalars
 /// first in the file.
 class File {
  public:
-  explicit File(const Plan& plan) : plan_(plan) {
+  File(const Catalogue& catalogue, const FileOrder& order) : catalogue_(catalogue), order_(order) {
     // Large enough for the count and for the table's own offset, each one more than the largest
     // number stored: there are readers that ask for that.
-    referenceSize_ = sizeToHold(plan.objectCount());
+    referenceSize_ = sizeToHold(order.objectCount());
     table_ = kHeader.size();
-    for (const PlannedScalar& scalar : plan.scalars()) {
-      table_ += sizeOf(scalar);
+    for (const Catalogue::Reference number : order.scalars()) {
+      table_ += sizeOf(catalogue.scalar(number));
     }
-    for (const PlannedContainer& container : plan.containers()) {
+    for (const Catalogue::Reference number : order.containers()) {
+      const CatalogueContainer& container = catalogue.container(number);
       table_ += sizeOfHead(container.childCount()) + container.referenceCount * referenceSize_;
     }
     offsetSize_ = sizeToHold(table_);
   }
 
   [[nodiscard]] std::string write() const {
-    const std::size_t trailer = table_ + plan_.objectCount() * offsetSize_;
+    const std::size_t trailer = table_ + order_.objectCount() * offsetSize_;
     std::string bytes(trailer + kTrailerSize, '\0');
     withConstantSize(offsetSize_, [&](auto size) { writeObjects<size()>(bytes.data()); });
     char* const place = bytes.data() + trailer;
     place[kOffsetSizePosition] = static_cast<char>(offsetSize_);
     place[kReferenceSizePosition] = static_cast<char>(referenceSize_);
-    store(place + kObjectCountPosition, plan_.objectCount(), 8);
+    store(place + kObjectCountPosition, order_.objectCount(), 8);
     store(place + kTopObjectPosition, 0, 8);
     store(place + kTablePosition, table_, 8);
     return bytes;
@@ -195,33 +255,28 @@ class File {
   void writeObjects(char* bytes) const {
     Output output(bytes);
     Output containerOffsets(bytes + table_);
-    Output scalarOffsets(bytes + table_ + plan_.containers().size() * OffsetSize);
+    Output scalarOffsets(bytes + table_ + order_.containers().size() * OffsetSize);
     const auto offset = [&] { return static_cast<std::uint64_t>(output.place() - bytes); };
     output.putBytes(kHeader);
-    for (const PlannedScalar& scalar : plan_.scalars()) {
+    for (const Catalogue::Reference number : order_.scalars()) {
       scalarOffsets.putNumber<OffsetSize>(offset());
-      output.putScalar(scalar);
+      output.putScalar(catalogue_.scalar(number));
     }
-    const auto& containers = plan_.containers();
-    for (auto container = containers.rbegin(); container != containers.rend(); ++container) {
+    const auto& containers = order_.containers();
+    for (auto number = containers.rbegin(); number != containers.rend(); ++number) {
+      const CatalogueContainer& container = catalogue_.container(*number);
       containerOffsets.putNumber<OffsetSize>(offset());
-      output.putHead(container->kind, container->childCount());
+      output.putHead(container.kind, container.childCount());
       withConstantSize(referenceSize_, [&](auto size) {
-        for (const Plan::Reference reference : plan_.referencesOf(*container)) {
-          output.putNumber<size()>(numberInFile(reference));
+        for (const Catalogue::Reference reference : catalogue_.referencesOf(container)) {
+          output.putNumber<size()>(order_.numberInFile(reference));
         }
       });
     }
   }
 
-  [[nodiscard]] std::uint32_t numberInFile(Plan::Reference reference) const {
-    const auto containerCount = static_cast<std::uint32_t>(plan_.containers().size());
-    return (reference & Plan::kContainerBit) != 0
-               ? containerCount - 1 - (reference & ~Plan::kContainerBit)
-               : containerCount + reference;
-  }
-
-  const Plan& plan_;
+  const Catalogue& catalogue_;
+  const FileOrder& order_;
   std::size_t referenceSize_ = 0;
   std::size_t offsetSize_ = 0;
   std::size_t table_ = 0;
@@ -232,11 +287,32 @@ class File {
 
 std::optional<std::string> writeBinaryPropertyList(const PropertyValue& value,
                                                    PropertyListError& error) {
-  binaryplist::Plan plan(error);
-  if (!plan.make(value)) {
-    return std::nullopt;
+  return BinaryPropertyListWriter().write(value, error);
+}
+
+BinaryPropertyListWriter::BinaryPropertyListWriter()
+    : catalogue_(std::make_unique<binaryplist::Catalogue>()) {}
+
+BinaryPropertyListWriter::~BinaryPropertyListWriter() = default;
+
+std::optional<std::string> BinaryPropertyListWriter::write(const PropertyValue& value,
+                                                           PropertyListError& error) {
+  using binaryplist::Catalogue;
+  const bool isFirst = catalogue_->objectCount() == 0;
+  const std::optional<Catalogue::Reference> top = catalogue_->add(value, error);
+  if (!top) {
+    catalogue_ = std::make_unique<Catalogue>();
+    // What was written before may have used up the room for objects.
+    return isFirst ? std::nullopt : write(value, error);
   }
-  return binaryplist::File(plan).write();
+  const binaryplist::FileOrder order(*catalogue_, *top);
+  std::string bytes = binaryplist::File(*catalogue_, order).write();
+  lastValue_ = value;
+  // More than as much again that only earlier values had is not worth its memory.
+  if (catalogue_->objectCount() > 2 * order.objectCount()) {
+    catalogue_ = std::make_unique<Catalogue>();
+  }
+  return bytes;
 }
 
 }  // namespace accounts

@@ -38,13 +38,4 @@ void ContentTable::grow() {
   }
 }
 
-void IdentityTable::grow() {
-  const std::vector<Slot> old = std::exchange(slots_, std::vector<Slot>(kGrowth * slots_.size()));
-  for (const Slot& slot : old) {
-    if (slot.identity != nullptr) {
-      slots_[placeOf(slot.identity)] = slot;
-    }
-  }
-}
-
 }  // namespace accounts

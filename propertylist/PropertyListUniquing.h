@@ -3,7 +3,6 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
-#include <optional>
 #include <string_view>
 #include <vector>
 
@@ -105,56 +104,6 @@ class ContentTable {
     /// 0 marks a free slot.
     std::uint32_t numberPlusOne = 0;
   };
-  void grow();
-
-  /// Their number is a power of two.
-  std::vector<Slot> slots_ = std::vector<Slot>(kInitialSlotCount);
-  std::size_t count_ = 0;
-};
-
-/// Finds numbers by the address of a node.
-class IdentityTable {
- public:
-  /// As `ContentTable::announce`.
-  void announce(const void* identity) const {
-    __builtin_prefetch(slots_.data() + firstPlaceOf(identity));
-  }
-
-  [[nodiscard]] std::optional<std::uint32_t> find(const void* identity) const {
-    const Slot& slot = slots_[placeOf(identity)];
-    return slot.identity != nullptr ? std::optional(slot.number) : std::nullopt;
-  }
-
-  /// Adds an address that is not null and not in the table.
-  void add(const void* identity, std::uint32_t number) {
-    if (2 * (count_ + 1) > slots_.size()) {
-      grow();
-    }
-    slots_[placeOf(identity)] = {identity, number};
-    ++count_;
-  }
-
- private:
-  struct Slot {
-    const void* identity = nullptr;
-    std::uint32_t number = 0;
-  };
-
-  [[nodiscard]] std::size_t firstPlaceOf(const void* identity) const {
-    constexpr std::uint64_t kOddConstant = 0x9E3779B97F4A7C15;
-    const std::uint64_t hash = reinterpret_cast<std::uintptr_t>(identity) * kOddConstant;
-    return (hash >> 32) & (slots_.size() - 1);
-  }
-
-  /// The address's place, or the free place where it belongs.
-  [[nodiscard]] std::size_t placeOf(const void* identity) const {
-    const std::size_t mask = slots_.size() - 1;
-    std::size_t place = firstPlaceOf(identity);
-    while (slots_[place].identity != nullptr && slots_[place].identity != identity) {
-      place = (place + 1) & mask;
-    }
-    return place;
-  }
   void grow();
 
   /// Their number is a power of two.

@@ -70,7 +70,7 @@ class PropertyArray {
   [[nodiscard]] bool isSameAs(const PropertyArray& other) const {
     return node_.get() == other.node_.get();
   }
-  [[nodiscard]] const void* identity() const { return node_.get(); }
+  [[nodiscard]] const SharedNodeBase* sharedNode() const { return node_.get(); }
   /// True when there is content that another handle holds too.
   [[nodiscard]] bool isShared() const { return node_.isShared(); }
 
@@ -123,7 +123,7 @@ class PropertyDictionary {
   [[nodiscard]] bool isSameAs(const PropertyDictionary& other) const {
     return node_.get() == other.node_.get();
   }
-  [[nodiscard]] const void* identity() const { return node_.get(); }
+  [[nodiscard]] const SharedNodeBase* sharedNode() const { return node_.get(); }
   /// True when there is content that another handle holds too.
   [[nodiscard]] bool isShared() const { return node_.isShared(); }
 

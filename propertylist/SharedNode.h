@@ -11,8 +11,8 @@ namespace accounts {
 
 /// Base of every heap node of the value model: counts the handles that share the node. The count is
 /// atomic, because tables that are computed once per process are read, and so copied, by any
-/// thread; a process that never had a second thread is
-/// spared the price of that.
+/// thread; a process that never had a second thread is spared the price of that. 32 bits are
+/// enough: as many handles would not fit into memory.
 class SharedNodeBase {
  public:
   SharedNodeBase() = default;
@@ -31,7 +31,7 @@ class SharedNodeBase {
   /// destroys the node.
   [[nodiscard]] bool releaseIsLast() {
     if (__libc_single_threaded != 0) {
-      const std::size_t left = references_.load(std::memory_order_relaxed) - 1;
+      const std::uint32_t left = references_.load(std::memory_order_relaxed) - 1;
       references_.store(left, std::memory_order_relaxed);
       return left == 0;
     }
@@ -41,8 +41,14 @@ class SharedNodeBase {
   /// True when exactly one handle holds the node, so that it may be changed in place.
   [[nodiscard]] bool isUnshared() const { return references_.load(std::memory_order_acquire) == 1; }
 
+  /// A number that a writer notes on a node that it has met, in order to know it again without a
+  /// table. It may be out of date or another writer's, so it tells nothing by itself.
+  [[nodiscard]] std::uint32_t note() const { return note_.load(std::memory_order_relaxed); }
+  void setNote(std::uint32_t note) const { note_.store(note, std::memory_order_relaxed); }
+
  private:
-  std::atomic<std::size_t> references_{1};
+  std::atomic<std::uint32_t> references_{1};
+  mutable std::atomic<std::uint32_t> note_{UINT32_MAX};
 };
 
 /// An owning handle to a shared node, null allowed. Copying shares the node. `Owner` is the class

@@ -24,11 +24,9 @@ class SharedBytes {
     return node_.get() == other.node_.get();
   }
 
-  /// The node's address, null for no bytes: names the content for as long as a handle to it lives.
-  [[nodiscard]] const void* identity() const { return node_.get(); }
-
-  /// True when there are bytes and another handle holds them too.
-  [[nodiscard]] bool isShared() const { return node_.isShared(); }
+  /// The node, null for no bytes: its address names the content for as long as a handle to it
+  /// lives.
+  [[nodiscard]] const SharedNodeBase* sharedNode() const { return node_.get(); }
 
  private:
   friend class SharedNode<SharedBytes>;
@@ -87,9 +85,8 @@ class Text {
   operator std::string_view() const { return view(); }
   [[nodiscard]] std::string string() const { return std::string(view()); }
   [[nodiscard]] bool empty() const { return view().empty(); }
-  [[nodiscard]] const void* identity() const { return bytes_.identity(); }
-  /// True when the text is not empty and another text shares its memory.
-  [[nodiscard]] bool isShared() const { return bytes_.isShared(); }
+  /// The bytes, which other texts may share.
+  [[nodiscard]] const SharedBytes& bytes() const { return bytes_; }
 
   friend bool operator==(const Text& left, const Text& right) {
     return left.bytes_.isSameAs(right.bytes_) || left.view() == right.view();

@@ -8,13 +8,12 @@ namespace {
 
 constexpr std::string_view kOperation = "read the property list";
 
-std::optional<PropertyDictionary> dictionaryFromBytes(const std::optional<std::string>& bytes,
-                                                      std::string_view path, PathError& error) {
-  if (!bytes) {
-    return std::nullopt;
-  }
+}  // namespace
+
+std::optional<PropertyDictionary> dictionaryFromBytes(std::string_view bytes, std::string_view path,
+                                                      PathError& error) {
   PropertyListError malformed;
-  const auto value = readPropertyList(*bytes, malformed);
+  const auto value = readPropertyList(bytes, malformed);
   if (!value) {
     error = pathError(kOperation, path, malformed.text);
     return std::nullopt;
@@ -27,16 +26,16 @@ std::optional<PropertyDictionary> dictionaryFromBytes(const std::optional<std::s
   return *dictionary;
 }
 
-}  // namespace
-
 std::optional<PropertyDictionary> readDictionaryFile(const DeviceRoot& root, std::string_view path,
                                                      PathError& error) {
-  return dictionaryFromBytes(root.readFile(path, error), path, error);
+  const std::optional<std::string> bytes = root.readFile(path, error);
+  return bytes ? dictionaryFromBytes(*bytes, path, error) : std::nullopt;
 }
 
 std::optional<PropertyDictionary> readHostDictionaryFile(const std::string& path,
                                                          PathError& error) {
-  return dictionaryFromBytes(readHostFile(path, error), path, error);
+  const std::optional<std::string> bytes = readHostFile(path, error);
+  return bytes ? dictionaryFromBytes(*bytes, path, error) : std::nullopt;
 }
 
 }  // namespace accounts

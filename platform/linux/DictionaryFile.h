@@ -10,6 +10,11 @@
 
 namespace accounts {
 
+/// The dictionary that the bytes of a property-list file stand for. None, with `error` naming the
+/// path, when they are malformed or stand for something else.
+std::optional<PropertyDictionary> dictionaryFromBytes(std::string_view bytes, std::string_view path,
+                                                      PathError& error);
+
 /// The dictionary that a property-list file of the device holds. None, with `error` set, when the
 /// file is missing (`error.isMissing()`), cannot be read, is malformed or holds something else.
 std::optional<PropertyDictionary> readDictionaryFile(const DeviceRoot& root, std::string_view path,

@@ -63,13 +63,30 @@ std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_vi
 
 std::optional<std::string> readContents(const FileDescriptor& file, std::string_view path,
                                         PathError& error) {
-  std::string contents;
+  std::optional<ComparedContents> contents = readAndCompare(file, {}, path, error);
+  return contents ? std::optional(std::move(contents->bytes)) : std::nullopt;
+}
+
+std::optional<ComparedContents> readAndCompare(const FileDescriptor& file, std::string_view known,
+                                               std::string_view path, PathError& error) {
+  ComparedContents contents{.areKnown = true, .bytes = {}};
+  std::size_t equalSize = 0;
   const bool read = readBlocks(file, path, error, [&](std::string_view block) {
-    contents.append(block);
+    if (contents.areKnown && known.substr(equalSize).starts_with(block)) {
+      equalSize += block.size();
+      return true;
+    }
+    if (contents.areKnown) {
+      contents = {.areKnown = false, .bytes = std::string(known.substr(0, equalSize))};
+    }
+    contents.bytes.append(block);
     return true;
   });
   if (!read) {
     return std::nullopt;
+  }
+  if (contents.areKnown && equalSize < known.size()) {
+    return ComparedContents{.areKnown = false, .bytes = std::string(known.substr(0, equalSize))};
   }
   return contents;
 }

@@ -23,6 +23,19 @@ std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_vi
 std::optional<std::string> readContents(const FileDescriptor& file, std::string_view path,
                                         PathError& error);
 
+/// What a file holds, compared with bytes that the reader knows.
+struct ComparedContents {
+  /// Whether the file holds exactly the known bytes.
+  bool areKnown = false;
+  /// What the file holds otherwise.
+  std::string bytes;
+};
+
+/// Like `readContents`, for a file that probably holds bytes that are in memory already: it needs
+/// no second copy of them then.
+std::optional<ComparedContents> readAndCompare(const FileDescriptor& file, std::string_view known,
+                                               std::string_view path, PathError& error);
+
 /// The bytes of a regular file of the host, outside any device root. None, with `error` set, when
 /// it is missing, unreadable, too large or no regular file; opening never waits.
 std::optional<std::string> readHostFile(const std::string& path, PathError& error);

@@ -3,7 +3,7 @@
 #include <utility>
 
 #include "platform/linux/DictionaryFile.h"
-#include "propertylist/BinaryPropertyList.h"
+#include "platform/linux/FileContents.h"
 
 namespace accounts {
 
@@ -14,17 +14,39 @@ std::optional<PropertyDictionary> LinuxPropertyLists::readDictionary(std::string
 
 std::optional<PropertyDictionary> LinuxPropertyLists::readDictionary(std::string_view path,
                                                                      PathError& error) {
-  return readDictionaryFile(root_, path, error);
+  const std::optional<FileDescriptor> file = root_.openRegularFile(path, error);
+  if (!file) {
+    return std::nullopt;
+  }
+  const std::string_view known = rememberedValue_ ? rememberedBytes_ : std::string_view();
+  std::optional<ComparedContents> contents = readAndCompare(*file, known, path, error);
+  if (!contents) {
+    return std::nullopt;
+  }
+  if (contents->areKnown && rememberedValue_) {
+    return rememberedValue_;
+  }
+  std::optional<PropertyDictionary> dictionary = dictionaryFromBytes(contents->bytes, path, error);
+  // A smaller file is not worth forgetting a larger one for.
+  if (dictionary && contents->bytes.size() >= known.size()) {
+    rememberedBytes_ = std::move(contents->bytes);
+    rememberedValue_ = dictionary;
+  }
+  return dictionary;
 }
 
-Result LinuxPropertyLists::serializeBinary(const PropertyValue& value, std::string& bytes) {
+Result LinuxPropertyLists::serializeBinary(const PropertyValue& value, std::string_view& bytes) {
   PropertyListError error;
-  auto written = writeBinaryPropertyList(value, error);
+  std::optional<std::string> written = writer_.write(value, error);
+  rememberedBytes_ = std::move(written).value_or(std::string());
+  rememberedValue_ = std::nullopt;
+  bytes = rememberedBytes_;
   if (!written) {
-    bytes.clear();
     return Result::failure(std::move(error.text));
   }
-  bytes = std::move(*written);
+  if (const PropertyDictionary* dictionary = value.asDictionary()) {
+    rememberedValue_ = *dictionary;
+  }
   return Result::success();
 }
 

@@ -7,16 +7,19 @@
 #include "platform/PropertyLists.h"
 #include "platform/linux/DeviceRoot.h"
 #include "platform/linux/PathError.h"
+#include "propertylist/BinaryPropertyList.h"
 
 namespace accounts {
 
-/// The property-list files beneath a device root, which must outlive this.
+/// The property-list files beneath a device root, which must outlive this. What was read or written
+/// last is remembered with its value: a file that is found to hold it again, as every save finds
+/// the file of the save before, is read but not decoded.
 class LinuxPropertyLists final : public PropertyLists {
  public:
   explicit LinuxPropertyLists(const DeviceRoot& root) : root_(root) {}
 
   std::optional<PropertyDictionary> readDictionary(std::string_view path) override;
-  Result serializeBinary(const PropertyValue& value, std::string& bytes) override;
+  Result serializeBinary(const PropertyValue& value, std::string_view& bytes) override;
 
   /// Like `readDictionary`, and says in `error` why there is none: `error.isMissing()` tells a
   /// missing file from an unreadable one.
@@ -24,6 +27,10 @@ class LinuxPropertyLists final : public PropertyLists {
 
  private:
   const DeviceRoot& root_;
+  BinaryPropertyListWriter writer_;
+  std::string rememberedBytes_;
+  /// The dictionary that the bytes stand for, if they do.
+  std::optional<PropertyDictionary> rememberedValue_;
 };
 
 }  // namespace accounts

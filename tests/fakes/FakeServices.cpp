@@ -91,8 +91,8 @@ std::optional<PropertyDictionary> FakePropertyLists::readDictionary(std::string_
   return bytes ? dictionaryOf(*bytes) : std::nullopt;
 }
 
-Result FakePropertyLists::serializeBinary(const PropertyValue& value, std::string& bytes) {
-  bytes.clear();
+Result FakePropertyLists::serializeBinary(const PropertyValue& value, std::string_view& bytes) {
+  bytes = {};
   if (serializationError) {
     return Result::failure(*serializationError);
   }
@@ -101,7 +101,8 @@ Result FakePropertyLists::serializeBinary(const PropertyValue& value, std::strin
   if (!written) {
     return Result::failure(error.text);
   }
-  bytes = std::move(*written);
+  serialized_ = std::move(*written);
+  bytes = serialized_;
   return Result::success();
 }
 

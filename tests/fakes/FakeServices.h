@@ -208,10 +208,11 @@ class FakePropertyLists : public PropertyLists {
   std::optional<std::string> serializationError;
 
   std::optional<PropertyDictionary> readDictionary(std::string_view path) override;
-  Result serializeBinary(const PropertyValue& value, std::string& bytes) override;
+  Result serializeBinary(const PropertyValue& value, std::string_view& bytes) override;
 
  private:
   FakeFileSystem& fileSystem_;
+  std::string serialized_;
 };
 
 class FakeSharedResources : public SharedResources {

@@ -25,12 +25,72 @@ TEST_F(PropertyListsTest, AnXMLFileIsRead) {
 
 TEST_F(PropertyListsTest, ABinaryFileThatWasWrittenHereIsRead) {
   const PropertyDictionary original = {{"Accounts", PropertyArray{"one", 2, true}}};
-  std::string bytes;
+  std::string_view bytes;
   ASSERT_TRUE(propertyLists.serializeBinary(original, bytes));
   makeFile("/file.plist", bytes);
   const auto dictionary = propertyLists.readDictionary("/file.plist");
   ASSERT_TRUE(dictionary);
   EXPECT_EQ(*dictionary, original);
+}
+
+/// Writes a dictionary to a file, so that it is the one remembered.
+std::string writeAndRemember(LinuxPropertyLists& propertyLists, const PropertyDictionary& value) {
+  std::string_view bytes;
+  EXPECT_TRUE(propertyLists.serializeBinary(value, bytes));
+  return std::string(bytes);
+}
+
+TEST_F(PropertyListsTest, AFileThatStillHoldsWhatWasWrittenGivesTheSameDictionary) {
+  const PropertyDictionary written = {{"Name", "value"}};
+  makeFile("/file.plist", writeAndRemember(propertyLists, written));
+
+  const auto dictionary = propertyLists.readDictionary("/file.plist");
+
+  ASSERT_TRUE(dictionary);
+  EXPECT_TRUE(dictionary->isSameAs(written));
+}
+
+TEST_F(PropertyListsTest, AFileWithOneOtherByteThanWhatWasWrittenIsDecoded) {
+  std::string bytes = writeAndRemember(propertyLists, {{"Name", "value"}});
+  bytes.replace(bytes.find("value"), 5, "Value");
+  makeFile("/file.plist", bytes);
+
+  EXPECT_EQ(propertyLists.readDictionary("/file.plist"), (PropertyDictionary{{"Name", "Value"}}));
+}
+
+TEST_F(PropertyListsTest, AFileThatIsOnlyTheBeginningOfWhatWasWrittenIsMalformed) {
+  const std::string bytes = writeAndRemember(propertyLists, {{"Name", "value"}});
+  makeFile("/file.plist", bytes.substr(0, bytes.size() - 1));
+
+  EXPECT_FALSE(propertyLists.readDictionary("/file.plist"));
+}
+
+TEST_F(PropertyListsTest, AFileThatGoesOnAfterWhatWasWrittenIsDecoded) {
+  const std::string bytes = writeAndRemember(propertyLists, {{"Name", "value"}});
+  makeFile("/file.plist", bytes + "more");
+
+  EXPECT_FALSE(propertyLists.readDictionary("/file.plist", error));
+  EXPECT_TRUE(error.text.starts_with("Cannot read the property list")) << error.text;
+}
+
+TEST_F(PropertyListsTest, AFileThatWasReadGivesTheSameDictionaryUntilItChanges) {
+  makeFile("/file.plist", xmlDictionary("<key>Version</key><integer>1</integer>"));
+  const auto first = propertyLists.readDictionary("/file.plist");
+  const auto second = propertyLists.readDictionary("/file.plist");
+  makeFile("/file.plist", xmlDictionary("<key>Version</key><integer>2</integer>"));
+  const auto third = propertyLists.readDictionary("/file.plist");
+
+  ASSERT_TRUE(first && second);
+  EXPECT_TRUE(second->isSameAs(*first));
+  EXPECT_EQ(third, (PropertyDictionary{{"Version", 2}}));
+}
+
+TEST_F(PropertyListsTest, WhatWasWrittenOtherThanADictionaryIsNoDictionaryWhenRead) {
+  std::string_view bytes;
+  ASSERT_TRUE(propertyLists.serializeBinary(PropertyArray{1}, bytes));
+  makeFile("/file.plist", bytes);
+
+  EXPECT_FALSE(propertyLists.readDictionary("/file.plist"));
 }
 
 TEST_F(PropertyListsTest, AMissingFileIsToldFromAnUnreadableOne) {
@@ -84,7 +144,7 @@ TEST_F(PropertyListsTest, AValueNestedTooDeeplyIsNotSerialised) {
   for (std::size_t depth = 0; depth <= kMaximumNestingDepth; ++depth) {
     value = PropertyArray{value};
   }
-  std::string bytes = "left over";
+  std::string_view bytes = "left over";
   const Result result = propertyLists.serializeBinary(value, bytes);
   ASSERT_FALSE(result);
   EXPECT_FALSE(result.error().empty());

@@ -1,4 +1,4 @@
-#include "propertylist/BinaryPropertyListPlan.h"
+#include "propertylist/BinaryPropertyListCatalogue.h"
 
 #include <algorithm>
 #include <bit>
@@ -9,7 +9,7 @@
 
 namespace accounts::binaryplist {
 
-static_assert(kMaximumObjectCount < Plan::kContainerBit);
+static_assert(kMaximumObjectCount < Catalogue::kContainerBit);
 
 namespace {
 
@@ -31,26 +31,30 @@ bool isGeneralisedUTF8(std::string_view text) {
   return true;
 }
 
-std::string_view asBytes(std::span<const Plan::Reference> references) {
+std::string_view asBytes(std::span<const Catalogue::Reference> references) {
   return {reinterpret_cast<const char*>(references.data()), references.size_bytes()};
 }
 
 }  // namespace
 
-bool Plan::make(const PropertyValue& value) {
+std::optional<Catalogue::Reference> Catalogue::add(const PropertyValue& value,
+                                                   PropertyListError& error) {
+  error_ = &error;
+  ++walk_;
+  pending_.clear();
   Size size;
-  return visit(value, 0, size);
+  return visit(value, 0, size) ? std::optional(pending_.back()) : std::nullopt;
 }
 
-bool Plan::fail(std::string_view what) const {
-  error_.text = "binary property list: cannot write ";
-  error_.text.append(what);
+bool Catalogue::fail(std::string_view what) const {
+  error_->text = "binary property list: cannot write ";
+  error_->text.append(what);
   return false;
 }
 
 /// Appends a value's reference to the pending ones and adds the value to its parent's size. `depth`
 /// is the number of containers around it; it bounds the recursion.
-bool Plan::visit(const PropertyValue& value, std::size_t depth, Size& parent) {
+bool Catalogue::visit(const PropertyValue& value, std::size_t depth, Size& parent) {
   switch (value.kind()) {
     case PropertyKind::String:
       ++parent.expandedCount;
@@ -73,86 +77,86 @@ bool Plan::visit(const PropertyValue& value, std::size_t depth, Size& parent) {
                          std::bit_cast<std::uint64_t>(value.asDate()->secondsSinceReferenceDate),
                          parent);
     case PropertyKind::Data:
-      return visitData(value.asData()->bytes.view(), parent);
+      return visitData(value.asData()->bytes, parent);
   }
   return false;
 }
 
-bool Plan::visitNumber(ScalarKind kind, std::uint64_t bits, Size& parent) {
+bool Catalogue::visitNumber(ScalarKind kind, std::uint64_t bits, Size& parent) {
   ++parent.expandedCount;
   const auto newNumber = static_cast<Reference>(scalars_.size());
   const Reference number = numberTable_.findOrAdd(hash_(bits), newNumber, [&](Reference candidate) {
-    return scalars_[candidate].kind == kind && scalars_[candidate].bits == bits;
-  });
-  pending_.push_back(number);
-  return number != newNumber || addScalar({.bits = bits, .kind = kind});
-}
-
-bool Plan::visitData(std::string_view bytes, Size& parent) {
-  parent.expandedCount += 1 + expandedCountOfBytes(bytes.size());
-  return addBytes(ScalarKind::Data, bytes);
-}
-
-bool Plan::visitText(const Text& text, Size& parent) {
-  const std::string_view bytes = text.view();
-  parent.expandedCount += expandedCountOfBytes(bytes.size());
-  // A text with one holder alone is met once: to look for it would be lost labour.
-  const bool isShared = text.isShared();
-  if (isShared) {
-    if (const std::optional<Reference> known = texts_.find(text.identity())) {
-      pending_.push_back(*known);
-      return true;
-    }
-  }
-  if (!addBytes(ScalarKind::ASCIIText, bytes)) {
-    return false;
-  }
-  if (isShared) {
-    texts_.add(text.identity(), pending_.back());
-  }
-  return true;
-}
-
-/// Finds or adds a data or a text. Of a text the kind given is ASCII, and may become the other one.
-bool Plan::addBytes(ScalarKind kind, std::string_view bytes) {
-  if (expandedCountOfBytes(bytes.size()) > kMaximumExpandedValueCount) {
-    return fail("a text or data longer than the limit");
-  }
-  const auto newNumber = static_cast<Reference>(scalars_.size());
-  const Reference number = bytesTable_.findOrAdd(hash_(bytes), newNumber, [&](Reference candidate) {
-    const PlannedScalar& other = scalars_[candidate];
-    return (other.kind == ScalarKind::Data) == (kind == ScalarKind::Data) && other.view() == bytes;
+    return scalars_[candidate].kind() == kind && scalars_[candidate].bits() == bits;
   });
   pending_.push_back(number);
   if (number != newNumber) {
     return true;
   }
-  PlannedScalar scalar{
-      .bytes = bytes.data(), .byteCount = static_cast<std::uint32_t>(bytes.size()), .kind = kind};
-  if (kind != ScalarKind::Data && !isASCII(bytes)) {
-    if (!isGeneralisedUTF8(bytes)) {
-      return fail("a text that is not well-formed UTF-8");
-    }
-    scalar.kind = ScalarKind::UTF16Text;
-  }
-  return addScalar(scalar);
+  scalars_.emplace_back(kind, bits);
+  return checkObjectCount();
 }
 
-bool Plan::addScalar(const PlannedScalar& scalar) {
-  scalars_.push_back(scalar);
+bool Catalogue::visitData(const SharedBytes& bytes, Size& parent) {
+  parent.expandedCount += 1 + expandedCountOfBytes(bytes.view().size());
+  return addBytes(ScalarKind::Data, bytes);
+}
+
+bool Catalogue::visitText(const Text& text, Size& parent) {
+  parent.expandedCount += expandedCountOfBytes(text.view().size());
+  return addBytes(ScalarKind::ASCIIText, text.bytes());
+}
+
+bool Catalogue::isKnown(const SharedNodeBase* bytes) const {
+  return bytes != nullptr && bytes->note() < scalars_.size() &&
+         scalars_[bytes->note()].isNode(bytes);
+}
+
+/// Finds or adds a data or a text. Of a text the kind given is ASCII, and may become the other one.
+bool Catalogue::addBytes(ScalarKind kind, const SharedBytes& bytes) {
+  const SharedNodeBase* const node = bytes.sharedNode();
+  const bool isData = kind == ScalarKind::Data;
+  const auto isOfKind = [&](Reference candidate) {
+    return (scalars_[candidate].kind() == ScalarKind::Data) == isData;
+  };
+  if (isKnown(node) && isOfKind(node->note())) {
+    pending_.push_back(node->note());
+    return true;
+  }
+  const std::string_view content = bytes.view();
+  if (expandedCountOfBytes(content.size()) > kMaximumExpandedValueCount) {
+    return fail("a text or data longer than the limit");
+  }
+  const auto newNumber = static_cast<Reference>(scalars_.size());
+  const Reference number =
+      bytesTable_.findOrAdd(hash_(content), newNumber, [&](Reference candidate) {
+        return isOfKind(candidate) && scalars_[candidate].view() == content;
+      });
+  pending_.push_back(number);
+  if (number != newNumber) {
+    return true;
+  }
+  if (!isData && !isASCII(content)) {
+    if (!isGeneralisedUTF8(content)) {
+      return fail("a text that is not well-formed UTF-8");
+    }
+    kind = ScalarKind::UTF16Text;
+  }
+  scalars_.emplace_back(kind, bytes);
+  if (node != nullptr) {
+    node->setNote(number);
+  }
   return checkObjectCount();
 }
 
 template <class Container>
-bool Plan::visitContainer(const Container& container, std::size_t depth, Size& parent) {
+bool Catalogue::visitContainer(const Container& container, std::size_t depth, Size& parent) {
   if (depth == kMaximumNestingDepth) {
     return fail("containers nested deeper than the limit");
   }
-  const bool isShared = container.isShared();
-  if (isShared) {
-    if (const std::optional<Reference> known = containerIdentities_.find(container.identity())) {
-      return addToParent(*known, depth, parent);
-    }
+  const SharedNodeBase* const node = container.sharedNode();
+  if (isKnownContainer(node)) {
+    containers_[node->note()].walk = walk_;
+    return addToParent(node->note(), depth, parent);
   }
   const std::size_t firstPending = pending_.size();
   Size size;
@@ -164,18 +168,28 @@ bool Plan::visitContainer(const Container& container, std::size_t depth, Size& p
   if (!number) {
     return false;
   }
-  if (isShared) {
-    containerIdentities_.add(container.identity(), *number);
+  if (node != nullptr) {
+    containers_[*number].walk = walk_;
+    containers_[*number].node = node;
+    node->setNote(*number);
   }
   return addToParent(*number, depth, parent);
 }
 
-bool Plan::visitChildren(const PropertyArray& array, std::size_t depth, Size& size) {
+bool Catalogue::isKnownContainer(const SharedNodeBase* node) const {
+  if (node == nullptr || node->note() >= containers_.size()) {
+    return false;
+  }
+  const CatalogueContainer& container = containers_[node->note()];
+  return container.node == node && walk_ - container.walk <= 1;
+}
+
+bool Catalogue::visitChildren(const PropertyArray& array, std::size_t depth, Size& size) {
   return visitEach(array, depth, size,
                    [](const PropertyValue& element) -> const PropertyValue& { return element; });
 }
 
-bool Plan::visitChildren(const PropertyDictionary& dictionary, std::size_t depth, Size& size) {
+bool Catalogue::visitChildren(const PropertyDictionary& dictionary, std::size_t depth, Size& size) {
   return std::all_of(dictionary.begin(), dictionary.end(),
                      [&](const PropertyEntry& entry) { return visitText(entry.key, size); }) &&
          visitEach(dictionary, depth, size,
@@ -183,8 +197,8 @@ bool Plan::visitChildren(const PropertyDictionary& dictionary, std::size_t depth
 }
 
 template <class Container, class ValueOf>
-bool Plan::visitEach(const Container& container, std::size_t depth, Size& size,
-                     const ValueOf& valueOf) {
+bool Catalogue::visitEach(const Container& container, std::size_t depth, Size& size,
+                          const ValueOf& valueOf) {
   // Tables are looked into for a handful of values at once, which saves a seventh of the time for
   // a large file: the memory's answers come while others are waited for.
   constexpr std::ptrdiff_t kAnnouncedAtOnce = 16;
@@ -201,22 +215,21 @@ bool Plan::visitEach(const Container& container, std::size_t depth, Size& size,
   return true;
 }
 
-void Plan::announce(const PropertyValue& value) const {
+void Catalogue::announce(const PropertyValue& value) const {
   constexpr std::size_t kLongestAnnounced = 128;
   const Text* text = value.asText();
-  if (text == nullptr) {
+  if (text == nullptr || isKnown(text->bytes().sharedNode())) {
     return;
   }
-  if (text->isShared()) {
-    texts_.announce(text->identity());
-  } else if (const std::string_view bytes = *text; bytes.size() <= kLongestAnnounced) {
+  if (const std::string_view bytes = *text; bytes.size() <= kLongestAnnounced) {
     bytesTable_.announce(hash_(bytes));
   }
 }
 
 /// The number of the container whose references are the last pending ones, which it takes away.
-std::optional<Plan::Reference> Plan::findOrAddContainer(Kind kind, std::size_t firstPending,
-                                                        const Size& size) {
+std::optional<Catalogue::Reference> Catalogue::findOrAddContainer(Kind kind,
+                                                                  std::size_t firstPending,
+                                                                  const Size& size) {
   if (size.expandedCount > kMaximumExpandedValueCount) {
     fail("a container that stands for more values than the limit");
     return std::nullopt;
@@ -225,31 +238,34 @@ std::optional<Plan::Reference> Plan::findOrAddContainer(Kind kind, std::size_t f
   const auto newNumber = static_cast<Reference>(containers_.size());
   const Reference number =
       containerTable_.findOrAdd(hash_(asBytes(content)), newNumber, [&](Reference candidate) {
-        const PlannedContainer& other = containers_[candidate];
+        const CatalogueContainer& other = containers_[candidate];
         return other.kind == kind && asBytes(referencesOf(other)) == asBytes(content);
       });
   if (number == newNumber) {
-    containers_.push_back({kind, static_cast<std::uint32_t>(content.size()), references_.size(),
-                           static_cast<std::uint32_t>(size.expandedCount), size.height});
+    containers_.push_back({.firstReference = references_.size(),
+                           .referenceCount = static_cast<std::uint32_t>(content.size()),
+                           .expandedCount = static_cast<std::uint32_t>(size.expandedCount),
+                           .height = static_cast<std::uint16_t>(size.height),
+                           .kind = kind});
     references_.insert(references_.end(), content.begin(), content.end());
   }
   pending_.resize(firstPending);
   return checkObjectCount() ? std::optional(number) : std::nullopt;
 }
 
-bool Plan::addToParent(Reference number, std::size_t depth, Size& parent) {
-  const PlannedContainer& container = containers_[number];
+bool Catalogue::addToParent(Reference number, std::size_t depth, Size& parent) {
+  const CatalogueContainer& container = containers_[number];
   // A container that was met before, at a lower level, may be too high for this one.
   if (depth + container.height > kMaximumNestingDepth) {
     return fail("containers nested deeper than the limit");
   }
   pending_.push_back(number | kContainerBit);
   parent.expandedCount += container.expandedCount;
-  parent.height = std::max(parent.height, container.height + 1);
+  parent.height = std::max(parent.height, std::uint32_t{container.height} + 1);
   return true;
 }
 
-bool Plan::checkObjectCount() const {
+bool Catalogue::checkObjectCount() const {
   return objectCount() <= kMaximumObjectCount || fail("more objects than the limit");
 }
 

@@ -1,0 +1,157 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <optional>
+#include <span>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+#include "propertylist/BinaryPropertyListFormat.h"
+#include "propertylist/PropertyListError.h"
+#include "propertylist/PropertyListUniquing.h"
+#include "propertylist/PropertyValue.h"
+
+namespace accounts::binaryplist {
+
+/// The kinds of scalar that are written differently. Those that hold bytes come last.
+enum class ScalarKind : std::uint8_t {
+  Boolean,
+  SignedInteger,
+  /// From 2^63 to 2^64-1.
+  LargeInteger,
+  Real,
+  Date,
+  Data,
+  ASCIIText,
+  UTF16Text
+};
+
+/// A scalar that a file may hold. There may be millions: it is kept small.
+class CatalogueScalar {
+ public:
+  /// A number: its bits, 0 or 1 of a boolean.
+  CatalogueScalar(ScalarKind kind, std::uint64_t bits) : bits_(bits), kind_(kind) {}
+  /// A text or data, which it keeps alive.
+  CatalogueScalar(ScalarKind kind, SharedBytes bytes)
+      : bytes_(std::move(bytes)),
+        byteCount_(static_cast<std::uint32_t>(bytes_.view().size())),
+        kind_(kind) {}
+  CatalogueScalar(CatalogueScalar&& other) noexcept
+      : bits_(std::exchange(other.bits_, 0)), byteCount_(other.byteCount_), kind_(other.kind_) {}
+  CatalogueScalar& operator=(CatalogueScalar&&) = delete;
+  ~CatalogueScalar() {
+    if (holdsBytes()) {
+      bytes_.~SharedBytes();
+    }
+  }
+
+  [[nodiscard]] ScalarKind kind() const { return kind_; }
+  [[nodiscard]] bool holdsBytes() const { return kind_ >= ScalarKind::Data; }
+  /// Of numbers alone.
+  [[nodiscard]] std::uint64_t bits() const { return bits_; }
+  /// Of texts and data alone.
+  [[nodiscard]] std::string_view view() const { return bytes_.view(); }
+  [[nodiscard]] std::size_t byteCount() const { return byteCount_; }
+  [[nodiscard]] bool isNode(const SharedNodeBase* node) const {
+    return holdsBytes() && bytes_.sharedNode() == node;
+  }
+
+ private:
+  union {
+    std::uint64_t bits_;
+    SharedBytes bytes_;
+  };
+  std::uint32_t byteCount_ = 0;
+  ScalarKind kind_;
+};
+static_assert(sizeof(CatalogueScalar) == 16);
+
+/// A container that a file may hold: its references are a run of the catalogue's. The keys of a
+/// dictionary come first.
+struct CatalogueContainer {
+  std::size_t firstReference = 0;
+  std::uint32_t referenceCount = 0;
+  std::uint32_t expandedCount = 0;
+  std::uint16_t height = 0;
+  Kind kind = Kind::Array;
+  /// The walk that met it last, by number, and the node that it was met in. Its node is only kept
+  /// alive, and its address only tells something, until the next walk has ended.
+  std::uint32_t walk = 0;
+  const SharedNodeBase* node = nullptr;
+
+  [[nodiscard]] std::uint32_t childCount() const {
+    return kind == Kind::Dictionary ? referenceCount / 2 : referenceCount;
+  }
+};
+
+/// The distinct contents of the values that a writer met, containers too. What a value refers to
+/// depends on its content alone and not on which of its parts happen to share memory. A part that
+/// the walk before met, in the same memory, is known by the note on its node and not walked again.
+class Catalogue {
+ public:
+  /// Scalars and containers are numbered apart, each from 0 in the order in which a walk first left
+  /// them; a container's number has this bit in a reference.
+  using Reference = std::uint32_t;
+  static constexpr Reference kContainerBit = Reference{1} << 31;
+
+  /// The reference of a value, whose parts are all in the catalogue then. The value that was added
+  /// before must still be alive. None, with the error set, for a value that the reader would not
+  /// take back; nothing can be added after that.
+  [[nodiscard]] std::optional<Reference> add(const PropertyValue& value, PropertyListError& error);
+
+  [[nodiscard]] const CatalogueScalar& scalar(Reference number) const { return scalars_[number]; }
+  [[nodiscard]] const CatalogueContainer& container(Reference number) const {
+    return containers_[number];
+  }
+  [[nodiscard]] std::size_t scalarCount() const { return scalars_.size(); }
+  [[nodiscard]] std::size_t containerCount() const { return containers_.size(); }
+  [[nodiscard]] std::size_t objectCount() const { return scalarCount() + containerCount(); }
+  [[nodiscard]] std::span<const Reference> referencesOf(const CatalogueContainer& container) const {
+    return {references_.data() + container.firstReference, container.referenceCount};
+  }
+
+ private:
+  /// What a container adds up of its children.
+  struct Size {
+    std::uint64_t expandedCount = 1;
+    std::uint32_t height = 1;
+  };
+
+  bool fail(std::string_view what) const;
+  bool visit(const PropertyValue& value, std::size_t depth, Size& parent);
+  bool visitText(const Text& text, Size& parent);
+  bool visitNumber(ScalarKind kind, std::uint64_t bits, Size& parent);
+  bool visitData(const SharedBytes& bytes, Size& parent);
+  template <class Container>
+  bool visitContainer(const Container& container, std::size_t depth, Size& parent);
+  bool visitChildren(const PropertyArray& array, std::size_t depth, Size& size);
+  bool visitChildren(const PropertyDictionary& dictionary, std::size_t depth, Size& size);
+  template <class Container, class ValueOf>
+  bool visitEach(const Container& container, std::size_t depth, Size& size, const ValueOf& valueOf);
+  [[nodiscard]] bool isKnown(const SharedNodeBase* bytes) const;
+  [[nodiscard]] bool isKnownContainer(const SharedNodeBase* node) const;
+  void announce(const PropertyValue& value) const;
+  bool addBytes(ScalarKind kind, const SharedBytes& bytes);
+  std::optional<Reference> findOrAddContainer(Kind kind, std::size_t firstPending,
+                                              const Size& size);
+  bool addToParent(Reference number, std::size_t depth, Size& parent);
+  [[nodiscard]] bool checkObjectCount() const;
+
+  /// The number of the walk under way.
+  std::uint32_t walk_ = 0;
+  /// Where its error goes.
+  PropertyListError* error_ = nullptr;
+  KeyedHash hash_;
+  std::vector<CatalogueScalar> scalars_;
+  ContentTable numberTable_;
+  ContentTable bytesTable_;
+  std::vector<CatalogueContainer> containers_;
+  std::vector<Reference> references_;
+  ContentTable containerTable_;
+  /// References of the containers that are being walked, the innermost one's last.
+  std::vector<Reference> pending_;
+};
+
+}  // namespace accounts::binaryplist
