@@ -105,7 +105,7 @@ std::vector<std::string> DeviceRootFixture::files() const {
   std::vector<std::string> paths;
   for (const fs::directory_entry& entry : fs::recursive_directory_iterator(directory_)) {
     if (!fs::is_directory(entry.symlink_status())) {
-      paths.push_back("/" + fs::relative(entry.path(), directory_).string());
+      paths.push_back("/" + entry.path().lexically_relative(directory_).string());
     }
   }
   std::sort(paths.begin(), paths.end());

@@ -23,6 +23,11 @@ inline constexpr const char* kLegacyMailPath = "/var/mobile/Library/Mail/Account
 inline constexpr const char* kLegacyExchangePath =
     "/var/mobile/Library/Preferences/com.quarx.DataAccess.plist";
 inline constexpr const char* kSentinelPath = "/var/mobile/Library/Preferences/.removingOldAccounts";
+inline constexpr const char* kAutoFetchPath = "/var/mobile/Library/Mail/AutoFetchEnabled";
+inline constexpr const char* kLoggingPreferencesPath =
+    "/var/mobile/Library/Preferences/com.quarx.accountsettings-logging.plist";
+inline constexpr const char* kInformationDirectory =
+    "/var/mobile/Library/Logs/CrashReporter/AccountMigration";
 inline constexpr const char* kLockPath = "/tmp/AccountMigrationInProgress";
 inline constexpr const char* kDevicePropertyListPath = "/etc/device.plist";
 

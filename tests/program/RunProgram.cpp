@@ -2,12 +2,16 @@
 
 #include <fcntl.h>
 #include <grp.h>
+#include <gtest/gtest.h>
+#include <poll.h>
 #include <sys/mman.h>
+#include <sys/syscall.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <array>
+#include <csignal>
 #include <cstdlib>
 #include <sstream>
 
@@ -40,7 +44,7 @@ bool becomeUser(uid_t user) {
   return setgroups(0, nullptr) == 0 && setgid(user) == 0 && setuid(user) == 0;
 }
 
-[[noreturn]] void startProgram(const ProgramCall& call, int output, int errors) {
+[[noreturn]] void becomeProgram(const ProgramCall& call, int output, int errors) {
   dup2(open("/dev/null", O_RDONLY | O_CLOEXEC), STDIN_FILENO);
   const int outputFile =
       call.outputFile ? open(call.outputFile->c_str(), O_WRONLY | O_CLOEXEC) : output;
@@ -75,15 +79,33 @@ bool ProgramResult::hasErrorLine(const std::string& line) const {
   return std::find(lines.begin(), lines.end(), line) != lines.end();
 }
 
+pid_t startProgram(const ProgramCall& call, int output, int errors) {
+  const pid_t child = fork();
+  if (child == 0) {
+    becomeProgram(call, output, errors);
+  }
+  return child;
+}
+
+int waitForEnd(pid_t process, std::chrono::seconds timeLimit) {
+  const auto handle = static_cast<int>(syscall(SYS_pidfd_open, process, 0));
+  pollfd ended = {handle, POLLIN, 0};
+  const auto milliseconds = std::chrono::milliseconds(timeLimit).count();
+  if (poll(&ended, 1, static_cast<int>(milliseconds)) == 0) {
+    ADD_FAILURE() << "a program did not end within " << timeLimit.count() << " seconds";
+    kill(process, SIGKILL);
+  }
+  close(handle);
+  int status = 0;
+  waitpid(process, &status, 0);
+  return status;
+}
+
 ProgramResult runProgram(const ProgramCall& call) {
   const int output = memfd_create("output", MFD_CLOEXEC);
   const int errors = memfd_create("errors", MFD_CLOEXEC);
-  const pid_t child = fork();
-  if (child == 0) {
-    startProgram(call, output, errors);
-  }
-  int status = 0;
-  waitpid(child, &status, 0);
+  const pid_t process = startProgram(call, output, errors);
+  const int status = waitForEnd(process, call.timeLimit);
   return ProgramResult{WIFSIGNALED(status) ? -WTERMSIG(status) : WEXITSTATUS(status),
                        contentsOf(output), contentsOf(errors)};
 }

@@ -1,6 +1,8 @@
 #pragma once
 
 #include <sys/types.h>
+
+#include <chrono>
 #include <map>
 #include <optional>
 #include <string>
@@ -19,6 +21,9 @@ struct ProgramCall {
   std::optional<uid_t> user = {};
   /// Where standard output goes instead of into the result.
   std::optional<std::string> outputFile = {};
+  /// How long it may take. Generous, for machines that are busy: it only has to tell a program that
+  /// waits for something that never happens from one that works.
+  std::chrono::seconds timeLimit = std::chrono::seconds(60);
 };
 
 /// What a program left behind when it ended.
@@ -35,7 +40,16 @@ struct ProgramResult {
   [[nodiscard]] bool hasErrorLine(const std::string& line) const;
 };
 
-/// Runs a program to its end, standard input being empty.
+/// Starts a program, standard input being empty, and returns its process. Standard output and
+/// standard error go to the given descriptors.
+pid_t startProgram(const ProgramCall& call, int output, int errors);
+
+/// Waits for the end of a process that this one started and returns what waitpid() says. One that
+/// takes longer than its time is killed, and the test fails.
+int waitForEnd(pid_t process, std::chrono::seconds timeLimit);
+
+/// Runs a program to its end, standard input being empty. One that takes longer than its time limit
+/// is killed, and the test fails.
 ProgramResult runProgram(const ProgramCall& call);
 
 }  // namespace accounts

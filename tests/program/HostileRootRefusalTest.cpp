@@ -1,0 +1,133 @@
+#include <gmock/gmock.h>
+
+#include "tests/program/HostileRootFixture.h"
+
+// What a person reads when something of a device had to be refused: which path, and why.
+
+namespace accounts {
+namespace {
+
+using testing::HasSubstr;
+
+struct Refusal {
+  const char* kind;
+  const char* path;
+  /// A line of standard error, or a part of one.
+  const char* line;
+};
+
+class HostileRootRefusal : public HostileRootFixture,
+                           public testing::WithParamInterface<Refusal> {};
+
+constexpr Refusal kFileRefusals[] = {
+    {"ANamedPipe", kDevicePropertyListPath,
+     "migration-host: Cannot open /etc/device.plist: It is a named pipe, not a regular file\n"},
+    {"ACharacterDevice", kDevicePropertyListPath,
+     "migration-host: Cannot open /etc/device.plist: It is a character device, not a regular "
+     "file\n"},
+    {"ALinkToItself", kDevicePropertyListPath,
+     "migration-host: Cannot open /etc/device.plist: Too many levels of symbolic links\n"},
+    {"AHugeFile", kDevicePropertyListPath,
+     "migration-host: Cannot read /etc/device.plist: File too large\n"},
+    {"AnUnreadableFile", kDevicePropertyListPath,
+     "migration-host: Cannot open /etc/device.plist: Permission denied\n"},
+    {"ASocket", kLockPath, "migration-host: The plug-in reported that it failed\n"},
+    {"ADirectory", kSettingsPath, "\"Failed to save accounts to filesystem.\"\n"},
+    {"AnImmutableFile", kSettingsPath, "\"Failed to save accounts to filesystem.\"\n"},
+    {"ANamedPipe", kSettingsPath,
+     "Error trying to save an accountsettings plist copy: Cannot open "
+     "/var/mobile/Library/Preferences/com.quarx.accountsettings.plist: It is a named pipe, not a "
+     "regular file\n"},
+    {"ADirectory", kSettingsCopyPath,
+     "Couldn't remove existing accountsettings copy at "
+     "/var/mobile/Library/Logs/CrashReporter/com.quarx.accountsettings.plist\n"},
+    {"AnImmutableFile", kLegacyMailPath,
+     "-[AccountsDataMigrator(Internal) _removeOldAccountsInfo]. Could not delete "
+     "/var/mobile/Library/Mail/Accounts.plist. Error = Cannot remove "
+     "/var/mobile/Library/Mail/Accounts.plist: Operation not permitted\n"},
+    {"AnImmutableFile", kLegacyExchangePath,
+     "-[AccountsDataMigrator(Internal) _removeOldAccountsInfo]. Could not delete "
+     "/var/mobile/Library/Preferences/com.quarx.DataAccess.plist. Error = Cannot remove "
+     "/var/mobile/Library/Preferences/com.quarx.DataAccess.plist: Operation not permitted\n"},
+    {"ADirectory", kSentinelPath,
+     "-[AccountsDataMigrator(Internal) _removeOldAccountsInfo]. Could not delete "
+     "/var/mobile/Library/Preferences/.removingOldAccounts. Error = Cannot remove "
+     "/var/mobile/Library/Preferences/.removingOldAccounts: Is a directory\n"},
+    {"ABlockDevice", "/etc/passwd",
+     "\"Could not set attributes on the temporary account settings plist. Cannot open /etc/passwd: "
+     "It is a block device, not a regular file\"\n"},
+    {"AnAbsoluteLinkOut", "/etc/group",
+     "\"Could not set attributes on the temporary account settings plist. Cannot open /etc/group: "
+     "No such file or directory\"\n"},
+};
+
+constexpr Refusal kDirectoryRefusals[] = {
+    {"ALinkToItself", "/etc",
+     "migration-host: Cannot open /etc/device.plist: Too many levels of symbolic links\n"},
+    {"AnAbsoluteLinkOut", "/tmp", "migration-host: The plug-in reported that it failed\n"},
+    {"AFile", "/var/mobile/tmp", "\"Failed to save accounts to filesystem.\"\n"},
+    {"AnAbsoluteLinkOut", "/var/mobile/tmp", "\"Failed to save accounts to filesystem.\"\n"},
+    {"AFile", kInformationDirectory,
+     "AccountMigrator warning: /var/mobile/Library/Logs/CrashReporter/AccountMigration already "
+     "exists and is not a directory\n"},
+    {"AnAbsoluteLinkOut", kInformationDirectory,
+     "AccountMigration warning: Could not create the directory to store migration information at "
+     "/var/mobile/Library/Logs/CrashReporter/AccountMigration [Error = Cannot create the directory "
+     "/var/mobile/Library/Logs/CrashReporter/AccountMigration: File exists]\n"},
+};
+
+class RefusedFile : public HostileRootRefusal {};
+class RefusedDirectory : public HostileRootRefusal {};
+
+TEST_P(RefusedFile, IsNamedOnOneLineWithTheReason) {
+  const HostileKind& kind = hostileFileKind(GetParam().kind);
+  put(kind, GetParam().path);
+
+  EXPECT_THAT(migrateWith(kind, {"--bare"}).errors, HasSubstr(GetParam().line));
+}
+
+TEST_P(RefusedDirectory, IsNamedOnOneLineWithTheReason) {
+  const HostileKind& kind = hostileDirectoryKind(GetParam().kind);
+  put(kind, GetParam().path);
+
+  EXPECT_THAT(migrateWith(kind, {"--bare"}).errors, HasSubstr(GetParam().line));
+}
+
+std::string nameOf(const testing::TestParamInfo<Refusal>& information) {
+  std::string name = std::string(information.param.kind) + "At" + information.param.path;
+  std::erase_if(name, [](unsigned char character) { return std::isalnum(character) == 0; });
+  return name;
+}
+
+INSTANTIATE_TEST_SUITE_P(Hostile, RefusedFile, testing::ValuesIn(kFileRefusals), nameOf);
+INSTANTIATE_TEST_SUITE_P(Hostile, RefusedDirectory, testing::ValuesIn(kDirectoryRefusals), nameOf);
+
+/// The device of these tests without anything hostile: what the refusals above are measured by.
+class NothingHostile : public HostileRootFixture {};
+
+TEST_F(NothingHostile, IsMigratedInEveryWayWithoutARefusal) {
+  const ProgramResult result = migrate();
+
+  EXPECT_EQ(result.exitStatus, 0);
+  EXPECT_THAT(result.errors, testing::Not(testing::AnyOf(HasSubstr("Cannot"), HasSubstr("Could"),
+                                                         HasSubstr("rror"))));
+  EXPECT_EQ(readDictionary(kSettingsPath).arrayForKey("Accounts")->size(), 3U);
+  EXPECT_FALSE(exists(kLegacyMailPath));
+  EXPECT_FALSE(exists(kLegacyExchangePath));
+  EXPECT_FALSE(exists(kAutoFetchPath));
+  EXPECT_FALSE(std::filesystem::is_empty(onThisMachine(kInformationDirectory)));
+}
+
+TEST_F(NothingHostile, ALinkThatStaysInTheRootIsFollowed) {
+  std::filesystem::rename(onThisMachine(kLegacyMailPath), onThisMachine("/var/mobile/Elsewhere"));
+  std::filesystem::create_symlink("/var/mobile/Elsewhere", onThisMachine(kLegacyMailPath));
+
+  EXPECT_EQ(migrate().exitStatus, 0);
+
+  EXPECT_EQ(readDictionary(kSettingsPath).arrayForKey("Accounts")->size(), 3U);
+  EXPECT_FALSE(exists(kLegacyMailPath));
+  EXPECT_TRUE(exists("/var/mobile/Elsewhere"));
+}
+
+}  // namespace
+}  // namespace accounts
