@@ -14,8 +14,12 @@ namespace {
 
 namespace fs = std::filesystem;
 
-fs::path makeTemporaryDirectory() {
-  std::string path = (fs::temp_directory_path() / "device-root-XXXXXX").string();
+constexpr const char* kDirectoryInMemory = "/dev/shm";
+
+fs::path makeTemporaryDirectory(Medium medium) {
+  const bool inMemory = medium == Medium::Memory && access(kDirectoryInMemory, W_OK) == 0;
+  const fs::path parent = inMemory ? kDirectoryInMemory : fs::temp_directory_path();
+  std::string path = (parent / "device-root-XXXXXX").string();
   if (mkdtemp(path.data()) == nullptr) {
     ADD_FAILURE() << "no temporary directory";
   }
@@ -24,7 +28,7 @@ fs::path makeTemporaryDirectory() {
 
 }  // namespace
 
-DeviceRootFixture::DeviceRootFixture() : directory_(makeTemporaryDirectory()) {
+DeviceRootFixture::DeviceRootFixture(Medium medium) : directory_(makeTemporaryDirectory(medium)) {
   for (const char* directory :
        {"/tmp", "/etc", "/var/mobile/Library/Preferences", "/var/mobile/Library/Mail",
         "/var/mobile/Library/Logs/CrashReporter"}) {

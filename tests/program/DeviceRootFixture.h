@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdint>
 #include <filesystem>
 #include <nlohmann/json.hpp>
 #include <optional>
@@ -31,6 +32,10 @@ inline constexpr const char* kInformationDirectory =
 inline constexpr const char* kLockPath = "/tmp/AccountMigrationInProgress";
 inline constexpr const char* kDevicePropertyListPath = "/etc/device.plist";
 
+/// Where a device root lies: on the machine's disk, or in memory if the machine has such a place,
+/// for tests of hundreds of runs, which would mostly wait for the disk.
+enum class Medium : std::uint8_t { Disk, Memory };
+
 /// A device root in a temporary directory, and the real host to run on it. The root starts with the
 /// directories that every device has, a user "mobile" who is the test's own user, and no accounts.
 class DeviceRootFixture : public testing::Test {
@@ -39,7 +44,7 @@ class DeviceRootFixture : public testing::Test {
   DeviceRootFixture& operator=(const DeviceRootFixture&) = delete;
 
  protected:
-  DeviceRootFixture();
+  explicit DeviceRootFixture(Medium medium = Medium::Disk);
   ~DeviceRootFixture() override;
 
   /// Where a device path lies on this machine.

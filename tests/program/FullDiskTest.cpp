@@ -1,64 +1,120 @@
-#include <sys/mount.h>
+#include <gmock/gmock.h>
 
-#include <fstream>
-#include <string>
+#include <filesystem>
+#include <iostream>
+#include <memory>
+#include <tuple>
 
-#include "tests/program/DeviceRootFixture.h"
+#include "tests/program/InterruptedDevice.h"
+#include "tests/program/SmallDisk.h"
+
+// A device whose home directory is a file system of its own that is really full: of blocks or of
+// files, to every degree from nothing free to enough.
 
 namespace accounts {
 namespace {
 
 constexpr const char* kHome = "/var/mobile";
+constexpr const char* kSaveFailed = "\"Failed to save accounts to filesystem.\"";
 
-/// A device whose home directory is a file system of its own, and full.
-class FullDisk : public DeviceRootFixture {
- protected:
-  void SetUp() override {
-    mounted_ = mount("none", onThisMachine(kHome).c_str(), "tmpfs", 0, "size=256k") == 0;
-    if (!mounted_) {
-      GTEST_SKIP() << "This system lets the test mount no file system.";
-    }
-    write(kSettingsPath, accountSettings(11, {PropertyDictionary{{"Type", "CalDAV"},
-                                                                 {"Class", "MobileCalDAVAccount"},
-                                                                 {"Identifier", "one"}}}));
-    write(kLegacyMailPath, PropertyDictionary{{"MailAccounts", PropertyArray{}}});
-  }
-
-  void TearDown() override {
-    if (mounted_) {
-      umount2(onThisMachine(kHome).c_str(), MNT_DETACH);
-    }
-  }
-
-  /// Leaves no room for a single byte.
-  void fill() const {
-    std::ofstream stream(onThisMachine("/var/mobile/filling"), std::ios::binary);
-    const std::string page(4096, 'x');
-    while (stream.write(page.data(), static_cast<std::streamsize>(page.size())).flush()) {
-    }
-  }
-
- private:
-  bool mounted_ = false;
+/// What the disk runs out of.
+struct Shortage {
+  const char* name;
+  void (SmallDisk::*leave)(std::uint64_t count) const;
 };
 
-TEST_F(FullDisk, LeavesTheSettingsFileAsItWas) {
-  const std::string settingsBefore = readText(kSettingsPath);
-  fill();
-
-  const ProgramResult result = migrate({"--channel", "-"});
-
-  EXPECT_NE(result.errors.find("\"Failed to save accounts to filesystem.\""), std::string::npos)
-      << result.errors;
-  EXPECT_EQ(readText(kSettingsPath), settingsBefore);
+std::ostream& operator<<(std::ostream& stream, const Shortage& shortage) {
+  return stream << shortage.name;
 }
 
-TEST_F(FullDisk, WithRoomIsMigrated) {
-  ASSERT_EQ(migrate().exitStatus, 0);
+constexpr Shortage kShortages[] = {
+    {"Blocks", &SmallDisk::leaveBlocks},
+    {"Inodes", &SmallDisk::leaveInodes},
+};
 
-  EXPECT_EQ(readDictionary(kSettingsPath).find("Version")->integerValue(), 12);
-  EXPECT_FALSE(exists(kLegacyMailPath));
+// More than a migration of these devices takes of anything.
+constexpr std::uint64_t kEnough = 24;
+
+class FullDisk : public InterruptedDevice,
+                 public testing::WithParamInterface<std::tuple<SmallDisk::Kind, Shortage>> {
+ protected:
+  void SetUp() override {
+    disk_ = std::make_unique<SmallDisk>(std::get<0>(GetParam()), onThisMachine(kHome));
+    if (disk_->reason()) {
+      GTEST_SKIP() << *disk_->reason();
+    }
+    makeDevice();
+  }
+
+  void TearDown() override { disk_.reset(); }
+
+  void leave(std::uint64_t count) const { ((*disk_).*std::get<1>(GetParam()).leave)(count); }
+
+  /// Makes the device anew on a disk with room.
+  void makeDeviceAgain() const {
+    disk_->makeRoom();
+    makeDevice();
+  }
+
+  /// Expects that no file of a migration's own is left, whether it succeeded or not.
+  void expectNoLeftovers() const {
+    EXPECT_FALSE(exists(kSentinelPath));
+    for (const char* directory : {"/var/mobile/tmp", "/var/mobile/Library/Preferences"}) {
+      for (const std::string& file : files()) {
+        EXPECT_FALSE(file.starts_with(std::string(directory) + "/.")) << file;
+      }
+    }
+  }
+
+  std::unique_ptr<SmallDisk> disk_;
+};
+
+TEST_P(FullDisk, ToAnyDegreeLeavesTheSettingsWhollyOldOrWhollyNew) {
+  int failures = 0;
+  for (std::uint64_t free = 0; free <= kEnough; ++free) {
+    SCOPED_TRACE("free: " + std::to_string(free));
+    leave(free);
+
+    const ProgramResult result = migrate({"--bare", "--channel", "-"});
+
+    // The plug-in's own result: it is that of the upgrade, whatever becomes of the save.
+    EXPECT_EQ(result.exitStatus, 0);
+    const PropertyDictionary settings = readDictionary(kSettingsPath);
+    const bool isNew = settings == settingsAfter();
+    EXPECT_TRUE(isNew || settings == settingsBefore());
+    if (!isNew) {
+      ++failures;
+      EXPECT_THAT(result.errors, testing::HasSubstr(kSaveFailed));
+    }
+    expectNoLeftovers();
+    expectLockIsFree();
+    makeDeviceAgain();
+  }
+
+  EXPECT_GT(failures, 0);
+  std::cout << kEnough + 1 << " degrees of fullness, " << failures << " too full\n";
 }
+
+TEST_P(FullDisk, WithEnoughRoomIsMigrated) {
+  leave(kEnough);
+
+  EXPECT_EQ(migrate({"--bare"}).exitStatus, 0);
+
+  disk_->makeRoom();
+  expectMigrated();
+}
+
+std::string nameOf(
+    const testing::TestParamInfo<std::tuple<SmallDisk::Kind, Shortage>>& information) {
+  const auto& [kind, shortage] = information.param;
+  return testing::PrintToString(kind) + shortage.name;
+}
+
+INSTANTIATE_TEST_SUITE_P(Kinds, FullDisk,
+                         testing::Combine(testing::Values(SmallDisk::Kind::Memory,
+                                                          SmallDisk::Kind::Ext4),
+                                          testing::ValuesIn(kShortages)),
+                         nameOf);
 
 }  // namespace
 }  // namespace accounts

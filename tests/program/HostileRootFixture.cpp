@@ -31,7 +31,7 @@ bool holdsMark(const fs::path& file) {
 
 }  // namespace
 
-HostileRootFixture::HostileRootFixture() {
+HostileRootFixture::HostileRootFixture() : DeviceRootFixture(Medium::Memory) {
   write(kSettingsPath, accountSettings(11, {PropertyDictionary{{"Type", "CalDAV"},
                                                                {"Class", "MobileCalDAVAccount"},
                                                                {"Identifier", "SETTINGS"}}}));

@@ -16,6 +16,10 @@ struct Refusal {
   const char* line;
 };
 
+std::ostream& operator<<(std::ostream& stream, const Refusal& refusal) {
+  return stream << refusal.kind << " at " << refusal.path;
+}
+
 class HostileRootRefusal : public HostileRootFixture,
                            public testing::WithParamInterface<Refusal> {};
 

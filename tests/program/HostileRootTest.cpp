@@ -28,6 +28,10 @@ struct Place {
   Role role = Role::Other;
 };
 
+std::ostream& operator<<(std::ostream& stream, const Place& place) {
+  return stream << place.path;
+}
+
 constexpr Place kFiles[] = {
     {"Settings", kSettingsPath},
     {"SettingsCopy", kSettingsCopyPath},

@@ -44,7 +44,22 @@ bool becomeUser(uid_t user) {
   return setgroups(0, nullptr) == 0 && setgid(user) == 0 && setuid(user) == 0;
 }
 
-[[noreturn]] void becomeProgram(const ProgramCall& call, int output, int errors) {
+}  // namespace
+
+std::vector<std::string> ProgramResult::outputLines() const {
+  return linesOf(output);
+}
+
+std::vector<std::string> ProgramResult::errorLines() const {
+  return linesOf(errors);
+}
+
+bool ProgramResult::hasErrorLine(const std::string& line) const {
+  const std::vector<std::string> lines = errorLines();
+  return std::find(lines.begin(), lines.end(), line) != lines.end();
+}
+
+void becomeProgram(const ProgramCall& call, int output, int errors) {
   dup2(open("/dev/null", O_RDONLY | O_CLOEXEC), STDIN_FILENO);
   const int outputFile =
       call.outputFile ? open(call.outputFile->c_str(), O_WRONLY | O_CLOEXEC) : output;
@@ -62,21 +77,6 @@ bool becomeUser(uid_t user) {
     execvp(call.program.c_str(), arguments.data());
   }
   _exit(kCannotStart);
-}
-
-}  // namespace
-
-std::vector<std::string> ProgramResult::outputLines() const {
-  return linesOf(output);
-}
-
-std::vector<std::string> ProgramResult::errorLines() const {
-  return linesOf(errors);
-}
-
-bool ProgramResult::hasErrorLine(const std::string& line) const {
-  const std::vector<std::string> lines = errorLines();
-  return std::find(lines.begin(), lines.end(), line) != lines.end();
 }
 
 pid_t startProgram(const ProgramCall& call, int output, int errors) {

@@ -40,6 +40,10 @@ struct ProgramResult {
   [[nodiscard]] bool hasErrorLine(const std::string& line) const;
 };
 
+/// Makes the calling process the program, standard input being empty; standard output and standard
+/// error go to the given descriptors. For a process that was just forked.
+[[noreturn]] void becomeProgram(const ProgramCall& call, int output, int errors);
+
 /// Starts a program, standard input being empty, and returns its process. Standard output and
 /// standard error go to the given descriptors.
 pid_t startProgram(const ProgramCall& call, int output, int errors);
