@@ -1,29 +1,16 @@
 #include <fcntl.h>
 #include <sys/file.h>
-#include <sys/stat.h>
 #include <unistd.h>
 
 #include <filesystem>
-#include <fstream>
 #include <future>
 #include <thread>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/ListedLocks.h"
 
 namespace accounts {
 namespace {
-
-/// Whether the system's list of file locks has one on a file, held or waited for.
-bool isListed(ino_t inode, bool waiting) {
-  std::ifstream locks("/proc/locks");
-  for (std::string line; std::getline(locks, line);) {
-    const bool waits = line.find("->") != std::string::npos;
-    if (waits == waiting && line.find(":" + std::to_string(inode) + " ") != std::string::npos) {
-      return true;
-    }
-  }
-  return false;
-}
 
 /// The result that the host sees of each kind of migration.
 class DriverResult : public DeviceRootFixture {
@@ -73,16 +60,15 @@ TEST_F(DriverResult, WithTheLockOfAFinishedMigrationItIsTrue) {
 TEST_F(DriverResult, WhileAnotherProcessHoldsTheLockItIsWaitedFor) {
   constexpr mode_t ownerOnly = 0600;
   const int lock = open(onThisMachine(kLockPath).c_str(), O_CREAT | O_RDWR | O_CLOEXEC, ownerOnly);
-  struct stat information {};
-  ASSERT_EQ(fstat(lock, &information), 0);
   ASSERT_EQ(flock(lock, LOCK_EX), 0);
-  if (!isListed(information.st_ino, false)) {
+  const std::filesystem::path lockFile = onThisMachine(kLockPath);
+  if (!isLockListed(lockFile)) {
     close(lock);
     GTEST_SKIP() << "This system does not list its file locks.";
   }
 
   std::future<ProgramResult> result = std::async(std::launch::async, [this] { return migrate(); });
-  while (!isListed(information.st_ino, true)) {
+  while (listedLockWaiters(lockFile) == 0) {
     std::this_thread::yield();
   }
 
