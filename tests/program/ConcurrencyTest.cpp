@@ -221,7 +221,7 @@ class StoppedMigration : public InterruptedDevice {
 
 TEST_F(StoppedMigration, IsNeverSeenHalfDoneByAProgramThatWaitsForItsEnd) {
   TracedProgram program(migrationCall({"--bare"}), root());
-  for (int stop = 0; program.runToNextStop(); ++stop) {
+  for (int stop = 0; program.runToNextStop() && !HasFatalFailure(); ++stop) {
     if (stop % kStep == 0 && isLockListed(onThisMachine(kLockPath))) {
       startWaiting();
     }

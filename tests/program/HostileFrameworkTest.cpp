@@ -40,20 +40,29 @@ class HostileFramework : public HostileRootFixture,
   }
 };
 
-class HostileLibrary : public HostileFramework {};
-class HostileFrameworkDirectory : public HostileFramework {};
+class HostileLibrary : public HostileFramework {
+ protected:
+  void SetUp() override {
+    HostileFramework::SetUp();
+    put(GetParam(), kLibrary);
+  }
+};
+
+class HostileFrameworkDirectory : public HostileFramework {
+ protected:
+  void SetUp() override {
+    HostileFramework::SetUp();
+    put(GetParam(), kFramework);
+  }
+};
 
 TEST_P(HostileLibrary, IsLoadedOnlyIfItIsTheDevicesOwnFile) {
-  put(GetParam(), kLibrary);
-
   // Huge ones included: the dynamic loader maps what it needs.
   EXPECT_EQ(isNotified(), GetParam().opened == Finding::Usable);
   expectNothingCrossedTheBorder();
 }
 
 TEST_P(HostileFrameworkDirectory, HoldsNothingToLoadUnlessItIsTheDevicesOwn) {
-  put(GetParam(), kFramework);
-
   EXPECT_EQ(isNotified(), GetParam().finding == Finding::Usable);
   expectNothingCrossedTheBorder();
 }

@@ -28,7 +28,8 @@ class HostileRootFixture : public DeviceRootFixture {
   HostileRootFixture();
   ~HostileRootFixture() override;
 
-  /// Puts something hostile in a place of the device. Skips the test where the system cannot.
+  /// Puts something hostile in a place of the device, for SetUp(). Skips the test where the system
+  /// cannot.
   void put(const HostileKind& kind, const char* devicePath);
 
   /// Migrates with JSON and the log channel, by the user to whom the kind is hostile.

@@ -80,20 +80,25 @@ constexpr Refusal kDirectoryRefusals[] = {
      "/var/mobile/Library/Logs/CrashReporter/AccountMigration: File exists]\n"},
 };
 
-class RefusedFile : public HostileRootRefusal {};
-class RefusedDirectory : public HostileRootRefusal {};
+class RefusedFile : public HostileRootRefusal {
+ protected:
+  const HostileKind& kind = hostileFileKind(GetParam().kind);
+
+  void SetUp() override { put(kind, GetParam().path); }
+};
+
+class RefusedDirectory : public HostileRootRefusal {
+ protected:
+  const HostileKind& kind = hostileDirectoryKind(GetParam().kind);
+
+  void SetUp() override { put(kind, GetParam().path); }
+};
 
 TEST_P(RefusedFile, IsNamedOnOneLineWithTheReason) {
-  const HostileKind& kind = hostileFileKind(GetParam().kind);
-  put(kind, GetParam().path);
-
   EXPECT_THAT(migrateWith(kind, {"--bare"}).errors, HasSubstr(GetParam().line));
 }
 
 TEST_P(RefusedDirectory, IsNamedOnOneLineWithTheReason) {
-  const HostileKind& kind = hostileDirectoryKind(GetParam().kind);
-  put(kind, GetParam().path);
-
   EXPECT_THAT(migrateWith(kind, {"--bare"}).errors, HasSubstr(GetParam().line));
 }
 
