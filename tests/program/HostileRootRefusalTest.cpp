@@ -1,4 +1,8 @@
 #include <gmock/gmock.h>
+#include <sys/stat.h>
+
+#include <map>
+#include <sstream>
 
 #include "tests/program/HostileRootFixture.h"
 
@@ -112,7 +116,18 @@ INSTANTIATE_TEST_SUITE_P(Hostile, RefusedFile, testing::ValuesIn(kFileRefusals),
 INSTANTIATE_TEST_SUITE_P(Hostile, RefusedDirectory, testing::ValuesIn(kDirectoryRefusals), nameOf);
 
 /// The device of these tests without anything hostile: what the refusals above are measured by.
-class NothingHostile : public HostileRootFixture {};
+class NothingHostile : public HostileRootFixture {
+ protected:
+  /// Contents, mode, owner and time of change of a file.
+  [[nodiscard]] std::string describe(const std::string& devicePath) const {
+    struct stat status {};
+    EXPECT_EQ(lstat(onThisMachine(devicePath).c_str(), &status), 0) << devicePath;
+    std::ostringstream text;
+    text << status.st_mode << " " << status.st_uid << ":" << status.st_gid << " "
+         << status.st_mtim.tv_sec << "." << status.st_mtim.tv_nsec << " " << readText(devicePath);
+    return text.str();
+  }
+};
 
 TEST_F(NothingHostile, IsMigratedInEveryWayWithoutARefusal) {
   const ProgramResult result = migrate();
@@ -136,6 +151,24 @@ TEST_F(NothingHostile, ALinkThatStaysInTheRootIsFollowed) {
   EXPECT_EQ(readDictionary(kSettingsPath).arrayForKey("Accounts")->size(), 3U);
   EXPECT_FALSE(exists(kLegacyMailPath));
   EXPECT_TRUE(exists("/var/mobile/Elsewhere"));
+}
+
+// Snapshots of images are often made of hard links.
+TEST_F(NothingHostile, ASnapshotThatSharesItsFilesStaysAsItIs) {
+  std::map<std::string, std::string> before;
+  for (const std::string& file : files()) {
+    const std::string snapshot = "/snapshot" + file;
+    std::filesystem::create_directories(onThisMachine(snapshot).parent_path());
+    std::filesystem::create_hard_link(onThisMachine(file), onThisMachine(snapshot));
+    before[snapshot] = describe(snapshot);
+  }
+
+  EXPECT_EQ(migrate().exitStatus, 0);
+
+  EXPECT_NE(readText(kSettingsPath), readText(std::string("/snapshot") + kSettingsPath));
+  for (const auto& [snapshot, description] : before) {
+    EXPECT_EQ(describe(snapshot), description) << snapshot;
+  }
 }
 
 }  // namespace

@@ -17,10 +17,12 @@ namespace {
 // Several pages, so that a write of the settings can end in the middle.
 constexpr std::size_t kNotesSize = 20'000;
 
-// What a killed run leaves in the temporary directory is in nobody's way.
-std::vector<std::string> withoutTemporaryFiles(std::vector<std::string> files) {
+constexpr std::string_view kKeptInputs = "/var/mobile/Library/AccountMigration/";
+
+// What a killed run leaves is in nobody's way: inputs that it had kept, and temporary files.
+std::vector<std::string> withoutRemains(std::vector<std::string> files) {
   std::erase_if(files, [](const std::string& file) {
-    return file.find(kTemporaryFilePrefix) != std::string::npos;
+    return file.starts_with(kKeptInputs) || file.find(kTemporaryFilePrefix) != std::string::npos;
   });
   return files;
 }
@@ -84,11 +86,11 @@ void InterruptedDevice::expectLockIsFree() const {
 
 void InterruptedDevice::expectMigrated() const {
   EXPECT_EQ(readDictionary(kSettingsPath), settingsAfter_);
-  EXPECT_EQ(withoutTemporaryFiles(files()), filesAfter_);
+  EXPECT_EQ(withoutRemains(files()), filesAfter_);
 }
 
-void InterruptedDevice::expectNextRunFinishes() const {
-  const ProgramResult result = migrate({"--bare"});
+void InterruptedDevice::expectNextRunFinishes(const std::vector<std::string>& arguments) const {
+  const ProgramResult result = migrate(arguments);
   EXPECT_EQ(result.exitStatus, 0) << result.errors;
   expectMigrated();
 }

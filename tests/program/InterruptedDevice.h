@@ -24,11 +24,12 @@ class InterruptedDevice : public DeviceRootFixture {
   /// Expects that nobody holds the migration's lock any more.
   void expectLockIsFree() const;
 
-  /// Expects the device as an undisturbed migration leaves it, no file more or less.
+  /// Expects the device as an undisturbed migration leaves it, no file more or less but for the
+  /// inputs that a killed run had kept.
   void expectMigrated() const;
 
   /// Migrates the device to the end and expects that it is as if nothing had happened.
-  void expectNextRunFinishes() const;
+  void expectNextRunFinishes(const std::vector<std::string>& arguments) const;
 
   [[nodiscard]] static PropertyDictionary settingsBefore();
   [[nodiscard]] const PropertyDictionary& settingsAfter() const { return settingsAfter_; }

@@ -13,7 +13,10 @@ namespace {
 // With sanitizers every fifth stop has to do, each run being so much slower.
 constexpr int kStep = kWithSanitizers ? 5 : 1;
 
-class KillAtSystemCall : public InterruptedDevice {
+/// With the host's safety net, and without.
+using Arguments = std::vector<std::string>;
+
+class KillAtSystemCall : public InterruptedDevice, public testing::WithParamInterface<Arguments> {
  protected:
   void SetUp() override {
     if (!TracedProgram::isPossible()) {
@@ -24,7 +27,7 @@ class KillAtSystemCall : public InterruptedDevice {
 
   /// Runs a migration up to the n-th stop and kills it there. False when it ended before.
   bool killAtStop(int number, std::string& place) const {
-    TracedProgram program(migrationCall({"--bare"}), root());
+    TracedProgram program(migrationCall(GetParam()), root());
     for (int stop = 1; stop <= number; ++stop) {
       if (!program.runToNextStop()) {
         return false;
@@ -36,7 +39,7 @@ class KillAtSystemCall : public InterruptedDevice {
   }
 };
 
-TEST_F(KillAtSystemCall, OfAnyFileLosesNothingAndIsFinishedByTheNextRun) {
+TEST_P(KillAtSystemCall, OfAnyFileLosesNothingAndIsFinishedByTheNextRun) {
   int kills = 0;
   std::string place;
   for (int stop = 1; killAtStop(stop, place); stop += kStep) {
@@ -44,7 +47,7 @@ TEST_F(KillAtSystemCall, OfAnyFileLosesNothingAndIsFinishedByTheNextRun) {
     ++kills;
     expectLockIsFree();
     expectNothingLost();
-    expectNextRunFinishes();
+    expectNextRunFinishes(GetParam());
     if (HasFailure()) {
       break;
     }
@@ -56,13 +59,18 @@ TEST_F(KillAtSystemCall, OfAnyFileLosesNothingAndIsFinishedByTheNextRun) {
             << " before and after each system call that touches a file of the device\n";
 }
 
-TEST_F(KillAtSystemCall, IsNothingWhenTheProgramIsOnlyTraced) {
-  TracedProgram program(migrationCall({"--bare"}), root());
+TEST_P(KillAtSystemCall, IsNothingWhenTheProgramIsOnlyTraced) {
+  TracedProgram program(migrationCall(GetParam()), root());
 
   EXPECT_EQ(program.runToEnd(), 0);
 
   expectMigrated();
 }
+
+INSTANTIATE_TEST_SUITE_P(Hosts, KillAtSystemCall, testing::Values(Arguments(), Arguments{"--bare"}),
+                         [](const testing::TestParamInfo<Arguments>& information) {
+                           return information.param.empty() ? "WithSafetyNet" : "Bare";
+                         });
 
 }  // namespace
 }  // namespace accounts
