@@ -16,19 +16,20 @@ namespace fs = std::filesystem;
 
 constexpr const char* kDirectoryInMemory = "/dev/shm";
 
-fs::path makeTemporaryDirectory(Medium medium) {
+}  // namespace
+
+fs::path makeTemporaryDirectory(Medium medium, const std::string& name) {
   const bool inMemory = medium == Medium::Memory && access(kDirectoryInMemory, W_OK) == 0;
   const fs::path parent = inMemory ? kDirectoryInMemory : fs::temp_directory_path();
-  std::string path = (parent / "device-root-XXXXXX").string();
+  std::string path = (parent / (name + "-XXXXXX")).string();
   if (mkdtemp(path.data()) == nullptr) {
     ADD_FAILURE() << "no temporary directory";
   }
   return path;
 }
 
-}  // namespace
-
-DeviceRootFixture::DeviceRootFixture(Medium medium) : directory_(makeTemporaryDirectory(medium)) {
+DeviceRootFixture::DeviceRootFixture(Medium medium)
+    : directory_(makeTemporaryDirectory(medium, "device-root")) {
   for (const char* directory :
        {"/tmp", "/etc", "/var/mobile/Library/Preferences", "/var/mobile/Library/Mail",
         "/var/mobile/Library/Logs/CrashReporter"}) {

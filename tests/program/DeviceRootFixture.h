@@ -36,6 +36,9 @@ inline constexpr const char* kDevicePropertyListPath = "/etc/device.plist";
 /// for tests of hundreds of runs, which would mostly wait for the disk.
 enum class Medium : std::uint8_t { Disk, Memory };
 
+/// Makes a directory with a name that begins like this and is nobody else's.
+std::filesystem::path makeTemporaryDirectory(Medium medium, const std::string& name);
+
 /// A device root in a temporary directory, and the real host to run on it. The root starts with the
 /// directories that every device has, a user "mobile" who is the test's own user, and no accounts.
 class DeviceRootFixture : public testing::Test {

@@ -129,10 +129,7 @@ std::vector<fs::path> everythingIn(const fs::path& directory) {
 
 }  // namespace
 
-OutsideTree::OutsideTree() {
-  std::string path = (fs::temp_directory_path() / "outside-XXXXXX").string();
-  EXPECT_NE(mkdtemp(path.data()), nullptr);
-  directory_ = path;
+OutsideTree::OutsideTree() : directory_(makeTemporaryDirectory(Medium::Memory, "outside")) {
   for (const char* directory : kDirectories) {
     fs::create_directories(this->path(directory));
   }
