@@ -1,0 +1,54 @@
+#include "fuzz/FuzzTarget.h"
+
+#include <cstddef>
+#include <cstdint>
+#include <cstdlib>
+#include <iostream>
+
+#include "propertylist/Description.h"
+
+namespace accounts {
+
+namespace {
+
+[[noreturn]] void fail(std::string_view sentence) {
+  std::cerr << "Not so: " << sentence << std::endl;
+  std::abort();
+}
+
+void show(std::string_view name, const PropertyValue& value) {
+  std::string description;
+  appendDescription(description, value);
+  std::cerr << name << ": " << description << '\n';
+}
+
+}  // namespace
+
+void require(bool holds, std::string_view sentence) {
+  if (!holds) {
+    fail(sentence);
+  }
+}
+
+void requireEqual(const PropertyValue& actual, const PropertyValue& expected,
+                  std::string_view sentence) {
+  if (actual != expected) {
+    show("actual", actual);
+    show("expected", expected);
+    fail(sentence);
+  }
+}
+
+}  // namespace accounts
+
+/// The fuzzing engine's entry point.
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* bytes, std::size_t size) {
+  accounts::runOneInput(std::string_view(reinterpret_cast<const char*>(bytes), size));
+  return 0;
+}
+
+/// The options of AddressSanitizer, which would otherwise keep up to 256 MiB of freed memory aside:
+/// as much as an input may need in all.
+extern "C" const char* __asan_default_options() {
+  return "quarantine_size_mb=8:malloc_context_size=8";
+}
