@@ -1,4 +1,4 @@
-#include <vector>
+#include <algorithm>
 
 #include "accountsettings/AccountsManager.h"
 #include "fuzz/AccountValues.h"
@@ -76,6 +76,19 @@ PropertyArray propertiesOf(const AccountsManager& store) {
   return list;
 }
 
+/// How many of some accounts' child dictionaries are accepted as accounts.
+std::size_t countOfAcceptedChildren(const AccountsManager::Accounts& accounts) {
+  std::size_t count = 0;
+  for (const BasicAccountReference& account : accounts) {
+    for (const PropertyValue& child :
+         account->properties().arrayForKey(kAccountChildAccounts).value_or(PropertyArray())) {
+      const PropertyDictionary* dictionary = child.asDictionary();
+      count += dictionary != nullptr && BasicAccount::initWithProperties(*dictionary) ? 1 : 0;
+    }
+  }
+  return count;
+}
+
 /// A store that nobody changed is saved as it was loaded, loads as it was saved, and is saved to
 /// the same bytes again. Where several accounts share an identifier the file's last one holds for
 /// all of them, so nothing is said of those.
@@ -87,6 +100,9 @@ void checkThatSavingKeeps(const FuzzedDevice& device, AccountsManager& store) {
   if (!haveDistinctIdentifiers(loaded)) {
     return;
   }
+  require(store.allBasicSyncableAccounts().size() ==
+              store.count() + countOfAcceptedChildren(store.allBasicAccounts()),
+          "every child that is accepted is indexed");
   requireEqual(saved, loaded, "what was loaded is saved as it was");
   requireEqual(propertiesOf(*AccountsManager::initInsideOfMigration()), saved,
                "what was saved is loaded as it was");
@@ -108,6 +124,7 @@ void runOneInput(std::string_view bytes) {
   AccountsManager::_setShouldSkipNotifications(true);
   device.logSystem.channel.enabled = input.below(8) == 7;
   device.addAnything(input, kSettingsPath, settingsFrom);
+  // A directory in the file's place would only keep it from being saved.
   device.fileSystem.directories.erase(std::string(kSettingsPath));
 
   const std::unique_ptr<AccountsManager> store = AccountsManager::initInsideOfMigration();
