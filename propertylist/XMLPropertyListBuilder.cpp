@@ -167,15 +167,15 @@ bool ValueBuilder::endScalar(Element element) {
   if (!value) {
     return fail("a content that does not fit its element", element);
   }
-  return count(1 + (holdsBytes ? expandedCountOfBytes(characters_.size()) : 0)) &&
-         addValue(std::move(*value));
+  return addValue(std::move(*value),
+                  1 + (holdsBytes ? expandedCountOfBytes(characters_.size()) : 0));
 }
 
 bool ValueBuilder::endContainer() {
   const Container container = containers_.back();
   if (container.element == Element::Array) {
     containers_.pop_back();
-    return count(1) && addValue(PropertyArray(takeFrom(values_, container.firstValue)));
+    return addValue(PropertyArray(takeFrom(values_, container.firstValue)), 1);
   }
   if (hasKeyWithoutValue()) {
     return fail("a key without a value");
@@ -189,7 +189,7 @@ bool ValueBuilder::endContainer() {
   keys_.resize(container.firstKey);
   values_.erase(values_.begin() + static_cast<std::ptrdiff_t>(container.firstValue), values_.end());
   containers_.pop_back();
-  return count(1) && addValue(PropertyDictionary(std::move(entries)));
+  return addValue(PropertyDictionary(std::move(entries)), 1);
 }
 
 bool ValueBuilder::addKey() {
@@ -197,9 +197,9 @@ bool ValueBuilder::addKey() {
   return count(expandedCountOfBytes(characters_.size()));
 }
 
-bool ValueBuilder::addValue(PropertyValue value) {
+bool ValueBuilder::addValue(PropertyValue value, std::uint64_t expandedCount) {
   values_.push_back(std::move(value));
-  return true;
+  return count(expandedCount);
 }
 
 bool ValueBuilder::count(std::uint64_t expandedCount) {

@@ -75,7 +75,7 @@ class ValueBuilder {
   bool endScalar(Element element);
   bool endContainer();
   bool addKey();
-  bool addValue(PropertyValue value);
+  bool addValue(PropertyValue value, std::uint64_t expandedCount);
   bool count(std::uint64_t expandedCount);
 
   std::vector<Container> containers_;

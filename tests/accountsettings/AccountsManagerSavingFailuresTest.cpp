@@ -56,6 +56,15 @@ TEST_F(AccountsManagerSavingFailures, WithoutDataNothingIsWritten) {
   expectNothingChanged();
 }
 
+TEST_F(AccountsManagerSavingFailures, WithoutDataAndWithoutAnErrorNothingIsWrittenEither) {
+  device.propertyLists.givesNoBytes = true;
+  EXPECT_EQ(failureLinesOfASave(),
+            (Lines{R"(-[AccountsManager saveAllAccounts] (N) )"
+                   R"*("Failed to serialize account settings data: (null)")*",
+                   failed}));
+  expectNothingChanged();
+}
+
 TEST_F(AccountsManagerSavingFailures, WithoutDataTheTemporaryFileIsMadeAndRemovedAgain) {
   device.propertyLists.serializationError = "nested too deeply";
   device.journal.clear();

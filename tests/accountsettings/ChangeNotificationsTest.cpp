@@ -210,5 +210,33 @@ TEST_F(ChangeNotificationsTest, TheFrameworkOfANotifierIsLoadedBeneathTheSystemR
   EXPECT_EQ(frameworkLoader.loads, std::vector<std::string>{"/Mail.so"});
 }
 
+TEST_F(ChangeNotificationsTest, MembersOfAListThatAreNoTextsAreNoDataclasses) {
+  account_->setAccountProperty_forKey(PropertyArray{kAccountDataclassMail, 7},
+                                      kAccountEnabledDataclasses);
+
+  store_->saveAllAccounts();
+
+  EXPECT_TRUE(calls_.empty());
+}
+
+TEST_F(ChangeNotificationsTest, AnAccountWithoutTypeConcernsNobody) {
+  AccountsManager::NotificationBatch batch;
+
+  AccountsManager::_addNotificationToDictionary_forChangeType_originalProperties_currentProperties(
+      batch, AccountChangeType::Added, std::nullopt, PropertyDictionary());
+
+  EXPECT_TRUE(batch.empty());
+}
+
+using ChangeNotificationsDeathTest = ChangeNotificationsTest;
+
+TEST_F(ChangeNotificationsDeathTest, ANotifierThatCannotBeToldOfChangesIsAnError) {
+  frameworkLoader.registerClass("MailNotifier", AccountClass());
+  account_->setDisplayName("other");
+
+  EXPECT_DEATH(store_->saveAllAccounts(),
+               "The class MailNotifier does not answer noteAccountChanges:");
+}
+
 }  // namespace
 }  // namespace accounts

@@ -75,5 +75,20 @@ TEST_F(CreatorAssertionsDeathTest, TheTextNamesTheOperationAndTheSourceFile) {
       "-[BasicAccount _creatorClassNameForAccountType:creatorType:loader:], BasicAccount: ");
 }
 
+TEST_F(CreatorAssertionsDeathTest, AMapThatIsNotThere) {
+  bundleResources.replaced["AccountCreators"] = std::nullopt;
+  expectDeathOfFullAccount(
+      "Malformed AccountCreators information. Could not find the information for the type Mail\n");
+}
+
+TEST_F(CreatorAssertionsDeathTest, AClassOfFullAccountsThatMakesNone) {
+  setCreators({{"Mail", PropertyArray{fullAccountCreator("Mail.so", "Creator")}}});
+  const AccountClass classWithoutOperations;
+  AccountClass creator;
+  creator.classForAccountType = [&](std::string_view) { return &classWithoutOperations; };
+  frameworkLoader.registerClass("Creator", creator);
+  expectDeathOfFullAccount("Could not create the account with class Creator and id A\n");
+}
+
 }  // namespace
 }  // namespace accounts

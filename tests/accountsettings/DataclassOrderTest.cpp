@@ -100,5 +100,9 @@ TEST(DataclassSet, MembersThatAreNoTextsStay) {
   EXPECT_EQ(with({1, "A", 1}, "A", DataclassSwitch::Off), "1 1");
 }
 
+TEST(DataclassesWithout, WhatIsNoTextHidesNothing) {
+  EXPECT_EQ(shortNames(dataclassesWithout({"A", "B"}, {1, "A"})), "B");
+}
+
 }  // namespace
 }  // namespace accounts

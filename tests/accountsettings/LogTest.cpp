@@ -119,6 +119,10 @@ TEST(LogFormat, OtherPercentSignsStand) {
   EXPECT_EQ(formatted("100% of %@ %", {"x"}), "100% of x %");
 }
 
+TEST(LogFormat, APlaceholderWithoutAnArgumentIsShownAsNull) {
+  EXPECT_EQ(formatted("%@ and %@", {"one"}), "one and (null)");
+}
+
 TEST(ConsoleLine, ItIsWrittenWithItsArgumentsAndNothingElse) {
   FakeProcess device;
   logToConsole("%s. Could not delete %@. Error = %@", {"-[A b]", "/tmp/x", "no such file"});

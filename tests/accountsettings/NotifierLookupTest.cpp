@@ -17,6 +17,15 @@ TEST_F(NotifierLookupTest, NamesTheClassesOfAllMatchingEntriesInOrderWithDuplica
   EXPECT_EQ(frameworkLoader.loads, (std::vector<std::string>{"/A.so", "/A.so"}));
 }
 
+TEST_F(NotifierLookupTest, AnEntryThatNamesNoDataclassesIsConcernedWithNone) {
+  setCreators({{"Mail", PropertyArray{creatorEntry("NotifierAccount",
+                                                   {{"Framework", "A.so"}, {"Class", "A"}})}}});
+
+  EXPECT_TRUE(
+      AccountsManager::_notifierClassNamesForAccountType_dataclass("Mail", kAccountDataclassMail)
+          .empty());
+}
+
 class AnnouncedChangeTest : public CreatorsTest {
  protected:
   AnnouncedChangeTest() {

@@ -36,6 +36,10 @@ TEST(Process, ANewOneKnowsNothingOfTheOneBefore) {
   EXPECT_EQ(Process::current().identifierChanges, 0U);
 }
 
+TEST(ProcessDeathTest, AskingForItBeforeItIsMadeEndsTheProgram) {
+  EXPECT_EXIT(Process::current(), testing::KilledBySignal(SIGABRT), "");
+}
+
 TEST(Once, TheValueIsComputedOnFirstUseOnly) {
   Once<int> once;
   int computations = 0;

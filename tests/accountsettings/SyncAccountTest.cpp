@@ -119,5 +119,20 @@ TEST_F(SyncAccountTest, TheLookupNeverAsksALoader) {
   EXPECT_EQ(frameworkLoader.loads, std::vector<std::string>{"/Mail.so"});
 }
 
+TEST_F(SyncAccountTest, AClassThatMakesNoSyncAccountsGivesNone) {
+  frameworkLoader.registerClass("MailSync", AccountClass());
+
+  EXPECT_EQ(record_->_cachedSyncAccount(), nullptr);
+}
+
+TEST_F(SyncAccountTest, WithoutASyncAccountNoRefreshHasAResult) {
+  frameworkLoader.registerClass("MailSync", AccountClass());
+
+  EXPECT_EQ(record_->refreshContainerWithIdentifier_forDataclass("c", kAccountDataclassMail),
+            std::nullopt);
+  EXPECT_EQ(record_->refreshContainerListForDataclass(kAccountDataclassMail), std::nullopt);
+  EXPECT_EQ(record_->refreshContainersForDataclass(kAccountDataclassMail), std::nullopt);
+}
+
 }  // namespace
 }  // namespace accounts

@@ -96,6 +96,9 @@ Result FakePropertyLists::serializeBinary(const PropertyValue& value, std::strin
   if (serializationError) {
     return Result::failure(*serializationError);
   }
+  if (givesNoBytes) {
+    return Result::success();
+  }
   PropertyListError error;
   std::optional<std::string> written = writeBinaryPropertyList(value, error);
   if (!written) {

@@ -206,6 +206,8 @@ class FakePropertyLists : public PropertyLists {
   explicit FakePropertyLists(FakeFileSystem& fileSystem) : fileSystem_(fileSystem) {}
   /// When set, every serialisation fails with this text.
   std::optional<std::string> serializationError;
+  /// When set, every serialisation succeeds and gives no bytes.
+  bool givesNoBytes = false;
 
   std::optional<PropertyDictionary> readDictionary(std::string_view path) override;
   Result serializeBinary(const PropertyValue& value, std::string_view& bytes) override;

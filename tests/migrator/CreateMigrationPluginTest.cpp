@@ -36,5 +36,14 @@ TEST(CreateMigrationPluginTest, ASecondInstanceSharesTheProcessOfTheFirst) {
   EXPECT_EQ(&Process::current(), &process);
 }
 
+TEST(CreateMigrationPluginTest, AnotherPlatformTakesThePlaceOfTheFirst) {
+  static FakePlatform otherDevice;
+  const std::unique_ptr<MigrationPluginBase> first(CreateMigrationPlugin(lastingDevice().platform));
+
+  const std::unique_ptr<MigrationPluginBase> second(CreateMigrationPlugin(otherDevice.platform));
+
+  EXPECT_EQ(&Process::current().platform, &otherDevice.platform);
+}
+
 }  // namespace
 }  // namespace accounts

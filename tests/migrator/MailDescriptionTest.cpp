@@ -65,6 +65,12 @@ TEST_F(MailDescriptionTest, LegacyKeysMoveAndEveryOtherKeyIsCarriedOver) {
                                             {"Short Type String", "Account"}}));
 }
 
+TEST_F(MailDescriptionTest, GmailIsGmailWhereTheRegionSaysNo) {
+  device.deviceInfoService.answers.insert_or_assign("RegionalBehaviorGoogleMail", false);
+
+  EXPECT_EQ(AccountsDataMigrator::_accountTypeStringForMailAccountClass("GmailAccount"), "Gmail");
+}
+
 TEST_F(MailDescriptionTest, GmailIsGoogleMailWhereTheRegionSaysSo) {
   device.deviceInfoService.answers.insert_or_assign("RegionalBehaviorGoogleMail", true);
 
@@ -185,6 +191,14 @@ TEST_F(MailDescriptionTest, AnOldSyncIdentifierGivesWayToTheIdentifier) {
       {{"AccountType", "IMAPAccount"}, {"uniqueId", "M"}, {"Sync Identifier", "old"}});
 
   EXPECT_EQ(record->syncStoreIdentifier(), "M");
+}
+
+TEST_F(MailDescriptionTest, TheGenericMailClassIsKeptForTheFixer) {
+  const BasicAccountReference record = convertIncoming({{"AccountType", "MailAccount"}});
+
+  ASSERT_NE(record, nullptr);
+  EXPECT_EQ(record->accountClass(), Text("MailAccount"));
+  EXPECT_EQ(record->type(), kMailAccountType);
 }
 
 }  // namespace

@@ -164,5 +164,15 @@ TEST_F(MigrationInformationTest, AFailureToWriteIsNotReported) {
   EXPECT_FALSE(exists(file));
 }
 
+TEST_F(MigrationInformationTest, AConversionOutsideAMigrationCollectsNothing) {
+  switchMigrationInformationOn();
+  device.addPropertyList(kLegacyMailPath, PropertyDictionary{{"MailAccounts", PropertyArray()}});
+
+  EXPECT_TRUE(migrator._migrateMailAccounts(*store));
+  migrator._saveCollatedMigrationInformation();
+
+  EXPECT_FALSE(exists(file));
+}
+
 }  // namespace
 }  // namespace accounts

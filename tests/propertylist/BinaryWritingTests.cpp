@@ -184,5 +184,9 @@ TEST(BinaryWriting, AValueThatStandsForTooManyValuesIsRefused) {
   EXPECT_TRUE(contains(errorOfWriting(value), "more values than the limit"));
 }
 
+TEST(BinaryWriting, ATextThatIsNotWellFormedIsRefusedAsAKeyToo) {
+  EXPECT_TRUE(contains(errorOfWriting(PropertyDictionary{{"\xC0", 1}}), "well-formed UTF-8"));
+}
+
 }  // namespace
 }  // namespace accounts

@@ -59,7 +59,10 @@ TEST(IntegerValue, ATextGivesItsLeadingDecimalInteger) {
                   {"-", 0},
                   {"+-5", 0},
                   {"- 5", 0},
-                  {"a12", 0}});
+                  {"a12", 0},
+                  {"\x01"
+                   "12",
+                   0}});
 }
 
 TEST(IntegerValue, ATextBeyondTheRangeGivesTheNearestEnd) {

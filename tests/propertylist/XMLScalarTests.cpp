@@ -35,6 +35,7 @@ TEST(XMLScalars, Integers) {
   EXPECT_EQ(read("integer", "007"), PropertyValue(7));
   EXPECT_EQ(read("integer", "-0"), PropertyValue(0));
   EXPECT_EQ(read("integer", "\n\t12 "), PropertyValue(12));
+  EXPECT_EQ(read("integer", "&#13;12&#13;"), PropertyValue(12));
 }
 
 TEST(XMLScalars, HexadecimalIntegers) {
