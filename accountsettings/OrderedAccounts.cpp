@@ -13,7 +13,11 @@ namespace {
 template <class Index, class Key, class Number>
 void takeFromIndex(Index& index, const Key& key, Number number) {
   const auto entry = index.find(key);
-  if (entry != index.end() && entry->second.erase(number) > 0 && entry->second.empty()) {
+  if (entry == index.end()) {
+    return;
+  }
+  entry->second.erase(number);
+  if (entry->second.empty()) {
     index.erase(entry);
   }
 }

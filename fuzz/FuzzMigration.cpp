@@ -105,7 +105,9 @@ void runOneInput(std::string_view bytes) {
   device.addAnything(input, kLegacyMailPath, legacyMailFrom);
   device.addAnything(input, kLegacyExchangePath, legacyExchangeFrom);
   const CarriedOver carriedOver(device);
-  const bool mayReplaceSettings = device.sharedResources.canMakeLock && !device.has(kSentinelPath);
+  // A fault may hide the sentinel.
+  const bool mayReplaceSettings =
+      device.sharedResources.canMakeLock && (hasFault || !device.has(kSentinelPath));
   const std::optional<std::string> settings = device.fileSystem.contentsOf(kSettingsPath);
 
   const std::optional<bool> result = migrate(device);

@@ -188,5 +188,21 @@ TEST_F(AccountsManagerReplacement, AParentWhoseChildrenStayIsLeftAsItIs) {
   EXPECT_EQ(store->accountWithIdentifier("A")->properties(), PropertyDictionary(untouched));
 }
 
+TEST_F(AccountsManagerReplacement, UnacceptableChildElementsStayWhenAChildIsAdded) {
+  const Store store = storeOf({mail("A").withChildren({17, ofUnknownType("x")})});
+  store->replaceAccountsWithTypes_withAccounts({}, {childOf("A", calDAV("c"))});
+  EXPECT_EQ(store->accountWithIdentifier("A")->properties().arrayForKey(kAccountChildAccounts),
+            (PropertyArray{17, PropertyValue(ofUnknownType("x")), PropertyValue(calDAV("c"))}));
+}
+
+TEST_F(AccountsManagerReplacement, AChildStaysWithAParentWhoseIdentifierIsNoLongerTheIndexedOne) {
+  const Store store = storeOf({mail("A").withChildren({calDAV("c")}), exchange("B")});
+  const BasicAccountReference parent = store->accountWithIdentifier("A");
+  parent->setAccountProperty_forKey("A2", kAccountIdentifier);
+  store->replaceAccountsWithTypes_withAccounts({}, {childOf("B", calDAV("c"))});
+  EXPECT_EQ(parent->properties().arrayForKey(kAccountChildAccounts)->size(), 1U);
+  EXPECT_EQ(storedChildren(*store, "B"), "c");
+}
+
 }  // namespace
 }  // namespace accounts

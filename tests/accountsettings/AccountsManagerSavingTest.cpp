@@ -77,6 +77,14 @@ TEST_F(AccountsManagerSaving, AnAccountThatIsAChildOnDiskIsMergedWithItsParentTh
   EXPECT_EQ(settingsAccount(0), PropertyDictionary(exchange("P").withChildren({mail("A")})));
 }
 
+TEST_F(AccountsManagerSaving, AnAccountThatIsAChildOnDiskIsMergedSoWithTheChannelOffToo) {
+  device.logSystem.channel.enabled = false;
+  const Store store = storeFromFileOf({mail("A").with("Username", "old")});
+  writeSettings({exchange("P").withChildren({mail("A")})});
+  store->saveAllAccounts();
+  EXPECT_EQ(settingsAccount(0), PropertyDictionary(exchange("P").withChildren({mail("A")})));
+}
+
 TEST_F(AccountsManagerSaving, WithoutAFileEveryAccountIsWrittenFromMemory) {
   const Store store = AccountsManager::initInsideOfMigration();
   store->insertAccount(mail("A").record());

@@ -58,6 +58,18 @@ TEST_F(AccountsWithoutIdentifier, AmongTheReplacementsAreAppended) {
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "E - -");
 }
 
+TEST_F(AccountsWithoutIdentifier, KeepTheirChildrenWhenAnotherParentGetsOne) {
+  const Store store = storeOf({exchange("E")});
+  const BasicAccountReference parent = nameless(mail("")).withChildren({calDAV("c")}).record();
+  const BasicAccountReference child = calDAV("c").record();
+  child->setParentAccount(store->accountWithIdentifier("E"));
+
+  store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, {parent, child});
+
+  EXPECT_EQ(identifiersOf(*parent->arrayPropertyForKey(kAccountChildAccounts)), "c");
+  EXPECT_EQ(identifiersOf({store->accountWithIdentifier("c")}), "E");
+}
+
 TEST_F(AccountsWithoutIdentifier, AreSavedFromMemoryAlone) {
   const Store store = storeFromFileOf({nameless(mail("")).with(kAccountDisplayName, "before")});
   store->allBasicAccounts().front()->setDisplayName("after");

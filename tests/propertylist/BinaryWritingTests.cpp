@@ -188,5 +188,9 @@ TEST(BinaryWriting, ATextThatIsNotWellFormedIsRefusedAsAKeyToo) {
   EXPECT_TRUE(contains(errorOfWriting(PropertyDictionary{{"\xC0", 1}}), "well-formed UTF-8"));
 }
 
+TEST(BinaryWriting, ATextThatIsNotWellFormedIsRefusedUnderAKeyToo) {
+  EXPECT_TRUE(contains(errorOfWriting(PropertyDictionary{{"k", "\xC0"}}), "well-formed UTF-8"));
+}
+
 }  // namespace
 }  // namespace accounts

@@ -28,6 +28,7 @@ TEST(PropertyValueKind, AContentIsNotGivenAsAnotherKind) {
   EXPECT_EQ(integer.asBoolean(), nullptr);
   EXPECT_EQ(integer.asReal(), nullptr);
   EXPECT_EQ(integer.asText(), nullptr);
+  EXPECT_EQ(integer.asDate(), nullptr);
   EXPECT_EQ(integer.asLargeUnsigned(), nullptr);
 }
 
