@@ -71,8 +71,6 @@ class PropertyArray {
     return node_.get() == other.node_.get();
   }
   [[nodiscard]] const SharedNodeBase* sharedNode() const { return node_.get(); }
-  /// True when there is content that another handle holds too.
-  [[nodiscard]] bool isShared() const { return node_.isShared(); }
 
   /// Deep equality, in order.
   friend bool operator==(const PropertyArray& left, const PropertyArray& right);
@@ -124,8 +122,6 @@ class PropertyDictionary {
     return node_.get() == other.node_.get();
   }
   [[nodiscard]] const SharedNodeBase* sharedNode() const { return node_.get(); }
-  /// True when there is content that another handle holds too.
-  [[nodiscard]] bool isShared() const { return node_.isShared(); }
 
   /// Deep equality.
   friend bool operator==(const PropertyDictionary& left, const PropertyDictionary& right);

@@ -84,8 +84,6 @@ class SharedNode {
 
   [[nodiscard]] SharedNodeBase* get() const { return node_; }
   explicit operator bool() const { return node_ != nullptr; }
-  /// True when another handle holds the node too.
-  [[nodiscard]] bool isShared() const { return node_ != nullptr && !node_->isUnshared(); }
 
  private:
   SharedNodeBase* node_ = nullptr;
