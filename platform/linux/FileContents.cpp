@@ -146,4 +146,9 @@ int flush(const FileDescriptor& file) {
   return 0;
 }
 
+int flushDirectory(const FileDescriptor& directory) {
+  const int number = flush(directory);
+  return number == EINVAL ? 0 : number;
+}
+
 }  // namespace accounts

@@ -53,5 +53,8 @@ bool copyContents(const FileDescriptor& source, std::string_view sourcePath,
 /// Waits until the contents of an open file or directory are on the medium, and returns 0 or the
 /// error number.
 int flush(const FileDescriptor& file);
+/// The same for the names in an open directory. Some file systems have nothing to flush for one and
+/// say so with EINVAL; that is no error.
+int flushDirectory(const FileDescriptor& directory);
 
 }  // namespace accounts

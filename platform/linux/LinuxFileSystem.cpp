@@ -10,6 +10,7 @@
 
 #include "platform/linux/DevicePath.h"
 #include "platform/linux/FileContents.h"
+#include "platform/linux/PathResult.h"
 #include "platform/linux/TemporaryFile.h"
 
 namespace accounts {
@@ -17,21 +18,6 @@ namespace {
 
 constexpr mode_t kPermissionBits = 0777;
 constexpr mode_t kOwnerOnlyFile = 0600;
-constexpr mode_t kOwnerOnlyDirectory = 0700;
-
-Result asResult(const PathError& error) {
-  return Result::failure(error.text);
-}
-
-Result asResult(std::string_view operation, std::string_view path, int number) {
-  return number == 0 ? Result::success() : asResult(pathError(operation, path, number));
-}
-
-// Some file systems have nothing to flush for a directory and say so with EINVAL.
-int flushDirectory(const FileDescriptor& directory) {
-  const int number = flush(directory);
-  return number == EINVAL ? 0 : number;
-}
 
 // Moves an entry, whose contents are flushed already, over another and waits until that is on the
 // medium. The directory is opened before the move so that little can fail after it.
@@ -87,7 +73,9 @@ Result LinuxFileSystem::copyFile(std::string_view source, std::string_view desti
 Result LinuxFileSystem::removeFile(std::string_view path) {
   PathError error;
   const auto entry = root_.locate(path, error);
-  return entry ? asResult("remove", path, entry->remove()) : asResult(error);
+  const Result result = entry ? asResult("remove", path, entry->remove()) : asResult(error);
+  temporaryFiles_.erase(std::string(path));
+  return result;
 }
 
 Result LinuxFileSystem::createFile(std::string_view path, std::string_view contents) {
@@ -119,22 +107,6 @@ Result LinuxFileSystem::createDirectoryWithIntermediates(std::string_view path,
   const auto entry = root_.locate(whole, error);
   return entry && entry->createDirectory(permissions & kPermissionBits, error) ? Result::success()
                                                                                : asResult(error);
-}
-
-std::optional<std::string> LinuxFileSystem::makeTemporaryFile() {
-  PathError error;
-  if (!isDirectory(temporaryDirectory_)) {
-    const auto entry = root_.locate(temporaryDirectory_, error);
-    const bool made = entry && entry->createDirectory(kOwnerOnlyDirectory, error);
-    if (!made && error.number != EEXIST) {
-      return std::nullopt;
-    }
-  }
-  const auto temporary = makeTemporaryFileIn(root_, temporaryDirectory_, error);
-  if (!temporary) {
-    return std::nullopt;
-  }
-  return temporary->entry.path();
 }
 
 Result LinuxFileSystem::writeFile(std::string_view path, std::string_view contents) {
@@ -206,7 +178,24 @@ Result LinuxFileSystem::renameFile(std::string_view source, std::string_view des
     return asResult(error);
   }
   const int number = flush(*file);
-  return number == 0 ? moveOver(*from, *to) : asResult("flush", source, number);
+  const Result result = number == 0 ? moveOver(*from, *to) : asResult("flush", source, number);
+  if (result) {
+    temporaryFiles_.erase(std::string(source));
+  }
+  return result;
+}
+
+Result LinuxFileSystem::renameDirectory(std::string_view source, std::string_view destination) {
+  PathError error;
+  const auto from = root_.locate(source, error);
+  const auto to = from ? root_.locate(destination, error) : std::nullopt;
+  if (!to) {
+    return asResult(error);
+  }
+  if (kindOfEntry(source) != EntryKind::Directory) {
+    return asResult("rename", source, ENOTDIR);
+  }
+  return moveOver(*from, *to);
 }
 
 }  // namespace accounts

@@ -1,11 +1,14 @@
 #pragma once
 
+#include <map>
 #include <optional>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "platform/FileSystem.h"
 #include "platform/linux/DeviceRoot.h"
+#include "platform/linux/FileDescriptor.h"
 #include "platform/linux/OwnerNames.h"
 
 namespace accounts {
@@ -22,14 +25,27 @@ class LinuxFileSystem final : public FileSystem {
 
   bool fileExists(std::string_view path) override;
   bool isDirectory(std::string_view path) override;
+  std::optional<EntryKind> kindOfEntry(std::string_view path) override;
+  std::optional<std::vector<std::string>> directoryEntries(std::string_view path) override;
+  bool haveSameContents(std::string_view first, std::string_view second) override;
 
   /// The copy gets the permission bits of its source. Files above kLargestFileSize are not copied.
   Result copyFile(std::string_view source, std::string_view destination) override;
+  /// A file that may not be read is linked without being flushed. A copy stays the user's own when
+  /// that user may give no file away.
+  Result linkFile(std::string_view source, std::string_view destination) override;
   Result removeFile(std::string_view path) override;
   Result createFile(std::string_view path, std::string_view contents) override;
   Result createDirectoryWithIntermediates(std::string_view path, unsigned permissions) override;
+  Result removeDirectory(std::string_view path) override;
+  /// As with renameFile, the directory can have its new name after a failure.
+  Result renameDirectory(std::string_view source, std::string_view destination) override;
+  Result synchronizeDirectory(std::string_view path) override;
 
   std::optional<std::string> makeTemporaryFile() override;
+  /// A maker holds a lock (flock) on its file until it renames or removes it, or ends. Where the
+  /// file system has no such locks, no file counts as abandoned.
+  void removeAbandonedTemporaryFiles(const std::vector<std::string>& furtherDirectories) override;
   Result writeFile(std::string_view path, std::string_view contents) override;
   Result writeFileAtomically(std::string_view path, std::string_view contents) override;
   Result setOwnerAndGroup(std::string_view path, std::string_view ownerName,
@@ -39,9 +55,13 @@ class LinuxFileSystem final : public FileSystem {
   Result renameFile(std::string_view source, std::string_view destination) override;
 
  private:
+  void removeAbandonedTemporaryFilesIn(const std::string& directory);
+
   const DeviceRoot& root_;
   OwnerNames ownerNames_;
   std::string temporaryDirectory_;
+  /// By their paths, the temporary files that are neither renamed nor removed yet.
+  std::map<std::string, FileDescriptor> temporaryFiles_;
 };
 
 }  // namespace accounts

@@ -1,5 +1,6 @@
 #include "platform/linux/TemporaryFile.h"
 
+#include <sys/file.h>
 #include <sys/random.h>
 #include <sys/stat.h>
 
@@ -32,6 +33,15 @@ std::optional<std::string> uniqueName() {
   return name;
 }
 
+// Locks a new file, so that nobody takes it for an abandoned one, and tells whether nobody did
+// before it was locked. Where the file system has no such locks, nobody can.
+bool isOurs(const FileDescriptor& file) {
+  while (::flock(file.number(), LOCK_EX) != 0 && errno == EINTR) {
+  }
+  struct stat status = {};
+  return ::fstat(file.number(), &status) != 0 || status.st_nlink > 0;
+}
+
 }  // namespace
 
 std::optional<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::string_view directory,
@@ -47,10 +57,10 @@ std::optional<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::st
       return std::nullopt;
     }
     auto file = entry->createFile(kOwnerReadsAndWrites, error);
-    if (file) {
+    if (file && isOurs(*file)) {
       return TemporaryFile{std::move(*entry), std::move(*file)};
     }
-    if (error.number != EEXIST) {
+    if (!file && error.number != EEXIST) {
       return std::nullopt;
     }
   }

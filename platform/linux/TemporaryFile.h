@@ -15,7 +15,8 @@ namespace accounts {
 /// from everything else.
 inline constexpr std::string_view kTemporaryFilePrefix = ".accounts-migration-";
 
-/// A new, empty file with a unique name, readable and writable by its owner alone.
+/// A new, empty file with a unique name, readable and writable by its owner alone. It is locked
+/// (flock) as long as it is open, which tells others that its maker still runs.
 struct TemporaryFile {
   DirectoryEntry entry;
   FileDescriptor file;

@@ -61,10 +61,15 @@ void FakeFileSystem::removeFaults() {
   stopAfter_.reset();
 }
 
+void FakeFileSystem::stopWorld() {
+  ownTemporaryFiles_.clear();
+  throw WorldStopped();
+}
+
 Result FakeFileSystem::perform(const std::string& line, const std::function<Result()>& operation) {
   const std::size_t number = operationCount_++;
   if (number == stopBefore_) {
-    throw WorldStopped();
+    stopWorld();
   }
   journal_.push_back(line);
   const bool isFailing =
@@ -73,7 +78,7 @@ Result FakeFileSystem::perform(const std::string& line, const std::function<Resu
                   [&](const std::string& beginning) { return line.starts_with(beginning); });
   Result result = isFailing ? Result::failure(line + ": Input/output error") : operation();
   if (number == stopAfter_) {
-    throw WorldStopped();
+    stopWorld();
   }
   return result;
 }
@@ -137,6 +142,7 @@ Result FakeFileSystem::removeFile(std::string_view path) {
     if (file == files.end()) {
       return noSuchFile(path);
     }
+    ownTemporaryFiles_.erase(file->first);
     files.erase(file);
     return Result::success();
   });
@@ -165,6 +171,7 @@ std::optional<std::string> FakeFileSystem::makeTemporaryFile() {
     Result made = put(path, "");
     if (made) {
       files[path].permissions = 0600;
+      ownTemporaryFiles_.insert(path);
     }
     return made;
   });
@@ -205,6 +212,7 @@ Result FakeFileSystem::renameFile(std::string_view source, std::string_view dest
       return Result::failure(std::string(destination) + ": Is a directory");
     }
     FakeFile moved = std::move(file->second);
+    ownTemporaryFiles_.erase(file->first);
     files.erase(file);
     files.insert_or_assign(std::string(destination), std::move(moved));
     return Result::success();

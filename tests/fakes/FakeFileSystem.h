@@ -35,6 +35,8 @@ class FakeFileSystem : public FileSystem {
   std::map<std::string, FakeFile, std::less<>> files;
   /// Directories with their permission bits.
   std::map<std::string, unsigned, std::less<>> directories = {{"/", 0755}};
+  /// Where something stands that is neither a file nor a directory.
+  std::set<std::string, std::less<>> otherEntries;
   std::set<std::string, std::less<>> accountNames = {"mobile", "root"};
   std::string temporaryDirectory = "/var/mobile/tmp";
 
@@ -66,11 +68,21 @@ class FakeFileSystem : public FileSystem {
 
   bool fileExists(std::string_view path) override;
   bool isDirectory(std::string_view path) override;
+  std::optional<EntryKind> kindOfEntry(std::string_view path) override;
+  std::optional<std::vector<std::string>> directoryEntries(std::string_view path) override;
+  bool haveSameContents(std::string_view first, std::string_view second) override;
   Result copyFile(std::string_view source, std::string_view destination) override;
+  Result linkFile(std::string_view source, std::string_view destination) override;
   Result removeFile(std::string_view path) override;
   Result createFile(std::string_view path, std::string_view contents) override;
   Result createDirectoryWithIntermediates(std::string_view path, unsigned permissions) override;
+  Result removeDirectory(std::string_view path) override;
+  Result renameDirectory(std::string_view source, std::string_view destination) override;
+  Result synchronizeDirectory(std::string_view path) override;
   std::optional<std::string> makeTemporaryFile() override;
+  /// A temporary file is abandoned unless the running process, which ends when the world stops,
+  /// made it.
+  void removeAbandonedTemporaryFiles(const std::vector<std::string>& furtherDirectories) override;
   Result writeFile(std::string_view path, std::string_view contents) override;
   Result writeFileAtomically(std::string_view path, std::string_view contents) override;
   Result setOwnerAndGroup(std::string_view path, std::string_view ownerName,
@@ -81,11 +93,15 @@ class FakeFileSystem : public FileSystem {
   /// Records an operation and runs it unless a fault hits it.
   Result perform(const std::string& line, const std::function<Result()>& operation);
   [[nodiscard]] bool parentExists(std::string_view path) const;
+  [[nodiscard]] EntryKind kindOf(std::string_view path) const;
+  [[nodiscard]] std::vector<std::string> namesIn(std::string_view path) const;
+  [[noreturn]] void stopWorld();
   Result put(std::string_view path, std::string_view contents);
 
   std::vector<std::string>& journal_;
   std::size_t operationCount_ = 0;
   std::size_t temporaryFileCount_ = 0;
+  std::set<std::string, std::less<>> ownTemporaryFiles_;
   std::set<std::string> failingBeginnings_;
   std::optional<std::size_t> failAt_, failFrom_, stopBefore_, stopAfter_;
 };

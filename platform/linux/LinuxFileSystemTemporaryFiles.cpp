@@ -1,0 +1,61 @@
+#include <fcntl.h>
+#include <sys/file.h>
+
+#include <cerrno>
+#include <string>
+#include <utility>
+
+#include "platform/linux/DevicePath.h"
+#include "platform/linux/LinuxFileSystem.h"
+#include "platform/linux/TemporaryFile.h"
+
+namespace accounts {
+namespace {
+
+constexpr mode_t kOwnerOnlyDirectory = 0700;
+
+}  // namespace
+
+std::optional<std::string> LinuxFileSystem::makeTemporaryFile() {
+  PathError error;
+  if (!isDirectory(temporaryDirectory_)) {
+    const auto entry = root_.locate(temporaryDirectory_, error);
+    const bool made = entry && entry->createDirectory(kOwnerOnlyDirectory, error);
+    if (!made && error.number != EEXIST) {
+      return std::nullopt;
+    }
+  }
+  auto temporary = makeTemporaryFileIn(root_, temporaryDirectory_, error);
+  if (!temporary) {
+    return std::nullopt;
+  }
+  std::string path = temporary->entry.path();
+  // Open, and so locked, until it is renamed or removed: as long as it is, it is not abandoned.
+  temporaryFiles_.insert_or_assign(path, std::move(temporary->file));
+  return path;
+}
+
+void LinuxFileSystem::removeAbandonedTemporaryFiles(
+    const std::vector<std::string>& furtherDirectories) {
+  removeAbandonedTemporaryFilesIn(temporaryDirectory_);
+  for (const std::string& directory : furtherDirectories) {
+    removeAbandonedTemporaryFilesIn(directory);
+  }
+}
+
+void LinuxFileSystem::removeAbandonedTemporaryFilesIn(const std::string& directory) {
+  for (const std::string& name : directoryEntries(directory).value_or(std::vector<std::string>())) {
+    PathError error;
+    const auto entry = name.starts_with(kTemporaryFilePrefix)
+                           ? root_.locate(joinedPath(directory, name), error)
+                           : std::nullopt;
+    const auto file = entry ? entry->openRegularFile(O_RDONLY, error) : std::nullopt;
+    // The lock is held over the removal: a maker that has made its file but not locked it yet waits
+    // for it, and then sees that its file is gone.
+    if (file && ::flock(file->number(), LOCK_EX | LOCK_NB) == 0) {
+      (void)entry->remove();
+    }
+  }
+}
+
+}  // namespace accounts
