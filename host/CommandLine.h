@@ -23,6 +23,18 @@ struct RunOptions {
   std::optional<std::string> temporaryDirectory;
   /// Where the log channel goes, "-" for standard error; none keeps the channel off.
   std::optional<std::string> channel;
+  /// Runs the plug-in without the safety net.
+  bool bare = false;
+  OutputForm output = OutputForm::Summary;
+};
+
+/// Kept files are to be put back.
+struct RestoreOptions {
+  std::string root;
+  /// A device path; none for the platform's own.
+  std::optional<std::string> home;
+  /// The name or the device path of the folder of kept files; none for the only one.
+  std::optional<std::string> folder;
   OutputForm output = OutputForm::Summary;
 };
 
@@ -38,7 +50,7 @@ struct UsageError {
   OutputForm output = OutputForm::Summary;
 };
 
-using CommandLine = std::variant<RunOptions, RequestedText, UsageError>;
+using CommandLine = std::variant<RunOptions, RestoreOptions, RequestedText, UsageError>;
 
 /// What the arguments of the program ask for. Touches no file.
 CommandLine parseCommandLine(int argumentCount, const char* const* arguments);

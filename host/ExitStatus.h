@@ -10,6 +10,8 @@ enum class ExitStatus : int {
   Success = 0,
   /// The plug-in ran and reported failure.
   MigrationFailed = 1,
+  /// The plug-in reported success, but that could not be verified; its inputs were put back.
+  NotVerified = 2,
   /// The arguments cannot be used; nothing was done.
   UnusableArguments = EX_USAGE,
   /// No such root, device description or bundle, or an unreadable one; nothing was done.

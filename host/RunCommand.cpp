@@ -6,7 +6,12 @@
 #include <variant>
 
 #include "host/ChildProcess.h"
+#include "host/CurrentTime.h"
+#include "host/HeldLock.h"
 #include "host/PluginBundle.h"
+#include "host/RootLock.h"
+#include "host/SafetyNet.h"
+#include "host/SaveObserver.h"
 #include "platform/linux/LinuxPlatform.h"
 
 namespace accounts {
@@ -37,11 +42,23 @@ LinuxPlatformOptions platformOptions(const RunOptions& options, const PluginBund
   return result;
 }
 
+/// The platform as the plug-in sees it, with its saves observed.
+struct ObservedPlatform {
+  ObservedPlatform(LinuxPlatform& linuxPlatform, const AccountFiles& files)
+      : linux(linuxPlatform),
+        saves(linuxPlatform.fileSystem(), files.settings),
+        platform(linuxPlatform.platformWith(saves)) {}
+
+  LinuxPlatform& linux;
+  SaveObserver saves;
+  Platform platform;
+};
+
 /// Loads the plug-in and lets it migrate, all in this process.
-RunReport runPlugin(const PluginBundle& bundle, LinuxPlatform& platform) {
+RunReport runPlugin(const PluginBundle& bundle, ObservedPlatform& observed) {
   RunReport report;
   std::variant<std::unique_ptr<MigrationPluginBase>, HostError> made =
-      bundle.makePlugin(platform.platform());
+      bundle.makePlugin(observed.platform);
   if (const auto* error = std::get_if<HostError>(&made)) {
     setError(report, *error);
     return report;
@@ -51,8 +68,9 @@ RunReport runPlugin(const PluginBundle& bundle, LinuxPlatform& platform) {
   report.result = plugin->performMigration();
   plugin.reset();
 
-  report.broadcasts = platform.preferencesBroadcast().changes();
-  const std::vector<CloudTabs>& announcements = platform.cloudTabService().announcements();
+  report.settingsSaves = observed.saves.saves();
+  report.broadcasts = observed.linux.preferencesBroadcast().changes();
+  const std::vector<CloudTabs>& announcements = observed.linux.cloudTabService().announcements();
   report.cloudTabAnnouncements = static_cast<std::size_t>(
       std::count(announcements.begin(), announcements.end(), CloudTabs::On));
   if (!report.result) {
@@ -63,9 +81,9 @@ RunReport runPlugin(const PluginBundle& bundle, LinuxPlatform& platform) {
 
 /// Runs the plug-in in a child process, so that whatever ends it leaves someone to report it.
 std::variant<RunReport, HostError> runPluginInChild(const PluginBundle& bundle,
-                                                    LinuxPlatform& platform) {
+                                                    ObservedPlatform& observed) {
   const std::variant<std::string, HostError> outcome =
-      runInChildProcess([&] { return jsonText(runPlugin(bundle, platform)); });
+      runInChildProcess([&] { return jsonText(runPlugin(bundle, observed)); });
   if (const auto* error = std::get_if<HostError>(&outcome)) {
     return *error;
   }
@@ -74,6 +92,64 @@ std::variant<RunReport, HostError> runPluginInChild(const PluginBundle& bundle,
     return HostError{ExitStatus::PluginEnded, "The plug-in left no result"};
   }
   return *std::move(report);
+}
+
+/// What a person types to put kept files back, without the folder.
+std::string restoreCommand(const RunOptions& options) {
+  std::string command = "migration-host restore --root " + options.root;
+  if (options.home) {
+    command += " --home " + *options.home;
+  }
+  return command;
+}
+
+PluginEnd endOf(const std::variant<RunReport, HostError>& outcome) {
+  if (const auto* report = std::get_if<RunReport>(&outcome)) {
+    return report->result ? PluginEnd::GaveTrue : PluginEnd::GaveFalse;
+  }
+  return PluginEnd::Died;
+}
+
+RunReport reportOf(std::variant<RunReport, HostError> outcome) {
+  if (auto* report = std::get_if<RunReport>(&outcome)) {
+    return std::move(*report);
+  }
+  RunReport report;
+  setError(report, std::get<HostError>(outcome));
+  return report;
+}
+
+/// Runs the plug-in with its inputs kept around it.
+std::variant<RunReport, HostError> runPluginSafely(const RunOptions& options,
+                                                   const PluginBundle& bundle,
+                                                   const AccountFiles& files,
+                                                   ObservedPlatform& observed) {
+  PathError lockError;
+  const auto rootLock = RootLock::take(observed.linux.root(), lockError);
+  if (!rootLock) {
+    return HostError{ExitStatus::CannotCreate, lockError.text};
+  }
+  SafetyNet safetyNet(observed.linux.fileSystem(), observed.platform.propertyLists, files,
+                      restoreCommand(options));
+  if (const Result kept = safetyNet.keepInputs(currentTimeText()); !kept) {
+    return HostError{ExitStatus::CannotCreate, "The files cannot be kept: " + kept.error()};
+  }
+  std::variant<RunReport, HostError> outcome = runPluginInChild(bundle, observed);
+  const PluginEnd end = endOf(outcome);
+  RunReport report = reportOf(std::move(outcome));
+  std::optional<HeldLock> migrationLock;
+  if (end == PluginEnd::Died || report.dataClassName) {
+    // Readers that wait for the migration wait until it is verified or undone, too. Where the
+    // plug-in could not be loaded, not even the lock's file is made.
+    migrationLock.emplace(observed.platform.sharedResources, kMigrationLockName);
+  }
+  Settlement settlement = safetyNet.settle(end, report.settingsSaves);
+  if (settlement.error) {
+    setError(report, *settlement.error);
+  }
+  report.warnings = std::move(settlement.warnings);
+  report.keptInputs = std::move(settlement.keptFolders);
+  return report;
 }
 
 std::variant<RunReport, HostError> findAndRunPlugin(const RunOptions& options) {
@@ -88,19 +164,16 @@ std::variant<RunReport, HostError> findAndRunPlugin(const RunOptions& options) {
   if (platform == nullptr) {
     return HostError{exitStatusOf(error.kind), error.text};
   }
-  return runPluginInChild(found, *platform);
+  const AccountFiles files = accountFilesInHome(platform->platform().homeDirectory.path());
+  ObservedPlatform observed(*platform, files);
+  return options.bare ? runPluginInChild(found, observed)
+                      : runPluginSafely(options, found, files, observed);
 }
 
 }  // namespace
 
 RunReport runMigration(const RunOptions& options) {
-  std::variant<RunReport, HostError> outcome = findAndRunPlugin(options);
-  RunReport report;
-  if (const auto* error = std::get_if<HostError>(&outcome)) {
-    setError(report, *error);
-  } else {
-    report = std::get<RunReport>(std::move(outcome));
-  }
+  RunReport report = reportOf(findAndRunPlugin(options));
   report.root = options.root;
   return report;
 }

@@ -17,6 +17,11 @@ constexpr const char* kBroadcastsKey = "broadcasts";
 constexpr const char* kApplicationKey = "application";
 constexpr const char* kPreferenceKey = "key";
 constexpr const char* kCloudTabAnnouncementsKey = "cloudTabAnnouncements";
+constexpr const char* kSettingsSavesKey = "settingsSaves";
+constexpr const char* kLastWrittenKey = "lastWritten";
+constexpr const char* kReplacedFileKey = "replacedFile";
+constexpr const char* kKeptInputsKey = "keptInputs";
+constexpr const char* kWarningsKey = "warnings";
 constexpr const char* kExitStatusKey = "exitStatus";
 constexpr const char* kErrorKey = "error";
 
@@ -28,6 +33,22 @@ std::optional<std::string> optionalText(const JSON& object, const char* key) {
   const auto found = object.find(key);
   return found != object.end() && found->is_string() ? std::optional(found->get<std::string>())
                                                      : std::nullopt;
+}
+
+JSON jsonOf(const SettingsSaves& saves) {
+  return {{kLastWrittenKey,
+           saves.last == LastSave::None ? JSON(nullptr) : JSON(saves.last == LastSave::Written)},
+          {kReplacedFileKey, saves.replacedFile}};
+}
+
+SettingsSaves settingsSavesFrom(const JSON& object) {
+  const JSON& written = object.at(kLastWrittenKey);
+  SettingsSaves saves;
+  if (!written.is_null()) {
+    saves.last = written.get<bool>() ? LastSave::Written : LastSave::Failed;
+  }
+  saves.replacedFile = object.at(kReplacedFileKey).get<bool>();
+  return saves;
 }
 
 std::string escaped(const std::string& text) {
@@ -54,6 +75,9 @@ std::string jsonText(const RunReport& report) {
                  {kResultKey, report.result},
                  {kBroadcastsKey, std::move(broadcasts)},
                  {kCloudTabAnnouncementsKey, report.cloudTabAnnouncements},
+                 {kSettingsSavesKey, jsonOf(report.settingsSaves)},
+                 {kKeptInputsKey, report.keptInputs},
+                 {kWarningsKey, report.warnings},
                  {kExitStatusKey, static_cast<int>(report.exitStatus)}};
   if (report.error) {
     object[kErrorKey] = *report.error;
@@ -75,6 +99,9 @@ std::optional<RunReport> reportFromJSONText(const std::string& text) {
                                    broadcast.at(kPreferenceKey).get<std::string>()});
     }
     report.cloudTabAnnouncements = object.at(kCloudTabAnnouncementsKey).get<std::size_t>();
+    report.settingsSaves = settingsSavesFrom(object.at(kSettingsSavesKey));
+    report.keptInputs = object.at(kKeptInputsKey).get<std::vector<std::string>>();
+    report.warnings = object.at(kWarningsKey).get<std::vector<std::string>>();
     report.exitStatus = static_cast<ExitStatus>(object.at(kExitStatusKey).get<int>());
     report.error = optionalText(object, kErrorKey);
     return report;
@@ -87,9 +114,9 @@ std::string summaryText(const RunReport& report) {
   if (!report.dataClassName) {
     return "";
   }
-  std::string summary = (report.result ? "Migrated the " : "Failed to migrate the ") +
-                        escaped(*report.dataClassName) + " of " +
-                        escaped(report.root.value_or("")) + ".\n";
+  std::string summary =
+      (report.result && !report.error ? "Migrated the " : "Failed to migrate the ") +
+      escaped(*report.dataClassName) + " of " + escaped(report.root.value_or("")) + ".\n";
   for (const PreferencesChange& broadcast : report.broadcasts) {
     summary += "  Told " + escaped(broadcast.application) + " that its " + escaped(broadcast.key) +
                " changed.\n";

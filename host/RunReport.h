@@ -7,6 +7,7 @@
 
 #include "host/ExitStatus.h"
 #include "host/HostError.h"
+#include "host/SettingsSaves.h"
 #include "platform/linux/RecordingPreferencesBroadcast.h"
 
 namespace accounts {
@@ -22,6 +23,12 @@ struct RunReport {
   std::vector<PreferencesChange> broadcasts;
   /// How often cloud tabs were announced to be on.
   std::size_t cloudTabAnnouncements = 0;
+  /// What the plug-in did to the settings file, as far as that was looked at.
+  SettingsSaves settingsSaves;
+  /// The folders of kept files that are there after the run, device paths, oldest first.
+  std::vector<std::string> keptInputs;
+  /// What a person should know, one sentence each.
+  std::vector<std::string> warnings;
   ExitStatus exitStatus = ExitStatus::Success;
   /// What went wrong, one line for a person; none when nothing did.
   std::optional<std::string> error;

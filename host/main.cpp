@@ -7,6 +7,7 @@
 #include <variant>
 
 #include "host/CommandLine.h"
+#include "host/RestoreCommand.h"
 #include "host/RunCommand.h"
 #include "host/RunReport.h"
 #include "propertylist/Description.h"
@@ -25,10 +26,14 @@ void openStandardStreams() {
   }
 }
 
-void printError(const std::string& message) {
-  std::string line = "migration-host: ";
+void printLine(const std::string& beginning, const std::string& message) {
+  std::string line = beginning;
   appendEscapedText(line, message);
   std::cerr << line + "\n";
+}
+
+void printError(const std::string& message) {
+  printLine("migration-host: ", message);
 }
 
 /// Writes the program's whole result to standard output, and tells when it does not arrive.
@@ -43,6 +48,9 @@ ExitStatus print(const std::string& text, ExitStatus exitStatus) {
 }
 
 ExitStatus finish(const RunReport& report, OutputForm output) {
+  for (const std::string& warning : report.warnings) {
+    printLine("migration-host: warning: ", warning);
+  }
   if (report.error) {
     printError(*report.error);
   }
@@ -62,6 +70,16 @@ ExitStatus finish(const UsageError& error) {
 
 ExitStatus finish(const RunOptions& options) {
   return finish(runMigration(options), options.output);
+}
+
+ExitStatus finish(const RestoreOptions& options) {
+  const Restoration restoration = runRestoration(options);
+  if (restoration.error) {
+    printError(restoration.error->message);
+  }
+  return print(options.output == OutputForm::JSON ? jsonText(restoration, options.root) + "\n"
+                                                  : summaryText(restoration),
+               exitStatusOf(restoration));
 }
 
 }  // namespace

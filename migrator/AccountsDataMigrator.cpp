@@ -38,7 +38,11 @@ std::string AccountsDataMigrator::dataClassName() {
 
 bool AccountsDataMigrator::performMigration() {
   std::unique_ptr<NamedLock> lock = AccountsManager::createAndLockMigrationLock();
-  const bool succeeded = lock != nullptr && executeMigrationSteps();
+  bool succeeded = false;
+  if (lock != nullptr) {
+    removeAbandonedTemporaryFiles();
+    succeeded = executeMigrationSteps();
+  }
   AccountsManager::releaseMigrationLock(std::move(lock));
   return succeeded;
 }

@@ -26,6 +26,10 @@ std::string pathInHomeLibrary(std::string_view pathInLibrary) {
   return pathByAppending(pathByAppending(home, "Library"), pathInLibrary);
 }
 
+std::string informationDirectory() {
+  return pathInHomeLibrary("Logs/CrashReporter/AccountMigration");
+}
+
 void logRemovalFailure(const std::string& path, const Result& removal) {
   logToConsole("%s. Could not delete %@. Error = %@", {removalOperation, path, removal.error()});
 }
@@ -54,6 +58,13 @@ bool makeInformationDirectory(FileSystem& files, const std::string& directory) {
 }
 
 }  // namespace
+
+void AccountsDataMigrator::removeAbandonedTemporaryFiles() {
+  // Beside the default directory, those of the files that are written atomically: the sentinel and
+  // the information files.
+  Process::current().platform.fileSystem.removeAbandonedTemporaryFiles(
+      {pathInHomeLibrary("Preferences"), informationDirectory()});
+}
 
 void AccountsDataMigrator::_copyAsideAccountsPlist() {
   Platform& platform = Process::current().platform;
@@ -138,7 +149,7 @@ void AccountsDataMigrator::_saveCollatedMigrationInformation() {
             .value_or(PropertyDictionary()));
   }
 
-  const std::string directory = pathInHomeLibrary("Logs/CrashReporter/AccountMigration");
+  const std::string directory = informationDirectory();
   if (!makeInformationDirectory(platform.fileSystem, directory) || !_collatedMigrationData) {
     return;
   }

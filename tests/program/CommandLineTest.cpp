@@ -96,21 +96,42 @@ TEST(CommandLine, ARefusedRunTouchesNothing) {
   EXPECT_FALSE(std::filesystem::exists(root));
 }
 
-TEST(CommandLine, HelpOfTheProgramNamesItsSubcommandAndAnExample) {
+TEST(CommandLine, HelpOfTheProgramNamesItsSubcommandsAndExamples) {
   const std::string help = textFor({"--help"});
 
   EXPECT_NE(help.find("run"), std::string::npos);
   EXPECT_NE(help.find("migration-host run --root /mnt/image"), std::string::npos);
+  EXPECT_NE(help.find("migration-host restore --root /mnt/image"), std::string::npos);
 }
 
-TEST(CommandLine, HelpOfRunNamesEveryOptionAndSaysThatTheHostRunsBare) {
+TEST(CommandLine, HelpOfRunNamesEveryOption) {
   const std::string help = textFor({"run", "--help"});
 
-  for (const char* expected :
-       {"--root", "--home", "--device", "--plugin", "--temporary-directory", "--channel", "--json",
-        "--bare", "runs bare", "Exit status:", "Examples:"}) {
+  for (const char* expected : {"--root", "--home", "--device", "--plugin", "--temporary-directory",
+                               "--channel", "--json", "--bare", "Exit status:", "Examples:"}) {
     EXPECT_NE(help.find(expected), std::string::npos) << expected;
   }
+}
+
+TEST(CommandLine, HelpOfRestoreNamesEveryOption) {
+  const std::string help = textFor({"restore", "--help"});
+
+  for (const char* expected :
+       {"--root", "--home", "--from", "--json", "Exit status:", "Examples:"}) {
+    EXPECT_NE(help.find(expected), std::string::npos) << expected;
+  }
+}
+
+TEST(CommandLine, RestoreIsRefusedWhereRunIs) {
+  expectRefused({"restore"}, "--root");
+  expectRefused({"restore", "--root", ""}, "--root");
+  expectRefused({"restore", "--root", "/nowhere", "--from", ""}, "--from");
+  expectRefused({"restore", "--root", "/nowhere", "--home", "var/mobile"}, "--home");
+  expectRefused({"restore", "--root", "/nowhere", "--bare"}, "--bare");
+}
+
+TEST(CommandLine, TwoSubcommandsAreRefused) {
+  expectRefused({"run", "--root", "/nowhere", "restore"}, "restore");
 }
 
 TEST(CommandLine, TheProgramAndRunTellTheSameVersion) {

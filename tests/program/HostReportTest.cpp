@@ -21,6 +21,9 @@ TEST_F(HostReport, TheObjectTellsEverythingInTheAgreedKeys) {
       {"result", true},
       {"broadcasts", {{{"application", kMobileMail}, {"key", "MailAccounts"}}}},
       {"cloudTabAnnouncements", 0},
+      {"settingsSaves", {{"lastWritten", true}, {"replacedFile", true}}},
+      {"keptInputs", nlohmann::json::array()},
+      {"warnings", nlohmann::json::array()},
       {"exitStatus", 0}};
   EXPECT_EQ(object, expected);
 }

@@ -59,6 +59,8 @@ TEST_F(PluginEnd, AFailedMigrationIsNoError) {
 }
 
 TEST_F(PluginEnd, WhatThePluginPrintsStaysOutOfStandardOutput) {
+  write(kSettingsPath, accountSettings(12));
+
   const ProgramResult result = migrateMisbehaving("print");
 
   EXPECT_EQ(result.exitStatus, 0);

@@ -2,6 +2,7 @@
 #include <unistd.h>
 
 #include <filesystem>
+#include <fstream>
 
 #include "tests/program/DeviceRootFixture.h"
 
@@ -55,11 +56,44 @@ TEST_F(Unprivileged, TheMobileUserCanMigrate) {
 TEST_F(Unprivileged, AUserWhoMayNotWriteThePreferencesLeavesThemAsTheyWere) {
   const std::string settingsBefore = readText(kSettingsPath);
 
-  const ProgramResult result = migrateAs(kSomeUser, {"--channel", "-"});
+  const ProgramResult result = migrateAs(kSomeUser, {"--channel", "-", "--bare"});
 
   EXPECT_NE(result.errors.find("\"Failed to save accounts to filesystem.\""), std::string::npos)
       << result.errors;
   expectSettingsAsTheyWere(settingsBefore);
+}
+
+TEST_F(Unprivileged, AUserWhoCannotKeepTheFilesIsRefused) {
+  const std::string settingsBefore = readText(kSettingsPath);
+  const std::vector<std::string> filesBefore = files();
+
+  const ProgramResult result = migrateAs(kSomeUser);
+
+  EXPECT_EQ(result.exitStatus, 73);
+  EXPECT_EQ(result.errors,
+            "migration-host: The files cannot be kept: Cannot create the directory "
+            "/var/mobile/Library/AccountMigration: Permission denied\n");
+  expectSettingsAsTheyWere(settingsBefore);
+  EXPECT_EQ(files(), filesBefore);
+}
+
+TEST_F(Unprivileged, AFileThatCanBeNeitherLinkedNorReadIsNotRisked) {
+  giveTo(kSomeUser);
+  writeText(kLegacyMailPath, "of another user");
+  ASSERT_EQ(chown(onThisMachine(kLegacyMailPath).c_str(), kSomeOtherUser, kSomeOtherUser), 0);
+  std::filesystem::permissions(onThisMachine(kLegacyMailPath), std::filesystem::perms::none);
+  std::string protection;
+  std::ifstream("/proc/sys/fs/protected_hardlinks") >> protection;
+  if (protection != "1") {
+    GTEST_SKIP() << "This system lets anyone link to the files of others.";
+  }
+  const std::vector<std::string> filesBefore = files();
+
+  const ProgramResult result = migrateAs(kSomeUser);
+
+  EXPECT_EQ(result.exitStatus, 73);
+  EXPECT_EQ(result.errorLines().size(), 1U) << result.errors;
+  EXPECT_EQ(files(), filesBefore);
 }
 
 TEST_F(Unprivileged, AUserWhoMayNotGiveTheFileToMobileLeavesItAsItWas) {
@@ -80,7 +114,7 @@ TEST_F(Unprivileged, AUserWhoMayNotMakeTheLockFailsAtOnce) {
   std::filesystem::permissions(onThisMachine("/tmp"), std::filesystem::perms(0755));
   const std::string settingsBefore = readText(kSettingsPath);
 
-  EXPECT_EQ(migrateAs(kSomeUser).exitStatus, 1);
+  EXPECT_EQ(migrateAs(kSomeUser, {"--bare"}).exitStatus, 1);
 
   expectSettingsAsTheyWere(settingsBefore);
 }

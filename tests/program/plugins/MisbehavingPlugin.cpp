@@ -1,3 +1,5 @@
+#include <unistd.h>
+
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
@@ -11,22 +13,48 @@
 namespace accounts {
 namespace {
 
+constexpr const char* kSettings = "/var/mobile/Library/Preferences/com.quarx.accountsettings.plist";
+constexpr const char* kLegacyMail = "/var/mobile/Library/Mail/Accounts.plist";
+
 // The ways to misbehave, chosen by the environment variable MISBEHAVIOUR.
-const std::map<std::string, bool (*)()> behaviours = {
+const std::map<std::string, bool (*)(Platform&)> behaviours = {
     {"abort",
-     [] {
+     [](Platform&) {
        std::abort();
        return false;
      }},
-    {"kill", [] { return std::raise(SIGKILL) == 0; }},
-    {"throw", []() -> bool { throw std::runtime_error("thrown by the plug-in"); }},
+    {"kill", [](Platform&) { return std::raise(SIGKILL) == 0; }},
+    {"throw", [](Platform&) -> bool { throw std::runtime_error("thrown by the plug-in"); }},
     {"exit",
-     [] {
+     [](Platform&) {
        std::exit(0);
        return false;
      }},
-    {"fail", [] { return false; }},
-    {"print", [] { return std::puts("printed by the plug-in") >= 0; }},
+    {"fail", [](Platform&) { return false; }},
+    {"print", [](Platform&) { return std::puts("printed by the plug-in") >= 0; }},
+    {"break the settings",
+     [](Platform& platform) {
+       return static_cast<bool>(platform.fileSystem.writeFileAtomically(kSettings, "half a file"));
+     }},
+    {"lose mail and fail",
+     [](Platform& platform) {
+       (void)platform.fileSystem.removeFile(kLegacyMail);
+       return false;
+     }},
+    {"lose mail and die",
+     [](Platform& platform) {
+       (void)platform.fileSystem.removeFile(kLegacyMail);
+       std::abort();
+       return false;
+     }},
+    {"lose mail and kill the host",
+     [](Platform& platform) {
+       (void)platform.fileSystem.removeFile(kLegacyMail);
+       kill(getppid(), SIGKILL);
+       // The host takes this process along.
+       pause();
+       return false;
+     }},
 };
 
 std::string chosenBehaviour() {
@@ -36,13 +64,19 @@ std::string chosenBehaviour() {
 
 class MisbehavingPlugin : public MigrationPluginBase {
  public:
+  explicit MisbehavingPlugin(Platform& platform) : platform_(platform) {}
+
   std::string dataClassName() override { return "misbehaviour"; }
-  bool performMigration() override { return behaviours.at(chosenBehaviour())(); }
+  bool performMigration() override { return behaviours.at(chosenBehaviour())(platform_); }
+
+ private:
+  Platform& platform_;
 };
 
 }  // namespace
 }  // namespace accounts
 
-extern "C" accounts::MigrationPluginBase* CreateMigrationPlugin(accounts::Platform& /*platform*/) {
-  return accounts::chosenBehaviour() == "no instance" ? nullptr : new accounts::MisbehavingPlugin();
+extern "C" accounts::MigrationPluginBase* CreateMigrationPlugin(accounts::Platform& platform) {
+  return accounts::chosenBehaviour() == "no instance" ? nullptr
+                                                      : new accounts::MisbehavingPlugin(platform);
 }

@@ -1,0 +1,27 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "host/AccountFiles.h"
+#include "host/SettingsSaves.h"
+#include "platform/PropertyLists.h"
+
+namespace accounts {
+
+/// Why the settings file is not what a migration leaves, as a clause such as "the settings file was
+/// not written"; none when it is: the last save, if there was one, was written, and the file is a
+/// property list of the current version.
+std::optional<std::string> whyNotMigrated(PropertyLists& propertyLists, const std::string& settings,
+                                          LastSave lastSave);
+
+/// What a verified migration may not have carried over, one sentence each without a full stop, in
+/// order: an input that is no property list; a settings file that had accounts and has none; a
+/// legacy store with an account that is not in the settings file. `folder` holds the inputs as they
+/// were. None of these is an error of the migration, whose rules drop what they cannot read.
+std::vector<std::string> whatMayBeMissing(PropertyLists& propertyLists, const AccountFiles& files,
+                                          const std::vector<std::string>& keptInputs,
+                                          const std::string& folder);
+
+}  // namespace accounts

@@ -1,0 +1,88 @@
+#include "host/RestoreCommand.h"
+
+#include <nlohmann/json.hpp>
+
+#include "host/CurrentTime.h"
+#include "host/HeldLock.h"
+#include "host/RootLock.h"
+#include "platform/linux/DeviceRoot.h"
+#include "platform/linux/LinuxFileSystem.h"
+#include "platform/linux/LinuxPlatform.h"
+#include "platform/linux/LinuxSharedResources.h"
+#include "propertylist/Description.h"
+
+namespace accounts {
+namespace {
+
+using JSON = nlohmann::ordered_json;
+
+Restoration failed(ExitStatus exitStatus, const std::string& message) {
+  Restoration restoration;
+  restoration.error = HostError{exitStatus, message};
+  return restoration;
+}
+
+JSON textOrNull(const std::optional<std::string>& text) {
+  return text ? JSON(*text) : JSON(nullptr);
+}
+
+std::string escapedLine(const std::string& beginning, const std::string& text) {
+  std::string line = beginning;
+  appendEscapedText(line, text);
+  return line + "\n";
+}
+
+}  // namespace
+
+Restoration runRestoration(const RestoreOptions& options) {
+  PathError error;
+  const auto root = DeviceRoot::openRoot(options.root, error);
+  if (!root) {
+    return failed(ExitStatus::MissingInput, error.text);
+  }
+  const auto rootLock = RootLock::take(*root, error);
+  if (!rootLock) {
+    return failed(ExitStatus::CannotCreate, error.text);
+  }
+  LinuxSharedResources sharedResources(*root);
+  const HeldLock migrationLock(sharedResources, kMigrationLockName);
+  if (!migrationLock.isHeld()) {
+    return failed(ExitStatus::CannotCreate,
+                  "The migration lock cannot be made in /tmp of the device");
+  }
+  // No temporary file is made; the directory is only named.
+  const std::string home = options.home.value_or(LinuxPlatformOptions().homeDirectory);
+  LinuxFileSystem files(*root, home + "/tmp");
+  return restoreKeptFiles(files, accountFilesInHome(home), options.folder, currentTimeText());
+}
+
+ExitStatus exitStatusOf(const Restoration& restoration) {
+  return restoration.error ? restoration.error->exitStatus : ExitStatus::Success;
+}
+
+std::string jsonText(const Restoration& restoration, const std::string& root) {
+  JSON object = {{"root", root},
+                 {"from", textOrNull(restoration.folder)},
+                 {"restored", restoration.restored},
+                 {"replaced", textOrNull(restoration.replaced)},
+                 {"exitStatus", static_cast<int>(exitStatusOf(restoration))}};
+  if (restoration.error) {
+    object["error"] = restoration.error->message;
+  }
+  constexpr int onOneLine = -1;
+  constexpr bool keepUnicode = false;
+  return object.dump(onOneLine, ' ', keepUnicode, JSON::error_handler_t::replace);
+}
+
+std::string summaryText(const Restoration& restoration) {
+  std::string summary;
+  for (const std::string& path : restoration.restored) {
+    summary += escapedLine("Put back ", path);
+  }
+  if (restoration.replaced) {
+    summary += escapedLine("What was there is kept in ", *restoration.replaced);
+  }
+  return summary;
+}
+
+}  // namespace accounts

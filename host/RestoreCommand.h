@@ -1,0 +1,24 @@
+#pragma once
+
+#include <string>
+
+#include "host/CommandLine.h"
+#include "host/Restoration.h"
+
+namespace accounts {
+
+/// Puts kept files back on one device root and tells what came of it; also every error, for this
+/// never fails in another way.
+Restoration runRestoration(const RestoreOptions& options);
+
+/// How the program ends after that.
+ExitStatus exitStatusOf(const Restoration& restoration);
+
+/// The outcome as one JSON object on one line, without a line end. `root` is the root as the person
+/// named it.
+std::string jsonText(const Restoration& restoration, const std::string& root);
+
+/// The outcome in a few lines for a person, each with its line end; errors are no part of it.
+std::string summaryText(const Restoration& restoration);
+
+}  // namespace accounts

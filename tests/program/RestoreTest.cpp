@@ -1,0 +1,140 @@
+#include <filesystem>
+
+#include "tests/program/SafetyNetFixture.h"
+
+namespace accounts {
+namespace {
+
+/// `migration-host restore` on a device whose settings file was refused and replaced.
+class Restore : public SafetyNetFixture {
+ protected:
+  void SetUp() override {
+    writeText(kSettingsPath, "refused");
+    ASSERT_EQ(migrate().exitStatus, 0);
+    folder = onlyKeptFolder();
+    name = std::filesystem::path(folder).filename();
+    migrated = readText(kSettingsPath);
+  }
+
+  void expectRefused(const ProgramResult& result, int exitStatus, const std::string& message) {
+    EXPECT_EQ(result.exitStatus, exitStatus);
+    EXPECT_EQ(result.output, "");
+    EXPECT_EQ(result.errors, "migration-host: " + message + "\n");
+    EXPECT_EQ(readText(kSettingsPath), migrated);
+    EXPECT_TRUE(exists(folder));
+  }
+
+  std::string folder, name, migrated;
+};
+
+TEST_F(Restore, PutsTheFilesBackAndKeepsWhatTheyReplace) {
+  const ProgramResult result = restore();
+
+  EXPECT_EQ(result.exitStatus, 0) << result.errors;
+  EXPECT_EQ(readText(kSettingsPath), "refused");
+  ASSERT_EQ(hostFolders().size(), 1u);
+  const std::string replaced = hostFolders()[0];
+  EXPECT_EQ(readText(replaced + "/com.quarx.accountsettings.plist"), migrated);
+  EXPECT_EQ(result.output, "Put back " + std::string(kSettingsPath) +
+                               "\nWhat was there is kept in " + replaced + "\n");
+  EXPECT_EQ(result.errors, "");
+}
+
+TEST_F(Restore, TellsInJSONWhatItDid) {
+  const ProgramResult result = restore({"--json", "--from", name});
+
+  const nlohmann::json expected = {{"root", root()},
+                                   {"from", folder},
+                                   {"restored", {kSettingsPath}},
+                                   {"replaced", hostFolders().at(0)},
+                                   {"exitStatus", 0}};
+  EXPECT_EQ(onlyObject(result), expected);
+}
+
+TEST_F(Restore, LeavesWhatItReplacedWithoutAWarningOfTheNextRun) {
+  ASSERT_EQ(restore().exitStatus, 0);
+  write(kSettingsPath, accountSettings(12));
+
+  EXPECT_EQ(migrate().errors, "");
+
+  EXPECT_EQ(hostFolders().size(), 1u);
+}
+
+TEST_F(Restore, NamesTheFoldersWhereThereAreSeveral) {
+  writeText(std::string(kAccountMigration) + "/Kept-19990101T000000Z/Accounts.plist", "older");
+
+  expectRefused(
+      restore(), 64,
+      "Several folders hold kept files, --from must name one: Kept-19990101T000000Z " + name);
+
+  EXPECT_EQ(restore({"--from", folder}).exitStatus, 0);
+  EXPECT_FALSE(exists(kLegacyMailPath));
+}
+
+TEST_F(Restore, RefusesAFolderThatIsNotThere) {
+  expectRefused(restore({"--from", "Kept-missing"}), 66, "No folder of kept files: Kept-missing");
+  expectRefused(restore({"--from", "../Preferences"}), 66,
+                "No folder of kept files: ../Preferences");
+}
+
+TEST_F(Restore, RefusesAFolderThatIsALink) {
+  std::filesystem::create_directory_symlink(name, onThisMachine(kAccountMigration) / "Kept-link");
+
+  expectRefused(restore({"--from", "Kept-link"}), 66, "No folder of kept files: Kept-link");
+}
+
+TEST_F(Restore, RefusesARootThatIsNotThere) {
+  const ProgramResult result = runProgram(
+      {.program = MIGRATION_HOST, .arguments = {"restore", "--root", root() + "missing"}});
+
+  EXPECT_EQ(result.exitStatus, 66);
+  EXPECT_EQ(result.errorLines().size(), 1u) << result.errors;
+}
+
+TEST_F(Restore, ReportsAnErrorInJSONAsWell) {
+  const ProgramResult result = restore({"--json", "--from", "Kept-missing"});
+
+  EXPECT_EQ(result.exitStatus, 66);
+  const nlohmann::json object = onlyObject(result);
+  EXPECT_EQ(object["restored"], nlohmann::json::array());
+  EXPECT_EQ(object["exitStatus"], 66);
+  EXPECT_EQ(object["error"], "No folder of kept files: Kept-missing");
+}
+
+TEST_F(Restore, DoesNotReplaceWhatIsNoRegularFile) {
+  std::filesystem::remove(onThisMachine(kSettingsPath));
+  std::filesystem::create_symlink("/etc/passwd", onThisMachine(kSettingsPath));
+
+  const ProgramResult result = restore();
+
+  EXPECT_EQ(result.exitStatus, 73);
+  EXPECT_TRUE(std::filesystem::is_symlink(onThisMachine(kSettingsPath)));
+  EXPECT_TRUE(exists(folder));
+}
+
+TEST_F(Restore, WithNothingKeptSaysSo) {
+  ASSERT_EQ(restore().exitStatus, 0);
+
+  const ProgramResult result = restore();
+
+  EXPECT_EQ(result.exitStatus, 66);
+  EXPECT_EQ(result.errors,
+            "migration-host: No files are kept in /var/mobile/Library/AccountMigration\n");
+}
+
+TEST_F(Restore, AfterAKilledRunBringsTheAccountsToTheNextMigration) {
+  ASSERT_EQ(restore().exitStatus, 0);
+  std::filesystem::remove_all(onThisMachine(kAccountMigration));
+  write(kSettingsPath, accountSettings(12));
+  write(kLegacyMailPath, legacyMail());
+  writeText(kSentinelPath, "Old Account Information Removal Sentinel");
+  ASSERT_EQ(migrateMisbehaving("lose mail and kill the host").exitStatus, -9);
+
+  EXPECT_EQ(restore().exitStatus, 0);
+
+  EXPECT_EQ(migrate().exitStatus, 0);
+  EXPECT_EQ(accountIdentifiers(), std::vector<std::string>{"M"});
+}
+
+}  // namespace
+}  // namespace accounts

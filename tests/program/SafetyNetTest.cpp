@@ -1,0 +1,206 @@
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <csignal>
+#include <filesystem>
+#include <functional>
+
+#include "tests/program/SafetyNetFixture.h"
+
+namespace accounts {
+namespace {
+
+/// What the host keeps, verifies and puts back around the plug-in.
+using SafetyNet = SafetyNetFixture;
+
+TEST_F(SafetyNet, AVerifiedRunLeavesNothingOfItsOwn) {
+  write(kSettingsPath, accountSettings(11));
+  write(kLegacyMailPath, legacyMail());
+
+  const ProgramResult result = migrate();
+
+  EXPECT_EQ(result.exitStatus, 0) << result.errors;
+  EXPECT_FALSE(exists(kAccountMigration));
+}
+
+TEST_F(SafetyNet, ARefusedSettingsFileIsKeptWhileAnEmptyOneTakesItsPlace) {
+  writeText(kSettingsPath, "bplist00 but not quite");
+
+  const ProgramResult result = migrate({"--json"});
+
+  EXPECT_EQ(result.exitStatus, 0) << result.errors;
+  EXPECT_EQ(readDictionary(kSettingsPath), accountSettings(12));
+  const std::string folder = onlyKeptFolder();
+  EXPECT_EQ(readText(folder + "/com.quarx.accountsettings.plist"), "bplist00 but not quite");
+  EXPECT_EQ(std::filesystem::status(onThisMachine(folder)).permissions(),
+            std::filesystem::perms::owner_all);
+  const nlohmann::json object = onlyObject(result);
+  EXPECT_EQ(object["keptInputs"], nlohmann::json::array({folder}));
+  ASSERT_EQ(object["warnings"].size(), 1u);
+  EXPECT_TRUE(
+      result.hasErrorLine("migration-host: warning: " + object["warnings"][0].get<std::string>()));
+  EXPECT_NE(result.errors.find(folder), std::string::npos) << result.errors;
+}
+
+TEST_F(SafetyNet, ABareRunKeepsNothing) {
+  writeText(kSettingsPath, "bplist00 but not quite");
+
+  const ProgramResult result = migrate({"--bare"});
+
+  EXPECT_EQ(result.exitStatus, 0);
+  EXPECT_EQ(result.errors, "");
+  EXPECT_FALSE(exists(kAccountMigration));
+}
+
+TEST_F(SafetyNet, AResultThatIsNotVerifiedIsUndone) {
+  write(kSettingsPath, accountSettings(11));
+  const std::string before = readText(kSettingsPath);
+
+  const ProgramResult result = migrateMisbehaving("break the settings");
+
+  EXPECT_EQ(result.exitStatus, 2);
+  EXPECT_EQ(result.errors,
+            "migration-host: The plug-in reported success but the settings file cannot be read as "
+            "a property list; the files are put back as they were\n");
+  EXPECT_EQ(readText(kSettingsPath), before);
+  EXPECT_FALSE(exists(kAccountMigration));
+  const nlohmann::json object = onlyObject(result);
+  EXPECT_EQ(object["result"], true);
+  EXPECT_EQ(object["exitStatus"], 2);
+}
+
+TEST_F(SafetyNet, WhatIsPutBackIsTheVerySameFile) {
+  write(kSettingsPath, accountSettings(11));
+  std::filesystem::permissions(onThisMachine(kSettingsPath), std::filesystem::perms(0640));
+  const ino_t before = statusOf(kSettingsPath).st_ino;
+
+  ASSERT_EQ(migrateMisbehaving("break the settings").exitStatus, 2);
+
+  EXPECT_EQ(statusOf(kSettingsPath).st_ino, before);
+  EXPECT_EQ(statusOf(kSettingsPath).st_nlink, 1u);
+  EXPECT_EQ(statusOf(kSettingsPath).st_mode & 0777, 0640u);
+}
+
+TEST_F(SafetyNet, AnInterruptedRemovalBesideOldSettingsIsNotTakenForAMigration) {
+  writeText(kSentinelPath, "Old Account Information Removal Sentinel");
+  write(kSettingsPath, accountSettings(3));
+  write(kLegacyMailPath, legacyMail());
+
+  EXPECT_EQ(migrate().exitStatus, 2);
+  EXPECT_TRUE(exists(kLegacyMailPath));
+  EXPECT_FALSE(exists(kSentinelPath));
+
+  EXPECT_EQ(migrate().exitStatus, 0);
+  EXPECT_EQ(accountIdentifiers(), std::vector<std::string>{"M"});
+}
+
+TEST_F(SafetyNet, AnInterruptedRemovalBesideMigratedSettingsIsFinished) {
+  writeText(kSentinelPath, "Old Account Information Removal Sentinel");
+  write(kSettingsPath, accountSettings(12));
+  write(kLegacyMailPath, PropertyDictionary{{"MailAccounts", PropertyArray{}}});
+
+  EXPECT_EQ(migrate().exitStatus, 0);
+
+  EXPECT_FALSE(exists(kLegacyMailPath));
+  EXPECT_FALSE(exists(kAccountMigration));
+}
+
+TEST_F(SafetyNet, ALegacyStoreThatCannotBeConvertedIsKept) {
+  // A description that is no account: the plug-in converts none of the store and removes it.
+  write(kLegacyExchangePath,
+        PropertyDictionary{{"DAAccountsKey", PropertyArray{PropertyDictionary{}}}});
+  const std::string before = readText(kLegacyExchangePath);
+
+  const ProgramResult result = migrate();
+
+  EXPECT_EQ(result.exitStatus, 0);
+  EXPECT_FALSE(exists(kLegacyExchangePath));
+  EXPECT_EQ(readText(onlyKeptFolder() + "/com.quarx.DataAccess.plist"), before);
+}
+
+TEST_F(SafetyNet, AFailureThatChangedNothingLeavesNothing) {
+  write(kSettingsPath, accountSettings(11));
+
+  const ProgramResult result = migrateMisbehaving("fail");
+
+  EXPECT_EQ(result.exitStatus, 1);
+  EXPECT_EQ(result.errorLines().size(), 1u) << result.errors;
+  EXPECT_FALSE(exists(kAccountMigration));
+}
+
+TEST_F(SafetyNet, ALegacyStoreThatAFailedOrDeadPluginLostIsPutBack) {
+  for (const auto& [behaviour, exitStatus] :
+       {std::pair("lose mail and fail", 1), std::pair("lose mail and die", 70)}) {
+    write(kLegacyMailPath, legacyMail());
+
+    EXPECT_EQ(migrateMisbehaving(behaviour).exitStatus, exitStatus) << behaviour;
+
+    EXPECT_EQ(readDictionary(kLegacyMailPath), legacyMail()) << behaviour;
+    EXPECT_FALSE(exists(kAccountMigration)) << behaviour;
+  }
+}
+
+TEST_F(SafetyNet, AKilledHostLeavesItsFolderAndTheNextRunNamesIt) {
+  write(kSettingsPath, accountSettings(12));
+  write(kLegacyMailPath, legacyMail());
+
+  EXPECT_EQ(migrateMisbehaving("lose mail and kill the host").exitStatus, -SIGKILL);
+  const std::string folder = onlyKeptFolder();
+  const ProgramResult next = migrate({"--json"});
+
+  EXPECT_EQ(next.exitStatus, 0);
+  EXPECT_EQ(onlyKeptFolder(), folder);
+  EXPECT_EQ(readDictionary(folder + "/Accounts.plist"), legacyMail());
+  EXPECT_EQ(onlyObject(next)["keptInputs"], nlohmann::json::array({folder}));
+  EXPECT_NE(next.errors.find("An earlier run left files in " + folder), std::string::npos)
+      << next.errors;
+}
+
+TEST_F(SafetyNet, WhatIsNoRegularFileIsRefusedAtOnceWithNothingTouched) {
+  const std::vector<std::string> before = files();
+  const auto makePipe = [](const std::filesystem::path& path) { mkfifo(path.c_str(), 0600); };
+  const auto makeDirectory = [](const std::filesystem::path& path) {
+    std::filesystem::create_directory(path);
+  };
+  const auto makeLink = [](const std::filesystem::path& path) {
+    std::filesystem::create_symlink("/etc/passwd", path);
+  };
+  for (const char* input : {kSettingsPath, kLegacyMailPath, kLegacyExchangePath}) {
+    for (const std::function<void(const std::filesystem::path&)>& make :
+         {std::function<void(const std::filesystem::path&)>(makePipe),
+          {makeDirectory},
+          {makeLink}}) {
+      make(onThisMachine(input));
+
+      const ProgramResult result = migrate();
+
+      EXPECT_EQ(result.exitStatus, 73) << input;
+      EXPECT_EQ(result.errors, "migration-host: The files cannot be kept: " + std::string(input) +
+                                   " is no regular file\n");
+      std::filesystem::remove(onThisMachine(input));
+      EXPECT_EQ(files(), before);
+      EXPECT_FALSE(exists(kAccountMigration));
+    }
+  }
+}
+
+TEST_F(SafetyNet, TemporaryFilesOfAKilledRunAreRemovedByTheNext) {
+  write(kSettingsPath, accountSettings(12));
+  for (const char* directory : {"/var/mobile/tmp", "/var/mobile/Library/Preferences",
+                                "/var/mobile/Library/Logs/CrashReporter/AccountMigration"}) {
+    writeText(std::string(directory) + "/.accounts-migration-0123456789abcdef", "half a file");
+  }
+
+  ASSERT_EQ(migrate().exitStatus, 0);
+
+  const std::vector<std::string> left = files();
+  EXPECT_EQ(std::count_if(left.begin(), left.end(),
+                          [](const std::string& path) {
+                            return path.find(".accounts-migration-") != std::string::npos;
+                          }),
+            0);
+}
+
+}  // namespace
+}  // namespace accounts
