@@ -5,6 +5,7 @@
 #include <csignal>
 #include <filesystem>
 #include <functional>
+#include <future>
 
 #include "tests/program/SafetyNetFixture.h"
 
@@ -155,6 +156,24 @@ TEST_F(SafetyNet, AKilledHostLeavesItsFolderAndTheNextRunNamesIt) {
   EXPECT_EQ(onlyObject(next)["keptInputs"], nlohmann::json::array({folder}));
   EXPECT_NE(next.errors.find("An earlier run left files in " + folder), std::string::npos)
       << next.errors;
+}
+
+TEST_F(SafetyNet, HostsOnOneRootTakeTurns) {
+  write(kSettingsPath, accountSettings(11));
+  write(kLegacyMailPath, legacyMail());
+
+  std::vector<std::future<ProgramResult>> hosts(6);
+  for (std::future<ProgramResult>& host : hosts) {
+    host = std::async(std::launch::async, [this] { return migrate(); });
+  }
+
+  for (std::future<ProgramResult>& host : hosts) {
+    const ProgramResult result = host.get();
+    EXPECT_EQ(result.exitStatus, 0) << result.errors;
+    EXPECT_EQ(result.errors.find("warning"), std::string::npos) << result.errors;
+  }
+  EXPECT_EQ(accountIdentifiers(), std::vector<std::string>{"M"});
+  EXPECT_FALSE(exists(kAccountMigration));
 }
 
 TEST_F(SafetyNet, WhatIsNoRegularFileIsRefusedAtOnceWithNothingTouched) {
