@@ -1,0 +1,70 @@
+#include "tests/campaign/AllocationFailures.h"
+
+#include <cstdlib>
+#include <limits>
+#include <new>
+
+namespace accounts {
+
+namespace {
+
+constexpr std::size_t kNever = std::numeric_limits<std::size_t>::max();
+
+// Allocations have no other way to find these. The program has one thread.
+struct {
+  bool isCounting = false;
+  int pauses = 0;
+  std::size_t count = 0;
+  std::size_t failing = kNever;
+} state;
+
+void* allocate(std::size_t size) {
+  if (state.isCounting && state.pauses == 0 && state.count++ == state.failing) {
+    throw std::bad_alloc();
+  }
+  void* memory = std::malloc(size != 0 ? size : 1);
+  if (memory == nullptr) {
+    throw std::bad_alloc();
+  }
+  return memory;
+}
+
+}  // namespace
+
+AllocationFailure::AllocationFailure(std::optional<std::size_t> number) {
+  state.count = 0;
+  state.failing = number.value_or(kNever);
+  state.isCounting = true;
+}
+
+AllocationFailure::~AllocationFailure() {
+  state.isCounting = false;
+}
+
+std::size_t AllocationFailure::count() {
+  return state.count;
+}
+
+AllocationsSucceed::AllocationsSucceed() {
+  ++state.pauses;
+}
+
+AllocationsSucceed::~AllocationsSucceed() {
+  --state.pauses;
+}
+
+}  // namespace accounts
+
+// Every allocation of the program. The forms for arrays and for no exceptions come to these in the
+// standard library; nothing here asks for more than the default alignment.
+void* operator new(std::size_t size) {
+  return accounts::allocate(size);
+}
+
+void operator delete(void* memory) noexcept {
+  std::free(memory);
+}
+
+void operator delete(void* memory, std::size_t /*size*/) noexcept {
+  std::free(memory);
+}

@@ -1,0 +1,18 @@
+#pragma once
+
+#include <vector>
+
+#include "tests/campaign/Report.h"
+#include "tests/campaign/Scenario.h"
+
+namespace accounts {
+
+/// Each system call of each scenario fails in every way, once and from then on; then the action is
+/// run again to its end.
+bool runFaultCampaign(const std::vector<Scenario>& scenarios, const Selection& selection);
+
+/// The process is killed before and after each system call of each scenario; then the action is
+/// run again, killed again at each of its calls, and run to its end.
+bool runKillCampaign(const std::vector<Scenario>& scenarios, const Selection& selection);
+
+}  // namespace accounts

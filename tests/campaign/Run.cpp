@@ -1,0 +1,213 @@
+#include "tests/campaign/Run.h"
+
+#include <cstdio>
+#include <new>
+#include <stdexcept>
+#include <utility>
+
+#include "accountsettings/AccountsManager.h"
+#include "accountsettings/Process.h"
+#include "migrator/AccountsDataMigrator.h"
+#include "platform/linux/DescribedCloudAccountService.h"
+#include "platform/linux/DescribedDeviceInfoService.h"
+#include "platform/linux/DescribedExternalSyncSources.h"
+#include "platform/linux/DescribedPairingValueStore.h"
+#include "platform/linux/DescribedProfileRestrictions.h"
+#include "platform/linux/LinuxFileSystem.h"
+#include "platform/linux/LinuxHomeDirectory.h"
+#include "platform/linux/LinuxMailDirectory.h"
+#include "platform/linux/LinuxPreferenceDomain.h"
+#include "platform/linux/LinuxPropertyLists.h"
+#include "platform/linux/LinuxSharedResources.h"
+#include "tests/campaign/AllocationFailures.h"
+#include "tests/fakes/FakeServices.h"
+
+namespace accounts {
+
+namespace {
+
+constexpr std::string_view kHome = "/var/mobile";
+constexpr std::string_view kNotifier = "CampaignNotifier";
+
+DeviceRoot openDevice() {
+  PathError error;
+  std::optional<DeviceRoot> root =
+      DeviceRoot::openRoot(std::string(SimulatedKernel::kDeviceDirectory), error);
+  if (!root) {
+    throw std::logic_error(error.text);
+  }
+  return std::move(*root);
+}
+
+/// Remembers what is turned into an account settings file.
+class ObservedPropertyLists : public PropertyLists {
+ public:
+  explicit ObservedPropertyLists(PropertyLists& real) : real_(real) {}
+  std::vector<std::string> settingsWritten;
+
+  std::optional<PropertyDictionary> readDictionary(std::string_view path) override {
+    return real_.readDictionary(path);
+  }
+  Result serializeBinary(const PropertyValue& value, std::string_view& bytes) override {
+    Result result = real_.serializeBinary(value, bytes);
+    const AllocationsSucceed whileObserving;
+    const PropertyDictionary* root = value.asDictionary();
+    if (result && root != nullptr && root->contains(kPlistAccountsKey)) {
+      settingsWritten.emplace_back(bytes);
+    }
+    return result;
+  }
+
+ private:
+  PropertyLists& real_;
+};
+
+/// UUIDs that count up and differ from run to run.
+class CountingUUIDs : public UUIDGenerator {
+ public:
+  explicit CountingUUIDs(unsigned run) : run_(run) {}
+
+  std::optional<std::string> randomUUID() override {
+    char text[37];
+    std::snprintf(text, sizeof text, "%08X-0000-4000-8000-%012X", run_, ++count_);
+    return std::string(text);
+  }
+
+ private:
+  unsigned run_;
+  unsigned count_ = 0;
+};
+
+/// The bundle's resources, read once: every run needs them.
+const FakeBundleResources& resources() {
+  static const FakeBundleResources read = [] {
+    FakeBundleResources bundle;
+    for (const char* name :
+         {"AccountTypesProperties", "DataclassesProperties", "AccountCreators", "MailServices"}) {
+      bundle.replaced[name] = bundle.readPropertyList(name);
+    }
+    return bundle;
+  }();
+  return read;
+}
+
+/// The Linux platform on the simulated device: all that works with files is the real thing.
+struct DeviceProcess {
+  DeviceProcess(const DeviceDescription& description, unsigned run)
+      : root(openDevice()),
+        cloudAccountService(description),
+        deviceInfoService(description),
+        externalSyncSources(description),
+        pairingValueStore(description),
+        profileRestrictions(description),
+        uuidGenerator(run) {
+    consoleLog.alsoStandardError = false;
+    logSystem.channel.enabled = false;
+  }
+
+  std::vector<std::string> journal;
+  const DeviceRoot root;
+  LinuxFileSystem fileSystem{root, std::string(kHome) + "/tmp"};
+  LinuxPropertyLists realPropertyLists{root};
+  ObservedPropertyLists propertyLists{realPropertyLists};
+  LinuxHomeDirectory homeDirectory{kHome};
+  LinuxMailDirectory mailDirectory{homeDirectory};
+  LinuxPreferenceDomain preferenceDomain{realPropertyLists, homeDirectory};
+  LinuxSharedResources sharedResources{root};
+  DescribedCloudAccountService cloudAccountService;
+  DescribedDeviceInfoService deviceInfoService;
+  DescribedExternalSyncSources externalSyncSources;
+  DescribedPairingValueStore pairingValueStore;
+  DescribedProfileRestrictions profileRestrictions;
+  CountingUUIDs uuidGenerator;
+  FakeBundleResources bundleResources = resources();
+  FakeCloudTabService cloudTabService{journal};
+  FakeConsoleLog consoleLog{journal};
+  FakeDateFormatter dateFormatter;
+  FakeFrameworkLoader frameworkLoader;
+  FakeLocalizedStrings localizedStrings;
+  FakeLogSystem logSystem;
+  FakePreferencesBroadcast preferencesBroadcast{journal};
+  Platform platform = {.bundleResources = bundleResources,
+                       .cloudAccountService = cloudAccountService,
+                       .cloudTabService = cloudTabService,
+                       .consoleLog = consoleLog,
+                       .dateFormatter = dateFormatter,
+                       .deviceInfoService = deviceInfoService,
+                       .externalSyncSources = externalSyncSources,
+                       .fileSystem = fileSystem,
+                       .frameworkLoader = frameworkLoader,
+                       .homeDirectory = homeDirectory,
+                       .localizedStrings = localizedStrings,
+                       .logSystem = logSystem,
+                       .mailDirectory = mailDirectory,
+                       .pairingValueStore = pairingValueStore,
+                       .preferenceDomain = preferenceDomain,
+                       .preferencesBroadcast = preferencesBroadcast,
+                       .profileRestrictions = profileRestrictions,
+                       .propertyLists = propertyLists,
+                       .sharedResources = sharedResources,
+                       .uuidGenerator = uuidGenerator};
+  Process process{platform};
+};
+
+/// What a program of the device does outside a migration: it adds an account and saves.
+bool saveOutsideMigration(DeviceProcess& device, std::size_t& notifications) {
+  AccountClass notifier;
+  notifier.noteAccountChanges = [&](const PropertyArray& changes) {
+    notifications += changes.size();
+  };
+  device.frameworkLoader.registerClass(std::string(kNotifier), notifier);
+  device.bundleResources.replaced["AccountCreators"] = PropertyDictionary{
+      {kMailAccountType,
+       PropertyArray{PropertyDictionary{
+           {"Type", "NotifierAccount"},
+           {"Description", PropertyDictionary{{"Framework", "Notifier.so"},
+                                              {"Class", kNotifier},
+                                              {"Supported Dataclasses",
+                                               PropertyArray{kAccountDataclassMail}}}}}}}};
+  const std::unique_ptr<AccountsManager> store = AccountsManager::init();
+  store->insertAccount(BasicAccount::initWithProperties(
+      {{kAccountIdentifier, "ADDED"},
+       {kAccountType, kMailAccountType},
+       {kAccountClass, "IMAPAccount"},
+       {kAccountEnabledDataclasses, PropertyArray{kAccountDataclassMail}}}));
+  store->saveAllAccounts();
+  return true;
+}
+
+bool act(DeviceProcess& device, Scenario::Action action, std::size_t& notifications) {
+  return action == Scenario::Action::SaveOutsideMigration
+             ? saveOutsideMigration(device, notifications)
+             : AccountsDataMigrator().performMigration();
+}
+
+}  // namespace
+
+Run runOn(const SimulatedDisk& disk, const Scenario& scenario, const RunOptions& options) {
+  SimulatedKernel kernel(disk, options.number);
+  Run run;
+  std::size_t descriptorsBefore = 0;
+  {
+    DeviceProcess device(scenario.description, options.number);
+    descriptorsBefore = kernel.openDescriptors();
+    kernel.start(options.fault, options.recording);
+    const AllocationFailure allocations(options.failingAllocation);
+    try {
+      run.succeeded = act(device, scenario.action, run.notifications);
+    } catch (const std::bad_alloc&) {
+      run.ranOutOfMemory = true;
+    }
+    run.allocations = AllocationFailure::count();
+    run.settingsWritten = std::move(device.propertyLists.settingsWritten);
+    run.openDescriptors = kernel.openDescriptors() - descriptorsBefore;
+  }
+  run.disk = kernel.disk();
+  run.refusedPaths = kernel.refusedPaths();
+  run.operations = kernel.operationCount();
+  run.calls = kernel.calls();
+  run.changes = kernel.changes();
+  return run;
+}
+
+}  // namespace accounts
