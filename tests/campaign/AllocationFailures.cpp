@@ -55,10 +55,22 @@ AllocationsSucceed::~AllocationsSucceed() {
 
 }  // namespace accounts
 
-// Every allocation of the program. The forms for arrays and for no exceptions come to these in the
-// standard library; nothing here asks for more than the default alignment.
+// Every form that the program uses, since the sanitizers' forms do not come to one another. Nothing
+// here asks for more than the default alignment.
 void* operator new(std::size_t size) {
   return accounts::allocate(size);
+}
+
+void* operator new[](std::size_t size) {
+  return accounts::allocate(size);
+}
+
+void* operator new(std::size_t size, const std::nothrow_t& /*nothrow*/) noexcept {
+  try {
+    return accounts::allocate(size);
+  } catch (const std::bad_alloc&) {
+    return nullptr;
+  }
 }
 
 void operator delete(void* memory) noexcept {
@@ -66,5 +78,17 @@ void operator delete(void* memory) noexcept {
 }
 
 void operator delete(void* memory, std::size_t /*size*/) noexcept {
+  std::free(memory);
+}
+
+void operator delete[](void* memory) noexcept {
+  std::free(memory);
+}
+
+void operator delete[](void* memory, std::size_t /*size*/) noexcept {
+  std::free(memory);
+}
+
+void operator delete(void* memory, const std::nothrow_t& /*nothrow*/) noexcept {
   std::free(memory);
 }

@@ -15,4 +15,8 @@ bool runFaultCampaign(const std::vector<Scenario>& scenarios, const Selection& s
 /// run again, killed again at each of its calls, and run to its end.
 bool runKillCampaign(const std::vector<Scenario>& scenarios, const Selection& selection);
 
+/// The power fails after each change that a scenario makes to the disk, with everything that the
+/// disk may then hold (PowerLoss.h); then the action is run again to its end.
+bool runPowerLossCampaign(const std::vector<Scenario>& scenarios, const Selection& selection);
+
 }  // namespace accounts

@@ -13,6 +13,8 @@ namespace accounts {
 namespace {
 
 constexpr std::string_view kTemporaryMark = "/.accounts-migration-";
+constexpr std::string_view kInformationDirectory =
+    "/var/mobile/Library/Logs/CrashReporter/AccountMigration";
 
 std::optional<PropertyDictionary> dictionaryIn(const std::string& bytes) {
   PropertyListError error;
@@ -210,6 +212,21 @@ Complaint Invariants::ofInterruption(const SimulatedDisk& disk,
   }
   if (const LegacyStore* store = lostStore(disk)) {
     return store->path + " is gone although its accounts are not in the settings file";
+  }
+  if (disk.exists(kSentinelPath) && !scenario_.disk.exists(kSentinelPath)) {
+    // The next run takes the legacy stores for carried over.
+    SimulatedDisk withoutStores = disk;
+    for (const LegacyStore& store : legacyStores_) {
+      withoutStores.removeFile(store.path);
+    }
+    if (const LegacyStore* store = lostStore(withoutStores)) {
+      return "the sentinel gives up " + store->path + " before its accounts are carried over";
+    }
+  }
+  for (const std::string& path : disk.filesBeneath(kInformationDirectory)) {
+    if (path.find(kTemporaryMark) == std::string::npos && !dictionaryIn(*disk.contentsOf(path))) {
+      return "the migration-information file is not whole";
+    }
   }
   return std::nullopt;
 }

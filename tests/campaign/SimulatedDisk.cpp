@@ -1,6 +1,7 @@
 #include "tests/campaign/SimulatedDisk.h"
 
 #include <algorithm>
+#include <functional>
 #include <utility>
 
 namespace accounts {
@@ -29,33 +30,24 @@ void addFilesBeneath(const SimulatedDisk& disk, std::size_t directory, const std
   }
 }
 
-/// A hash of a sequence of texts and numbers; 64 bits of FNV-1a.
+/// A hash of a sequence of texts and numbers.
 class Fingerprint {
  public:
-  void add(std::string_view text) {
-    add(text.size());
-    for (const char character : text) {
-      addByte(static_cast<unsigned char>(character));
-    }
-  }
+  void add(std::string_view text) { add(std::hash<std::string_view>()(text)); }
   void add(std::uint64_t number) {
-    for (int shift = 0; shift < 64; shift += 8) {
-      addByte(static_cast<unsigned char>(number >> shift));
-    }
+    constexpr std::uint64_t factor = 0x9e3779b97f4a7c15U;
+    value_ = (value_ ^ number) * factor;
+    value_ ^= value_ >> 32U;
   }
   [[nodiscard]] std::uint64_t value() const { return value_; }
 
  private:
-  void addByte(unsigned char byte) {
-    constexpr std::uint64_t prime = 1099511628211U;
-    value_ = (value_ ^ byte) * prime;
-  }
-  std::uint64_t value_ = 14695981039346656037U;
+  std::uint64_t value_ = 0;
 };
 
 void addTree(Fingerprint& fingerprint, const SimulatedDisk& disk, std::size_t number) {
   const SimulatedInode& inode = disk.inode(number);
-  fingerprint.add(inode.isDirectory ? 1U : 0U);
+  fingerprint.add(std::uint64_t{inode.isDirectory});
   fingerprint.add(inode.permissions);
   fingerprint.add(inode.owner);
   fingerprint.add(inode.group);

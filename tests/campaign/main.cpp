@@ -21,6 +21,7 @@ struct NamedCampaign {
 constexpr std::array kCampaigns = {
     NamedCampaign{"faults", accounts::runFaultCampaign},
     NamedCampaign{"kills", accounts::runKillCampaign},
+    NamedCampaign{"power-loss", accounts::runPowerLossCampaign},
 };
 
 int runSelected(const std::string& campaign, const Selection& selection) {
