@@ -19,4 +19,8 @@ bool runKillCampaign(const std::vector<Scenario>& scenarios, const Selection& se
 /// disk may then hold (PowerLoss.h); then the action is run again to its end.
 bool runPowerLossCampaign(const std::vector<Scenario>& scenarios, const Selection& selection);
 
+/// Each allocation of the codecs and of each scenario fails; then the action is run again to its
+/// end.
+bool runAllocationCampaign(const std::vector<Scenario>& scenarios, const Selection& selection);
+
 }  // namespace accounts

@@ -35,7 +35,7 @@ void tryScenario(const Scenario& scenario, Report& report) {
   for (std::size_t operation = 0; operation < calls.size(); ++operation) {
     for (const NamedFault& named : kFaults) {
       const bool canHit = named.error != 0 || calls[operation].line.starts_with("write ");
-      if (!canHit || !report.takes(scenario, operation, named.name)) {
+      if (!canHit || !report.takes(scenario.name, operation, named.name)) {
         continue;
       }
       const Fault fault = {operation, named.error, named.duration};
@@ -57,7 +57,7 @@ void tryScenario(const Scenario& scenario, Report& report) {
 bool runFaultCampaign(const std::vector<Scenario>& scenarios, const Selection& selection) {
   Report report(selection);
   for (const Scenario& scenario : scenarios) {
-    if (report.takes(scenario)) {
+    if (report.takes(scenario.name)) {
       tryScenario(scenario, report);
     }
   }

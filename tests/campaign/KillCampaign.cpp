@@ -39,7 +39,7 @@ class KilledScenario {
     for (std::size_t operation = 0; operation < run.calls.size(); ++operation) {
       for (const bool isAfter : {false, true}) {
         const SimulatedDisk& disk = disks[operation + (isAfter ? 1 : 0)];
-        if (report_.takes(scenario_, operation, isAfter ? "kill-after" : "kill-before")) {
+        if (report_.takes(scenario_.name, operation, isAfter ? "kill-after" : "kill-before")) {
           report_.judge(judge(disk, run.settingsWritten), run.calls[operation].line);
         }
         // The second run is the same on the same disk: it is killed once for each.
@@ -61,7 +61,7 @@ class KilledScenario {
 
   void killSecondRun(const SimulatedDisk& left, std::size_t firstOperation, const Run& first) {
     const std::string fault = "second-kill-after-" + std::to_string(firstOperation);
-    if (!report_.mayTake(scenario_, fault)) {
+    if (!report_.mayTake(scenario_.name, fault)) {
       return;
     }
     const Run second =
@@ -71,7 +71,7 @@ class KilledScenario {
                            second.settingsWritten.end());
     const std::vector<SimulatedDisk> disks = disksOf(left, second);
     for (std::size_t operation = 0; operation < second.calls.size(); ++operation) {
-      if (report_.takes(scenario_, operation, fault)) {
+      if (report_.takes(scenario_.name, operation, fault)) {
         report_.judge(judge(disks[operation + 1], settingsWritten), second.calls[operation].line);
       }
     }
@@ -88,7 +88,7 @@ class KilledScenario {
 bool runKillCampaign(const std::vector<Scenario>& scenarios, const Selection& selection) {
   Report report(selection);
   for (const Scenario& scenario : scenarios) {
-    if (report.takes(scenario)) {
+    if (report.takes(scenario.name)) {
       KilledScenario(scenario, report).tryAll();
     }
   }

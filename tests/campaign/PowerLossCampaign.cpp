@@ -35,7 +35,7 @@ class PowerlessScenario {
     for (std::size_t count = from; count <= changes.size(); ++count) {
       std::size_t number = 0;
       powerLoss.forEachDiskAfter(count, [&](const SimulatedDisk& disk) {
-        if (report_.takes(scenario_, count, name + "state-" + std::to_string(number++)) &&
+        if (report_.takes(scenario_.name, count, name + "state-" + std::to_string(number++)) &&
             known_.insert(disk.fingerprint()).second) {
           report_.judge(judge(disk, settingsWritten), "change " + std::to_string(count));
         }
@@ -79,7 +79,7 @@ class PowerlessScenario {
 bool runPowerLossCampaign(const std::vector<Scenario>& scenarios, const Selection& selection) {
   Report report(selection);
   for (const Scenario& scenario : scenarios) {
-    if (report.takes(scenario)) {
+    if (report.takes(scenario.name)) {
       PowerlessScenario(scenario, report).tryAll();
     }
   }

@@ -11,14 +11,14 @@ constexpr std::size_t kMostComplaintsShown = 10;
 
 }  // namespace
 
-bool Report::takes(const Scenario& scenario, std::size_t operation, std::string_view fault) {
+bool Report::takes(std::string_view scenario, std::size_t operation, std::string_view fault) {
   const bool isAsked =
       mayTake(scenario, fault) && (!selection_.operation || selection_.operation == operation);
   if (!isAsked || offered_++ % selection_.every != 0) {
     return false;
   }
   ++taken_;
-  scenario_ = scenario.name;
+  scenario_ = scenario;
   operation_ = operation;
   fault_ = fault;
   return true;

@@ -29,13 +29,13 @@ class Report {
   explicit Report(Selection selection) : selection_(std::move(selection)) {}
 
   /// Whether a case is selected: the n-th operation of a scenario with a fault. Counts.
-  bool takes(const Scenario& scenario, std::size_t operation, std::string_view fault);
-  [[nodiscard]] bool takes(const Scenario& scenario) const {
-    return selection_.scenario.empty() || selection_.scenario == scenario.name;
+  bool takes(std::string_view scenario, std::size_t operation, std::string_view fault);
+  [[nodiscard]] bool takes(std::string_view scenario) const {
+    return selection_.scenario.empty() || selection_.scenario == scenario;
   }
 
   /// Whether any case with a fault is selected. Does not count.
-  [[nodiscard]] bool mayTake(const Scenario& scenario, std::string_view fault) const {
+  [[nodiscard]] bool mayTake(std::string_view scenario, std::string_view fault) const {
     return takes(scenario) && (selection_.fault.empty() || selection_.fault == fault);
   }
 

@@ -151,7 +151,8 @@ struct DeviceProcess {
   Process process{platform};
 };
 
-/// What a program of the device does outside a migration: it adds an account and saves.
+/// What a program of the device does outside a migration: it looks around in the store, adds,
+/// changes and removes accounts, and saves.
 bool saveOutsideMigration(DeviceProcess& device, std::size_t& notifications) {
   AccountClass notifier;
   notifier.noteAccountChanges = [&](const PropertyArray& changes) {
@@ -172,8 +173,22 @@ bool saveOutsideMigration(DeviceProcess& device, std::size_t& notifications) {
        {kAccountType, kMailAccountType},
        {kAccountClass, "IMAPAccount"},
        {kAccountEnabledDataclasses, PropertyArray{kAccountDataclassMail}}}));
+  if (const BasicAccountReference account = store->accountWithIdentifier("IMAP-1")) {
+    account->setAccountProperty_forKey("New name", kAccountDisplayName);
+    store->updateAccount(account);
+  }
+  if (const BasicAccountReference parent = store->displayAccountWithSyncIdentifier("CALDAV-1")) {
+    store->addChild_toAccount(BasicAccount::initWithProperties({{kAccountIdentifier, "CHILD"},
+                                                                {kAccountType, kCalDAVAccountType},
+                                                                {kAccountClass, "CalDAVAccount"}}),
+                              parent);
+  }
+  for (const BasicAccountReference& account :
+       store->basicAccountsWithTypes({kExchangeAccountType})) {
+    store->deleteAccount(account);
+  }
   store->saveAllAccounts();
-  return true;
+  return store->allBasicSyncableAccounts().size() >= store->count();
 }
 
 bool act(DeviceProcess& device, Scenario::Action action, std::size_t& notifications) {

@@ -22,6 +22,7 @@ constexpr std::array kCampaigns = {
     NamedCampaign{"faults", accounts::runFaultCampaign},
     NamedCampaign{"kills", accounts::runKillCampaign},
     NamedCampaign{"power-loss", accounts::runPowerLossCampaign},
+    NamedCampaign{"allocations", accounts::runAllocationCampaign},
 };
 
 int runSelected(const std::string& campaign, const Selection& selection) {
