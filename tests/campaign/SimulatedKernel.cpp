@@ -1,6 +1,7 @@
 #include "tests/campaign/SimulatedKernel.h"
 
 #include <fcntl.h>
+#include <sys/file.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -39,6 +40,15 @@ void SimulatedKernel::start(const std::optional<Fault>& fault, Recording recordi
   operationCount_ = 0;
 }
 
+bool SimulatedKernel::endPlugin() {
+  const bool hasHit = fault_ && fault_->duration == Fault::Duration::UntilThePluginEnds &&
+                      operationCount_ > fault_->operation;
+  if (fault_ && fault_->duration == Fault::Duration::UntilThePluginEnds) {
+    fault_.reset();
+  }
+  return hasHit;
+}
+
 std::size_t SimulatedKernel::openDescriptors() const {
   return static_cast<std::size_t>(std::ranges::count_if(files_, &OpenFile::isOpen));
 }
@@ -52,8 +62,7 @@ int SimulatedKernel::begin(std::string_view call, const std::string& path) {
     return 0;
   }
   if (fault_->error != 0) {
-    const bool isHit =
-        number == fault_->operation || fault_->duration == Fault::Duration::FromThenOn;
+    const bool isHit = number == fault_->operation || fault_->duration != Fault::Duration::Once;
     if (isHit) {
       refusedPaths_.push_back(path);
     }
@@ -249,8 +258,12 @@ int SimulatedKernel::rename(int directory, std::string_view name, int newDirecto
     return -ENOENT;
   }
   const std::optional<std::size_t> replaced = entry(newDirectory, newName);
-  if (replaced && disk_.inode(*replaced).isDirectory) {
-    return -EISDIR;
+  const bool isDirectory = disk_.inode(*inode).isDirectory;
+  if (replaced && disk_.inode(*replaced).isDirectory != isDirectory) {
+    return isDirectory ? -ENOTDIR : -EISDIR;
+  }
+  if (replaced && !disk_.inode(*replaced).entries.empty()) {
+    return -ENOTEMPTY;
   }
   change({.kind = Kind::Rename,
           .inode = *inode,
@@ -281,6 +294,56 @@ int SimulatedKernel::unlink(int directory, std::string_view name, int flags) {
           .directory = file(directory).inode,
           .name = std::string(name)});
   return 0;
+}
+
+int SimulatedKernel::link(int directory, std::string_view name, int newDirectory,
+                          std::string_view newName) {
+  if (const int error = begin("linkat", pathIn(newDirectory, newName)); error != 0) {
+    return error;
+  }
+  const std::optional<std::size_t> inode = entry(directory, name);
+  if (!inode) {
+    return -ENOENT;
+  }
+  if (entry(newDirectory, newName)) {
+    return -EEXIST;
+  }
+  change({.kind = Kind::Link,
+          .inode = *inode,
+          .directory = file(newDirectory).inode,
+          .name = std::string(newName)});
+  return 0;
+}
+
+int SimulatedKernel::readNames(int descriptor, std::vector<std::string>& names) {
+  if (const int error = begin("getdents", file(descriptor).path); error != 0) {
+    return error;
+  }
+  names = {".", ".."};
+  for (const auto& [name, inode] : disk_.inode(file(descriptor).inode).entries) {
+    names.push_back(name);
+  }
+  return 0;
+}
+
+int SimulatedKernel::lock(int descriptor, int operation) {
+  OpenFile& locked = file(descriptor);
+  if ((operation & LOCK_UN) != 0) {
+    locked.isLocked = false;
+    return 0;
+  }
+  const bool isHeld = std::ranges::any_of(files_, [&](const OpenFile& other) {
+    return &other != &locked && other.isOpen && other.isLocked && other.inode == locked.inode;
+  });
+  if (isHeld) {
+    return (operation & LOCK_NB) != 0 ? -EWOULDBLOCK : -EDEADLK;
+  }
+  locked.isLocked = true;
+  return 0;
+}
+
+int SimulatedKernel::setTimes(int descriptor) {
+  return begin("futimens", file(descriptor).path);
 }
 
 int SimulatedKernel::makeDirectory(int directory, std::string_view name, unsigned permissions) {

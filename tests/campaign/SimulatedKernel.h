@@ -16,7 +16,13 @@ namespace accounts {
 
 /// What goes wrong in a run.
 struct Fault {
-  enum class Duration : std::uint8_t { Once, FromThenOn };
+  enum class Duration : std::uint8_t {
+    Once,
+    FromThenOn,
+    /// From then on, but only in the plug-in: as if its process had been killed there, while the
+    /// host lives on.
+    UntilThePluginEnds
+  };
   /// The number of the system call that fails, counted from 0.
   std::size_t operation = 0;
   /// The error number; 0 stands for a short write: half of the bytes are written, and the next
@@ -32,6 +38,7 @@ struct Fault {
 ///
 /// Every call that could fail for want of a working disk is numbered. Closing is not, nor are
 /// locking (the platform waits for a lock as long as it takes) and random numbers, which count up.
+/// Reading a directory is one call.
 class SimulatedKernel {
  public:
   /// The directory of the host that the device seems to be in.
@@ -51,6 +58,9 @@ class SimulatedKernel {
   /// Counts calls from 0 again, with a fault to come or none. Recording keeps every numbered call
   /// and every change from here on for calls() and changes().
   void start(const std::optional<Fault>& fault, Recording recording);
+
+  /// Ends a fault that lasts until the plug-in ends. Whether there was one and it has hit.
+  bool endPlugin();
 
   [[nodiscard]] const SimulatedDisk& disk() const { return disk_; }
   [[nodiscard]] std::size_t operationCount() const { return operationCount_; }
@@ -80,6 +90,12 @@ class SimulatedKernel {
   int setOwner(int descriptor, unsigned owner, unsigned group);
   int rename(int directory, std::string_view name, int newDirectory, std::string_view newName);
   int unlink(int directory, std::string_view name, int flags);
+  int link(int directory, std::string_view name, int newDirectory, std::string_view newName);
+  /// The names in an open directory, "." and ".." included, through `names`.
+  int readNames(int descriptor, std::vector<std::string>& names);
+  /// `operation` as flock takes it. Waiting for a lock would never end here: that is refused.
+  int lock(int descriptor, int operation);
+  int setTimes(int descriptor);
   int makeDirectory(int directory, std::string_view name, unsigned permissions);
   void close(int descriptor);
   void random(char* bytes, std::size_t count);
@@ -90,6 +106,7 @@ class SimulatedKernel {
     std::string path = {};
     std::size_t offset = 0;
     bool isOpen = true;
+    bool isLocked = false;
   };
   OpenFile& file(int descriptor) {
     return files_[static_cast<std::size_t>(descriptor - kFirstDescriptor)];

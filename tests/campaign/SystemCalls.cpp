@@ -2,6 +2,7 @@
 // library's (--wrap): those on the simulated device go to the simulated kernel, all others to the
 // real one. So what the campaign tries is the platform itself, not a model of it.
 
+#include <dirent.h>
 #include <fcntl.h>
 #include <linux/openat2.h>
 #include <sys/file.h>
@@ -12,6 +13,8 @@
 
 #include <cerrno>
 #include <cstdarg>
+#include <string>
+#include <vector>
 
 #include "tests/campaign/AllocationFailures.h"
 #include "tests/campaign/SimulatedKernel.h"
@@ -35,6 +38,26 @@ Number given(Number result) {
   return result;
 }
 
+/// An open directory of the simulated device, in place of the C library's.
+struct SimulatedDirectory {
+  int descriptor = 0;
+  std::vector<std::string> names = {};
+  std::size_t next = 0;
+  dirent entry = {};
+};
+
+/// Those that are open: a DIR* is one of these if it is among them.
+std::vector<SimulatedDirectory*> openDirectories;
+
+SimulatedDirectory* simulated(DIR* directory) {
+  for (SimulatedDirectory* each : openDirectories) {
+    if (static_cast<void*>(each) == static_cast<void*>(directory)) {
+      return each;
+    }
+  }
+  return nullptr;
+}
+
 }  // namespace
 
 }  // namespace accounts
@@ -42,6 +65,9 @@ Number given(Number result) {
 using accounts::AllocationsSucceed;
 using accounts::given;
 using accounts::kernelOf;
+using accounts::openDirectories;
+using accounts::simulated;
+using accounts::SimulatedDirectory;
 using accounts::SimulatedKernel;
 
 // Names of this form are what the linker's option asks for.
@@ -61,6 +87,12 @@ int __real_fchmod(int descriptor, mode_t permissions);
 int __real_fchown(int descriptor, uid_t owner, gid_t group);
 int __real_renameat(int directory, const char* name, int newDirectory, const char* newName);
 int __real_unlinkat(int directory, const char* name, int flags);
+int __real_linkat(int directory, const char* name, int newDirectory, const char* newName,
+                  int flags);
+int __real_futimens(int descriptor, const timespec* times);
+DIR* __real_fdopendir(int descriptor);
+dirent* __real_readdir(DIR* directory);
+int __real_closedir(DIR* directory);
 int __real_mkdirat(int directory, const char* name, mode_t permissions);
 int __real_flock(int descriptor, int operation);
 int __real_close(int descriptor);
@@ -186,8 +218,66 @@ int __wrap_mkdirat(int directory, const char* name, mode_t permissions) {
                            : __real_mkdirat(directory, name, permissions);
 }
 
+int __wrap_linkat(int directory, const char* name, int newDirectory, const char* newName,
+                  int flags) {
+  const AllocationsSucceed whileInTheKernel;
+  SimulatedKernel* kernel = kernelOf(directory);
+  return kernel != nullptr ? given(kernel->link(directory, name, newDirectory, newName))
+                           : __real_linkat(directory, name, newDirectory, newName, flags);
+}
+
+int __wrap_futimens(int descriptor, const timespec* times) {
+  const AllocationsSucceed whileInTheKernel;
+  SimulatedKernel* kernel = kernelOf(descriptor);
+  return kernel != nullptr ? given(kernel->setTimes(descriptor))
+                           : __real_futimens(descriptor, times);
+}
+
+DIR* __wrap_fdopendir(int descriptor) {
+  const AllocationsSucceed whileInTheKernel;
+  SimulatedKernel* kernel = kernelOf(descriptor);
+  if (kernel == nullptr) {
+    return __real_fdopendir(descriptor);
+  }
+  auto* directory = new SimulatedDirectory{.descriptor = descriptor};
+  if (given(kernel->readNames(descriptor, directory->names)) != 0) {
+    delete directory;
+    return nullptr;
+  }
+  openDirectories.push_back(directory);
+  return reinterpret_cast<DIR*>(directory);
+}
+
+dirent* __wrap_readdir(DIR* stream) {
+  SimulatedDirectory* directory = simulated(stream);
+  if (directory == nullptr) {
+    return __real_readdir(stream);
+  }
+  if (directory->next == directory->names.size()) {
+    return nullptr;
+  }
+  const std::string& name = directory->names[directory->next++];
+  directory->entry.d_name[name.copy(directory->entry.d_name, sizeof directory->entry.d_name - 1)] =
+      '\0';
+  return &directory->entry;
+}
+
+int __wrap_closedir(DIR* stream) {
+  const AllocationsSucceed whileInTheKernel;
+  SimulatedDirectory* directory = simulated(stream);
+  if (directory == nullptr) {
+    return __real_closedir(stream);
+  }
+  kernelOf(directory->descriptor)->close(directory->descriptor);
+  std::erase(openDirectories, directory);
+  delete directory;
+  return 0;
+}
+
 int __wrap_flock(int descriptor, int operation) {
-  return kernelOf(descriptor) != nullptr ? 0 : __real_flock(descriptor, operation);
+  SimulatedKernel* kernel = kernelOf(descriptor);
+  return kernel != nullptr ? given(kernel->lock(descriptor, operation))
+                           : __real_flock(descriptor, operation);
 }
 
 int __wrap_close(int descriptor) {
