@@ -1,5 +1,6 @@
 #include "host/MigrationCheck.h"
 
+#include <algorithm>
 #include <cstddef>
 #include <set>
 
@@ -12,6 +13,8 @@ constexpr std::string_view kVersion = "Version";
 constexpr std::string_view kAccounts = "Accounts";
 constexpr std::string_view kChildAccounts = "ChildAccounts";
 constexpr std::string_view kIdentifier = "Identifier";
+/// The identifier of the device's own account, which a migration makes anew where it is missing.
+constexpr std::string_view kDeviceLocalIdentifier = "DeviceLocalAccount";
 
 /// The arrays of a legacy store, and the key of an account's identifier in them.
 struct LegacyLayout {
@@ -33,9 +36,10 @@ std::optional<std::string> identifierIn(const PropertyValue& account, std::strin
   return text ? std::optional(text->string()) : std::nullopt;
 }
 
-void addIdentifiers(Identifiers& identifiers, const PropertyArray& accounts) {
+void addIdentifiers(Identifiers& identifiers, const PropertyArray& accounts,
+                    std::string_view key = kIdentifier) {
   for (const PropertyValue& account : accounts) {
-    if (const auto identifier = identifierIn(account, kIdentifier)) {
+    if (const auto identifier = identifierIn(account, key)) {
       identifiers.insert(*identifier);
     }
   }
@@ -52,6 +56,23 @@ Identifiers identifiersOf(const PropertyDictionary& settings) {
     }
   }
   return identifiers;
+}
+
+/// Whether a settings file had accounts of which none is left: as after a plug-in that could not
+/// read it. Accounts that come from elsewhere, too, do not count: they are there in any case.
+bool hasLostAll(const PropertyDictionary& before, const PropertyDictionary& after,
+                const Identifiers& fromElsewhere) {
+  if (arrayIn(before, kAccounts).size() == 0) {
+    return false;
+  }
+  const Identifiers left = identifiersOf(after);
+  Identifiers identifiers = identifiersOf(before);
+  std::erase_if(identifiers, [&](const auto& each) { return fromElsewhere.contains(each); });
+  // Accounts without identifiers cannot be looked for: they are given fresh ones.
+  const bool noneIsLeft =
+      !identifiers.empty() &&
+      std::ranges::none_of(identifiers, [&](const auto& each) { return left.contains(each); });
+  return noneIsLeft || arrayIn(after, kAccounts).size() == 0;
 }
 
 /// Whether the accounts of a legacy store are among these. One without an identifier is given a
@@ -99,17 +120,24 @@ std::vector<std::string> whatMayBeMissing(PropertyLists& propertyLists, const Ac
   const PropertyDictionary migrated =
       propertyLists.readDictionary(files.settings).value_or(PropertyDictionary());
   const Identifiers identifiers = identifiersOf(migrated);
+  Identifiers fromElsewhere = {std::string(kDeviceLocalIdentifier)};
+  // The settings file comes last, when what the legacy stores hold is known.
   for (const std::string& path : keptInputs) {
     const auto contents = propertyLists.readDictionary(keptPath(folder, path));
     if (!contents) {
       sentences.push_back(path + " could not be read as a property list");
     } else if (path == files.settings) {
-      if (arrayIn(*contents, kAccounts).size() > 0 && arrayIn(migrated, kAccounts).size() == 0) {
-        sentences.push_back(path + " had accounts and has none now");
+      if (hasLostAll(*contents, migrated, fromElsewhere)) {
+        sentences.push_back(path + " had accounts and has none of them now");
       }
-    } else if (!isAmong(identifiers, *contents,
-                        path == files.legacyMail ? kMailLayout : kExchangeLayout)) {
-      sentences.push_back("Not every account of " + path + " was found in the settings file");
+    } else {
+      const LegacyLayout& layout = path == files.legacyMail ? kMailLayout : kExchangeLayout;
+      if (!isAmong(identifiers, *contents, layout)) {
+        sentences.push_back("Not every account of " + path + " was found in the settings file");
+      }
+      for (const std::string_view key : layout.arrays) {
+        addIdentifiers(fromElsewhere, arrayIn(*contents, key), layout.identifier);
+      }
     }
   }
   return sentences;

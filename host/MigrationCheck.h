@@ -17,9 +17,10 @@ std::optional<std::string> whyNotMigrated(PropertyLists& propertyLists, const st
                                           LastSave lastSave);
 
 /// What a verified migration may not have carried over, one sentence each without a full stop, in
-/// order: an input that is no property list; a settings file that had accounts and has none; a
-/// legacy store with an account that is not in the settings file. `folder` holds the inputs as they
-/// were. None of these is an error of the migration, whose rules drop what they cannot read.
+/// order: an input that is no property list; a legacy store with an account that is not in the
+/// settings file; a settings file that had accounts and has none of them. `folder` holds the inputs
+/// as they were, `keptInputs` in the order of AccountFiles. None of these is an error of the
+/// migration, whose rules drop what they cannot read.
 std::vector<std::string> whatMayBeMissing(PropertyLists& propertyLists, const AccountFiles& files,
                                           const std::vector<std::string>& keptInputs,
                                           const std::string& folder);

@@ -62,8 +62,31 @@ TEST_F(SettlingVerifiedTest, ASettingsFileThatLostAllItsAccountsStaysKept) {
   const Settlement settlement = net.settle(PluginEnd::GaveTrue, kWrittenSave);
 
   EXPECT_FALSE(settlement.error);
-  EXPECT_THAT(settlement.warnings, ElementsAre(HasSubstr(" had accounts and has none now; ")));
+  EXPECT_THAT(settlement.warnings,
+              ElementsAre(HasSubstr(" had accounts and has none of them now; ")));
   EXPECT_TRUE(isKept());
+}
+
+TEST_F(SettlingVerifiedTest, ASettingsFileThatHasOnlyOtherAccountsNowStaysKept) {
+  addSettings(2, {"one", "DeviceLocalAccount", "mail"});
+  addLegacyMail({"mail"});
+  keep();
+  addSettings(12, {"mail", "DeviceLocalAccount"});
+
+  EXPECT_THAT(net.settle(PluginEnd::GaveTrue, kWrittenSave).warnings,
+              ElementsAre(HasSubstr(" had accounts and has none of them now; ")));
+  EXPECT_TRUE(isKept());
+}
+
+TEST_F(SettlingVerifiedTest, ASettingsFileWhoseAccountsHadNoIdentifiersIsNotKeptForTheirFreshOnes) {
+  device.addPropertyList(
+      kSettingsPath,
+      PropertyDictionary{{"Version", 1}, {"Accounts", PropertyArray{PropertyDictionary()}}});
+  keep();
+  addSettings(12, {"fresh"});
+
+  EXPECT_THAT(net.settle(PluginEnd::GaveTrue, kWrittenSave).warnings, IsEmpty());
+  EXPECT_FALSE(isKept());
 }
 
 TEST_F(SettlingVerifiedTest, ASettingsFileThatLostSomeAccountsDoesNot) {
