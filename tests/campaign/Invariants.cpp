@@ -5,6 +5,7 @@
 
 #include "accountsettings/AccountVocabulary.h"
 #include "accountsettings/AccountsManager.h"
+#include "host/AccountFiles.h"
 #include "propertylist/PropertyListFile.h"
 #include "tests/program/StoredVersionsComparison.h"
 
@@ -73,6 +74,17 @@ std::vector<std::string> temporaryFiles(const SimulatedDisk& disk) {
   return files;
 }
 
+/// The contents of all files that the host keeps in whole folders.
+std::vector<std::string> keptContents(const SimulatedDisk& disk) {
+  std::vector<std::string> contents;
+  for (const std::string& path : disk.filesBeneath(kAccountMigrationDirectory)) {
+    if (path.find("/Unfinished-") == std::string::npos) {
+      contents.push_back(*disk.contentsOf(path));
+    }
+  }
+  return contents;
+}
+
 bool contains(const std::vector<std::string>& texts, std::string_view text) {
   return std::ranges::find(texts, text) != texts.end();
 }
@@ -90,6 +102,7 @@ Invariants::Invariants(const Scenario& scenario)
     : scenario_(scenario),
       undisturbed_(runOn(scenario.disk, scenario, {.recording = SimulatedKernel::Recording::On})),
       settingsBefore_(scenario.disk.contentsOf(kSettingsPath)) {
+  keptBefore_ = keptContents(scenario.disk);
   const std::optional<std::string> end = undisturbed_.disk.contentsOf(kSettingsPath);
   std::set<std::string> before = identifiersOf(settingsBefore_);
   for (const std::string& path : scenario.disk.filesBeneath("/")) {
@@ -135,7 +148,8 @@ const std::set<std::string>& Invariants::identifiersIn(const std::string& settin
 Complaint Invariants::ofSettings(const SimulatedDisk& disk,
                                  const std::vector<std::string>& settingsWritten) const {
   const std::optional<std::string> settings = disk.contentsOf(kSettingsPath);
-  if (settings == settingsBefore_ || (settings && contains(settingsWritten, *settings))) {
+  if (settings == settingsBefore_ ||
+      (settings && (contains(settingsWritten, *settings) || contains(keptBefore_, *settings)))) {
     return std::nullopt;
   }
   return settings ? "the settings file is neither the old one nor a whole new one"
@@ -144,7 +158,8 @@ Complaint Invariants::ofSettings(const SimulatedDisk& disk,
 
 const Invariants::LegacyStore* Invariants::lostStore(const SimulatedDisk& disk) {
   for (const LegacyStore& store : legacyStores_) {
-    const bool isThere = disk.contentsOf(store.path) == store.contents;
+    const bool isThere = disk.contentsOf(store.path) == store.contents ||
+                         contains(keptContents(disk), store.contents);
     if (!isThere &&
         !std::ranges::includes(identifiersIn(disk.contentsOf(kSettingsPath).value_or("")),
                                store.identifiers)) {
@@ -169,15 +184,20 @@ Complaint Invariants::ofFaultedRun(const Run& run, const Fault& fault) {
   if (run.openDescriptors != 0) {
     return "a descriptor stayed open";
   }
-  if (!run.succeeded && !isUntouched(run.disk)) {
-    return "the run gave false but changed the device";
+  if (const Complaint complaint = ofKeptFiles(run.disk, run.settingsWritten)) {
+    return complaint;
+  }
+  const bool isProtected = scenario_.host == Scenario::Host::SafetyNet;
+  // A protected run that fails may leave what it changed when it also leaves what that was.
+  if (!run.succeeded && (!isProtected || run.wasRefused) && !isUntouched(run.disk)) {
+    return "the run failed at once but changed the device";
   }
   const bool isSaved = !run.settingsWritten.empty() &&
                        run.disk.contentsOf(kSettingsPath) == run.settingsWritten.back();
   if (const LegacyStore* store = lostStore(run.disk)) {
     // Kept on purpose: a store that cannot be read counts as an empty one, and a save's failure
     // keeps no store.
-    if (isSaved && !contains(run.refusedPaths, store->path)) {
+    if (isProtected || (isSaved && !contains(run.refusedPaths, store->path))) {
       return store->path + " was removed although its accounts were not carried over";
     }
     ++removalsWithoutSave_;
@@ -187,10 +207,11 @@ Complaint Invariants::ofFaultedRun(const Run& run, const Fault& fault) {
   const bool allCouldBeRead =
       std::ranges::none_of(std::array{kSettingsPath, kLegacyMailPath, kLegacyExchangePath},
                            [&](std::string_view path) { return contains(run.refusedPaths, path); });
-  if (isSaved && allCouldBeRead && settingsBefore_ &&
-      !std::ranges::includes(identifiersIn(*run.disk.contentsOf(kSettingsPath)),
+  if (((isSaved && allCouldBeRead) || isProtected) && settingsBefore_ &&
+      !contains(keptContents(run.disk), *settingsBefore_) &&
+      !std::ranges::includes(identifiersIn(run.disk.contentsOf(kSettingsPath).value_or("")),
                              intersection(identifiersIn(*settingsBefore_), keptIdentifiers_))) {
-    return "accounts of a settings file that could be read are gone";
+    return "accounts of the settings file are gone";
   }
   if (fault.duration == Fault::Duration::Once && fault.error != 0) {
     if (!temporaryFiles(run.disk).empty()) {
@@ -208,6 +229,9 @@ Complaint Invariants::ofFaultedRun(const Run& run, const Fault& fault) {
 Complaint Invariants::ofInterruption(const SimulatedDisk& disk,
                                      const std::vector<std::string>& settingsWritten) {
   if (const Complaint complaint = ofSettings(disk, settingsWritten)) {
+    return complaint;
+  }
+  if (const Complaint complaint = ofKeptFiles(disk, settingsWritten)) {
     return complaint;
   }
   if (const LegacyStore* store = lostStore(disk)) {
@@ -239,7 +263,47 @@ Complaint Invariants::ofNextRun(const SimulatedDisk& disk) {
              : nextRuns_.emplace(fingerprint, judgeNextRun(disk)).first->second;
 }
 
+Complaint Invariants::ofKeptFiles(const SimulatedDisk& disk,
+                                  const std::vector<std::string>& settingsWritten) const {
+  const std::vector<std::string> kept = keptContents(disk);
+  const auto isKnown = [&](const std::string& contents) {
+    return contents == settingsBefore_ || contains(settingsWritten, contents) ||
+           contains(keptBefore_, contents) ||
+           std::ranges::find(legacyStores_, contents, &LegacyStore::contents) !=
+               legacyStores_.end();
+  };
+  if (!std::ranges::all_of(kept, isKnown)) {
+    return "a kept file is not whole";
+  }
+  const auto isSomewhere = [&](const std::string& contents) {
+    return contains(kept, contents) ||
+           std::ranges::any_of(
+               std::array{kSettingsPath, kLegacyMailPath, kLegacyExchangePath},
+               [&](std::string_view path) { return disk.contentsOf(path) == contents; });
+  };
+  if (!std::ranges::all_of(keptBefore_, isSomewhere)) {
+    return "a file kept by an earlier run is gone";
+  }
+  if (scenario_.action == Scenario::Action::Restoration && settingsBefore_ &&
+      !isSomewhere(*settingsBefore_)) {
+    return "a file that a kept one replaced is gone";
+  }
+  return std::nullopt;
+}
+
+Complaint Invariants::judgeNextRestoration(const SimulatedDisk& disk) const {
+  const Run run = runOn(disk, scenario_, {.number = 2});
+  const bool isAsUndisturbed = std::ranges::all_of(
+      std::array{kSettingsPath, kLegacyMailPath, kLegacyExchangePath}, [&](std::string_view path) {
+        return run.disk.contentsOf(path) == undisturbed_.disk.contentsOf(path);
+      });
+  return isAsUndisturbed ? Complaint() : "the next restoration does not bring everything back";
+}
+
 Complaint Invariants::judgeNextRun(const SimulatedDisk& disk) {
+  if (scenario_.action == Scenario::Action::Restoration) {
+    return judgeNextRestoration(disk);
+  }
   const bool isRemoval =
       disk.exists(kSentinelPath) && scenario_.action == Scenario::Action::Migration;
   const Run run = runOn(disk, scenario_, {.number = 2});
@@ -251,10 +315,8 @@ Complaint Invariants::judgeNextRun(const SimulatedDisk& disk) {
       run.disk.exists(kLegacyExchangePath)) {
     return "the next run leaves the sentinel or a legacy store";
   }
-  for (const std::string& path : temporaryFiles(run.disk)) {
-    if (!disk.exists(path)) {
-      return "the next run leaves the temporary file " + path;
-    }
+  if (scenario_.action == Scenario::Action::Migration && !temporaryFiles(run.disk).empty()) {
+    return "the next run leaves a temporary file";
   }
   if (isRemoval) {
     return settings == disk.contentsOf(kSettingsPath)

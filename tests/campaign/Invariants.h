@@ -58,6 +58,10 @@ class Invariants {
   [[nodiscard]] const LegacyStore* lostStore(const SimulatedDisk& disk);
   [[nodiscard]] bool isUntouched(const SimulatedDisk& disk) const;
   Complaint judgeNextRun(const SimulatedDisk& disk);
+  Complaint judgeNextRestoration(const SimulatedDisk& disk) const;
+  /// Whether the host's kept files are whole, and hold what a restoration has not put back yet.
+  [[nodiscard]] Complaint ofKeptFiles(const SimulatedDisk& disk,
+                                      const std::vector<std::string>& settingsWritten) const;
   [[nodiscard]] PropertyValue named(const std::string& settingsBytes) const;
   /// The identifiers of the accounts in a settings file's bytes, children included.
   const std::set<std::string>& identifiersIn(const std::string& settingsBytes);
@@ -66,6 +70,8 @@ class Invariants {
   Run undisturbed_;
   std::set<std::string> textsBefore_;
   std::optional<std::string> settingsBefore_;
+  /// What files kept by an earlier run hold.
+  std::vector<std::string> keptBefore_;
   std::vector<LegacyStore> legacyStores_;
   std::set<std::string> keptIdentifiers_;
   std::optional<PropertyValue> end_;

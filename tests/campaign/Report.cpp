@@ -26,9 +26,10 @@ bool Report::takes(std::string_view scenario, std::size_t operation, std::string
 
 void Report::judge(const Complaint& complaint, std::string_view call) {
   if (complaint) {
-    complaints_.push_back(*complaint + "\n    at \"" + std::string(call) +
-                          "\"\n    repeat with: --scenario " + scenario_ + " --operation " +
-                          std::to_string(operation_) + " --fault " + fault_);
+    complaints_.push_back(*complaint + "\n    at \"" + std::string(call) + "\"\n    repeat with: " +
+                          (selection_.host == Scenario::Host::SafetyNet ? "--net " : "") +
+                          "--scenario " + scenario_ + " --operation " + std::to_string(operation_) +
+                          " --fault " + fault_);
   }
 }
 

@@ -7,6 +7,11 @@
 
 #include "accountsettings/AccountsManager.h"
 #include "accountsettings/Process.h"
+#include "host/HeldLock.h"
+#include "host/Restoration.h"
+#include "host/RootLock.h"
+#include "host/SafetyNet.h"
+#include "host/SaveObserver.h"
 #include "migrator/AccountsDataMigrator.h"
 #include "platform/linux/DescribedCloudAccountService.h"
 #include "platform/linux/DescribedDeviceInfoService.h"
@@ -110,6 +115,7 @@ struct DeviceProcess {
   LinuxFileSystem fileSystem{root, std::string(kHome) + "/tmp"};
   LinuxPropertyLists realPropertyLists{root};
   ObservedPropertyLists propertyLists{realPropertyLists};
+  SaveObserver saves{fileSystem, std::string(kSettingsPath)};
   LinuxHomeDirectory homeDirectory{kHome};
   LinuxMailDirectory mailDirectory{homeDirectory};
   LinuxPreferenceDomain preferenceDomain{realPropertyLists, homeDirectory};
@@ -135,7 +141,7 @@ struct DeviceProcess {
                        .dateFormatter = dateFormatter,
                        .deviceInfoService = deviceInfoService,
                        .externalSyncSources = externalSyncSources,
-                       .fileSystem = fileSystem,
+                       .fileSystem = saves,
                        .frameworkLoader = frameworkLoader,
                        .homeDirectory = homeDirectory,
                        .localizedStrings = localizedStrings,
@@ -191,10 +197,66 @@ bool saveOutsideMigration(DeviceProcess& device, std::size_t& notifications) {
   return store->allBasicSyncableAccounts().size() >= store->count();
 }
 
-bool act(DeviceProcess& device, Scenario::Action action, std::size_t& notifications) {
-  return action == Scenario::Action::SaveOutsideMigration
-             ? saveOutsideMigration(device, notifications)
-             : AccountsDataMigrator().performMigration();
+/// The time that a run's folders are named after.
+std::string timeText(unsigned run) {
+  return "2026010" + std::to_string(run) + "T000000Z";
+}
+
+/// The plug-in's end, as the host sees it: a plug-in that runs out of memory dies in a process of
+/// its own.
+PluginEnd runPlugin(Run& run) {
+  PluginEnd end = PluginEnd::Died;
+  try {
+    end = AccountsDataMigrator().performMigration() ? PluginEnd::GaveTrue : PluginEnd::GaveFalse;
+  } catch (const std::bad_alloc&) {
+    run.ranOutOfMemory = true;
+  }
+  return SimulatedKernel::current()->endPlugin() ? PluginEnd::Died : end;
+}
+
+/// What the host does around the plug-in (host/RunCommand.cpp).
+void migrateSafely(DeviceProcess& device, unsigned number, Run& run) {
+  PathError error;
+  const std::optional<RootLock> rootLock = RootLock::take(device.root, error);
+  SafetyNet safetyNet(device.fileSystem, device.propertyLists, accountFilesInHome(kHome),
+                      "restore");
+  if (!rootLock || !safetyNet.keepInputs(timeText(number))) {
+    run.wasRefused = true;
+    return;
+  }
+  const PluginEnd end = runPlugin(run);
+  const HeldLock migrationLock(device.sharedResources, kMigrationLockName);
+  const Settlement settlement = safetyNet.settle(end, device.saves.saves());
+  run.succeeded = end == PluginEnd::GaveTrue && !settlement.error;
+}
+
+/// What the host does to put kept files back (host/RestoreCommand.cpp).
+void restore(DeviceProcess& device, unsigned number, Run& run) {
+  PathError error;
+  const std::optional<RootLock> rootLock = RootLock::take(device.root, error);
+  const HeldLock migrationLock(device.sharedResources, kMigrationLockName);
+  run.wasRefused = !rootLock || !migrationLock.isHeld();
+  run.succeeded = !run.wasRefused && !restoreKeptFiles(device.fileSystem, accountFilesInHome(kHome),
+                                                       std::nullopt, timeText(number))
+                                          .error;
+}
+
+void act(DeviceProcess& device, const Scenario& scenario, unsigned number, Run& run) {
+  switch (scenario.action) {
+    case Scenario::Action::SaveOutsideMigration:
+      run.succeeded = saveOutsideMigration(device, run.notifications);
+      break;
+    case Scenario::Action::Restoration:
+      restore(device, number, run);
+      break;
+    case Scenario::Action::Migration:
+      if (scenario.host == Scenario::Host::SafetyNet) {
+        migrateSafely(device, number, run);
+      } else {
+        run.succeeded = AccountsDataMigrator().performMigration();
+      }
+      break;
+  }
 }
 
 }  // namespace
@@ -209,13 +271,17 @@ Run runOn(const SimulatedDisk& disk, const Scenario& scenario, const RunOptions&
     kernel.start(options.fault, options.recording);
     const AllocationFailure allocations(options.failingAllocation);
     try {
-      run.succeeded = act(device, scenario.action, run.notifications);
+      act(device, scenario, options.number, run);
     } catch (const std::bad_alloc&) {
       run.ranOutOfMemory = true;
     }
     run.allocations = AllocationFailure::count();
     run.settingsWritten = std::move(device.propertyLists.settingsWritten);
     run.openDescriptors = kernel.openDescriptors() - descriptorsBefore;
+  }
+  if (run.ranOutOfMemory) {
+    // The file system keeps a temporary file open for a plug-in that may still go on with it.
+    run.openDescriptors = kernel.openDescriptors();
   }
   run.disk = kernel.disk();
   run.refusedPaths = kernel.refusedPaths();

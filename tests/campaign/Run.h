@@ -24,8 +24,11 @@ struct RunOptions {
 /// What came of a run.
 struct Run {
   SimulatedDisk disk;
-  /// Whether the action gave true; a save gives nothing and counts as true.
+  /// Whether the action was a success: the plug-in gave true, and a safety net verified it. A save
+  /// gives nothing and counts as one.
   bool succeeded = false;
+  /// Whether a safety net refused to start, or gave true but was undone and says so.
+  bool wasRefused = false;
   /// Whether the action ended with std::bad_alloc.
   bool ranOutOfMemory = false;
   /// The bytes of every account settings file that the run meant to write, in order.

@@ -16,14 +16,19 @@ struct Scenario {
     Migration,
     /// A program of the device adds an account outside a migration and saves; notifiers are told.
     SaveOutsideMigration,
+    /// Kept files are put back.
+    Restoration,
   };
+  /// What is around the plug-in.
+  enum class Host : std::uint8_t { Bare, SafetyNet };
   std::string name;
   SimulatedDisk disk;
   DeviceDescription description = {};
   Action action = Action::Migration;
+  Host host = Host::Bare;
 };
 
-/// All scenarios, in a fixed order. Names are unique.
-std::vector<Scenario> allScenarios();
+/// All scenarios of a host, in a fixed order. Names are unique.
+std::vector<Scenario> allScenarios(Scenario::Host host);
 
 }  // namespace accounts

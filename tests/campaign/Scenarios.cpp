@@ -6,6 +6,7 @@
 #include "accountsettings/AccountVocabulary.h"
 #include "propertylist/BinaryPropertyList.h"
 #include "propertylist/PropertyListFile.h"
+#include "tests/campaign/Run.h"
 #include "tests/campaign/Scenario.h"
 
 namespace accounts {
@@ -144,9 +145,7 @@ Scenario fixture(const std::string& name) {
   return scenario;
 }
 
-}  // namespace
-
-std::vector<Scenario> allScenarios() {
+std::vector<Scenario> scenariosOfMigrations() {
   using Builder = ScenarioBuilder;
   const std::string damaged = "This is no property list.";
   const std::string cutOff = bytesOf(settings(12)).substr(0, 100);
@@ -217,15 +216,51 @@ std::vector<Scenario> allScenarios() {
       Builder("broken-exchange-description")
           .with(kLegacyExchangePath, brokenExchange())
           .with(kSettingsPath, settings(12)),
-      Builder("save-outside-a-migration")
-          .with(kSettingsPath, settings(12))
-          .doing(Scenario::Action::SaveOutsideMigration),
   };
   // One version before each group of steps: those that do not save, those that do, none.
   for (const char* name :
        {"0", "6", "9", "12", "none", "3-newer-processor", "12-with-legacy-mail"}) {
     scenarios.push_back(fixture(name));
   }
+  return scenarios;
+}
+
+/// A device on which a protected migration was killed when it had replaced the settings file.
+Scenario killedMigration(std::string name, Scenario scenario) {
+  scenario.name = std::move(name);
+  scenario.host = Scenario::Host::SafetyNet;
+  const Run run =
+      runOn(scenario.disk, scenario, {.recording = SimulatedKernel::Recording::On, .number = 0});
+  const std::optional<std::string> before = scenario.disk.contentsOf(kSettingsPath);
+  for (const DiskChange& change : run.changes) {
+    scenario.disk.apply(change);
+    if (scenario.disk.contentsOf(kSettingsPath) != before) {
+      break;
+    }
+  }
+  return scenario;
+}
+
+}  // namespace
+
+std::vector<Scenario> allScenarios(Scenario::Host host) {
+  std::vector<Scenario> scenarios = scenariosOfMigrations();
+  if (host == Scenario::Host::Bare) {
+    scenarios.push_back(ScenarioBuilder("save-outside-a-migration")
+                            .with(kSettingsPath, settings(12))
+                            .doing(Scenario::Action::SaveOutsideMigration));
+    return scenarios;
+  }
+  for (Scenario& scenario : scenarios) {
+    scenario.host = host;
+  }
+  const Scenario both = ScenarioBuilder("")
+                            .with(kLegacyMailPath, legacyMail())
+                            .with(kLegacyExchangePath, legacyExchange())
+                            .with(kSettingsPath, settings(9));
+  scenarios.push_back(killedMigration("after-a-kill", both));
+  scenarios.push_back(killedMigration("restoration", both));
+  scenarios.back().action = Scenario::Action::Restoration;
   return scenarios;
 }
 

@@ -26,7 +26,7 @@ constexpr std::array kCampaigns = {
 };
 
 int runSelected(const std::string& campaign, const Selection& selection) {
-  const std::vector<Scenario> scenarios = accounts::allScenarios();
+  const std::vector<Scenario> scenarios = accounts::allScenarios(selection.host);
   for (const NamedCampaign& each : kCampaigns) {
     if (each.name == campaign) {
       return each.run(scenarios, selection) ? 0 : 1;
@@ -44,12 +44,15 @@ int main(int argumentCount, char** arguments) {
   Selection selection;
   application.add_option("campaign", campaign, "faults, kills, power-loss or allocations")
       ->required();
+  bool hasNet = false;
+  application.add_flag("--net", hasNet, "with the host's safety net around the plug-in");
   application.add_option("--scenario", selection.scenario, "only this scenario");
   application.add_option("--operation", selection.operation, "only this operation");
   application.add_option("--fault", selection.fault, "only this fault");
   application.add_option("--every", selection.every, "only every n-th case")
       ->check(CLI::PositiveNumber);
   CLI11_PARSE(application, argumentCount, arguments);
+  selection.host = hasNet ? Scenario::Host::SafetyNet : Scenario::Host::Bare;
   try {
     return runSelected(campaign, selection);
   } catch (const std::exception& exception) {
