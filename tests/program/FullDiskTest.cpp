@@ -15,6 +15,9 @@ namespace accounts {
 namespace {
 
 constexpr const char* kHome = "/var/mobile";
+constexpr int kVerificationFailed = 2;
+constexpr int kCannotCreate = 73;
+constexpr int kInputOutputError = 74;
 constexpr const char* kSaveFailed = "\"Failed to save accounts to filesystem.\"";
 
 /// What the disk runs out of.
@@ -93,6 +96,23 @@ TEST_P(FullDisk, ToAnyDegreeLeavesTheSettingsWhollyOldOrWhollyNew) {
 
   EXPECT_GT(failures, 0);
   std::cout << kEnough + 1 << " degrees of fullness, " << failures << " too full\n";
+}
+
+TEST_P(FullDisk, ToAnyDegreeLosesNothingWithTheSafetyNet) {
+  for (std::uint64_t free = 0; free <= kEnough; ++free) {
+    SCOPED_TRACE("free: " + std::to_string(free));
+    leave(free);
+
+    const ProgramResult result = migrate();
+
+    EXPECT_THAT(result.exitStatus,
+                testing::AnyOf(0, kVerificationFailed, kCannotCreate, kInputOutputError));
+    expectNothingLost();
+    expectNoLeftovers();
+    disk_->makeRoom();
+    expectNextRunFinishes({});
+    makeDevice();
+  }
 }
 
 TEST_P(FullDisk, WithEnoughRoomIsMigrated) {
