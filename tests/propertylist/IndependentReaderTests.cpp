@@ -129,6 +129,19 @@ TEST_F(IndependentReader, ReadsEveryKindAsItWasWritten) {
   EXPECT_EQ(renderIndependently(testing::writeBinary(value)), render(value));
 }
 
+TEST_F(IndependentReader, ReadsEveryKindAsItWasWrittenInXML) {
+  const PropertyValue value = testing::valueOfEveryKindInXML();
+
+  EXPECT_EQ(renderIndependently(testing::writeXML(value)), render(value));
+}
+
+TEST_F(IndependentReader, ReadsAwkwardTextsAsTheyWereWrittenInXML) {
+  const PropertyValue value =
+      PropertyArray{" ", "\r\n", "a\tb", "]]>", "&amp;", "<string>", "\xC2\x85", "\xE2\x80\xA8"};
+
+  EXPECT_EQ(renderIndependently(testing::writeXML(value)), render(value));
+}
+
 TEST_F(IndependentReader, ReadsAFileWithSharedContainersAndManyObjects) {
   PropertyArray accounts;
   const PropertyArray dataclasses{"Mail", "Notes"};

@@ -37,6 +37,14 @@ PropertyValue valueOfEveryKind() {
       {"true", true}};
 }
 
+PropertyValue valueOfEveryKindInXML() {
+  PropertyDictionary values = *valueOfEveryKind().asDictionary();
+  for (const char* key : {"date, before the reference", "text, with a NUL"}) {
+    values.remove(key);
+  }
+  return values;
+}
+
 PropertyValue nestedArrays(std::size_t depth) {
   PropertyArray array;
   for (std::size_t level = 1; level < depth; ++level) {

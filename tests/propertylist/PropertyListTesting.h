@@ -98,6 +98,13 @@ inline std::string writeBinary(const PropertyValue& value) {
   return bytes.value_or("");
 }
 
+inline std::string writeXML(const PropertyValue& value) {
+  PropertyListError error;
+  std::optional<std::string> bytes = writeXMLPropertyList(value, error);
+  EXPECT_TRUE(bytes) << error.text;
+  return bytes.value_or("");
+}
+
 inline std::string inPropertyList(std::string_view content) {
   return "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<plist version=\"1.0\">" +
          std::string(content) + "</plist>\n";
@@ -119,6 +126,8 @@ inline std::string errorOfReadingXML(std::string_view bytes) {
 
 /// A value with every kind in it, the awkward ones of each too.
 PropertyValue valueOfEveryKind();
+/// The same without what XML cannot hold.
+PropertyValue valueOfEveryKindInXML();
 
 /// An array in an array and so on; `depth` 1 is an empty array alone.
 PropertyValue nestedArrays(std::size_t depth);
