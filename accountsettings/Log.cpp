@@ -5,6 +5,7 @@
 
 #include "accountsettings/Process.h"
 #include "propertylist/Description.h"
+#include "propertylist/SecretKeys.h"
 
 namespace {
 
@@ -62,7 +63,7 @@ void LogArgument::appendTo(std::string& line) const {
   } else if (const auto* number = std::get_if<std::int64_t>(&content_)) {
     line += std::to_string(*number);
   } else if (const auto* value = std::get_if<PropertyValue>(&content_)) {
-    appendDescription(line, *value);
+    appendDescription(line, withSecretsHidden(*value));
   } else {
     line += absentObject;
   }

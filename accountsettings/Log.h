@@ -38,7 +38,8 @@ class LogArgument {
   LogArgument(std::int64_t number) : content_(number) {}
   LogArgument(std::uint64_t number) : content_(static_cast<std::int64_t>(number)) {}
 
-  /// Appends the argument as it stands in a line. Texts are escaped, so that a line stays one line.
+  /// Appends the argument as it stands in a line. Texts are escaped, so that a line stays one line;
+  /// of a value, secrets are hidden.
   void appendTo(std::string& line) const;
 
  private:

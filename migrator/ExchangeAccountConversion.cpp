@@ -4,6 +4,7 @@
 #include "accountsettings/Process.h"
 #include "migrator/AccountsDataMigrator.h"
 #include "migrator/LegacyDescriptions.h"
+#include "migrator/LegacyStoreKeys.h"
 
 namespace accounts {
 
@@ -14,9 +15,9 @@ constexpr std::string_view conversionOperation =
 constexpr std::string_view exchangeTypeString = "Exchange";
 
 const std::array<LegacyKey, 3> exchangeKeys = {{
-    {"DAAccountConfigurationClass", kAccountClass},
-    {"DAAccountDescription", kAccountDisplayName},
-    {"DAAccountConfigurationAccountID", kAccountIdentifier},
+    {kLegacyExchangeClass, kAccountClass},
+    {kLegacyExchangeDisplayName, kAccountDisplayName},
+    {kLegacyExchangeIdentifier, kAccountIdentifier},
 }};
 
 /// A boolean of a legacy description and the dataclass that it switches.
@@ -64,11 +65,11 @@ bool AccountsDataMigrator::_migrateDAAccounts(AccountsManager& store) {
   if (!legacyAccounts.empty()) {
     _foundOldDAAccountsToMigrate = true;
   }
-  collect("OldExchangeAccount", file);
+  collect(kInformationOldExchangeAccounts, file);
 
   const std::optional<AccountsManager::Accounts> converted = convertDescriptions(
-      legacyAccounts.arrayForKey("DAAccountsKey").value_or(PropertyArray()), conversionOperation,
-      "%s. Could not convert the description for the Exchange account %@",
+      legacyAccounts.arrayForKey(kLegacyExchangeAccounts).value_or(PropertyArray()),
+      conversionOperation, "%s. Could not convert the description for the Exchange account %@",
       [this](const PropertyDictionary& description) {
         return _convertExchangeAccountDescription(description);
       });

@@ -6,6 +6,7 @@
 #include "accountsettings/Process.h"
 #include "migrator/AccountsDataMigrator.h"
 #include "migrator/LegacyDescriptions.h"
+#include "migrator/LegacyStoreKeys.h"
 #include "migrator/MailAccountClasses.h"
 
 bool _UseGoogleMail() {
@@ -25,9 +26,9 @@ constexpr std::string_view conversionOperation =
     "-[AccountsDataMigrator(Internal) _migrateMailAccounts:]";
 
 const std::array<LegacyKey, 3> mailKeys = {{
-    {"AccountType", kAccountClass},
-    {"AccountName", kAccountDisplayName},
-    {"uniqueId", kAccountIdentifier},
+    {kLegacyMailClass, kAccountClass},
+    {kLegacyMailDisplayName, kAccountDisplayName},
+    {kLegacyMailIdentifier, kAccountIdentifier},
 }};
 
 /// What a legacy mail account class stands for.
@@ -100,7 +101,7 @@ bool AccountsDataMigrator::_migrateMailAccounts(AccountsManager& store) {
   if (!legacyAccounts.empty()) {
     _foundOldMailAccountsToMigrate = true;
   }
-  collect("OldMailAccounts", file);
+  collect(kInformationOldMailAccounts, file);
 
   const bool converted = replaceMailAccounts(store, legacyAccounts);
   removeOriginalBeside(path);
@@ -118,13 +119,13 @@ bool AccountsDataMigrator::replaceMailAccounts(AccountsManager& store,
                                });
   };
   const std::optional<AccountsManager::Accounts> outgoing =
-      converted("DeliveryAccounts", kSMTPAccountType,
+      converted(kLegacyOutgoingAccounts, kSMTPAccountType,
                 "%s. Could not convert the description for the delivery account %@");
   if (!outgoing) {
     return false;
   }
   const std::optional<AccountsManager::Accounts> incoming =
-      converted("MailAccounts", kMailAccountType,
+      converted(kLegacyIncomingAccounts, kMailAccountType,
                 "%s. Could not convert the description for the incoming account %@");
   if (!incoming) {
     return false;

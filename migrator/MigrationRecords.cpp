@@ -2,6 +2,7 @@
 #include "accountsettings/Paths.h"
 #include "accountsettings/Process.h"
 #include "migrator/AccountsDataMigrator.h"
+#include "migrator/LegacyStoreKeys.h"
 
 namespace accounts {
 
@@ -17,9 +18,6 @@ constexpr unsigned informationDirectoryPermissions = 0777;
 // Kept on purpose: the second "M" and the "S" give the month again and tenths of a second where
 // minutes and seconds were meant. Tools that collect these files know the names as they are.
 constexpr std::string_view informationDatePattern = "Y-M-d-H-M-S";
-
-// Kept on purpose: one letter short of "Account". Readers of information files look for this key.
-constexpr std::string_view newAccountSettingsKey = "NewAccounSettings";
 
 std::string pathInHomeLibrary(std::string_view pathInLibrary) {
   const std::string home = Process::current().platform.homeDirectory.path();
@@ -144,7 +142,7 @@ void AccountsDataMigrator::_saveCollatedMigrationInformation() {
   logToConsole("Saving collated migration information");
   if (_collatedMigrationData) {
     _collatedMigrationData->set(
-        newAccountSettingsKey,
+        kInformationNewSettings,
         platform.propertyLists.readDictionary(AccountsManager::fullPathToAccountSettingsPlist())
             .value_or(PropertyDictionary()));
   }

@@ -3,6 +3,7 @@
 #include <algorithm>
 
 #include "accountsettings/Process.h"
+#include "migrator/LegacyStoreKeys.h"
 
 namespace accounts {
 
@@ -36,7 +37,7 @@ bool AccountsDataMigrator::runUpgradeChain(AccountsManager& store,
   const std::optional<PropertyDictionary> file =
       Process::current().platform.propertyLists.readDictionary(
           AccountsManager::fullPathToAccountSettingsPlist());
-  collect("OldAccountSettings", file);
+  collect(kInformationOldSettings, file);
 
   // Kept on purpose: the file decides, not the store's data version, so accounts that were just
   // converted from legacy stores go through the same steps as those of the file.

@@ -37,11 +37,18 @@ char letterOfEscape(char character, Quoting quoting) {
   }
 }
 
+/// True of the marks that put the text after them in another direction or order, to their end or
+/// the line's: with them a text could show itself, and what follows it, as something else.
+bool isDirectionalOverride(char32_t codePoint) {
+  return (codePoint >= 0x202A && codePoint <= 0x202E) ||
+         (codePoint >= 0x2066 && codePoint <= 0x2069);
+}
+
 /// True of what a terminal or an editor may take for a command or for the end of a line, and of
 /// surrogates, which are no characters in UTF-8.
 bool needsNumericEscape(char32_t codePoint) {
   return codePoint < 0x20 || (codePoint >= 0x7F && codePoint < 0xA0) || codePoint == 0x2028 ||
-         codePoint == 0x2029 || isSurrogate(codePoint);
+         codePoint == 0x2029 || isSurrogate(codePoint) || isDirectionalOverride(codePoint);
 }
 
 bool isPlain(char character, Quoting quoting) {

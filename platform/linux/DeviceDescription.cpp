@@ -8,13 +8,8 @@
 namespace accounts {
 namespace {
 
-constexpr std::string_view kDeviceInfo = "DeviceInfo";
-constexpr std::string_view kProfileRestrictions = "ProfileRestrictions";
-constexpr std::string_view kPairingValues = "PairingValues";
-constexpr std::string_view kExternalSyncSources = "ExternalSyncSources";
 constexpr std::string_view kSources = "Sources";
 constexpr std::string_view kError = "Error";
-constexpr std::string_view kCloudAccount = "CloudAccount";
 
 struct RestrictionKey {
   RestrictedFeature feature;
@@ -84,20 +79,20 @@ std::optional<DeviceDescription> describe(const std::optional<PropertyDictionary
 
 DeviceDescription deviceDescriptionFromDictionary(const PropertyDictionary& dictionary) {
   DeviceDescription description;
-  description.deviceInfo = dictionaryOrEmpty(dictionary, kDeviceInfo);
-  description.pairingValues = dictionary.dictionaryForKey(kPairingValues);
+  description.deviceInfo = dictionaryOrEmpty(dictionary, kDeviceInfoKey);
+  description.pairingValues = dictionary.dictionaryForKey(kPairingValuesKey);
 
-  const PropertyDictionary restrictions = dictionaryOrEmpty(dictionary, kProfileRestrictions);
+  const PropertyDictionary restrictions = dictionaryOrEmpty(dictionary, kProfileRestrictionsKey);
   for (const auto& [feature, key] : kRestrictionKeys) {
     description.profileRestrictions[static_cast<std::size_t>(feature)] =
         restrictionAnswer(restrictions.find(key));
   }
-  const PropertyDictionary syncSources = dictionaryOrEmpty(dictionary, kExternalSyncSources);
+  const PropertyDictionary syncSources = dictionaryOrEmpty(dictionary, kExternalSyncSourcesKey);
   for (const auto& [dataType, key] : kSyncDataTypeKeys) {
     description.externalSyncSources[static_cast<std::size_t>(dataType)] =
         syncSourcesAnswer(dictionaryOrEmpty(syncSources, key));
   }
-  const PropertyDictionary cloudAccount = dictionaryOrEmpty(dictionary, kCloudAccount);
+  const PropertyDictionary cloudAccount = dictionaryOrEmpty(dictionary, kCloudAccountKey);
   for (const auto& [key, text] : kCloudAccountKeys) {
     if (const auto given = cloudAccount.textForKey(key)) {
       description.*text = given->string();

@@ -3,6 +3,7 @@
 #include <array>
 #include <optional>
 #include <string>
+#include <string_view>
 
 #include "platform/ExternalSyncSources.h"
 #include "platform/ProfileRestrictions.h"
@@ -30,6 +31,16 @@ struct DeviceDescription {
   std::string cloudPrimaryAccountKey = "primaryAccount";
   std::string cloudAccountTypeDisplayName = "Stratix";
 };
+
+// The keys of a description.
+inline constexpr std::string_view kDeviceInfoKey = "DeviceInfo";
+inline constexpr std::string_view kProfileRestrictionsKey = "ProfileRestrictions";
+inline constexpr std::string_view kPairingValuesKey = "PairingValues";
+inline constexpr std::string_view kExternalSyncSourcesKey = "ExternalSyncSources";
+inline constexpr std::string_view kCloudAccountKey = "CloudAccount";
+inline constexpr std::array kDeviceDescriptionKeys = {kDeviceInfoKey, kProfileRestrictionsKey,
+                                                      kPairingValuesKey, kExternalSyncSourcesKey,
+                                                      kCloudAccountKey};
 
 /// Where a device holds its own description.
 inline constexpr std::string_view kDeviceDescriptionPath = "/etc/device.plist";

@@ -54,6 +54,12 @@ TEST(LogChannel, ALineHoldsOperationSourceLineAndQuotedMessage) {
                   ") \"Inserting account: mail-1\""});
 }
 
+TEST(LogChannel, SecretsInAValueAreHidden) {
+  const PropertyDictionary account = {{"Password", "x"}, {"Username", "u"}};
+  const std::string shown = "{\"Password\":\"(hidden)\",\"Username\":\"u\"}";
+  EXPECT_EQ(formatted("Inserting account: %@", {account}), "Inserting account: " + shown);
+}
+
 TEST(LogChannel, AMessageWithoutArgumentsIsQuotedToo) {
   FakeProcess device;
   logToChannel("-[AccountsManager saveAllAccounts]", "Saving all accounts");

@@ -44,6 +44,14 @@ TEST(Description, LineBreaksBeyondASCIIAreEscapedToo) {
             "a\\u0085b\\u2028c\\u2029");
 }
 
+TEST(Description, MarksThatReorderTheTextAfterThemAreEscaped) {
+  EXPECT_EQ(describe("a\u202Ab\u202Ec\u2066d\u2069"), "a\\u202ab\\u202ec\\u2066d\\u2069");
+}
+
+TEST(Description, LettersAndSingleMarksOfADirectionStandAsTheyAre) {
+  EXPECT_EQ(describe("\u05E9\u0628 Yahoo!\u200E"), "\u05E9\u0628 Yahoo!\u200E");
+}
+
 TEST(Description, AnUnpairedSurrogateIsEscaped) {
   EXPECT_EQ(describe("a\xED\xA0\xBD"
                      "b"),
