@@ -1,0 +1,27 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <variant>
+
+#include "accountsctl/ConvertCommand.h"
+#include "accountsctl/ShowCommand.h"
+#include "commandline/ArgumentParsing.h"
+
+namespace accounts {
+
+inline constexpr const char* kProgramName = "accountsctl";
+
+/// What the arguments ask for.
+struct CommandLine {
+  std::variant<ShowOptions, ConvertOptions, RequestedText, UnusableArguments> asked;
+  /// The subcommand's name; none when the arguments name none.
+  std::optional<std::string> subcommand;
+  /// Whether the report is to be a JSON object, that of an error too.
+  bool wantsJSON = false;
+};
+
+/// What the arguments of the program ask for. Touches no file.
+CommandLine parseCommandLine(int argumentCount, const char* const* arguments);
+
+}  // namespace accounts

@@ -1,0 +1,17 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "commandline/ExitStatus.h"
+
+namespace accounts {
+
+/// Writes a file of this machine so that a reader sees the old file or the whole new one. A new
+/// file can be read by its owner alone; one that is replaced keeps its owner, group and
+/// permissions. Symbolic links are followed. None when it is done; an error, with nothing changed,
+/// when something other than a regular file is there or the file cannot be made or written.
+std::optional<ProgramError> replaceFile(const std::string& path, std::string_view contents);
+
+}  // namespace accounts

@@ -1,0 +1,48 @@
+#include "accountsctl/ShowCommand.h"
+
+#include "accountsctl/JSONText.h"
+#include "accountsctl/PropertyListInput.h"
+#include "accountsctl/StoreLayout.h"
+#include "propertylist/XMLPropertyList.h"
+
+namespace accounts {
+namespace {
+
+std::string shownJSON(const PropertyValue& content, const ShowOptions& options) {
+  JSON object = reportObject("show");
+  object["file"] = options.file;
+  object["kind"] = identifierOf(kindOf(content));
+  object["content"] = jsonOf(content);
+  return lineOf(std::move(object), ExitStatus::Success);
+}
+
+CommandResult shownXML(const PropertyValue& content) {
+  PropertyListError error;
+  std::optional<std::string> text = writeXMLPropertyList(content, error);
+  if (!text) {
+    return ProgramError{ExitStatus::MalformedInput, error.text};
+  }
+  return CommandReport{*std::move(text)};
+}
+
+}  // namespace
+
+CommandResult show(const ShowOptions& options, const Terminal& terminal) {
+  const std::variant<PropertyValue, ProgramError> input = readPropertyListInput(options.file);
+  if (const auto* error = std::get_if<ProgramError>(&input)) {
+    return *error;
+  }
+  const auto& value = std::get<PropertyValue>(input);
+  const PropertyValue content = options.secrets == Secrets::Hide ? withSecretsHidden(value) : value;
+  switch (options.form) {
+    case ShownForm::Tables:
+      return CommandReport{shownTables(content, options, terminal)};
+    case ShownForm::JSON:
+      return CommandReport{shownJSON(content, options)};
+    case ShownForm::XML:
+      return shownXML(content);
+  }
+  return CommandReport{};
+}
+
+}  // namespace accounts

@@ -1,0 +1,31 @@
+#pragma once
+
+#include <string>
+
+#include "accountsctl/CommandResult.h"
+#include "commandline/Terminal.h"
+#include "propertylist/PropertyValue.h"
+#include "propertylist/SecretKeys.h"
+
+namespace accounts {
+
+/// The form in which a file is shown.
+enum class ShownForm { Tables, JSON, XML };
+
+struct ShowOptions {
+  /// A file of this machine, "-" for standard input.
+  std::string file;
+  ShownForm form = ShownForm::Tables;
+  Secrets secrets = Secrets::Hide;
+  /// Whether tables also show every property of each account.
+  bool withProperties = false;
+};
+
+/// Shows a file, whatever kind of property list it is.
+CommandResult show(const ShowOptions& options, const Terminal& terminal);
+
+/// The tables that show a file's content to people.
+std::string shownTables(const PropertyValue& content, const ShowOptions& options,
+                        const Terminal& terminal);
+
+}  // namespace accounts

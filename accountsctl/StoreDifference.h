@@ -1,0 +1,45 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "accountsctl/ListedAccount.h"
+#include "accountsctl/PropertyDifference.h"
+#include "accountsctl/StoreLayout.h"
+#include "propertylist/PropertyValue.h"
+#include "propertylist/SecretKeys.h"
+
+namespace accounts {
+
+/// What became of one account. Without a `before` it was added, without an `after` removed.
+struct AccountChange {
+  std::optional<ListedAccount> before;
+  std::optional<ListedAccount> after;
+  /// Whether it has another parent: it became a child, a top-level account or another's child.
+  bool hasMoved = false;
+  /// Of an account that is in both; its children are accounts of their own.
+  std::vector<PropertyChange> properties;
+};
+
+/// How two files of one kind differ.
+struct StoreDifference {
+  /// What stands beside the accounts.
+  std::vector<PropertyChange> properties;
+  /// Those that are in the newer file in its order, then those that are in the older one alone.
+  std::vector<AccountChange> accounts;
+  /// Whether the accounts that stayed stand in another order.
+  bool hasOtherOrder = false;
+
+  [[nodiscard]] bool isEmpty() const {
+    return properties.empty() && accounts.empty() && !hasOtherOrder;
+  }
+};
+
+/// Compares two roots of one kind. Accounts are the same if they have the same identifier;
+/// several with one identifier are compared in their order, as are those without one that have the
+/// same type and name.
+StoreDifference differenceBetween(const PropertyDictionary& before, const PropertyDictionary& after,
+                                  FileKind kind, Secrets secrets);
+
+}  // namespace accounts

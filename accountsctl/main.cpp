@@ -1,0 +1,53 @@
+#include <cstdlib>
+#include <string>
+#include <variant>
+
+#include "accountsctl/CommandLine.h"
+#include "accountsctl/JSONText.h"
+#include "commandline/StandardStreams.h"
+#include "commandline/Terminal.h"
+
+namespace accounts {
+namespace {
+
+CommandResult runCommand(const ShowOptions& options) {
+  return show(options, standardOutputTerminal(::getenv));
+}
+CommandResult runCommand(const ConvertOptions& options) {
+  return convert(options);
+}
+CommandResult runCommand(const RequestedText& requested) {
+  return CommandReport{requested.text};
+}
+CommandResult runCommand(const UnusableArguments& unusable) {
+  return ProgramError{ExitStatus::UnusableArguments, unusable.message};
+}
+
+/// An error as the object that a program reads in the place of the report.
+std::string errorObject(const CommandLine& commandLine, const ProgramError& error) {
+  JSON object = reportObject("");
+  object["command"] = commandLine.subcommand ? JSON(*commandLine.subcommand) : JSON(nullptr);
+  object["error"] = error.message;
+  return lineOf(std::move(object), error.exitStatus);
+}
+
+ExitStatus run(const CommandLine& commandLine) {
+  const CommandResult result =
+      std::visit([](const auto& asked) { return runCommand(asked); }, commandLine.asked);
+  if (const auto* error = std::get_if<ProgramError>(&result)) {
+    printError(kProgramName, error->message);
+    return commandLine.wantsJSON
+               ? printResult(kProgramName, errorObject(commandLine, *error), error->exitStatus)
+               : error->exitStatus;
+  }
+  const auto& report = std::get<CommandReport>(result);
+  return printResult(kProgramName, report.text, report.exitStatus);
+}
+
+}  // namespace
+}  // namespace accounts
+
+int main(int argumentCount, char** arguments) {
+  accounts::prepareStandardStreams();
+  return static_cast<int>(accounts::run(accounts::parseCommandLine(argumentCount, arguments)));
+}

@@ -1,0 +1,41 @@
+#include "commandline/StandardStreams.h"
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <csignal>
+#include <iostream>
+
+#include "propertylist/Description.h"
+
+namespace accounts {
+
+void prepareStandardStreams() {
+  for (const int stream : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
+    if (fcntl(stream, F_GETFD) < 0) {
+      // Gives the lowest free number, which is the stream's own. For one direction alone: a result
+      // that is written to a closed standard output did not arrive.
+      [[maybe_unused]] const int opened =
+          open("/dev/null", stream == STDIN_FILENO ? O_WRONLY : O_RDONLY);
+    }
+  }
+  signal(SIGPIPE, SIG_IGN);
+}
+
+void printError(std::string_view program, std::string_view message) {
+  std::string line(program);
+  line += ": ";
+  appendEscapedText(line, message);
+  std::cerr << line + "\n";
+}
+
+ExitStatus printResult(std::string_view program, const std::string& text, ExitStatus exitStatus) {
+  std::cout << text << std::flush;
+  if (std::cout.good()) {
+    return exitStatus;
+  }
+  printError(program, "The result cannot be written to standard output");
+  return ExitStatus::InputOutputError;
+}
+
+}  // namespace accounts
