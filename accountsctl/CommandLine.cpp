@@ -2,172 +2,242 @@
 
 #include <CLI/CLI.hpp>
 #include <string_view>
-#include <vector>
 
+#include "accountsctl/HelpTexts.h"
 #include "accountsctl/PropertyListInput.h"
 
 namespace accounts {
 namespace {
 
 constexpr const char* kVersion = "accountsctl " ACCOUNTSCTL_VERSION;
-
-constexpr const char* kProgramDescription =
-    "Shows, compares and checks the files of account migrations.";
-
-constexpr const char* kExitStatuses =
-    "  64  the arguments cannot be used\n"
-    "  65  a file is not what it has to be\n"
-    "  66  a file is missing or unreadable\n"
-    "  73  the output file cannot be created\n"
-    "  74  a file or standard output cannot be written or read\n";
-
-constexpr const char* kProgramExamples =
-    "Examples:\n"
-    "  accountsctl show com.quarx.accountsettings.plist\n"
-    "  accountsctl show --help\n";
-
-constexpr const char* kShowDescription =
-    "Show a settings file, a legacy store, a migration-information file, a device description or\n"
-    "any other property list; which of them it is, its content tells. Passwords and the like are\n"
-    "hidden.";
-
-constexpr const char* kShowExamples =
-    "\n"
-    "Examples:\n"
-    "  accountsctl show com.quarx.accountsettings.plist\n"
-    "  accountsctl show --properties Accounts.plist | less\n"
-    "  accountsctl show --json - < com.quarx.DataAccess.plist\n";
-
-constexpr const char* kConvertDescription =
-    "Write a property list as XML or in the binary format, its values unchanged. Nothing is "
-    "hidden:\n"
-    "the output holds every password that the input holds. What XML cannot hold is an error.";
-
-constexpr const char* kConvertExamples =
-    "\n"
-    "Examples:\n"
-    "  accountsctl convert settings.plist settings.xml --to xml\n"
-    "  accountsctl convert settings.plist - --to xml | less\n"
-    "  accountsctl convert edited.xml settings.plist --to binary\n";
+constexpr const char* kXMLForm = "xml";
+constexpr const char* kBinaryForm = "binary";
 
 std::string requireText(const std::string& value) {
   return value.empty() ? "must not be empty" : "";
 }
 
-constexpr const char* kXMLForm = "xml";
-constexpr const char* kBinaryForm = "binary";
-
 std::string requireForm(const std::string& value) {
   return value == kXMLForm || value == kBinaryForm ? "" : "must be xml or binary";
 }
 
-/// The options of every subcommand; the one that the arguments choose is filled.
-struct Options {
+std::string requireDevicePath(const std::string& value) {
+  return value.starts_with('/') ? "" : "must be an absolute device path, such as /var/mobile";
+}
+
+/// What is said of two names of which only one may be standard input.
+std::optional<std::string> bothStandardInput(const DiffOptions& options) {
+  return options.before == kStandardStream && options.after == kStandardStream
+             ? std::optional<std::string>("Only one of the two files can be standard input")
+             : std::nullopt;
+}
+
+/// The arguments of every subcommand; those of the one that is chosen are filled.
+struct Arguments {
   ShowOptions show;
+  DiffOptions diff;
+  CheckOptions check;
+  StatusOptions status;
   ConvertOptions convert;
   bool wantsJSON = false;
   bool wantsXML = false;
-  std::string form;
   bool showsSecrets = false;
+  std::string form;
+
+  [[nodiscard]] Secrets secrets() const { return showsSecrets ? Secrets::Show : Secrets::Hide; }
 };
 
-CLI::App& addSubcommand(CLI::App& program, const std::string& name, const std::string& description,
-                        const std::string& exitStatuses, const std::string& examples) {
-  CLI::App& subcommand = *program.add_subcommand(name, description);
-  subcommand.set_version_flag("--version", kVersion, "Print the version and exit");
-  subcommand.set_help_flag("-h,--help", "Print this help and exit");
-  subcommand.footer("Exit status:\n" + exitStatuses + kExitStatuses + examples);
-  return subcommand;
+using Asked = decltype(CommandLine::asked);
+
+Asked unusable(const std::string& message) {
+  return UnusableArguments{message + " (--help explains)"};
 }
 
-CLI::Option* addFile(CLI::App& subcommand, const std::string& name, std::string& destination,
-                     const std::string& description) {
-  return subcommand.add_option(name, destination, description)
+void addFile(CLI::App& command, const std::string& name, std::string& destination,
+             const std::string& description) {
+  command.add_option(name, destination, description)
       ->option_text(" ")
       ->required()
       ->check(requireText);
 }
 
-CLI::Option* addJSON(CLI::App& subcommand, Options& options) {
-  return subcommand.add_flag("--json", options.wantsJSON,
-                             "Write one JSON object on one line to standard output");
+CLI::Option* addPath(CLI::App& command, const std::string& name,
+                     std::optional<std::string>& destination, const std::string& placeholder,
+                     const std::string& description) {
+  return command
+      .add_option_function<std::string>(
+          name, [&destination](const std::string& value) { destination = value; }, description)
+      ->option_text(placeholder)
+      ->check(requireText);
 }
 
-void addShowSecrets(CLI::App& subcommand, Options& options) {
-  subcommand.add_flag("--show-secrets", options.showsSecrets,
-                      "Show passwords, tokens and the like as well");
+CLI::Option* addJSON(CLI::App& command, Arguments& arguments) {
+  return command.add_flag("--json", arguments.wantsJSON,
+                          "Write one JSON object on one line to standard output");
 }
 
-void addShow(CLI::App& program, Options& options) {
-  CLI::App& show =
-      addSubcommand(program, "show", kShowDescription, "  0   the file was shown\n", kShowExamples);
-  addFile(show, "FILE", options.show.file, "The file, - for standard input");
-  CLI::Option* json = addJSON(show, options);
-  show.add_flag("--xml", options.wantsXML, "Write an XML property list to standard output")
+void addShowSecrets(CLI::App& command, Arguments& arguments) {
+  command.add_flag("--show-secrets", arguments.showsSecrets,
+                   "Show passwords, tokens and the like as well");
+}
+
+void addBundle(CLI::App& command, std::optional<std::string>& bundle) {
+  addPath(command, "--plugin", bundle, "BUNDLE",
+          "The plug-in bundle (default: accounts.migrator beside the program)");
+}
+
+void addShow(CLI::App& command, Arguments& arguments) {
+  addFile(command, "FILE", arguments.show.file, "The file, - for standard input");
+  CLI::Option* json = addJSON(command, arguments);
+  command.add_flag("--xml", arguments.wantsXML, "Write an XML property list to standard output")
       ->excludes(json);
-  show.add_flag("--properties", options.show.withProperties, "Show every property of each account");
-  addShowSecrets(show, options);
+  command.add_flag("--properties", arguments.show.withProperties,
+                   "Show every property of each account");
+  addShowSecrets(command, arguments);
 }
 
-void addConvert(CLI::App& program, Options& options) {
-  CLI::App& convert = addSubcommand(program, "convert", kConvertDescription,
-                                    "  0   the output was written\n", kConvertExamples);
-  addFile(convert, "IN", options.convert.input, "The file to read, - for standard input");
-  addFile(convert, "OUT", options.convert.output, "The file to write, - for standard output");
-  convert.add_option("--to", options.form, "The form of the output: xml or binary")
+Asked showAsked(Arguments& arguments) {
+  arguments.show.form = arguments.wantsXML    ? ShownForm::XML
+                        : arguments.wantsJSON ? ShownForm::JSON
+                                              : ShownForm::Tables;
+  arguments.show.secrets = arguments.secrets();
+  return arguments.show;
+}
+
+void addDiff(CLI::App& command, Arguments& arguments) {
+  addFile(command, "A", arguments.diff.before, "The older file, - for standard input");
+  addFile(command, "B", arguments.diff.after, "The newer file, - for standard input");
+  addJSON(command, arguments);
+  addShowSecrets(command, arguments);
+}
+
+Asked diffAsked(Arguments& arguments) {
+  if (const std::optional<std::string> problem = bothStandardInput(arguments.diff)) {
+    return unusable(*problem);
+  }
+  arguments.diff.reportsJSON = arguments.wantsJSON;
+  arguments.diff.secrets = arguments.secrets();
+  return arguments.diff;
+}
+
+void addCheck(CLI::App& command, Arguments& arguments) {
+  addFile(command, "FILE", arguments.check.file, "The file, - for standard input");
+  addPath(command, "--device", arguments.check.device, "FILE",
+          "The device description (default: this machine's /etc/device.plist, if there is one)");
+  addBundle(command, arguments.check.bundle);
+  addJSON(command, arguments);
+}
+
+Asked checkAsked(Arguments& arguments) {
+  arguments.check.reportsJSON = arguments.wantsJSON;
+  return arguments.check;
+}
+
+void addStatus(CLI::App& command, Arguments& arguments) {
+  command
+      .add_option("--root", arguments.status.root,
+                  "The device root: / or the directory of an image")
+      ->option_text("DIR")
+      ->required()
+      ->check(requireText);
+  addPath(command, "--home", arguments.status.home, "DIR",
+          "The mobile user's home directory, a device path (default /var/mobile)")
+      ->check(requireDevicePath);
+  addPath(command, "--device", arguments.status.device, "FILE",
+          "The device description (default: the root's /etc/device.plist, if there is one)");
+  addBundle(command, arguments.status.bundle);
+  command.add_flag("--fail-if-pending", arguments.status.failsIfPending,
+                   "Exit with 1 if a migration has something to do");
+  addJSON(command, arguments);
+}
+
+Asked statusAsked(Arguments& arguments) {
+  arguments.status.reportsJSON = arguments.wantsJSON;
+  return arguments.status;
+}
+
+void addConvert(CLI::App& command, Arguments& arguments) {
+  addFile(command, "IN", arguments.convert.input, "The file to read, - for standard input");
+  addFile(command, "OUT", arguments.convert.output, "The file to write, - for standard output");
+  command.add_option("--to", arguments.form, "The form of the output: xml or binary")
       ->option_text("FORM")
       ->required()
       ->check(requireForm);
-  addJSON(convert, options);
+  addJSON(command, arguments);
 }
 
-ShownForm shownForm(const Options& options) {
-  if (options.wantsXML) {
-    return ShownForm::XML;
+Asked convertAsked(Arguments& arguments) {
+  if (arguments.wantsJSON && arguments.convert.output == kStandardStream) {
+    return unusable("OUT cannot be standard output with --json, which is for a report");
   }
-  return options.wantsJSON ? ShownForm::JSON : ShownForm::Tables;
+  arguments.convert.form =
+      arguments.form == kXMLForm ? PropertyListForm::XML : PropertyListForm::Binary;
+  arguments.convert.reportsJSON = arguments.wantsJSON;
+  return arguments.convert;
+}
+
+/// A subcommand: how its arguments are declared, and what they ask for once they are parsed.
+struct Subcommand {
+  const char* name;
+  const char* description;
+  const char* exitStatuses;
+  const char* examples;
+  void (*add)(CLI::App& command, Arguments& arguments);
+  Asked (*asked)(Arguments& arguments);
+};
+
+constexpr Subcommand kSubcommands[] = {
+    {"show", help::kShow, help::kShowStatuses, help::kShowExamples, addShow, showAsked},
+    {"diff", help::kDiff, help::kDiffStatuses, help::kDiffExamples, addDiff, diffAsked},
+    {"check", help::kCheck, help::kCheckStatuses, help::kCheckExamples, addCheck, checkAsked},
+    {"status", help::kStatus, help::kStatusStatuses, help::kStatusExamples, addStatus, statusAsked},
+    {"convert", help::kConvert, help::kConvertStatuses, help::kConvertExamples, addConvert,
+     convertAsked},
+};
+
+void addSubcommand(CLI::App& program, const Subcommand& subcommand, Arguments& arguments) {
+  CLI::App& command = *program.add_subcommand(subcommand.name, subcommand.description);
+  command.set_version_flag("--version", kVersion, "Print the version and exit");
+  command.set_help_flag("-h,--help", "Print this help and exit");
+  command.footer(std::string("Exit status:\n") + subcommand.exitStatuses + help::kErrors +
+                 "\nExamples:\n" + subcommand.examples);
+  subcommand.add(command, arguments);
+}
+
+/// What the chosen subcommand asks for.
+Asked askedBy(std::string_view chosen, Arguments& arguments) {
+  for (const Subcommand& subcommand : kSubcommands) {
+    if (subcommand.name == chosen) {
+      return subcommand.asked(arguments);
+    }
+  }
+  return unusable("A subcommand is required");
 }
 
 }  // namespace
 
 CommandLine parseCommandLine(int argumentCount, const char* const* arguments) {
-  Options options;
-  CLI::App program(kProgramDescription, kProgramName);
+  Arguments parsed;
+  CLI::App program(help::kProgram, kProgramName);
   program.set_help_flag("-h,--help", "Print this help and exit");
   program.set_version_flag("--version", kVersion, "Print the version and exit");
-  program.footer(kProgramExamples);
-  addShow(program, options);
-  addConvert(program, options);
+  program.footer(help::kProgramExamples);
+  for (const Subcommand& subcommand : kSubcommands) {
+    addSubcommand(program, subcommand, parsed);
+  }
 
-  CommandLine commandLine;
   ArgumentParsing parsing = parseArguments(program, argumentCount, arguments);
+  CommandLine commandLine;
   commandLine.wantsJSON = hasArgument(argumentCount, arguments, "--json");
   if (!program.get_subcommands().empty()) {
     commandLine.subcommand = program.get_subcommands().front()->get_name();
   }
   if (auto* text = std::get_if<RequestedText>(&parsing)) {
     commandLine.asked = std::move(*text);
-    return commandLine;
-  }
-  if (auto* unusable = std::get_if<UnusableArguments>(&parsing)) {
-    commandLine.asked = std::move(*unusable);
-    return commandLine;
-  }
-  if (options.wantsJSON && options.convert.output == kStandardStream) {
-    commandLine.asked = UnusableArguments{
-        "OUT cannot be standard output with --json, which is for a report (--help explains)"};
-    return commandLine;
-  }
-  const Secrets secrets = options.showsSecrets ? Secrets::Show : Secrets::Hide;
-  if (*commandLine.subcommand == "show") {
-    options.show.form = shownForm(options);
-    options.show.secrets = secrets;
-    commandLine.asked = options.show;
+  } else if (auto* problem = std::get_if<UnusableArguments>(&parsing)) {
+    commandLine.asked = std::move(*problem);
   } else {
-    options.convert.form =
-        options.form == kXMLForm ? PropertyListForm::XML : PropertyListForm::Binary;
-    options.convert.reportsJSON = options.wantsJSON;
-    commandLine.asked = options.convert;
+    commandLine.asked = askedBy(commandLine.subcommand.value_or(""), parsed);
   }
   return commandLine;
 }

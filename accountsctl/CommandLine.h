@@ -4,8 +4,11 @@
 #include <string>
 #include <variant>
 
+#include "accountsctl/CheckCommand.h"
 #include "accountsctl/ConvertCommand.h"
+#include "accountsctl/DiffCommand.h"
 #include "accountsctl/ShowCommand.h"
+#include "accountsctl/StatusCommand.h"
 #include "commandline/ArgumentParsing.h"
 
 namespace accounts {
@@ -14,7 +17,9 @@ inline constexpr const char* kProgramName = "accountsctl";
 
 /// What the arguments ask for.
 struct CommandLine {
-  std::variant<ShowOptions, ConvertOptions, RequestedText, UnusableArguments> asked;
+  std::variant<ShowOptions, DiffOptions, CheckOptions, StatusOptions, ConvertOptions, RequestedText,
+               UnusableArguments>
+      asked;
   /// The subcommand's name; none when the arguments name none.
   std::optional<std::string> subcommand;
   /// Whether the report is to be a JSON object, that of an error too.

@@ -13,6 +13,15 @@ namespace {
 CommandResult runCommand(const ShowOptions& options) {
   return show(options, standardOutputTerminal(::getenv));
 }
+CommandResult runCommand(const DiffOptions& options) {
+  return diff(options, standardOutputTerminal(::getenv));
+}
+CommandResult runCommand(const CheckOptions& options) {
+  return check(options, standardOutputTerminal(::getenv));
+}
+CommandResult runCommand(const StatusOptions& options) {
+  return status(options, standardOutputTerminal(::getenv));
+}
 CommandResult runCommand(const ConvertOptions& options) {
   return convert(options);
 }

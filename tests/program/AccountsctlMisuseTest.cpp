@@ -20,7 +20,7 @@ class AccountsctlMisuse : public AccountsctlFixture {
 };
 
 TEST_F(AccountsctlMisuse, NoArgumentsAreRefused) {
-  expectRefused(run({}), kUnusableArguments, "A subcommand is required: show");
+  expectRefused(run({}), kUnusableArguments, "A subcommand is required: show, diff");
 }
 
 TEST_F(AccountsctlMisuse, AMisspeltSubcommandIsRefusedWithASuggestion) {
@@ -130,7 +130,7 @@ TEST_F(AccountsctlMisuse, AReaderThatGoesAwayEndsTheProgramWithoutASignal) {
 }
 
 TEST_F(AccountsctlMisuse, HelpOfEachSubcommandHasItsExitStatusesAndExamples) {
-  for (const char* subcommand : {"show", "convert"}) {
+  for (const char* subcommand : {"show", "diff", "check", "status", "convert"}) {
     const std::string help = textFor({subcommand, "--help"});
     EXPECT_NE(help.find("Exit status:\n  0 "), std::string::npos) << help;
     EXPECT_NE(help.find("Examples:\n  accountsctl " + std::string(subcommand)), std::string::npos)

@@ -1,0 +1,52 @@
+#include "accountsctl/DevicePlatform.h"
+
+#include <utility>
+
+#include "commandline/BundleLocation.h"
+
+namespace accounts {
+namespace {
+
+/// Without these the store's code cannot work, and says so by ending the process.
+constexpr const char* kNeededResources[] = {"AccountTypesProperties", "DataclassesProperties",
+                                            "MailServices"};
+
+ExitStatus exitStatusOf(LinuxPlatformError::Kind kind) {
+  switch (kind) {
+    case LinuxPlatformError::Kind::UnusableOption:
+      return ExitStatus::UnusableArguments;
+    case LinuxPlatformError::Kind::MissingInput:
+      return ExitStatus::MissingInput;
+    case LinuxPlatformError::Kind::CannotCreate:
+      return ExitStatus::CannotCreate;
+    case LinuxPlatformError::Kind::InputOutput:
+      break;
+  }
+  return ExitStatus::InputOutputError;
+}
+
+}  // namespace
+
+DevicePlatform::DevicePlatform(std::unique_ptr<LinuxPlatform> platform)
+    : platform_(std::move(platform)), process_(platform_->platform()) {}
+
+std::variant<std::unique_ptr<DevicePlatform>, ProgramError> DevicePlatform::make(
+    LinuxPlatformOptions options) {
+  if (options.bundleResourcesDirectory.empty()) {
+    options.bundleResourcesDirectory = resourcesOfBundle(bundleBesideProgram()).string();
+  }
+  LinuxPlatformError error;
+  std::unique_ptr<LinuxPlatform> platform = LinuxPlatform::create(options, error);
+  if (platform == nullptr) {
+    return ProgramError{exitStatusOf(error.kind), error.text};
+  }
+  for (const char* name : kNeededResources) {
+    if (!platform->platform().bundleResources.readPropertyList(name)) {
+      return ProgramError{ExitStatus::MissingInput, std::string("No readable resource ") + name +
+                                                        " in " + options.bundleResourcesDirectory};
+    }
+  }
+  return std::unique_ptr<DevicePlatform>(new DevicePlatform(std::move(platform)));
+}
+
+}  // namespace accounts

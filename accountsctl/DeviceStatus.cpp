@@ -1,0 +1,106 @@
+#include "accountsctl/DeviceStatus.h"
+
+#include <fcntl.h>
+#include <sys/file.h>
+
+#include "accountsettings/AccountsManager.h"
+#include "migrator/AccountsDataMigrator.h"
+#include "platform/linux/DevicePath.h"
+#include "platform/linux/TemporaryFile.h"
+
+namespace accounts {
+namespace {
+
+constexpr std::string_view kKeptFoldersDirectory = "/var/mobile/Library/AccountMigration";
+constexpr std::string_view kKeptFolderPrefix = "Kept-";
+
+/// Where in the home directory a migration has temporary files.
+constexpr std::string_view kTemporaryPlaces[] = {"tmp", "Library/Preferences",
+                                                 "Library/Logs/CrashReporter/AccountMigration"};
+
+void lookAtSettings(LinuxPlatform& platform, DeviceStatus& status) {
+  status.settingsPath = AccountsManager::fullPathToAccountSettingsPlist();
+  PathError error;
+  const std::optional<PropertyDictionary> root =
+      platform.propertyLists().readDictionary(status.settingsPath, error);
+  status.hasSettings = root || !error.isMissing();
+  if (!root) {
+    status.settingsProblem = status.hasSettings ? std::optional(error.text) : std::nullopt;
+    return;
+  }
+  if (const PropertyValue* version = root->find(kPlistVersionKey)) {
+    status.storedVersion = *version;
+  }
+  status.accountCount = root->arrayForKey(kPlistAccountsKey).value_or(PropertyArray()).size();
+}
+
+/// Asks the migration's own decisions.
+void lookAtWork(DeviceStatus& status) {
+  status.finishesRemoval = AccountsDataMigrator()._failedToRemoveOldAccountsInfo();
+  if (status.finishesRemoval) {
+    return;
+  }
+  bool isOutOfDate = false;
+  AccountsManager::shouldMigrateOldMailAccounts_oldDAAccounts_newAccountSettings(
+      &status.convertsMailAccounts, &status.convertsExchangeAccounts, &isOutOfDate);
+  // Converted accounts go through the chain as well, from the version of the file.
+  const auto version = static_cast<std::uint64_t>(
+      status.storedVersion ? status.storedVersion->integerValue().value_or(0) : 0);
+  const bool runsChain =
+      isOutOfDate || status.convertsMailAccounts || status.convertsExchangeAccounts;
+  if (runsChain && version < AccountsManager::currentVersion()) {
+    status.upgradesFromVersion = version;
+  }
+}
+
+/// The paths in a directory whose names begin in a way, in order.
+std::vector<std::string> pathsWithPrefix(LinuxPlatform& platform, std::string_view directory,
+                                         std::string_view prefix) {
+  std::vector<std::string> paths;
+  const std::optional<std::vector<std::string>> names =
+      platform.fileSystem().directoryEntries(directory);
+  for (const std::string& name : names.value_or(std::vector<std::string>())) {
+    if (name.starts_with(prefix)) {
+      paths.push_back(joinedPath(directory, name));
+    }
+  }
+  return paths;
+}
+
+/// Whether no process has a temporary file in its hands. The lock that tells is given back at once.
+bool isAbandoned(const DeviceRoot& root, const std::string& path) {
+  PathError error;
+  const std::optional<DirectoryEntry> entry = root.locate(path, error);
+  const std::optional<FileDescriptor> file =
+      entry ? entry->openRegularFile(O_RDONLY, error) : std::nullopt;
+  return file && ::flock(file->number(), LOCK_SH | LOCK_NB) == 0;
+}
+
+void lookAtLeftovers(LinuxPlatform& platform, DeviceStatus& status) {
+  for (std::string& path : pathsWithPrefix(platform, kKeptFoldersDirectory, kKeptFolderPrefix)) {
+    if (platform.fileSystem().isDirectory(path)) {
+      status.keptFolders.push_back(std::move(path));
+    }
+  }
+  const std::string home = platform.platform().homeDirectory.path();
+  for (const std::string_view place : kTemporaryPlaces) {
+    for (std::string& path :
+         pathsWithPrefix(platform, joinedPath(home, place), kTemporaryFilePrefix)) {
+      if (isAbandoned(platform.root(), path)) {
+        status.abandonedFiles.push_back(std::move(path));
+      }
+    }
+  }
+}
+
+}  // namespace
+
+DeviceStatus statusOf(DevicePlatform& platform) {
+  DeviceStatus status;
+  lookAtSettings(platform.linuxPlatform(), status);
+  lookAtWork(status);
+  lookAtLeftovers(platform.linuxPlatform(), status);
+  return status;
+}
+
+}  // namespace accounts

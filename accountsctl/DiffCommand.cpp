@@ -1,0 +1,110 @@
+#include "accountsctl/DiffCommand.h"
+
+#include <fmt/format.h>
+
+#include <vector>
+
+#include "accountsctl/DifferenceReport.h"
+#include "accountsctl/PropertyListInput.h"
+#include "accountsctl/StoreDifference.h"
+
+namespace accounts {
+namespace {
+
+/// A store in both files: the whole files, or a part of two migration-information files.
+struct ComparedPart {
+  /// The key of the part; empty for whole files.
+  std::string_view key;
+  FileKind kind;
+  StoreDifference difference;
+};
+
+PropertyDictionary rootOf(const PropertyValue& value) {
+  const PropertyDictionary* root = value.asDictionary();
+  // A property list that is one value without keys is compared as one under the empty key.
+  return root != nullptr ? *root : PropertyDictionary{{"", value}};
+}
+
+std::vector<ComparedPart> comparedParts(PropertyDictionary before, PropertyDictionary after,
+                                        FileKind kind, Secrets secrets) {
+  std::vector<ComparedPart> parts;
+  if (kind == FileKind::MigrationInformation) {
+    for (const InformationPart& part : informationParts()) {
+      const std::optional<PropertyDictionary> left = before.dictionaryForKey(part.key);
+      const std::optional<PropertyDictionary> right = after.dictionaryForKey(part.key);
+      if (left && right) {
+        parts.push_back(
+            {part.key, part.kind, differenceBetween(*left, *right, part.kind, secrets)});
+        before.remove(part.key);
+        after.remove(part.key);
+      }
+    }
+  }
+  parts.insert(parts.begin(), {"", kind, differenceBetween(before, after, kind, secrets)});
+  return parts;
+}
+
+CommandReport textReport(const std::vector<ComparedPart>& parts, const Terminal& terminal) {
+  CommandReport report;
+  for (const ComparedPart& part : parts) {
+    const std::string text =
+        differenceText(part.difference, layoutOf(part.kind).value_or(StoreLayout()), terminal);
+    if (!text.empty() && !part.key.empty()) {
+      report.text += emphasized(terminal, Emphasis::Heading, part.key) + "\n";
+    }
+    report.text += text;
+  }
+  return report;
+}
+
+CommandReport jsonReport(const std::vector<ComparedPart>& parts, const DiffOptions& options,
+                         FileKind kind, ExitStatus exitStatus) {
+  JSON list = JSON::array();
+  for (const ComparedPart& part : parts) {
+    JSON object = {{"part", part.key.empty() ? JSON(nullptr) : JSON(part.key)}};
+    object.update(differenceObject(part.difference, layoutOf(part.kind).value_or(StoreLayout())));
+    list.push_back(std::move(object));
+  }
+  JSON object = reportObject("diff");
+  object["before"] = options.before;
+  object["after"] = options.after;
+  object["kind"] = identifierOf(kind);
+  object["same"] = exitStatus == ExitStatus::Success;
+  object["parts"] = std::move(list);
+  return CommandReport{lineOf(std::move(object), exitStatus)};
+}
+
+}  // namespace
+
+CommandResult diff(const DiffOptions& options, const Terminal& terminal) {
+  const std::variant<PropertyValue, ProgramError> before = readPropertyListInput(options.before);
+  if (const auto* error = std::get_if<ProgramError>(&before)) {
+    return *error;
+  }
+  const std::variant<PropertyValue, ProgramError> after = readPropertyListInput(options.after);
+  if (const auto* error = std::get_if<ProgramError>(&after)) {
+    return *error;
+  }
+  const auto& left = std::get<PropertyValue>(before);
+  const auto& right = std::get<PropertyValue>(after);
+  const FileKind kind = kindOf(left);
+  if (kindOf(right) != kind) {
+    return ProgramError{
+        ExitStatus::MalformedInput,
+        fmt::format("The files are of different kinds: {} ({}), {} ({})", options.before,
+                    nameOf(kind), options.after, nameOf(kindOf(right)))};
+  }
+  const std::vector<ComparedPart> parts =
+      comparedParts(rootOf(left), rootOf(right), kind, options.secrets);
+  bool isSame = true;
+  for (const ComparedPart& part : parts) {
+    isSame = isSame && part.difference.isEmpty();
+  }
+  const ExitStatus exitStatus = isSame ? ExitStatus::Success : ExitStatus::Attention;
+  CommandReport report = options.reportsJSON ? jsonReport(parts, options, kind, exitStatus)
+                                             : textReport(parts, terminal);
+  report.exitStatus = exitStatus;
+  return report;
+}
+
+}  // namespace accounts

@@ -1,0 +1,23 @@
+#pragma once
+
+#include <string>
+
+#include "accountsctl/CommandResult.h"
+#include "commandline/Terminal.h"
+#include "propertylist/SecretKeys.h"
+
+namespace accounts {
+
+struct DiffOptions {
+  /// Files of this machine; one of them may be "-" for standard input.
+  std::string before;
+  std::string after;
+  bool reportsJSON = false;
+  Secrets secrets = Secrets::Hide;
+};
+
+/// Compares two files of one kind. The exit status of the report is ExitStatus::Attention when they
+/// differ. Files of different kinds are an error.
+CommandResult diff(const DiffOptions& options, const Terminal& terminal);
+
+}  // namespace accounts

@@ -1,0 +1,75 @@
+#pragma once
+
+/// What the program's help says, apart from the options themselves.
+namespace accounts::help {
+
+inline constexpr const char* kProgram =
+    "Shows, compares, checks and converts the files of account migrations.";
+
+inline constexpr const char* kProgramExamples =
+    "Examples:\n"
+    "  accountsctl show com.quarx.accountsettings.plist\n"
+    "  accountsctl status --root /mnt/image\n"
+    "  accountsctl diff --help\n";
+
+/// The exit statuses that all subcommands have.
+inline constexpr const char* kErrors =
+    "  64  the arguments cannot be used\n"
+    "  65  a file is not what it has to be\n"
+    "  66  a file or the root is missing or unreadable\n"
+    "  73  the output file cannot be created\n"
+    "  74  a file or standard output cannot be written or read\n";
+
+inline constexpr const char* kShow =
+    "Show a settings file, a legacy store, a migration-information file, a device description or\n"
+    "any other property list; which of them it is, its content tells. Passwords and the like are\n"
+    "hidden.";
+inline constexpr const char* kShowStatuses = "  0   the file was shown\n";
+inline constexpr const char* kShowExamples =
+    "  accountsctl show com.quarx.accountsettings.plist\n"
+    "  accountsctl show --properties Accounts.plist | less\n"
+    "  accountsctl show --json - < com.quarx.DataAccess.plist\n";
+
+inline constexpr const char* kDiff =
+    "Compare two files of one kind, account by account. Accounts are the same if they have the\n"
+    "same identifier, wherever they stand; + is an added account or value, - a removed one, * an\n"
+    "account that changed or moved to another parent. Passwords and the like are hidden.";
+inline constexpr const char* kDiffStatuses =
+    "  0   the files hold the same\n"
+    "  1   they differ\n";
+inline constexpr const char* kDiffExamples =
+    "  accountsctl diff before.plist com.quarx.accountsettings.plist\n"
+    "  accountsctl diff --json before.plist - < after.plist\n";
+
+inline constexpr const char* kCheck =
+    "Say what a migration would drop, repair, ignore or refuse of a settings file or a legacy\n"
+    "store, and why. The store's own code decides, with the account types of the bundle.";
+inline constexpr const char* kCheckStatuses =
+    "  0   nothing was found\n"
+    "  1   something was found\n";
+inline constexpr const char* kCheckExamples =
+    "  accountsctl check com.quarx.accountsettings.plist\n"
+    "  accountsctl check --device image/etc/device.plist --json Accounts.plist\n";
+
+inline constexpr const char* kStatus =
+    "Tell what a migration would find on a device and do, and what an earlier one left behind.\n"
+    "Nothing is changed, and nothing outside the root is read.";
+inline constexpr const char* kStatusStatuses =
+    "  0   the device was looked at\n"
+    "  1   with --fail-if-pending: a migration has something to do, the settings file is\n"
+    "      unreadable, or kept inputs wait for a person\n";
+inline constexpr const char* kStatusExamples =
+    "  accountsctl status --root /\n"
+    "  accountsctl status --root /mnt/image --fail-if-pending && echo up to date\n";
+
+inline constexpr const char* kConvert =
+    "Write a property list as XML or in the binary format, its values unchanged. Nothing is "
+    "hidden:\n"
+    "the output holds every password that the input holds. What XML cannot hold is an error.";
+inline constexpr const char* kConvertStatuses = "  0   the output was written\n";
+inline constexpr const char* kConvertExamples =
+    "  accountsctl convert settings.plist settings.xml --to xml\n"
+    "  accountsctl convert settings.plist - --to xml | less\n"
+    "  accountsctl convert edited.xml settings.plist --to binary\n";
+
+}  // namespace accounts::help

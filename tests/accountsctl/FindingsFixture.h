@@ -1,0 +1,58 @@
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "accountsctl/Finding.h"
+#include "accountsctl/LegacyFindings.h"
+#include "accountsctl/SettingsFindings.h"
+#include "tests/fakes/FakePlatform.h"
+
+namespace accounts {
+
+/// A fake device on which files are checked.
+class FindingsFixture : public testing::Test {
+ protected:
+  using Lines = std::vector<std::string>;
+
+  static PropertyDictionary account(std::string_view type, std::string_view accountClass,
+                                    std::string_view identifier) {
+    return {{"Type", type}, {"Class", accountClass}, {"Identifier", identifier}};
+  }
+  static PropertyDictionary mail(std::string_view identifier) {
+    return account("Mail", "IMAPAccount", identifier);
+  }
+  static PropertyDictionary with(PropertyDictionary properties, std::string_view key,
+                                 PropertyValue value) {
+    properties.set(key, std::move(value));
+    return properties;
+  }
+  static PropertyDictionary without(PropertyDictionary properties, std::string_view key) {
+    properties.remove(key);
+    return properties;
+  }
+  static PropertyDictionary settings(std::vector<PropertyValue> accountDictionaries) {
+    return {{"Version", 12}, {"Accounts", PropertyArray(std::move(accountDictionaries))}};
+  }
+
+  /// Findings as "PLACE EFFECT CODE".
+  static Lines linesOf(const std::vector<Finding>& findings) {
+    Lines lines;
+    for (const Finding& finding : findings) {
+      lines.push_back((finding.place.empty() ? "file" : finding.place) + " " +
+                      std::string(nameOf(finding.effect)) + " " + std::string(finding.code));
+    }
+    return lines;
+  }
+  /// Those of a settings file with these accounts.
+  static Lines found(std::vector<PropertyValue> accountDictionaries) {
+    return linesOf(findingsInSettings(settings(std::move(accountDictionaries))));
+  }
+
+  FakeProcess device;
+};
+
+}  // namespace accounts

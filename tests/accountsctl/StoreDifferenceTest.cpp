@@ -1,0 +1,208 @@
+#include "accountsctl/StoreDifference.h"
+
+#include <gtest/gtest.h>
+
+#include "accountsctl/DifferenceReport.h"
+
+namespace accounts {
+namespace {
+
+PropertyDictionary account(std::string_view identifier, std::string_view name = "Name") {
+  return {{"Type", "Mail"}, {"DisplayName", name}, {"Identifier", identifier}};
+}
+
+PropertyDictionary parentOf(std::string_view identifier, PropertyArray children) {
+  PropertyDictionary parent = account(identifier);
+  parent.set("ChildAccounts", std::move(children));
+  return parent;
+}
+
+PropertyDictionary with(PropertyDictionary properties, std::string_view key, PropertyValue value) {
+  properties.set(key, std::move(value));
+  return properties;
+}
+
+PropertyDictionary settings(std::vector<PropertyValue> accountDictionaries) {
+  return {{"Version", 12}, {"Accounts", PropertyArray(std::move(accountDictionaries))}};
+}
+
+/// The lines in which two settings files differ.
+std::string difference(const PropertyDictionary& before, const PropertyDictionary& after,
+                       Secrets secrets = Secrets::Hide) {
+  const StoreDifference found =
+      differenceBetween(before, after, FileKind::AccountSettings, secrets);
+  const std::string text = differenceText(found, *layoutOf(FileKind::AccountSettings), {});
+  EXPECT_EQ(found.isEmpty(), text.empty());
+  return text;
+}
+
+TEST(StoreDifference, EqualFilesDoNotDiffer) {
+  const PropertyDictionary file = settings({account("A"), parentOf("B", {account("C")})});
+
+  EXPECT_EQ(difference(file, file), "");
+  EXPECT_EQ(difference(settings({}), settings({})), "");
+}
+
+TEST(StoreDifference, AccountsAreAddedAndRemoved) {
+  EXPECT_EQ(
+      difference(settings({account("A"), account("B")}), settings({account("C"), account("B")})),
+      "+ 1 Mail 'Name' (C)\n"
+      "- 1 Mail 'Name' (A)\n");
+}
+
+TEST(StoreDifference, ChildrenAreAccountsOfTheirOwn) {
+  EXPECT_EQ(difference(settings({parentOf("P", {account("A")})}),
+                       settings({parentOf("P", {account("B")})})),
+            "+ 1.1 Mail 'Name' (B)\n"
+            "- 1.1 Mail 'Name' (A)\n");
+}
+
+TEST(StoreDifference, PropertiesThatChangedAreListedInTheOrderOfTheirKeys) {
+  EXPECT_EQ(difference(settings({with(account("A", "Old"), "Gone", 1)}),
+                       settings({with(account("A", "New"), "Fresh", true)})),
+            "* 1 Mail 'New' (A)\n"
+            "    - DisplayName: Old\n"
+            "    + DisplayName: New\n"
+            "    + Fresh: true\n"
+            "    - Gone: 1\n");
+}
+
+TEST(StoreDifference, DictionariesAreComparedKeyByKeyAndArraysAsAWhole) {
+  const auto nested = [](int port, int member) {
+    return with(account("A"), "Server",
+                PropertyDictionary{{"List", PropertyArray{member}}, {"Port", port}, {"Same", 1}});
+  };
+
+  EXPECT_EQ(difference(settings({nested(1, 5)}), settings({nested(2, 6)})),
+            "* 1 Mail 'Name' (A)\n"
+            "    - Server/List: [5]\n"
+            "    + Server/List: [6]\n"
+            "    - Server/Port: 1\n"
+            "    + Server/Port: 2\n");
+}
+
+TEST(StoreDifference, ATopLevelAccountThatBecameAChildHasMoved) {
+  EXPECT_EQ(
+      difference(settings({account("P"), account("A")}), settings({parentOf("P", {account("A")})})),
+      "* 1.1 Mail 'Name' (A), now a child of P\n");
+}
+
+TEST(StoreDifference, AChildThatBecameATopLevelAccountHasMoved) {
+  EXPECT_EQ(difference(settings({parentOf("P", {account("A")})}),
+                       settings({parentOf("P", {}), account("A")})),
+            "* 2 Mail 'Name' (A), now a top-level account\n");
+}
+
+TEST(StoreDifference, AChildWithAnotherParentHasMoved) {
+  EXPECT_EQ(difference(settings({parentOf("P", {account("A")}), parentOf("Q", {})}),
+                       settings({parentOf("P", {}), parentOf("Q", {account("A")})})),
+            "* 2.1 Mail 'Name' (A), now a child of Q\n");
+}
+
+TEST(StoreDifference, AnAccountThatMovedShowsItsChangesToo) {
+  EXPECT_EQ(difference(settings({account("P"), account("A", "Old")}),
+                       settings({parentOf("P", {account("A", "New")})})),
+            "* 1.1 Mail 'New' (A), now a child of P\n"
+            "    - DisplayName: Old\n"
+            "    + DisplayName: New\n");
+}
+
+TEST(StoreDifference, AChildWhoseParentTookAnotherPlaceHasNotMoved) {
+  EXPECT_EQ(difference(settings({account("X"), parentOf("P", {account("A")})}),
+                       settings({parentOf("P", {account("A")})})),
+            "- 1 Mail 'Name' (X)\n");
+}
+
+TEST(StoreDifference, AnotherOrderIsADifference) {
+  EXPECT_EQ(
+      difference(settings({account("A"), account("B")}), settings({account("B"), account("A")})),
+      "The accounts stand in another order\n");
+}
+
+TEST(StoreDifference, WhatStandsBesideTheAccountsIsComparedToo) {
+  EXPECT_EQ(
+      difference(PropertyDictionary{{"Version", 9}, {"Accounts", PropertyArray{}}}, settings({})),
+      "- Version: 9\n"
+      "+ Version: 12\n");
+}
+
+TEST(StoreDifference, AnEmptyListOfAccountsIsNotTheSameAsNone) {
+  EXPECT_EQ(difference(PropertyDictionary{{"Version", 12}}, settings({})), "+ Accounts: []\n");
+}
+
+TEST(StoreDifference, AccountsWithOneIdentifierAreComparedInTheirOrder) {
+  EXPECT_EQ(difference(settings({account("A", "1"), account("A", "2")}),
+                       settings({account("A", "1"), account("A", "3"), account("A", "4")})),
+            "* 2 Mail '3' (A)\n"
+            "    - DisplayName: 2\n"
+            "    + DisplayName: 3\n"
+            "+ 3 Mail '4' (A)\n");
+}
+
+TEST(StoreDifference, AccountsWithoutIdentifiersAreMatchedByTypeAndName) {
+  const auto nameless = [](std::string_view name, int port) {
+    return PropertyDictionary{{"Type", "Mail"}, {"DisplayName", name}, {"Port", port}};
+  };
+
+  EXPECT_EQ(difference(settings({nameless("One", 1), nameless("Two", 2)}),
+                       settings({nameless("Two", 3)})),
+            "* 1 Mail 'Two' (none)\n"
+            "    - Port: 2\n"
+            "    + Port: 3\n"
+            "- 1 Mail 'One' (none)\n");
+}
+
+TEST(StoreDifference, SecretsThatChangedAreHidden) {
+  const PropertyDictionary before = settings({with(account("A"), "Password", "old")});
+  const PropertyDictionary after = settings({with(account("A"), "Password", "new")});
+
+  EXPECT_EQ(difference(before, after),
+            "* 1 Mail 'Name' (A)\n"
+            "    - Password: (hidden)\n"
+            "    + Password: (hidden)\n");
+  EXPECT_EQ(difference(before, after, Secrets::Show),
+            "* 1 Mail 'Name' (A)\n"
+            "    - Password: old\n"
+            "    + Password: new\n");
+}
+
+TEST(StoreDifference, ASecretDictionaryIsHiddenAsAWhole) {
+  const auto tokens = [](const char* value) {
+    return settings({with(account("A"), "Tokens", PropertyDictionary{{"Inner", value}})});
+  };
+
+  EXPECT_EQ(difference(tokens("old"), tokens("new")),
+            "* 1 Mail 'Name' (A)\n"
+            "    - Tokens: (hidden)\n"
+            "    + Tokens: (hidden)\n");
+}
+
+TEST(StoreDifference, WhatATerminalMightObeyIsEscaped) {
+  EXPECT_EQ(difference(settings({}), settings({account("A\n", "\x1B[2J")})),
+            "+ 1 Mail '\\u001b[2J' (A\\n)\n");
+}
+
+TEST(StoreDifference, ManyAccountsWithOneIdentifierAreComparedToo) {
+  std::vector<PropertyValue> many;
+  for (int number = 0; number < 3000; ++number) {
+    many.emplace_back(account("A", std::to_string(number)));
+  }
+
+  EXPECT_EQ(difference(settings(many), settings(many)), "");
+}
+
+TEST(StoreDifference, InJSONAMoveNamesBothPlaces) {
+  const StoreLayout layout = *layoutOf(FileKind::AccountSettings);
+  const JSON object = differenceObject(differenceBetween(settings({account("P"), account("A")}),
+                                                         settings({parentOf("P", {account("A")})}),
+                                                         FileKind::AccountSettings, Secrets::Hide),
+                                       layout);
+
+  ASSERT_EQ(object["accounts"].size(), 1U);
+  EXPECT_EQ(object["accounts"][0]["change"], "moved");
+  EXPECT_EQ(object["accounts"][0]["before"], (JSON{{"place", "2"}, {"parent", nullptr}}));
+  EXPECT_EQ(object["accounts"][0]["after"], (JSON{{"place", "1.1"}, {"parent", "P"}}));
+}
+
+}  // namespace
+}  // namespace accounts
