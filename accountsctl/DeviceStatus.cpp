@@ -4,15 +4,13 @@
 #include <sys/file.h>
 
 #include "accountsettings/AccountsManager.h"
+#include "host/KeptFolders.h"
 #include "migrator/AccountsDataMigrator.h"
 #include "platform/linux/DevicePath.h"
 #include "platform/linux/TemporaryFile.h"
 
 namespace accounts {
 namespace {
-
-constexpr std::string_view kKeptFoldersDirectory = "/var/mobile/Library/AccountMigration";
-constexpr std::string_view kKeptFolderPrefix = "Kept-";
 
 /// Where in the home directory a migration has temporary files.
 constexpr std::string_view kTemporaryPlaces[] = {"tmp", "Library/Preferences",
@@ -77,11 +75,7 @@ bool isAbandoned(const DeviceRoot& root, const std::string& path) {
 }
 
 void lookAtLeftovers(LinuxPlatform& platform, DeviceStatus& status) {
-  for (std::string& path : pathsWithPrefix(platform, kKeptFoldersDirectory, kKeptFolderPrefix)) {
-    if (platform.fileSystem().isDirectory(path)) {
-      status.keptFolders.push_back(std::move(path));
-    }
-  }
+  status.keptFolders = KeptFolders(platform.fileSystem()).ofMigrations();
   const std::string home = platform.platform().homeDirectory.path();
   for (const std::string_view place : kTemporaryPlaces) {
     for (std::string& path :
