@@ -146,7 +146,7 @@ TEST_F(NothingHostile, ALinkThatStaysInTheRootIsFollowed) {
   std::filesystem::rename(onThisMachine(kLegacyMailPath), onThisMachine("/var/mobile/Elsewhere"));
   std::filesystem::create_symlink("/var/mobile/Elsewhere", onThisMachine(kLegacyMailPath));
 
-  EXPECT_EQ(migrate().exitStatus, 0);
+  EXPECT_EQ(migrate({"--bare"}).exitStatus, 0);
 
   EXPECT_EQ(readDictionary(kSettingsPath).arrayForKey("Accounts")->size(), 3U);
   EXPECT_FALSE(exists(kLegacyMailPath));
