@@ -9,7 +9,7 @@ TEST(SecretKeys, NamesOfPasswordsAndTokensAreSecretHoweverTheyAreSpelt) {
   for (const char* key :
        {"Password", "password", "SMTP PASSWORD", "Pass-Word", "account_passwd", "Passphrase",
         "PassCode", "OAuthToken", "OAuth Token Secret", "ClientSecret", "Credentials", "API Key",
-        "Access-Key", "PrivateKey", "Authorization", "Session Cookie"}) {
+        "Access-Key", "PrivateKey", "Authorization", "Session Cookie", "2nd_Password2"}) {
     EXPECT_TRUE(isSecretKey(key)) << key;
   }
 }
@@ -29,6 +29,14 @@ TEST(SecretKeys, ASecretIsHiddenWhateverItsDepth) {
             PropertyValue(PropertyDictionary{
                 {"Accounts",
                  PropertyArray{PropertyDictionary{{"Password", "(hidden)"}, {"Username", "u"}}}}}));
+}
+
+TEST(SecretKeys, SeveralSecretsOfOneContainerAreAllHidden) {
+  const PropertyDictionary account = {{"Password", "x"}, {"Token", "y"}};
+  const PropertyDictionary hidden = {{"Password", "(hidden)"}, {"Token", "(hidden)"}};
+
+  EXPECT_EQ(withSecretsHidden(PropertyArray{account, account}),
+            PropertyValue(PropertyArray{hidden, hidden}));
 }
 
 TEST(SecretKeys, SecretsOfEveryTellingKindAreHidden) {
