@@ -5,6 +5,7 @@
 
 #include "accountsctl/HelpTexts.h"
 #include "accountsctl/PropertyListInput.h"
+#include "commandline/OptionDeclarations.h"
 
 namespace accounts {
 namespace {
@@ -13,16 +14,8 @@ constexpr const char* kVersion = "accountsctl " ACCOUNTSCTL_VERSION;
 constexpr const char* kXMLForm = "xml";
 constexpr const char* kBinaryForm = "binary";
 
-std::string requireText(const std::string& value) {
-  return value.empty() ? "must not be empty" : "";
-}
-
 std::string requireForm(const std::string& value) {
   return value == kXMLForm || value == kBinaryForm ? "" : "must be xml or binary";
-}
-
-std::string requireDevicePath(const std::string& value) {
-  return value.starts_with('/') ? "" : "must be an absolute device path, such as /var/mobile";
 }
 
 /// What is said of two names of which only one may be standard input.
@@ -58,16 +51,6 @@ void addFile(CLI::App& command, const std::string& name, std::string& destinatio
   command.add_option(name, destination, description)
       ->option_text(" ")
       ->required()
-      ->check(requireText);
-}
-
-CLI::Option* addPath(CLI::App& command, const std::string& name,
-                     std::optional<std::string>& destination, const std::string& placeholder,
-                     const std::string& description) {
-  return command
-      .add_option_function<std::string>(
-          name, [&destination](const std::string& value) { destination = value; }, description)
-      ->option_text(placeholder)
       ->check(requireText);
 }
 
@@ -134,15 +117,7 @@ Asked checkAsked(Arguments& arguments) {
 }
 
 void addStatus(CLI::App& command, Arguments& arguments) {
-  command
-      .add_option("--root", arguments.status.root,
-                  "The device root: / or the directory of an image")
-      ->option_text("DIR")
-      ->required()
-      ->check(requireText);
-  addPath(command, "--home", arguments.status.home, "DIR",
-          "The mobile user's home directory, a device path (default /var/mobile)")
-      ->check(requireDevicePath);
+  addDevice(command, arguments.status.root, arguments.status.home);
   addPath(command, "--device", arguments.status.device, "FILE",
           "The device description (default: the root's /etc/device.plist, if there is one)");
   addBundle(command, arguments.status.bundle);
@@ -197,8 +172,7 @@ constexpr Subcommand kSubcommands[] = {
 
 void addSubcommand(CLI::App& program, const Subcommand& subcommand, Arguments& arguments) {
   CLI::App& command = *program.add_subcommand(subcommand.name, subcommand.description);
-  command.set_version_flag("--version", kVersion, "Print the version and exit");
-  command.set_help_flag("-h,--help", "Print this help and exit");
+  addHelpAndVersion(command, kVersion);
   command.footer(std::string("Exit status:\n") + subcommand.exitStatuses + help::kErrors +
                  "\nExamples:\n" + subcommand.examples);
   subcommand.add(command, arguments);
@@ -219,8 +193,7 @@ Asked askedBy(std::string_view chosen, Arguments& arguments) {
 CommandLine parseCommandLine(int argumentCount, const char* const* arguments) {
   Arguments parsed;
   CLI::App program(help::kProgram, kProgramName);
-  program.set_help_flag("-h,--help", "Print this help and exit");
-  program.set_version_flag("--version", kVersion, "Print the version and exit");
+  addHelpAndVersion(program, kVersion);
   program.footer(help::kProgramExamples);
   for (const Subcommand& subcommand : kSubcommands) {
     addSubcommand(program, subcommand, parsed);

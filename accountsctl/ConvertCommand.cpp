@@ -4,7 +4,7 @@
 
 #include "accountsctl/JSONText.h"
 #include "accountsctl/PropertyListInput.h"
-#include "accountsctl/ReplacedFile.h"
+#include "commandline/ReplacedFile.h"
 #include "propertylist/BinaryPropertyList.h"
 #include "propertylist/XMLPropertyList.h"
 

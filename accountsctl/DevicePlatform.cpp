@@ -3,6 +3,7 @@
 #include <utility>
 
 #include "commandline/BundleLocation.h"
+#include "commandline/PlatformError.h"
 
 namespace accounts {
 namespace {
@@ -10,20 +11,6 @@ namespace {
 /// Without these the store's code cannot work, and says so by ending the process.
 constexpr const char* kNeededResources[] = {"AccountTypesProperties", "DataclassesProperties",
                                             "MailServices"};
-
-ExitStatus exitStatusOf(LinuxPlatformError::Kind kind) {
-  switch (kind) {
-    case LinuxPlatformError::Kind::UnusableOption:
-      return ExitStatus::UnusableArguments;
-    case LinuxPlatformError::Kind::MissingInput:
-      return ExitStatus::MissingInput;
-    case LinuxPlatformError::Kind::CannotCreate:
-      return ExitStatus::CannotCreate;
-    case LinuxPlatformError::Kind::InputOutput:
-      break;
-  }
-  return ExitStatus::InputOutputError;
-}
 
 }  // namespace
 
@@ -38,7 +25,7 @@ std::variant<std::unique_ptr<DevicePlatform>, ProgramError> DevicePlatform::make
   LinuxPlatformError error;
   std::unique_ptr<LinuxPlatform> platform = LinuxPlatform::create(options, error);
   if (platform == nullptr) {
-    return ProgramError{exitStatusOf(error.kind), error.text};
+    return programErrorOf(error);
   }
   for (const char* name : kNeededResources) {
     if (!platform->platform().bundleResources.readPropertyList(name)) {

@@ -4,10 +4,10 @@
 #include <sys/file.h>
 
 #include "accountsettings/AccountsManager.h"
-#include "host/KeptFolders.h"
 #include "migrator/AccountsDataMigrator.h"
 #include "platform/linux/DevicePath.h"
 #include "platform/linux/TemporaryFile.h"
+#include "safetynet/KeptFolders.h"
 
 namespace accounts {
 namespace {

@@ -6,18 +6,24 @@
 
 namespace accounts {
 
-/// What a program tells its caller. Errors have the numbers of sysexits.h.
+/// What the programs tell their callers. Errors have the numbers of sysexits.h.
 enum class ExitStatus : int {
   Success = 0,
-  /// The program did its work, and the answer is one that the caller may want to act on.
+  /// accountsctl did its work, and the answer is one that the caller may want to act on.
   Attention = 1,
+  /// The plug-in ran and reported failure.
+  MigrationFailed = 1,
+  /// The plug-in reported success, but that could not be verified; its inputs were put back.
+  NotVerified = 2,
   /// The arguments cannot be used; nothing was done.
   UnusableArguments = EX_USAGE,
   /// The input is there but is not what it has to be.
   MalformedInput = EX_DATAERR,
   /// The input is missing or unreadable.
   MissingInput = EX_NOINPUT,
-  /// An output file cannot be created.
+  /// The plug-in ended by an assertion, a signal or an exit of its own.
+  PluginEnded = EX_SOFTWARE,
+  /// An output file, or one of the program's own, cannot be created.
   CannotCreate = EX_CANTCREAT,
   /// A file or stream cannot be written or read.
   InputOutputError = EX_IOERR

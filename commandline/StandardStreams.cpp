@@ -9,6 +9,16 @@
 #include "propertylist/Description.h"
 
 namespace accounts {
+namespace {
+
+void printLine(std::string_view program, std::string_view separator, std::string_view message) {
+  std::string line(program);
+  line += separator;
+  appendEscapedText(line, message);
+  std::cerr << line + "\n";
+}
+
+}  // namespace
 
 void prepareStandardStreams() {
   for (const int stream : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
@@ -23,10 +33,11 @@ void prepareStandardStreams() {
 }
 
 void printError(std::string_view program, std::string_view message) {
-  std::string line(program);
-  line += ": ";
-  appendEscapedText(line, message);
-  std::cerr << line + "\n";
+  printLine(program, ": ", message);
+}
+
+void printWarning(std::string_view program, std::string_view message) {
+  printLine(program, ": warning: ", message);
 }
 
 ExitStatus printResult(std::string_view program, const std::string& text, ExitStatus exitStatus) {

@@ -15,6 +15,9 @@ void prepareStandardStreams();
 /// Writes the line "PROGRAM: MESSAGE" to standard error, the message escaped to stay one line.
 void printError(std::string_view program, std::string_view message);
 
+/// The same for something that a person should know: "PROGRAM: warning: MESSAGE".
+void printWarning(std::string_view program, std::string_view message);
+
 /// Writes the program's whole result to standard output, and tells on standard error when it does
 /// not arrive. Returns how the program ends: with `exitStatus`, or with an input/output error.
 ExitStatus printResult(std::string_view program, const std::string& text, ExitStatus exitStatus);

@@ -19,8 +19,8 @@ namespace {
 /// Ends a text that the child wrote in full; a child that dies while writing leaves it out.
 constexpr char kEndMark = '\x04';
 
-HostError inputOutputError(const std::string& message) {
-  return HostError{ExitStatus::InputOutputError, message + ": " + std::strerror(errno)};
+ProgramError inputOutputError(const std::string& message) {
+  return ProgramError{ExitStatus::InputOutputError, message + ": " + std::strerror(errno)};
 }
 
 bool writeAll(int file, std::string_view text) {
@@ -74,7 +74,7 @@ std::string describeEnd(int status) {
 
 }  // namespace
 
-std::variant<std::string, HostError> runInChildProcess(
+std::variant<std::string, ProgramError> runInChildProcess(
     const std::function<std::string()>& function) {
   // A file in memory rather than a pipe: its reader waits for the child alone, never for some
   // process that the child started and that keeps a pipe open.
@@ -88,7 +88,7 @@ std::variant<std::string, HostError> runInChildProcess(
     runChild(result, parent, function);
   }
   if (child < 0) {
-    const HostError error = inputOutputError("No process for the plug-in");
+    const ProgramError error = inputOutputError("No process for the plug-in");
     close(result);
     return error;
   }
@@ -99,7 +99,7 @@ std::variant<std::string, HostError> runInChildProcess(
   close(result);
   const bool delivered = text.ends_with(kEndMark);
   if (!WIFEXITED(status) || WEXITSTATUS(status) != EXIT_SUCCESS || !delivered) {
-    return HostError{ExitStatus::PluginEnded, "The plug-in " + describeEnd(status)};
+    return ProgramError{ExitStatus::PluginEnded, "The plug-in " + describeEnd(status)};
   }
   text.pop_back();
   return text;

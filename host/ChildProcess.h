@@ -4,7 +4,7 @@
 #include <string>
 #include <variant>
 
-#include "host/HostError.h"
+#include "commandline/ExitStatus.h"
 
 namespace accounts {
 
@@ -13,7 +13,7 @@ namespace accounts {
 /// writes; it is killed when the host ends first. An error, with the way the child ended in its
 /// message, when the child ends by a signal or in any other way than by returning the text; an
 /// error too when no child can be made.
-std::variant<std::string, HostError> runInChildProcess(
+std::variant<std::string, ProgramError> runInChildProcess(
     const std::function<std::string()>& function);
 
 }  // namespace accounts

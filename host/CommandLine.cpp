@@ -1,165 +1,112 @@
 #include "host/CommandLine.h"
 
 #include <CLI/CLI.hpp>
-#include <algorithm>
-#include <string_view>
+#include <utility>
 
-#include "propertylist/Description.h"
+#include "commandline/OptionDeclarations.h"
+#include "host/HelpTexts.h"
 
 namespace accounts {
 namespace {
 
 constexpr const char* kVersion = "migration-host " MIGRATION_HOST_VERSION;
 
-constexpr const char* kProgramExamples =
-    "Examples:\n"
-    "  migration-host run --root /mnt/image\n"
-    "  migration-host restore --root /mnt/image\n"
-    "  migration-host run --help\n";
+/// The arguments of every subcommand; those of the one that is chosen are filled.
+struct Arguments {
+  RunOptions run;
+  RestoreOptions restore;
+  bool wantsJSON = false;
+};
 
-constexpr const char* kRunDescription =
-    "Run the account-settings migration on one device root.\n\n"
-    "The settings file and the legacy stores are kept until the result is verified, and put back\n"
-    "if it cannot be; with --bare the plug-in's result is reported as it stands. Standard error\n"
-    "carries the plug-in's console lines, standard output a short summary or, with --json, one\n"
-    "object on one line.";
+using Asked = decltype(CommandLine::asked);
 
-constexpr const char* kRunExamples =
-    "Exit status:\n"
-    "  0   the plug-in reported success, which was verified unless --bare is given\n"
-    "  1   the plug-in reported failure\n"
-    "  2   the plug-in reported success, which was not verified: the files are put back\n"
-    "  64  the arguments cannot be used\n"
-    "  66  no such root, device description or bundle\n"
-    "  70  the plug-in ended by an assertion or a signal\n"
-    "  73  a file of the host's own cannot be created\n"
-    "  74  a file or stream of the host's own cannot be written or read\n"
-    "\n"
-    "Examples:\n"
-    "  migration-host run --root /                             the running device\n"
-    "  migration-host run --root /mnt/image --json             an image, for a program to read\n"
-    "  migration-host run --root /mnt/image --channel -        the log channel as well\n"
-    "  migration-host run --root image --device other.plist    answers of another device\n";
-
-constexpr const char* kRestoreDescription =
-    "Put back the settings file and the legacy stores that a run kept.\n\n"
-    "A run that was killed, or that may not have carried over everything, leaves them in\n"
-    "/var/mobile/Library/AccountMigration/Kept-TIME on the device. What is replaced is itself\n"
-    "kept, in Replaced-TIME beside it, and the folder whose files are back is removed.";
-
-constexpr const char* kRestoreExamples =
-    "Exit status:\n"
-    "  0   the files are back\n"
-    "  64  the arguments cannot be used, or --from is needed to choose among several folders\n"
-    "  66  no such root or folder, or nothing is kept\n"
-    "  73  what would be replaced cannot be kept; nothing was changed\n"
-    "  74  the files cannot be put back; the folder is still whole\n"
-    "\n"
-    "Examples:\n"
-    "  migration-host restore --root /mnt/image\n"
-    "  migration-host restore --root /mnt/image --from Kept-20260102T030405Z\n";
-
-std::string requireText(const std::string& value) {
-  return value.empty() ? "must not be empty" : "";
-}
-
-std::string requireDevicePath(const std::string& value) {
-  return value.starts_with('/') ? "" : "must be an absolute device path, such as /var/mobile";
-}
-
-CLI::Option* addPath(CLI::App& command, const std::string& name,
-                     std::optional<std::string>& destination, const std::string& placeholder,
-                     const std::string& description) {
-  return command
-      .add_option_function<std::string>(
-          name, [&destination](const std::string& value) { destination = value; }, description)
-      ->option_text(placeholder);
-}
-
-/// Whether the person wants JSON, also when the arguments as a whole cannot be used.
-OutputForm requestedOutput(int argumentCount, const char* const* arguments) {
-  const bool json = std::any_of(arguments, arguments + argumentCount,
-                                [](std::string_view word) { return word == "--json"; });
-  return json ? OutputForm::JSON : OutputForm::Summary;
-}
-
-void addCommonOptions(CLI::App& command, std::string& root, std::optional<std::string>& home,
-                      OutputForm& output) {
-  command.set_version_flag("--version", kVersion, "Print the version and exit");
-  command.set_help_flag("-h,--help", "Print this help and exit");
-  command.add_option("--root", root, "The device root: / or the directory of an image")
-      ->option_text("DIR")
-      ->required()
-      ->check(requireText);
-  addPath(command, "--home", home, "DIR",
-          "The mobile user's home directory, a device path (default /var/mobile)")
-      ->check(requireDevicePath);
-  command.add_flag_callback(
-      "--json", [&output] { output = OutputForm::JSON; },
-      "Write one JSON object on one line to standard output");
-}
-
-void addRunCommand(CLI::App& program, RunOptions& options) {
-  CLI::App& run = *program.add_subcommand("run", kRunDescription);
-  run.footer(kRunExamples);
-  addCommonOptions(run, options.root, options.home, options.output);
-  addPath(run, "--device", options.deviceDescription, "FILE",
-          "The device description (default: the root's /etc/device.plist, if there is one)")
-      ->check(requireText);
-  addPath(run, "--plugin", options.plugin, "BUNDLE",
-          "The plug-in bundle (default: accounts.migrator beside the program)")
-      ->check(requireText);
-  addPath(run, "--temporary-directory", options.temporaryDirectory, "DIR",
+void addRun(CLI::App& command, Arguments& arguments) {
+  RunOptions& options = arguments.run;
+  addDevice(command, options.root, options.home);
+  addPath(command, "--device", options.deviceDescription, "FILE",
+          "The device description (default: the root's /etc/device.plist, if there is one)");
+  addPath(command, "--plugin", options.plugin, "BUNDLE",
+          "The plug-in bundle (default: accounts.migrator beside the program)");
+  addPath(command, "--temporary-directory", options.temporaryDirectory, "DIR",
           "Where temporary files go, a device path (default: tmp in the home directory)")
       ->check(requireDevicePath);
-  addPath(run, "--channel", options.channel, "FILE",
-          "Append the log channel to FILE, - for standard error (default: off)")
-      ->check(requireText);
-  run.add_flag("--bare", options.bare, "Run the plug-in without keeping or verifying anything");
+  addPath(command, "--channel", options.channel, "FILE",
+          "Append the log channel to FILE, - for standard error (default: off)");
+  command.add_flag("--bare", options.bare, "Run the plug-in without keeping or verifying anything");
 }
 
-void addRestoreCommand(CLI::App& program, RestoreOptions& options) {
-  CLI::App& restore = *program.add_subcommand("restore", kRestoreDescription);
-  restore.footer(kRestoreExamples);
-  addCommonOptions(restore, options.root, options.home, options.output);
-  addPath(restore, "--from", options.folder, "FOLDER",
-          "The folder of kept files, by its name or device path (default: the only one)")
-      ->check(requireText);
+Asked runAsked(Arguments& arguments) {
+  return arguments.run;
 }
 
-UsageError usageError(const std::string& reason, int argumentCount, const char* const* arguments) {
-  std::string message;
-  appendEscapedText(message, reason);
-  return UsageError{message + " (--help explains)", requestedOutput(argumentCount, arguments)};
+void addRestore(CLI::App& command, Arguments& arguments) {
+  addDevice(command, arguments.restore.root, arguments.restore.home);
+  addPath(command, "--from", arguments.restore.folder, "FOLDER",
+          "The folder of kept files, by its name or device path (default: the only one)");
+}
+
+Asked restoreAsked(Arguments& arguments) {
+  return arguments.restore;
+}
+
+/// A subcommand: how its arguments are declared, and what they ask for once they are parsed.
+struct Subcommand {
+  const char* name;
+  const char* description;
+  const char* exitStatuses;
+  const char* errors;
+  const char* examples;
+  void (*add)(CLI::App& command, Arguments& arguments);
+  Asked (*asked)(Arguments& arguments);
+};
+
+constexpr Subcommand kSubcommands[] = {
+    {"run", help::kRun, help::kRunStatuses, help::kRunErrors, help::kRunExamples, addRun, runAsked},
+    {"restore", help::kRestore, help::kRestoreStatuses, help::kRestoreErrors,
+     help::kRestoreExamples, addRestore, restoreAsked},
+};
+
+void addSubcommand(CLI::App& program, const Subcommand& subcommand, Arguments& arguments) {
+  CLI::App& command = *program.add_subcommand(subcommand.name, subcommand.description);
+  addHelpAndVersion(command, kVersion);
+  command.footer(std::string("Exit status:\n") + subcommand.exitStatuses + help::kErrors +
+                 subcommand.errors + "\nExamples:\n" + subcommand.examples);
+  subcommand.add(command, arguments);
+  command.add_flag("--json", arguments.wantsJSON,
+                   "Write one JSON object on one line to standard output");
+}
+
+/// What the chosen subcommand asks for.
+Asked askedBy(const CLI::App& program, Arguments& arguments) {
+  for (const Subcommand& subcommand : kSubcommands) {
+    if (program.got_subcommand(subcommand.name)) {
+      return subcommand.asked(arguments);
+    }
+  }
+  return UnusableArguments{"A subcommand is required"};
 }
 
 }  // namespace
 
 CommandLine parseCommandLine(int argumentCount, const char* const* arguments) {
-  RunOptions options;
-  CLI::App program("Runs the account-settings migration plug-in.", "migration-host");
-  program.set_help_flag("-h,--help", "Print this help and exit");
-  program.set_version_flag("--version", kVersion, "Print the version and exit");
-  program.footer(kProgramExamples);
-  program.require_subcommand(0, 1);
-  RestoreOptions restoreOptions;
-  addRunCommand(program, options);
-  addRestoreCommand(program, restoreOptions);
-
-  try {
-    program.parse(argumentCount, arguments);
-  } catch (const CLI::CallForHelp&) {
-    return RequestedText{program.help()};
-  } catch (const CLI::CallForVersion& request) {
-    return RequestedText{std::string(request.what()) + "\n"};
-  } catch (const CLI::Error& error) {
-    return usageError(error.what(), argumentCount, arguments);
+  Arguments parsed;
+  CLI::App program(help::kProgram, kProgramName);
+  addHelpAndVersion(program, kVersion);
+  program.footer(help::kProgramExamples);
+  for (const Subcommand& subcommand : kSubcommands) {
+    addSubcommand(program, subcommand, parsed);
   }
-  // Asked only now, so that an unknown word is named rather than found to be missing.
-  if (program.get_subcommands().empty()) {
-    return usageError("A subcommand is required, such as run", argumentCount, arguments);
+  ArgumentParsing parsing = parseArguments(program, argumentCount, arguments);
+  CommandLine commandLine;
+  commandLine.wantsJSON = hasArgument(argumentCount, arguments, "--json");
+  if (auto* text = std::get_if<RequestedText>(&parsing)) {
+    commandLine.asked = std::move(*text);
+  } else if (auto* problem = std::get_if<UnusableArguments>(&parsing)) {
+    commandLine.asked = std::move(*problem);
+  } else {
+    commandLine.asked = askedBy(program, parsed);
   }
-  return program.got_subcommand("restore") ? CommandLine(restoreOptions) : CommandLine(options);
+  return commandLine;
 }
 
 }  // namespace accounts

@@ -8,19 +8,12 @@
 namespace accounts {
 namespace {
 
-constexpr const char* kBundleName = "accounts.migrator";
 constexpr const char* kPluginName = "AccountsDataMigrator.so";
 constexpr const char* kEntryPointName = "CreateMigrationPlugin";
 using EntryPoint = MigrationPluginBase*(Platform&);
 
-HostError missing(const std::string& message) {
-  return HostError{ExitStatus::MissingInput, message};
-}
-
-/// The directory of the running program; empty when the system does not tell.
-std::filesystem::path programDirectory() {
-  std::error_code error;
-  return std::filesystem::read_symlink("/proc/self/exe", error).parent_path();
+ProgramError missing(const std::string& message) {
+  return ProgramError{ExitStatus::MissingInput, message};
 }
 
 }  // namespace
@@ -29,12 +22,11 @@ std::filesystem::path PluginBundle::plugin() const {
   return path_ / kPluginName;
 }
 
-std::variant<PluginBundle, HostError> PluginBundle::find(
+std::variant<PluginBundle, ProgramError> PluginBundle::find(
     const std::optional<std::filesystem::path>& path) {
   // Absolute, because dlopen would search its own directories for a bare file name.
   std::error_code error;
-  PluginBundle bundle(
-      std::filesystem::absolute(path.value_or(programDirectory() / kBundleName), error));
+  PluginBundle bundle(std::filesystem::absolute(path.value_or(bundleBesideProgram()), error));
   if (!std::filesystem::is_directory(bundle.path_, error)) {
     return missing("No bundle at " + bundle.path_.string());
   }
@@ -44,7 +36,7 @@ std::variant<PluginBundle, HostError> PluginBundle::find(
   return bundle;
 }
 
-std::variant<std::unique_ptr<MigrationPluginBase>, HostError> PluginBundle::makePlugin(
+std::variant<std::unique_ptr<MigrationPluginBase>, ProgramError> PluginBundle::makePlugin(
     Platform& platform) const {
   // Never closed: objects of the plug-in may live as long as the process.
   void* const library = dlopen(plugin().c_str(), RTLD_NOW | RTLD_LOCAL);
@@ -59,7 +51,7 @@ std::variant<std::unique_ptr<MigrationPluginBase>, HostError> PluginBundle::make
   }
   std::unique_ptr<MigrationPluginBase> instance(entryPoint(platform));
   if (instance == nullptr) {
-    return HostError{ExitStatus::PluginEnded, "The plug-in made no instance of its class"};
+    return ProgramError{ExitStatus::PluginEnded, "The plug-in made no instance of its class"};
   }
   return instance;
 }

@@ -5,7 +5,8 @@
 #include <optional>
 #include <variant>
 
-#include "host/HostError.h"
+#include "commandline/BundleLocation.h"
+#include "commandline/ExitStatus.h"
 #include "platform/MigrationPluginBase.h"
 #include "platform/Platform.h"
 
@@ -16,16 +17,18 @@ class PluginBundle {
  public:
   /// The bundle at a path, or the one beside the running program. Nothing is loaded yet. An error
   /// when there is no such directory or no plug-in in it.
-  static std::variant<PluginBundle, HostError> find(
+  static std::variant<PluginBundle, ProgramError> find(
       const std::optional<std::filesystem::path>& path);
 
   [[nodiscard]] const std::filesystem::path& path() const { return path_; }
-  [[nodiscard]] std::filesystem::path resourcesDirectory() const { return path_ / "Resources"; }
+  [[nodiscard]] std::filesystem::path resourcesDirectory() const {
+    return resourcesOfBundle(path_);
+  }
 
   /// Loads the plug-in into this process, for good, and makes one instance of its principal class.
   /// The platform must stay alive as long as the process. An error when the plug-in cannot be
   /// loaded, has no entry point or makes no instance.
-  [[nodiscard]] std::variant<std::unique_ptr<MigrationPluginBase>, HostError> makePlugin(
+  [[nodiscard]] std::variant<std::unique_ptr<MigrationPluginBase>, ProgramError> makePlugin(
       Platform& platform) const;
 
  private:

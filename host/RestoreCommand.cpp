@@ -18,7 +18,7 @@ using JSON = nlohmann::ordered_json;
 
 Restoration failed(ExitStatus exitStatus, const std::string& message) {
   Restoration restoration;
-  restoration.error = HostError{exitStatus, message};
+  restoration.error = ProgramError{exitStatus, message};
   return restoration;
 }
 

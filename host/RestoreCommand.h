@@ -1,11 +1,21 @@
 #pragma once
 
+#include <optional>
 #include <string>
 
-#include "host/CommandLine.h"
-#include "host/Restoration.h"
+#include "safetynet/Restoration.h"
 
 namespace accounts {
+
+/// Kept files are to be put back.
+struct RestoreOptions {
+  /// The directory that holds the device, on the machine that the host runs on.
+  std::string root;
+  /// A device path; none for the platform's own.
+  std::optional<std::string> home;
+  /// The name or the device path of the folder of kept files; none for the only one.
+  std::optional<std::string> folder;
+};
 
 /// Puts kept files back on one device root and tells what came of it; also every error, for this
 /// never fails in another way.

@@ -5,31 +5,18 @@
 #include <utility>
 #include <variant>
 
+#include "commandline/PlatformError.h"
 #include "host/ChildProcess.h"
 #include "host/CurrentTime.h"
 #include "host/HeldLock.h"
 #include "host/PluginBundle.h"
 #include "host/RootLock.h"
-#include "host/SafetyNet.h"
-#include "host/SaveObserver.h"
 #include "platform/linux/LinuxPlatform.h"
+#include "safetynet/SafetyNet.h"
+#include "safetynet/SaveObserver.h"
 
 namespace accounts {
 namespace {
-
-ExitStatus exitStatusOf(LinuxPlatformError::Kind kind) {
-  switch (kind) {
-    case LinuxPlatformError::Kind::UnusableOption:
-      return ExitStatus::UnusableArguments;
-    case LinuxPlatformError::Kind::MissingInput:
-      return ExitStatus::MissingInput;
-    case LinuxPlatformError::Kind::CannotCreate:
-      return ExitStatus::CannotCreate;
-    case LinuxPlatformError::Kind::InputOutput:
-      break;
-  }
-  return ExitStatus::InputOutputError;
-}
 
 LinuxPlatformOptions platformOptions(const RunOptions& options, const PluginBundle& bundle) {
   LinuxPlatformOptions result;
@@ -57,9 +44,9 @@ struct ObservedPlatform {
 /// Loads the plug-in and lets it migrate, all in this process.
 RunReport runPlugin(const PluginBundle& bundle, ObservedPlatform& observed) {
   RunReport report;
-  std::variant<std::unique_ptr<MigrationPluginBase>, HostError> made =
+  std::variant<std::unique_ptr<MigrationPluginBase>, ProgramError> made =
       bundle.makePlugin(observed.platform);
-  if (const auto* error = std::get_if<HostError>(&made)) {
+  if (const auto* error = std::get_if<ProgramError>(&made)) {
     setError(report, *error);
     return report;
   }
@@ -80,16 +67,16 @@ RunReport runPlugin(const PluginBundle& bundle, ObservedPlatform& observed) {
 }
 
 /// Runs the plug-in in a child process, so that whatever ends it leaves someone to report it.
-std::variant<RunReport, HostError> runPluginInChild(const PluginBundle& bundle,
-                                                    ObservedPlatform& observed) {
-  const std::variant<std::string, HostError> outcome =
+std::variant<RunReport, ProgramError> runPluginInChild(const PluginBundle& bundle,
+                                                       ObservedPlatform& observed) {
+  const std::variant<std::string, ProgramError> outcome =
       runInChildProcess([&] { return jsonText(runPlugin(bundle, observed)); });
-  if (const auto* error = std::get_if<HostError>(&outcome)) {
+  if (const auto* error = std::get_if<ProgramError>(&outcome)) {
     return *error;
   }
   std::optional<RunReport> report = reportFromJSONText(std::get<std::string>(outcome));
   if (!report) {
-    return HostError{ExitStatus::PluginEnded, "The plug-in left no result"};
+    return ProgramError{ExitStatus::PluginEnded, "The plug-in left no result"};
   }
   return *std::move(report);
 }
@@ -103,38 +90,38 @@ std::string restoreCommand(const RunOptions& options) {
   return command;
 }
 
-PluginEnd endOf(const std::variant<RunReport, HostError>& outcome) {
+PluginEnd endOf(const std::variant<RunReport, ProgramError>& outcome) {
   if (const auto* report = std::get_if<RunReport>(&outcome)) {
     return report->result ? PluginEnd::GaveTrue : PluginEnd::GaveFalse;
   }
   return PluginEnd::Died;
 }
 
-RunReport reportOf(std::variant<RunReport, HostError> outcome) {
+RunReport reportOf(std::variant<RunReport, ProgramError> outcome) {
   if (auto* report = std::get_if<RunReport>(&outcome)) {
     return std::move(*report);
   }
   RunReport report;
-  setError(report, std::get<HostError>(outcome));
+  setError(report, std::get<ProgramError>(outcome));
   return report;
 }
 
 /// Runs the plug-in with its inputs kept around it.
-std::variant<RunReport, HostError> runPluginSafely(const RunOptions& options,
-                                                   const PluginBundle& bundle,
-                                                   const AccountFiles& files,
-                                                   ObservedPlatform& observed) {
+std::variant<RunReport, ProgramError> runPluginSafely(const RunOptions& options,
+                                                      const PluginBundle& bundle,
+                                                      const AccountFiles& files,
+                                                      ObservedPlatform& observed) {
   PathError lockError;
   const auto rootLock = RootLock::take(observed.linux.root(), lockError);
   if (!rootLock) {
-    return HostError{ExitStatus::CannotCreate, lockError.text};
+    return ProgramError{ExitStatus::CannotCreate, lockError.text};
   }
   SafetyNet safetyNet(observed.linux.fileSystem(), observed.platform.propertyLists, files,
                       restoreCommand(options));
   if (const Result kept = safetyNet.keepInputs(currentTimeText()); !kept) {
-    return HostError{ExitStatus::CannotCreate, "The files cannot be kept: " + kept.error()};
+    return ProgramError{ExitStatus::CannotCreate, "The files cannot be kept: " + kept.error()};
   }
-  std::variant<RunReport, HostError> outcome = runPluginInChild(bundle, observed);
+  std::variant<RunReport, ProgramError> outcome = runPluginInChild(bundle, observed);
   const PluginEnd end = endOf(outcome);
   RunReport report = reportOf(std::move(outcome));
   std::optional<HeldLock> migrationLock;
@@ -152,9 +139,9 @@ std::variant<RunReport, HostError> runPluginSafely(const RunOptions& options,
   return report;
 }
 
-std::variant<RunReport, HostError> findAndRunPlugin(const RunOptions& options) {
-  const std::variant<PluginBundle, HostError> bundle = PluginBundle::find(options.plugin);
-  if (const auto* error = std::get_if<HostError>(&bundle)) {
+std::variant<RunReport, ProgramError> findAndRunPlugin(const RunOptions& options) {
+  const std::variant<PluginBundle, ProgramError> bundle = PluginBundle::find(options.plugin);
+  if (const auto* error = std::get_if<ProgramError>(&bundle)) {
     return *error;
   }
   const auto& found = std::get<PluginBundle>(bundle);
@@ -162,7 +149,7 @@ std::variant<RunReport, HostError> findAndRunPlugin(const RunOptions& options) {
   const std::unique_ptr<LinuxPlatform> platform =
       LinuxPlatform::create(platformOptions(options, found), error);
   if (platform == nullptr) {
-    return HostError{exitStatusOf(error.kind), error.text};
+    return programErrorOf(error);
   }
   const AccountFiles files = accountFilesInHome(platform->platform().homeDirectory.path());
   ObservedPlatform observed(*platform, files);

@@ -59,7 +59,7 @@ std::string escaped(const std::string& text) {
 
 }  // namespace
 
-void setError(RunReport& report, const HostError& error) {
+void setError(RunReport& report, const ProgramError& error) {
   report.exitStatus = error.exitStatus;
   report.error = error.message;
 }

@@ -5,10 +5,9 @@
 #include <string>
 #include <vector>
 
-#include "host/ExitStatus.h"
-#include "host/HostError.h"
-#include "host/SettingsSaves.h"
+#include "commandline/ExitStatus.h"
 #include "platform/linux/RecordingPreferencesBroadcast.h"
+#include "safetynet/SettingsSaves.h"
 
 namespace accounts {
 
@@ -35,7 +34,7 @@ struct RunReport {
 };
 
 /// Notes an error of the host's own in a report.
-void setError(RunReport& report, const HostError& error);
+void setError(RunReport& report, const ProgramError& error);
 
 /// A report as one JSON object on one line, without a line end. Bytes that are no UTF-8 are
 /// replaced.

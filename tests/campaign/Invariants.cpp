@@ -5,8 +5,8 @@
 
 #include "accountsettings/AccountVocabulary.h"
 #include "accountsettings/AccountsManager.h"
-#include "host/AccountFiles.h"
 #include "propertylist/PropertyListFile.h"
+#include "safetynet/AccountFiles.h"
 #include "tests/program/StoredVersionsComparison.h"
 
 namespace accounts {

@@ -1,10 +1,10 @@
-#include "host/SafetyNet.h"
+#include "safetynet/SafetyNet.h"
 
 #include <algorithm>
 #include <utility>
 
-#include "host/MigrationCheck.h"
-#include "host/PutBack.h"
+#include "safetynet/MigrationCheck.h"
+#include "safetynet/PutBack.h"
 
 namespace accounts {
 
@@ -81,13 +81,14 @@ void SafetyNet::settleUnverified(Settlement& settlement, const std::string& reas
                                  const SettingsSaves& saves) {
   const std::string summary = "The plug-in reported success but " + reason;
   if (const Result back = putInputsBack(saves); !back) {
-    settlement.error = HostError{ExitStatus::InputOutputError,
-                                 summary + ", and the files cannot be put back: " + back.error() +
-                                     (folder_ ? "; " + howToRestore() : "")};
+    settlement.error =
+        ProgramError{ExitStatus::InputOutputError,
+                     summary + ", and the files cannot be put back: " + back.error() +
+                         (folder_ ? "; " + howToRestore() : "")};
     return;
   }
   settlement.error =
-      HostError{ExitStatus::NotVerified, summary + "; the files are put back as they were"};
+      ProgramError{ExitStatus::NotVerified, summary + "; the files are put back as they were"};
   discardFolder(settlement);
 }
 

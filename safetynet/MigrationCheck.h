@@ -4,9 +4,9 @@
 #include <string>
 #include <vector>
 
-#include "host/AccountFiles.h"
-#include "host/SettingsSaves.h"
 #include "platform/PropertyLists.h"
+#include "safetynet/AccountFiles.h"
+#include "safetynet/SettingsSaves.h"
 
 namespace accounts {
 

@@ -1,4 +1,4 @@
-#include "host/SaveObserver.h"
+#include "safetynet/SaveObserver.h"
 
 #include <gtest/gtest.h>
 

@@ -6,13 +6,13 @@
 #include <string_view>
 #include <vector>
 
-#include "host/AccountFiles.h"
-#include "host/HostError.h"
-#include "host/KeptFolders.h"
-#include "host/SettingsSaves.h"
+#include "commandline/ExitStatus.h"
 #include "platform/FileSystem.h"
 #include "platform/PropertyLists.h"
 #include "platform/Result.h"
+#include "safetynet/AccountFiles.h"
+#include "safetynet/KeptFolders.h"
+#include "safetynet/SettingsSaves.h"
 
 namespace accounts {
 
@@ -28,7 +28,7 @@ enum class PluginEnd : std::uint8_t {
 /// What the safety net has to say after a run.
 struct Settlement {
   /// Set when the plug-in gave true and its result could not be verified.
-  std::optional<HostError> error;
+  std::optional<ProgramError> error;
   /// One sentence each without a full stop.
   std::vector<std::string> warnings;
   /// The folders of kept files that are there now, oldest first.

@@ -1,20 +1,20 @@
-#include "host/Restoration.h"
+#include "safetynet/Restoration.h"
 
 #include <utility>
 #include <variant>
 
-#include "host/KeptFolders.h"
-#include "host/PutBack.h"
+#include "safetynet/KeptFolders.h"
+#include "safetynet/PutBack.h"
 
 namespace accounts {
 namespace {
 
-HostError missing(std::string message) {
-  return HostError{ExitStatus::MissingInput, std::move(message)};
+ProgramError missing(std::string message) {
+  return ProgramError{ExitStatus::MissingInput, std::move(message)};
 }
 
-std::variant<std::string, HostError> chosenFolder(const KeptFolders& folders,
-                                                  const std::optional<std::string>& asked) {
+std::variant<std::string, ProgramError> chosenFolder(const KeptFolders& folders,
+                                                     const std::optional<std::string>& asked) {
   if (asked) {
     const std::string name(nameOf(*asked));
     const bool isElsewhere = *asked != name && *asked != KeptFolders::pathOf(name);
@@ -32,14 +32,14 @@ std::variant<std::string, HostError> chosenFolder(const KeptFolders& folders,
     for (const std::string& folder : kept) {
       message.append(" ").append(nameOf(folder));
     }
-    return HostError{ExitStatus::UnusableArguments, std::move(message)};
+    return ProgramError{ExitStatus::UnusableArguments, std::move(message)};
   }
   return kept.front();
 }
 
-std::variant<std::vector<std::string>, HostError> filesIn(FileSystem& files,
-                                                          const AccountFiles& accountFiles,
-                                                          const std::string& folder) {
+std::variant<std::vector<std::string>, ProgramError> filesIn(FileSystem& files,
+                                                             const AccountFiles& accountFiles,
+                                                             const std::string& folder) {
   std::vector<std::string> held;
   for (const std::string& path : accountFiles.inputs()) {
     const std::optional<EntryKind> kind = files.kindOfEntry(keptPath(folder, path));
@@ -56,10 +56,10 @@ std::variant<std::vector<std::string>, HostError> filesIn(FileSystem& files,
 }
 
 /// Keeps the files that are about to be replaced.
-std::optional<HostError> keepReplaced(FileSystem& files, KeptFolders& folders,
-                                      Restoration& restoration,
-                                      const std::vector<std::string>& paths,
-                                      std::string_view time) {
+std::optional<ProgramError> keepReplaced(FileSystem& files, KeptFolders& folders,
+                                         Restoration& restoration,
+                                         const std::vector<std::string>& paths,
+                                         std::string_view time) {
   std::vector<std::string> replaced;
   for (const std::string& path : paths) {
     const std::optional<EntryKind> kind = files.kindOfEntry(path);
@@ -68,8 +68,8 @@ std::optional<HostError> keepReplaced(FileSystem& files, KeptFolders& folders,
         replaced.push_back(path);
       }
     } else if (kind != EntryKind::Nothing) {
-      return HostError{ExitStatus::CannotCreate,
-                       path + " is no regular file, so it is not replaced"};
+      return ProgramError{ExitStatus::CannotCreate,
+                          path + " is no regular file, so it is not replaced"};
     }
   }
   if (replaced.empty()) {
@@ -77,8 +77,8 @@ std::optional<HostError> keepReplaced(FileSystem& files, KeptFolders& folders,
   }
   std::string folder;
   if (const Result kept = folders.keep(replaced, KeptFor::Restoration, time, folder); !kept) {
-    return HostError{ExitStatus::CannotCreate,
-                     "What would be replaced cannot be kept: " + kept.error()};
+    return ProgramError{ExitStatus::CannotCreate,
+                        "What would be replaced cannot be kept: " + kept.error()};
   }
   restoration.replaced = std::move(folder);
   return std::nullopt;
@@ -106,13 +106,13 @@ Restoration restoreKeptFiles(FileSystem& files, const AccountFiles& accountFiles
   Restoration restoration;
   KeptFolders folders(files);
   auto chosen = chosenFolder(folders, folder);
-  if (auto* error = std::get_if<HostError>(&chosen)) {
+  if (auto* error = std::get_if<ProgramError>(&chosen)) {
     restoration.error = std::move(*error);
     return restoration;
   }
   restoration.folder = std::get<std::string>(std::move(chosen));
   auto held = filesIn(files, accountFiles, *restoration.folder);
-  if (auto* error = std::get_if<HostError>(&held)) {
+  if (auto* error = std::get_if<ProgramError>(&held)) {
     restoration.error = std::move(*error);
     return restoration;
   }
@@ -124,13 +124,13 @@ Restoration restoreKeptFiles(FileSystem& files, const AccountFiles& accountFiles
     return restoration;
   }
   if (const Result back = putAllBack(files, accountFiles, restoration, paths); !back) {
-    restoration.error = HostError{ExitStatus::InputOutputError,
-                                  "Not everything could be put back, " + *restoration.folder +
-                                      " is still whole: " + back.error()};
+    restoration.error = ProgramError{ExitStatus::InputOutputError,
+                                     "Not everything could be put back, " + *restoration.folder +
+                                         " is still whole: " + back.error()};
   } else if (const Result discarded = folders.discard(*restoration.folder); !discarded) {
-    restoration.error =
-        HostError{ExitStatus::InputOutputError,
-                  "Everything is put back, but the folder cannot be removed: " + discarded.error()};
+    restoration.error = ProgramError{
+        ExitStatus::InputOutputError,
+        "Everything is put back, but the folder cannot be removed: " + discarded.error()};
   }
   return restoration;
 }

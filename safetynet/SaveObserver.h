@@ -5,8 +5,8 @@
 #include <string_view>
 #include <vector>
 
-#include "host/SettingsSaves.h"
 #include "platform/FileSystem.h"
+#include "safetynet/SettingsSaves.h"
 
 namespace accounts {
 

@@ -1,4 +1,4 @@
-#include "accountsctl/ReplacedFile.h"
+#include "commandline/ReplacedFile.h"
 
 #include <sys/stat.h>
 

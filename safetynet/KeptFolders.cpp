@@ -1,10 +1,10 @@
-#include "host/KeptFolders.h"
+#include "safetynet/KeptFolders.h"
 
 #include <algorithm>
 #include <array>
 #include <optional>
 
-#include "host/AccountFiles.h"
+#include "safetynet/AccountFiles.h"
 
 namespace accounts {
 namespace {

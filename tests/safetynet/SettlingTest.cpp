@@ -1,4 +1,4 @@
-#include "tests/host/SafetyNetFixture.h"
+#include "tests/safetynet/SafetyNetFixture.h"
 
 namespace accounts {
 namespace {

@@ -1,10 +1,10 @@
-#include "host/MigrationCheck.h"
+#include "safetynet/MigrationCheck.h"
 
 #include <algorithm>
 #include <cstddef>
 #include <set>
 
-#include "host/PutBack.h"
+#include "safetynet/PutBack.h"
 
 namespace accounts {
 namespace {

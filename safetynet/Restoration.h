@@ -5,9 +5,9 @@
 #include <string_view>
 #include <vector>
 
-#include "host/AccountFiles.h"
-#include "host/HostError.h"
+#include "commandline/ExitStatus.h"
 #include "platform/FileSystem.h"
+#include "safetynet/AccountFiles.h"
 
 namespace accounts {
 
@@ -20,7 +20,7 @@ struct Restoration {
   std::vector<std::string> restored;
   /// The folder in which the files that they replaced are kept; none when they replaced none.
   std::optional<std::string> replaced;
-  std::optional<HostError> error;
+  std::optional<ProgramError> error;
 };
 
 /// Puts the files of a folder of kept files back and removes the folder. Files that it does not

@@ -7,7 +7,7 @@
 #include <string_view>
 #include <vector>
 
-#include "host/SafetyNet.h"
+#include "safetynet/SafetyNet.h"
 #include "tests/fakes/FakePlatform.h"
 
 namespace accounts {

@@ -3,9 +3,9 @@
 #include <string>
 #include <string_view>
 
-#include "host/AccountFiles.h"
 #include "platform/FileSystem.h"
 #include "platform/Result.h"
+#include "safetynet/AccountFiles.h"
 
 namespace accounts {
 

@@ -1,6 +1,6 @@
-#include "host/Restoration.h"
+#include "safetynet/Restoration.h"
 
-#include "tests/host/SafetyNetFixture.h"
+#include "tests/safetynet/SafetyNetFixture.h"
 
 namespace accounts {
 namespace {

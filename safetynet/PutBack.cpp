@@ -1,4 +1,4 @@
-#include "host/PutBack.h"
+#include "safetynet/PutBack.h"
 
 namespace accounts {
 namespace {

@@ -1,4 +1,4 @@
-#include "host/AccountFiles.h"
+#include "safetynet/AccountFiles.h"
 
 namespace accounts {
 
