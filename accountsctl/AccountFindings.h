@@ -4,9 +4,9 @@
 #include <vector>
 
 #include "accountsctl/Finding.h"
-#include "accountsctl/ListedAccount.h"
-#include "accountsctl/StoreLayout.h"
 #include "accountsettings/BasicAccount.h"
+#include "inspection/ListedAccount.h"
+#include "inspection/StoreLayout.h"
 
 namespace accounts {
 

@@ -9,9 +9,9 @@
 #include "accountsctl/LegacyFindings.h"
 #include "accountsctl/PropertyListInput.h"
 #include "accountsctl/SettingsFindings.h"
-#include "accountsctl/StoreLayout.h"
 #include "accountsctl/TextTable.h"
 #include "commandline/BundleLocation.h"
+#include "inspection/StoreLayout.h"
 
 namespace accounts {
 namespace {

@@ -5,8 +5,10 @@
 #include <vector>
 
 #include "accountsctl/DifferenceReport.h"
+#include "accountsctl/JSONText.h"
 #include "accountsctl/PropertyListInput.h"
-#include "accountsctl/StoreDifference.h"
+#include "inspection/DifferenceJSON.h"
+#include "inspection/StoreDifference.h"
 
 namespace accounts {
 namespace {

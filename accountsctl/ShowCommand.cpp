@@ -2,7 +2,7 @@
 
 #include "accountsctl/JSONText.h"
 #include "accountsctl/PropertyListInput.h"
-#include "accountsctl/StoreLayout.h"
+#include "inspection/StoreLayout.h"
 #include "propertylist/XMLPropertyList.h"
 
 namespace accounts {

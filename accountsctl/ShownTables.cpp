@@ -1,10 +1,10 @@
 #include <fmt/format.h>
 
-#include "accountsctl/ListedAccount.h"
 #include "accountsctl/ShowCommand.h"
-#include "accountsctl/StoreLayout.h"
 #include "accountsctl/TextTable.h"
 #include "accountsettings/AccountsManager.h"
+#include "inspection/ListedAccount.h"
+#include "inspection/StoreLayout.h"
 #include "propertylist/Description.h"
 
 namespace accounts {

@@ -1,10 +1,9 @@
 #include "host/RestoreCommand.h"
 
-#include <nlohmann/json.hpp>
-
 #include "host/CurrentTime.h"
 #include "host/HeldLock.h"
 #include "host/RootLock.h"
+#include "inspection/PropertyListJSON.h"
 #include "platform/linux/DeviceRoot.h"
 #include "platform/linux/LinuxFileSystem.h"
 #include "platform/linux/LinuxPlatform.h"
@@ -14,16 +13,10 @@
 namespace accounts {
 namespace {
 
-using JSON = nlohmann::ordered_json;
-
 Restoration failed(ExitStatus exitStatus, const std::string& message) {
   Restoration restoration;
   restoration.error = ProgramError{exitStatus, message};
   return restoration;
-}
-
-JSON textOrNull(const std::optional<std::string>& text) {
-  return text ? JSON(*text) : JSON(nullptr);
 }
 
 std::string escapedLine(const std::string& beginning, const std::string& text) {
@@ -69,9 +62,7 @@ std::string jsonText(const Restoration& restoration, const std::string& root) {
   if (restoration.error) {
     object["error"] = restoration.error->message;
   }
-  constexpr int onOneLine = -1;
-  constexpr bool keepUnicode = false;
-  return object.dump(onOneLine, ' ', keepUnicode, JSON::error_handler_t::replace);
+  return lineOf(object);
 }
 
 std::string summaryText(const Restoration& restoration) {

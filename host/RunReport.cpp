@@ -1,14 +1,10 @@
 #include "host/RunReport.h"
 
-#include <nlohmann/json.hpp>
-
+#include "inspection/PropertyListJSON.h"
 #include "propertylist/Description.h"
 
 namespace accounts {
 namespace {
-
-// Keys that a person reads first stand first.
-using JSON = nlohmann::ordered_json;
 
 constexpr const char* kRootKey = "root";
 constexpr const char* kDataClassNameKey = "dataClassName";
@@ -24,10 +20,6 @@ constexpr const char* kKeptInputsKey = "keptInputs";
 constexpr const char* kWarningsKey = "warnings";
 constexpr const char* kExitStatusKey = "exitStatus";
 constexpr const char* kErrorKey = "error";
-
-JSON textOrNull(const std::optional<std::string>& text) {
-  return text ? JSON(*text) : JSON(nullptr);
-}
 
 std::optional<std::string> optionalText(const JSON& object, const char* key) {
   const auto found = object.find(key);
@@ -82,9 +74,7 @@ std::string jsonText(const RunReport& report) {
   if (report.error) {
     object[kErrorKey] = *report.error;
   }
-  constexpr int onOneLine = -1;
-  constexpr bool keepUnicode = false;
-  return object.dump(onOneLine, ' ', keepUnicode, JSON::error_handler_t::replace);
+  return lineOf(object);
 }
 
 std::optional<RunReport> reportFromJSONText(const std::string& text) {

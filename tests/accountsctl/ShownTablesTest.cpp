@@ -1,7 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "accountsctl/ShowCommand.h"
-#include "accountsctl/StoreLayout.h"
+#include "inspection/StoreLayout.h"
 
 namespace accounts {
 namespace {

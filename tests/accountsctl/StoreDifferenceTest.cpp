@@ -1,8 +1,9 @@
-#include "accountsctl/StoreDifference.h"
+#include "inspection/StoreDifference.h"
 
 #include <gtest/gtest.h>
 
 #include "accountsctl/DifferenceReport.h"
+#include "inspection/DifferenceJSON.h"
 
 namespace accounts {
 namespace {

@@ -1,4 +1,4 @@
-#include "accountsctl/StoreLayout.h"
+#include "inspection/StoreLayout.h"
 
 #include <algorithm>
 #include <iterator>

@@ -1,4 +1,4 @@
-#include "accountsctl/PropertyDifference.h"
+#include "inspection/PropertyDifference.h"
 
 namespace accounts {
 namespace {

@@ -5,7 +5,7 @@
 #include <string_view>
 #include <vector>
 
-#include "accountsctl/StoreLayout.h"
+#include "inspection/StoreLayout.h"
 #include "propertylist/PropertyValue.h"
 
 namespace accounts {

@@ -1,4 +1,4 @@
-#include "accountsctl/ListedAccount.h"
+#include "inspection/ListedAccount.h"
 
 #include "propertylist/Description.h"
 

@@ -4,9 +4,9 @@
 #include <string>
 #include <vector>
 
-#include "accountsctl/ListedAccount.h"
-#include "accountsctl/PropertyDifference.h"
-#include "accountsctl/StoreLayout.h"
+#include "inspection/ListedAccount.h"
+#include "inspection/PropertyDifference.h"
+#include "inspection/StoreLayout.h"
 #include "propertylist/PropertyValue.h"
 #include "propertylist/SecretKeys.h"
 

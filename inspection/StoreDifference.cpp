@@ -1,4 +1,4 @@
-#include "accountsctl/StoreDifference.h"
+#include "inspection/StoreDifference.h"
 
 #include <deque>
 #include <unordered_map>
