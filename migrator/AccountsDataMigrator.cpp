@@ -5,6 +5,7 @@
 #include "accountsettings/Log.h"
 #include "accountsettings/Paths.h"
 #include "accountsettings/Process.h"
+#include "migrator/MigrationStage.h"
 
 namespace accounts {
 
@@ -49,12 +50,14 @@ bool AccountsDataMigrator::performMigration() {
 
 bool AccountsDataMigrator::executeMigrationSteps() {
   AccountsManager::_setShouldSkipNotifications(true);
-  _copyAsideAccountsPlist();
+  runStage("_copyAsideAccountsPlist", "Keep a copy of the settings file for engineers",
+           [&] { _copyAsideAccountsPlist(); });
 
   if (_failedToRemoveOldAccountsInfo()) {
     // Kept on purpose: the "!." ending is what engineers search device logs for.
     logToConsole("Detected that a removal old accounts info was in progress. Early return!.");
-    static_cast<void>(_removeOldAccountsInfo());
+    runStage("_removeOldAccountsInfo", "Finish the removal of the legacy stores",
+             [&] { static_cast<void>(_removeOldAccountsInfo()); });
     // Kept on purpose: notifications stay switched off on this path; the process ends after it, and
     // nothing that it did is an account change to be told.
     return true;
@@ -64,13 +67,17 @@ bool AccountsDataMigrator::executeMigrationSteps() {
   AccountsManager::shouldMigrateOldMailAccounts_oldDAAccounts_newAccountSettings(
       &needs.oldMailAccounts, &needs.oldDAAccounts, &needs.newAccountSettings);
 
+  MigrationStage opening("initInsideOfMigration", "Open the settings file");
   std::unique_ptr<AccountsManager> store = AccountsManager::initInsideOfMigration();
+  opening.end(true, store.get());
   const bool succeeded = !needs.any() || runMigrations(*store, needs);
 
   // Kept on purpose: a store whose upgrade failed is stamped and saved as well, so that the device
   // keeps what was achieved; the legacy stores then stay.
+  MigrationStage saving("saveAllAccounts", "Save the accounts");
   store->setDataVersion(AccountsManager::currentVersion());
   store->saveAllAccounts();
+  saving.end(true, store.get());
   store.reset();
 
   if (succeeded) {
@@ -91,10 +98,12 @@ bool AccountsDataMigrator::runMigrations(AccountsManager& store, const Needs& ne
   // upgrade chain's result alone decides; combining the results would keep a device with one broken
   // legacy description from ever finishing.
   if (needs.oldDAAccounts) {
-    static_cast<void>(_migrateDAAccounts(store));
+    static_cast<void>(runStage("_migrateDAAccounts:", "Convert the legacy Exchange accounts", store,
+                               [&] { return _migrateDAAccounts(store); }));
   }
   if (needs.oldMailAccounts) {
-    static_cast<void>(_migrateMailAccounts(store));
+    static_cast<void>(runStage("_migrateMailAccounts:", "Convert the legacy mail accounts", store,
+                               [&] { return _migrateMailAccounts(store); }));
   }
   return _migrateNewAccountsInfo(store);
 }
@@ -102,12 +111,15 @@ bool AccountsDataMigrator::runMigrations(AccountsManager& store, const Needs& ne
 void AccountsDataMigrator::finishSuccessfulMigration(const Needs& needs) {
   if (needs.legacyStores()) {
     // Its failures are logged where they happen; the accounts are carried over already.
-    static_cast<void>(_removeOldAccountsInfo());
+    runStage("_removeOldAccountsInfo", "Remove the legacy stores",
+             [&] { static_cast<void>(_removeOldAccountsInfo()); });
   }
   if (_saveMigrationInformation()) {
-    _saveCollatedMigrationInformation();
+    runStage("_saveCollatedMigrationInformation", "Write the migration-information file",
+             [&] { _saveCollatedMigrationInformation(); });
   }
-  tellMailApplication(Process::current().platform);
+  runStage("announceChange", "Tell the mail application that its accounts changed",
+           [] { tellMailApplication(Process::current().platform); });
 }
 
 }  // namespace accounts

@@ -4,6 +4,7 @@
 
 #include "accountsettings/Process.h"
 #include "migrator/LegacyStoreKeys.h"
+#include "migrator/MigrationStage.h"
 
 namespace accounts {
 
@@ -47,7 +48,8 @@ bool AccountsDataMigrator::runUpgradeChain(AccountsManager& store,
   }
   const auto entry = std::ranges::find(chain, version, &UpgradeStep::entryVersion);
   return entry != chain.end() && std::all_of(entry, chain.end(), [&](const UpgradeStep& step) {
-           return (this->*step.run)(store);
+           return runStage(step.name, step.purpose, store,
+                           [&] { return (this->*step.run)(store); });
          });
 }
 

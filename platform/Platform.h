@@ -13,6 +13,7 @@
 #include "platform/LocalizedStrings.h"
 #include "platform/LogSystem.h"
 #include "platform/MailDirectory.h"
+#include "platform/MigrationObserver.h"
 #include "platform/PairingValueStore.h"
 #include "platform/PreferenceDomain.h"
 #include "platform/PreferencesBroadcast.h"
@@ -46,6 +47,8 @@ struct Platform {
   PropertyLists& propertyLists;
   SharedResources& sharedResources;
   UUIDGenerator& uuidGenerator;
+  /// None for a migration that nobody watches, which then costs nothing.
+  MigrationObserver* migrationObserver = nullptr;
 };
 
 }  // namespace accounts

@@ -5,11 +5,11 @@ namespace accounts {
 std::optional<std::string> SaveObserver::makeTemporaryFile() {
   // A save has begun; unless the rename comes, it failed.
   saves_.last = LastSave::Failed;
-  return files_.makeTemporaryFile();
+  return ForwardingFileSystem::makeTemporaryFile();
 }
 
 Result SaveObserver::renameFile(std::string_view source, std::string_view destination) {
-  const Result result = files_.renameFile(source, destination);
+  const Result result = ForwardingFileSystem::renameFile(source, destination);
   if (destination == settingsPath_) {
     saves_.replacedFile = true;
     saves_.last = result ? LastSave::Written : LastSave::Failed;

@@ -24,6 +24,7 @@ template <std::size_t... versions>
 constexpr std::array<UpgradeStep, sizeof...(versions)> recordingChain(
     std::index_sequence<versions...>) {
   return {{{upgradeChain.at(versions).entryVersion, upgradeChain.at(versions).name,
+            upgradeChain.at(versions).purpose,
             static_cast<UpgradeStep::Operation>(&RecordingMigrator::step<versions>)}...}};
 }
 

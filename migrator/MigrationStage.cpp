@@ -1,0 +1,42 @@
+#include "migrator/MigrationStage.h"
+
+#include <optional>
+#include <vector>
+
+#include "accountsettings/Process.h"
+
+namespace accounts {
+
+namespace {
+
+MigrationObserver* observer() {
+  return Process::current().platform.migrationObserver;
+}
+
+/// What a settings file of the accounts in memory would hold.
+PropertyDictionary accountSettings(const AccountsManager& store) {
+  std::vector<PropertyValue> accounts;
+  accounts.reserve(store.allBasicAccounts().size());
+  for (const BasicAccountReference& account : store.allBasicAccounts()) {
+    accounts.emplace_back(account->propertiesToSave());
+  }
+  return {{kPlistAccountsKey, PropertyArray(std::move(accounts))},
+          {kPlistVersionKey, store.dataVersion()}};
+}
+
+}  // namespace
+
+MigrationStage::MigrationStage(std::string_view operation, std::string_view purpose) {
+  if (MigrationObserver* const told = observer()) {
+    told->stageBegan(operation, purpose);
+  }
+}
+
+void MigrationStage::end(bool succeeded, const AccountsManager* store) {
+  if (MigrationObserver* const told = observer()) {
+    told->stageEnded(succeeded,
+                     store != nullptr ? std::optional(accountSettings(*store)) : std::nullopt);
+  }
+}
+
+}  // namespace accounts

@@ -1,0 +1,67 @@
+#pragma once
+
+#include "platform/FileSystem.h"
+
+namespace accounts {
+
+/// Another file system, seen through something that adds to a few of its operations: each one that
+/// is not overridden is the other's own.
+class ForwardingFileSystem : public FileSystem {
+ public:
+  /// `files` must outlive this.
+  explicit ForwardingFileSystem(FileSystem& files) : files_(files) {}
+
+  bool fileExists(std::string_view path) override { return files_.fileExists(path); }
+  bool isDirectory(std::string_view path) override { return files_.isDirectory(path); }
+  std::optional<EntryKind> kindOfEntry(std::string_view path) override {
+    return files_.kindOfEntry(path);
+  }
+  std::optional<std::vector<std::string>> directoryEntries(std::string_view path) override {
+    return files_.directoryEntries(path);
+  }
+  bool haveSameContents(std::string_view first, std::string_view second) override {
+    return files_.haveSameContents(first, second);
+  }
+  Result copyFile(std::string_view source, std::string_view destination) override {
+    return files_.copyFile(source, destination);
+  }
+  Result linkFile(std::string_view source, std::string_view destination) override {
+    return files_.linkFile(source, destination);
+  }
+  Result removeFile(std::string_view path) override { return files_.removeFile(path); }
+  Result createFile(std::string_view path, std::string_view contents) override {
+    return files_.createFile(path, contents);
+  }
+  Result createDirectoryWithIntermediates(std::string_view path, unsigned permissions) override {
+    return files_.createDirectoryWithIntermediates(path, permissions);
+  }
+  Result removeDirectory(std::string_view path) override { return files_.removeDirectory(path); }
+  Result renameDirectory(std::string_view source, std::string_view destination) override {
+    return files_.renameDirectory(source, destination);
+  }
+  Result synchronizeDirectory(std::string_view path) override {
+    return files_.synchronizeDirectory(path);
+  }
+  std::optional<std::string> makeTemporaryFile() override { return files_.makeTemporaryFile(); }
+  void removeAbandonedTemporaryFiles(const std::vector<std::string>& furtherDirectories) override {
+    files_.removeAbandonedTemporaryFiles(furtherDirectories);
+  }
+  Result writeFile(std::string_view path, std::string_view contents) override {
+    return files_.writeFile(path, contents);
+  }
+  Result writeFileAtomically(std::string_view path, std::string_view contents) override {
+    return files_.writeFileAtomically(path, contents);
+  }
+  Result setOwnerAndGroup(std::string_view path, std::string_view ownerName,
+                          std::string_view groupName) override {
+    return files_.setOwnerAndGroup(path, ownerName, groupName);
+  }
+  Result renameFile(std::string_view source, std::string_view destination) override {
+    return files_.renameFile(source, destination);
+  }
+
+ private:
+  FileSystem& files_;
+};
+
+}  // namespace accounts

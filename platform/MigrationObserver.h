@@ -1,0 +1,26 @@
+#pragma once
+
+#include <optional>
+#include <string_view>
+
+#include "propertylist/PropertyValue.h"
+
+namespace accounts {
+
+/// Is told what a migration does, stage by stage, on the migration's own thread. No stage begins
+/// before the one before it has ended.
+class MigrationObserver {
+ public:
+  virtual ~MigrationObserver() = default;
+
+  /// A stage begins. `operation` is the name of the operation that it runs, `purpose` says in a
+  /// few words for people what that is for.
+  virtual void stageBegan(std::string_view operation, std::string_view purpose) = 0;
+
+  /// The stage that began last has ended. `accountSettings` is what a settings file of the accounts
+  /// in memory would hold now; none where they are not in memory.
+  virtual void stageEnded(bool succeeded,
+                          const std::optional<PropertyDictionary>& accountSettings) = 0;
+};
+
+}  // namespace accounts

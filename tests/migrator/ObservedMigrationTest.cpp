@@ -1,0 +1,122 @@
+#include "tests/migrator/MigratorFixture.h"
+
+namespace accounts {
+namespace {
+
+/// Remembers what it is told.
+class Observer final : public MigrationObserver {
+ public:
+  struct Stage {
+    std::string operation;
+    bool succeeded = false;
+    std::optional<PropertyDictionary> accountSettings;
+  };
+
+  void stageBegan(std::string_view operation, std::string_view purpose) override {
+    EXPECT_TRUE(hasEnded_) << operation << " began within another stage";
+    EXPECT_FALSE(purpose.empty());
+    hasEnded_ = false;
+    stages.push_back({std::string(operation), false, std::nullopt});
+  }
+  void stageEnded(bool succeeded,
+                  const std::optional<PropertyDictionary>& accountSettings) override {
+    EXPECT_FALSE(hasEnded_);
+    hasEnded_ = true;
+    stages.back().succeeded = succeeded;
+    stages.back().accountSettings = accountSettings;
+  }
+
+  [[nodiscard]] TextList operations() const {
+    TextList result;
+    for (const Stage& stage : stages) {
+      result.push_back(stage.operation);
+    }
+    return result;
+  }
+  [[nodiscard]] const Stage& stage(std::string_view operation) const {
+    return *std::find_if(stages.begin(), stages.end(),
+                         [&](const Stage& each) { return each.operation == operation; });
+  }
+
+  std::vector<Stage> stages;
+
+ private:
+  bool hasEnded_ = true;
+};
+
+class ObservedMigration : public MigratorTest {
+ protected:
+  ObservedMigration() { device.platform.migrationObserver = &observer; }
+
+  void addSettings(std::int64_t version) {
+    device.addPropertyList(
+        kSettingsPath,
+        PropertyDictionary{{"Version", version},
+                           {"Accounts", PropertyArray{PropertyDictionary{{"Identifier", "A"},
+                                                                         {"Type", "SMTP"},
+                                                                         {"Class", "SMTPAccount"},
+                                                                         {"uniqueId", "B"}}}}});
+  }
+
+  Observer observer;
+};
+
+TEST_F(ObservedMigration, OfNothingKeepsACopyOpensSavesAndTells) {
+  migrator.performMigration();
+  EXPECT_EQ(observer.operations(), (TextList{"_copyAsideAccountsPlist", "initInsideOfMigration",
+                                             "saveAllAccounts", "announceChange"}));
+}
+
+TEST_F(ObservedMigration, TellsEachStepOfTheChainThatRuns) {
+  addSettings(10);
+  migrator.performMigration();
+  EXPECT_EQ(observer.operations(),
+            (TextList{"_copyAsideAccountsPlist", "initInsideOfMigration",
+                      "_migrateAccountsFrom9A334:", "_migrateAccountsFrom9B176:", "saveAllAccounts",
+                      "announceChange"}));
+}
+
+TEST_F(ObservedMigration, TellsTheConversionsAndTheRemovalOfTheLegacyStores) {
+  device.addPropertyList(kLegacyMailPath, PropertyDictionary{{"MailAccounts", PropertyArray{}}});
+  device.addPropertyList(kLegacyExchangePath,
+                         PropertyDictionary{{"DAAccountsKey", PropertyArray{}}});
+  migrator.performMigration();
+  const TextList operations = observer.operations();
+  EXPECT_EQ(operations.at(2), "_migrateDAAccounts:");
+  EXPECT_EQ(operations.at(3), "_migrateMailAccounts:");
+  EXPECT_EQ(operations.at(operations.size() - 2), "_removeOldAccountsInfo");
+}
+
+TEST_F(ObservedMigration, TellsThatARemovalIsFinished) {
+  static_cast<void>(device.fileSystem.createFile(kSentinelPath, ""));
+  migrator.performMigration();
+  EXPECT_EQ(observer.operations(), (TextList{"_copyAsideAccountsPlist", "_removeOldAccountsInfo"}));
+}
+
+TEST_F(ObservedMigration, AConversionThatFailsIsAStageThatFailed) {
+  device.addPropertyList(
+      kLegacyExchangePath,
+      PropertyDictionary{{"DAAccountsKey", PropertyArray{PropertyDictionary{}}}});
+  EXPECT_TRUE(migrator.performMigration());
+  EXPECT_FALSE(observer.stage("_migrateDAAccounts:").succeeded);
+  EXPECT_TRUE(observer.stage("saveAllAccounts").succeeded);
+}
+
+TEST_F(ObservedMigration, EachStageShowsTheAccountsAsTheyAreAfterIt) {
+  addSettings(1);
+  migrator.performMigration();
+  const auto firstIdentifier = [&](std::string_view operation) {
+    const PropertyDictionary settings = *observer.stage(operation).accountSettings;
+    return settings.arrayForKey("Accounts")->begin()->asDictionary()->textForKey("Identifier");
+  };
+  EXPECT_EQ(firstIdentifier("initInsideOfMigration"), Text("A"));
+  EXPECT_EQ(firstIdentifier("_migrateAccountsFrom7A150:"), Text("B"));
+}
+
+TEST_F(ObservedMigration, AStageWithoutAStoreShowsNoAccounts) {
+  migrator.performMigration();
+  EXPECT_FALSE(observer.stage("announceChange").accountSettings);
+}
+
+}  // namespace
+}  // namespace accounts
