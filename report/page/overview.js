@@ -1,0 +1,111 @@
+// What came of the migration: one sentence, its facts, and what people must know of it.
+
+// The sentence for each outcome, by command. `%` stands for the versions, if they are known.
+const kSentences = {
+  run: {
+    migrated: "The accounts were migrated%.",
+    unchanged: "The migration succeeded and changed no account.",
+    unverified: "The result could not be verified, so the inputs were put back.",
+    failed: "The migration failed.",
+  },
+  plan: {
+    migrated: "A migration would bring the accounts up to date%.",
+    unchanged: "A migration would change no account.",
+    unverified: "The result of a migration could not be verified.",
+    failed: "A migration would fail.",
+  },
+};
+
+/** The outcome of a report: a key of kSentences' rows. */
+function outcomeOf(report, counts) {
+  if (report.result !== true) {
+    return "failed";
+  }
+  if ((report.exitStatus ?? 0) !== 0) {
+    return report.exitStatus === 2 ? "unverified" : "failed";
+  }
+  const { before, after } = report.versions ?? {};
+  const isChanged = Object.keys(kMarks).some((mark) => counts[mark] > 0);
+  return isChanged || before !== after ? "migrated" : "unchanged";
+}
+
+function versionWords({ before, after } = {}) {
+  if (after === null || after === undefined) {
+    return "";
+  }
+  return before === null || before === undefined ? ` to version ${after}` :
+    before === after ? `, which stay at version ${after}` : ` from version ${before} to ${after}`;
+}
+
+/** How many accounts have each mark; those without one are "unchanged". */
+function countMarks(accounts) {
+  const counts = { unchanged: 0 };
+  const removed = accounts.allBefore.filter((account) => account.partner === null);
+  for (const { marks } of [...accounts.allAfter, ...removed]) {
+    for (const mark of marks.length === 0 ? ["unchanged"] : marks) {
+      counts[mark] = (counts[mark] ?? 0) + 1;
+    }
+  }
+  return counts;
+}
+
+function timeOf(text) {
+  const date = new Date(text);
+  return Number.isNaN(date.getTime()) ? data("span", {}, text) :
+    make("time", { datetime: date.toISOString() },
+      date.toISOString().replace("T", " ").replace(/(\.\d+)?Z$/, " UTC"));
+}
+
+function overviewFacts(report) {
+  const versions = report.versions ?? {};
+  const seconds = (report.stages ?? []).reduce((sum, stage) => sum + (stage.seconds ?? 0), 0);
+  const facts = [
+    ["Root", report.root && data("code", {}, report.root)],
+    ["Time", report.time && timeOf(report.time)],
+    ["Version", "before" in versions || "after" in versions ?
+      `${versions.before ?? "none"} → ${versions.after ?? "none"}` : null],
+    ["Took", seconds > 0 ? duration(seconds) : null],
+    ["Exit status", report.exitStatus === undefined ? null : shown(report.exitStatus)],
+  ];
+  return make("dl", { class: "facts" }, facts.filter(([, value]) => value)
+    .map(([name, value]) => make("div", {}, make("dt", {}, name), make("dd", {}, value))));
+}
+
+/** A box with a heading and a list of texts; none if there is none. */
+function notice(kind, heading, texts) {
+  return texts.length === 0 ? null : make("section", { class: `notice ${kind}` },
+    make("h2", {}, heading), make("ul", {}, texts.map((text) => make("li", {}, data("span", {}, text)))));
+}
+
+/** The top of the page. */
+function overview(report, accounts) {
+  const counts = countMarks(accounts);
+  const outcome = outcomeOf(report, counts);
+  const sentence = (kSentences[report.command] ?? kSentences.run)[outcome]
+    .replace("%", () => shown(versionWords(report.versions)));
+  const marks = Object.keys(kMarks).filter((mark) => counts[mark] > 0);
+  const kept = report.keptInputs ?? [];
+  return [
+    make("p", { class: "kind" }, report.command === "plan" ? "Plan of a migration" : "Report of a migration"),
+    make("h1", { class: outcome }, make("span", { class: "sign", "aria-hidden": "true" },
+      outcome === "failed" || outcome === "unverified" ? "✕" : "✓"), sentence),
+    make("p", { class: "counts" }, marks.map((mark) => [make("span", { class: `badge ${mark}` },
+      `${counts[mark].toLocaleString("en")} ${mark}`), " "]),
+      counts.unchanged > 0 ? make("span", { class: "badge" }, `${counts.unchanged.toLocaleString("en")} unchanged`) : null),
+    overviewFacts(report),
+    notice("error", "Error", report.error ? [report.error] : []),
+    notice("warning", (report.warnings ?? []).length === 1 ? "Warning" : "Warnings", report.warnings ?? []),
+    notice("kept", "Kept inputs", kept),
+  ];
+}
+
+/** Whom the migration told of its changes; none if nobody. */
+function announcements(report) {
+  const lines = (report.broadcasts ?? []).map((each) => make("li", {},
+    data("code", {}, each.application ?? ""), " was told that ", data("code", {}, each.key ?? ""), " changed"));
+  if (report.cloudTabAnnouncements > 0) {
+    lines.push(make("li", {}, "Cloud tabs were announced ",
+      report.cloudTabAnnouncements === 1 ? "once" : `${report.cloudTabAnnouncements} times`));
+  }
+  return lines.length === 0 ? null : make("ul", { class: "announcements" }, lines);
+}

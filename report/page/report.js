@@ -1,0 +1,106 @@
+// Starts the page: reads the report, shows it, and lets a person filter, fold and print it.
+
+const kTypingMilliseconds = 150;
+
+function byId(id) {
+  return document.getElementById(id);
+}
+
+function contentOf(id) {
+  return document.querySelector(`#${id} > .content`);
+}
+
+/** The report and what was made of it; `reveal` brings a person to an account. */
+class Page {
+  constructor(report) {
+    this.report = report;
+    this.stages = report.stages ?? [];
+    this.accounts = accountsOf(report);
+    this.accountOfPart = new WeakMap();
+  }
+
+  showAll() {
+    byId("overview").replaceChildren(...overview(this.report, this.accounts).filter((each) => each !== null));
+    const told = announcements(this.report);
+    byId("announcements").hidden = told === null;
+    contentOf("announcements").replaceChildren(told ?? "");
+    const { allBefore, allAfter } = this.accounts;
+    byId("accounts").hidden = allBefore.length + allAfter.length === 0;
+    byId("steps").hidden = this.stages.length === 0;
+    byId("toolbar").hidden = byId("accounts").hidden && byId("steps").hidden;
+    byId("before-heading").append(make("span", { class: "dim" }, ` ${counted(allBefore.length, "account")}`));
+    byId("after-heading").append(make("span", { class: "dim" }, ` ${counted(allAfter.length, "account")}`));
+    this.showFiltered();
+  }
+
+  /** Shows what the filter leaves. */
+  showFiltered() {
+    const { allBefore, allAfter, before, after } = this.accounts;
+    const counts = [allBefore, allAfter].map((accounts) => accounts.filter(isChosen).length);
+    const stages = this.stages.filter(showsStage).length;
+    const isAll = filter.words.length === 0 && !filter.changedOnly;
+    setMatchCount(counts[0] + counts[1] + stages);
+    byId("shown").textContent = isAll ? "" : `Shown: ${stages} of ${counted(this.stages.length, "step")}, ` +
+      `${counts[0].toLocaleString("en")} of ${counted(allBefore.length, "account")} before, ` +
+      `${counts[1].toLocaleString("en")} of ${allAfter.length.toLocaleString("en")} after`;
+    contentOf("steps").replaceChildren(timeline(this.stages, this));
+    contentOf("before").replaceChildren(accountTree(before, this));
+    contentOf("after").replaceChildren(accountTree(after, this));
+  }
+
+  /** Brings the person to an account; a filter that hides it is taken away. */
+  reveal(account) {
+    if (!isChosen(account)) {
+      byId("filter").value = "";
+      byId("changed-only").checked = false;
+      setFilter("", false);
+      this.showFiltered();
+    }
+    buildTo(account);
+    goTo(account);
+  }
+}
+
+function watchFilter(page) {
+  const apply = () => {
+    setFilter(byId("filter").value, byId("changed-only").checked);
+    page.showFiltered();
+  };
+  let typing = null;
+  byId("filter").addEventListener("input", () => {
+    clearTimeout(typing);
+    typing = setTimeout(apply, kTypingMilliseconds);
+  });
+  byId("changed-only").addEventListener("change", apply);
+  document.addEventListener("keydown", (event) => {
+    const isTyping = event.target.closest?.("input, textarea, select");
+    if (event.key === "/" && !isTyping && !event.ctrlKey && !event.metaKey && !event.altKey) {
+      event.preventDefault();
+      byId("filter").focus();
+      byId("filter").select();
+    }
+  });
+}
+
+function start() {
+  let report = null;
+  try {
+    report = JSON.parse(byId("report").textContent);
+  } catch (error) {
+    byId("overview").replaceChildren(make("h1", { class: "failed" }, "This report cannot be read."),
+      make("p", {}, shown(error.message)));
+    return;
+  }
+  const page = new Page(isDictionary(report) ? report : {});
+  document.title = `${report.command === "plan" ? "Plan" : "Report"} of a migration: ${shown(report.root ?? "")}`;
+  page.showAll();
+  const content = byId("content");
+  watchParts(content);
+  watchPartners(byId("accounts"), page);
+  watchFilter(page);
+  openForPrinting(content);
+  byId("expand").addEventListener("click", () => expandAll(content));
+  byId("fold").addEventListener("click", () => foldAll(content));
+}
+
+start();

@@ -1,0 +1,147 @@
+// The steps of a migration as a timeline, and what each of them changed, wrote and logged.
+
+/** Whether a step did anything that can be seen in the device's files. */
+function changedAnything(stage) {
+  return [stage.accounts, stage.otherProperties, stage.files].some((list) => list?.length > 0);
+}
+
+/** Whether the filter shows a step. */
+function showsStage(stage) {
+  return (!filter.changedOnly || changedAnything(stage) || stage.succeeded === false) && matches(stage);
+}
+
+/** What of a step's list is shown: all of it if the step's own name has the words. */
+function chosenOf(stage, list) {
+  return hasWords(stageName(stage)) ? list ?? [] : (list ?? []).filter((item) => matches(item));
+}
+
+function stageName(stage) {
+  return `${stage.title ?? ""} ${stage.name ?? ""}`;
+}
+
+/** The timeline of the steps that the filter leaves. */
+function timeline(stages, page) {
+  const shownStages = stages.filter(showsStage);
+  if (shownStages.length === 0) {
+    return make("p", { class: "dim" }, stages.length === 0 ? "No steps." : "None to show.");
+  }
+  const longest = Math.max(...stages.map((stage) => stage.seconds ?? 0));
+  return fillList(make("ol", { class: "timeline" }), shownStages, (stage) =>
+    makePart({ class: `stage ${resultOf(stage)} ${stage.accounts?.length > 0 ? "" : "idle"}` },
+      stageSummary(stage, longest), () => stageBody(stage, page), stage),
+  (stage) => stage.title ?? stage.name);
+}
+
+function resultOf(stage) {
+  return stage.succeeded === undefined ? "" : stage.succeeded ? "succeeded" : "failed";
+}
+
+function stageSummary(stage, longest) {
+  const result = resultOf(stage);
+  const changed = stage.accounts?.length ?? 0;
+  return [
+    make("span", { class: "result" },
+      make("span", { "aria-hidden": "true" }, { succeeded: "✓", failed: "✕" }[result] ?? "·"),
+      make("span", { class: "unseen" }, `${result} `)),
+    make("span", { class: "what" },
+      data("strong", { class: "title" }, stage.title ?? stage.name ?? "a step"),
+      stage.title && stage.name ? [" ", data("code", {}, stage.name)] : null),
+    make("span", { class: "figures" },
+      make("span", { class: changed > 0 ? "count" : "dim" },
+        changed > 0 ? `${counted(changed, "account")}` : changedAnything(stage) ? "" : "no change"),
+      stage.seconds === undefined ? null : make("span", { class: "time" }, duration(stage.seconds),
+        make("span", { class: "share", "aria-hidden": "true",
+                       style: `--share: ${longest > 0 ? stage.seconds / longest : 0}` }))),
+  ];
+}
+
+/** A titled list within a step; none if there is nothing to list. */
+function titledList(title, items, makeItem, nameOf, attributes = {}) {
+  return items.length === 0 ? null : [make("h4", {}, title),
+    fillList(make("ul", attributes), items, makeItem, nameOf)];
+}
+
+function stageBody(stage, page) {
+  const others = chosenOf(stage, stage.otherProperties);
+  const accounts = chosenOf(stage, stage.accounts);
+  const files = chosenOf(stage, stage.files);
+  const log = chosenOf(stage, stage.log);
+  const body = [
+    titledList(counted(accounts.length, "account"), accounts,
+      (change) => makePart({ class: `change ${change.change}` }, changeSummary(change),
+        () => changeBody(change, page), change),
+      (change) => change.title ?? "an account", { class: "changes" }),
+    others.length === 0 ? null : [make("h4", {}, "Beside the accounts"), differenceTable(others)],
+    titledList(counted(files.length, "file"), files, fileLine, (file) => file.path, { class: "files" }),
+    titledList("Log", log, logLine, (line) => line.text, { class: "log" }),
+  ].flat().filter((child) => child !== null);
+  return body.length > 0 ? body : [make("p", { class: "dim" }, "Nothing to show.")];
+}
+
+function fileLine(file) {
+  return [make("span", { class: `action ${file.action}` }, shown(file.action ?? "")), " ",
+          data("code", {}, file.path ?? "")];
+}
+
+function logLine(line) {
+  return [make("span", { class: "to" }, shown(line.to ?? "")), " ", data("code", {}, line.text ?? "")];
+}
+
+function changeSummary(change) {
+  return make("span", { class: "line" }, badge(shown(change.change ?? "changed")),
+    data("strong", { class: "title" }, change.title ?? "an account"),
+    change.identifier ? data("code", { class: "dim" }, change.identifier) : null);
+}
+
+/** Where an account stands: its place and whose child it is. */
+function standing(where, side, page) {
+  if (!where) {
+    return null;
+  }
+  const parent = where.parent;
+  const title = page.accounts.withIdentifier[side].get(parent)?.title ?? parent;
+  return parent ? `${where.place}, below ${title}` : `${where.place}`;
+}
+
+function changeBody(change, page) {
+  const before = standing(change.before, "before", page);
+  const after = standing(change.after, "after", page);
+  const links = ["before", "after"]
+    .map((side) => [side, page.accounts.withIdentifier[side].get(change.identifier)])
+    .filter(([, account]) => account !== undefined)
+    .map(([side, account]) => [button(`Show it ${side}`, () => page.reveal(account)), " "]);
+  return [
+    change.properties?.length > 0 ? differenceTable(change.properties) : null,
+    before === null && after === null ? null : make("p", { class: "place" }, "Place: ",
+      before === after ? data("span", {}, after) :
+        [before === null ? null : data("del", {}, before), before && after ? " → " : null,
+         after === null ? null : data("ins", {}, after)]),
+    links.length > 0 ? make("p", { class: "links" }, links.flat()) : null,
+  ];
+}
+
+/** The cell of one side of a changed value; what differs from the other side is marked in it. */
+function differenceCell(tag, text, other) {
+  if (text === null) {
+    return make("td", { class: "none" }, make("span", { class: "dim" }, "none"));
+  }
+  const { start, end } = commonEnds(text, other ?? "");
+  const isWhole = other === null || start + end < text.length / 4;
+  const children = isWhole || filter.words.length > 0 ? marked(text) : [text.slice(0, start),
+    make("span", { class: "differs" }, text.slice(start, text.length - end)), text.slice(text.length - end)];
+  return make("td", {}, make(tag, { class: "value", dir: "auto" }, children));
+}
+
+/** Changed properties as a table: each with its value before and after. */
+function differenceTable(properties) {
+  const text = (property, side) => (Object.hasOwn(property, side) ? describe(property[side]) : null);
+  return make("table", { class: "differences" },
+    make("thead", {}, make("tr", {}, ["Property", "Before", "After"].map((name) =>
+      make("th", { scope: "col" }, name)))),
+    make("tbody", {}, properties.map((property) => {
+      const before = text(property, "before");
+      const after = text(property, "after");
+      return make("tr", {}, data("th", { scope: "row" }, property.path ?? ""),
+        differenceCell("del", before, after), differenceCell("ins", after, before));
+    })));
+}
