@@ -103,9 +103,14 @@ function accountsOf(report) {
 
 /** Whether the filter shows an account for its own sake, and not for its children's. */
 function isChosen(account) {
-  const { title, identifier, type, class: className, dataclasses, properties } = account.content;
-  return (!filter.changedOnly || account.marks.length > 0) &&
-    matches(account, [title, identifier, type, className, dataclasses, properties]);
+  return (!filter.changedOnly || account.marks.length > 0) && matches(account, () => textsOf(account));
+}
+
+/** What of an account a filter looks through: what is shown of it, its properties' paths included. */
+function textsOf({ content, properties }) {
+  const { title, identifier, type, class: className, dataclasses } = content;
+  return collectTexts([title, identifier, type, className, dataclasses, ...properties.keys(),
+                       ...properties.values()], []);
 }
 
 function badge(mark) {

@@ -11,13 +11,13 @@ function hasWords(text) {
   return filter.words.every((word) => folded.includes(word));
 }
 
-/** Whether an item's keys and values have every word of the filter between them. */
-function matches(item, parts = [item]) {
+/** Whether an item's texts, its keys and values unless others are given, have every word of the filter. */
+function matches(item, textsOf = () => collectTexts(item, [])) {
   if (filter.words.length === 0) {
     return true;
   }
   if (!searchTexts.has(item)) {
-    searchTexts.set(item, collectTexts(parts, []).join("\n").toLowerCase());
+    searchTexts.set(item, textsOf().join("\n").toLowerCase());
   }
   const text = searchTexts.get(item);
   return filter.words.every((word) => text.includes(word));

@@ -34,7 +34,7 @@ function versionWords({ before, after } = {}) {
     return "";
   }
   return before === null || before === undefined ? ` to version ${after}` :
-    before === after ? `, which stay at version ${after}` : ` from version ${before} to ${after}`;
+    before === after ? `; their version stays ${after}` : ` from version ${before} to ${after}`;
 }
 
 /** How many accounts have each mark; those without one are "unchanged". */

@@ -1,0 +1,30 @@
+#include "tests/report/SampleReports.h"
+
+#include <fstream>
+
+#include "report/HTMLReport.h"
+
+namespace accounts {
+
+nlohmann::json sampleReport() {
+  std::ifstream file(SAMPLE_REPORTS_DIRECTORY "/run.json");
+  return nlohmann::json::parse(file);
+}
+
+std::string pageOf(const nlohmann::json& report) {
+  return htmlReport(report.dump());
+}
+
+nlohmann::json plainAccount(const std::string& identifier, const std::string& title,
+                            const nlohmann::json& properties) {
+  return {{"source", "accountSettings"},
+          {"place", "1"},
+          {"identifier", identifier},
+          {"title", title},
+          {"type", "IMAP"},
+          {"class", "IMAPAccount"},
+          {"properties", properties},
+          {"children", nlohmann::json::array()}};
+}
+
+}  // namespace accounts
