@@ -4,10 +4,10 @@
 
 #include <vector>
 
-#include "accountsctl/DifferenceReport.h"
 #include "accountsctl/JSONText.h"
 #include "accountsctl/PropertyListInput.h"
 #include "inspection/DifferenceJSON.h"
+#include "inspection/DifferenceText.h"
 #include "inspection/StoreDifference.h"
 
 namespace accounts {
@@ -17,9 +17,17 @@ namespace {
 struct ComparedPart {
   /// The key of the part; empty for whole files.
   std::string_view key;
-  FileKind kind;
-  StoreDifference difference;
+  bool isEmpty = true;
+  /// For programs.
+  JSON difference;
 };
+
+ComparedPart comparedPart(std::string_view key, FileKind kind, const PropertyDictionary& before,
+                          const PropertyDictionary& after, Secrets secrets) {
+  const StoreDifference difference = differenceBetween(before, after, kind, secrets);
+  return {key, difference.isEmpty(),
+          differenceObject(difference, layoutOf(kind).value_or(StoreLayout()))};
+}
 
 PropertyDictionary rootOf(const PropertyValue& value) {
   const PropertyDictionary* root = value.asDictionary();
@@ -35,22 +43,20 @@ std::vector<ComparedPart> comparedParts(PropertyDictionary before, PropertyDicti
       const std::optional<PropertyDictionary> left = before.dictionaryForKey(part.key);
       const std::optional<PropertyDictionary> right = after.dictionaryForKey(part.key);
       if (left && right) {
-        parts.push_back(
-            {part.key, part.kind, differenceBetween(*left, *right, part.kind, secrets)});
+        parts.push_back(comparedPart(part.key, part.kind, *left, *right, secrets));
         before.remove(part.key);
         after.remove(part.key);
       }
     }
   }
-  parts.insert(parts.begin(), {"", kind, differenceBetween(before, after, kind, secrets)});
+  parts.insert(parts.begin(), comparedPart("", kind, before, after, secrets));
   return parts;
 }
 
 CommandReport textReport(const std::vector<ComparedPart>& parts, const Terminal& terminal) {
   CommandReport report;
   for (const ComparedPart& part : parts) {
-    const std::string text =
-        differenceText(part.difference, layoutOf(part.kind).value_or(StoreLayout()), terminal);
+    const std::string text = differenceText(part.difference, terminal);
     if (!text.empty() && !part.key.empty()) {
       report.text += emphasized(terminal, Emphasis::Heading, part.key) + "\n";
     }
@@ -64,7 +70,7 @@ CommandReport jsonReport(const std::vector<ComparedPart>& parts, const DiffOptio
   JSON list = JSON::array();
   for (const ComparedPart& part : parts) {
     JSON object = {{"part", part.key.empty() ? JSON(nullptr) : JSON(part.key)}};
-    object.update(differenceObject(part.difference, layoutOf(part.kind).value_or(StoreLayout())));
+    object.update(part.difference);
     list.push_back(std::move(object));
   }
   JSON object = reportObject("diff");
@@ -100,7 +106,7 @@ CommandResult diff(const DiffOptions& options, const Terminal& terminal) {
       comparedParts(rootOf(left), rootOf(right), kind, options.secrets);
   bool isSame = true;
   for (const ComparedPart& part : parts) {
-    isSame = isSame && part.difference.isEmpty();
+    isSame = isSame && part.isEmpty;
   }
   const ExitStatus exitStatus = isSame ? ExitStatus::Success : ExitStatus::Attention;
   CommandReport report = options.reportsJSON ? jsonReport(parts, options, kind, exitStatus)

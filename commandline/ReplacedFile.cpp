@@ -4,6 +4,7 @@
 
 #include <cerrno>
 #include <filesystem>
+#include <variant>
 
 #include "platform/linux/DevicePath.h"
 #include "platform/linux/DeviceRoot.h"
@@ -51,40 +52,68 @@ int fill(const FileDescriptor& file, std::string_view contents, const struct sta
   return isGiven ? 0 : errno;
 }
 
-}  // namespace
+/// A file that is to take another one's place.
+struct Replacement {
+  DeviceRoot machine;
+  TemporaryFile temporary;
+  std::string directory;
+  std::string target;
+  /// What stat says of the file to replace; a mode of 0 when there is none.
+  struct stat replaced = {};
+};
 
-std::optional<ProgramError> replaceFile(const std::string& path, std::string_view contents) {
+std::variant<Replacement, ProgramError> makeReplacement(const std::string& path) {
   struct stat replaced = {};
   if (std::optional<ProgramError> error = examine(path, replaced)) {
-    return error;
+    return *std::move(error);
   }
   std::error_code unresolved;
-  const std::string target = std::filesystem::weakly_canonical(path, unresolved).string();
+  std::string target = std::filesystem::weakly_canonical(path, unresolved).string();
   if (unresolved) {
     return cannotCreate(pathError("replace", path, unresolved.value()));
   }
   PathError error;
-  const std::optional<DeviceRoot> machine = DeviceRoot::openRoot("/", error);
+  std::optional<DeviceRoot> machine = DeviceRoot::openRoot("/", error);
   if (!machine) {
     return cannotWrite(error.text);
   }
   // In the target's own directory, so that both are on one file system.
-  const std::string directory(splitPath(target).directory);
-  const std::optional<TemporaryFile> temporary = makeTemporaryFileIn(*machine, directory, error);
+  std::string directory(splitPath(target).directory);
+  std::optional<TemporaryFile> temporary = makeTemporaryFileIn(*machine, directory, error);
   if (!temporary) {
     return cannotCreate(error);
   }
-  const int number = fill(temporary->file, contents, replaced);
+  return Replacement{*std::move(machine), *std::move(temporary), std::move(directory),
+                     std::move(target), replaced};
+}
+
+}  // namespace
+
+std::optional<ProgramError> replaceFile(const std::string& path, std::string_view contents) {
+  const std::variant<Replacement, ProgramError> made = makeReplacement(path);
+  if (const auto* error = std::get_if<ProgramError>(&made)) {
+    return *error;
+  }
+  const auto& [machine, temporary, directory, target, replaced] = std::get<Replacement>(made);
+  const int number = fill(temporary.file, contents, replaced);
   const Result moved =
-      number != 0
-          ? Result::failure(pathError("write", path, number).text)
-          : LinuxFileSystem(*machine, directory).renameFile(temporary->entry.path(), target);
+      number != 0 ? Result::failure(pathError("write", path, number).text)
+                  : LinuxFileSystem(machine, directory).renameFile(temporary.entry.path(), target);
   if (moved) {
     return std::nullopt;
   }
   // Gone already when only the directory could not be flushed; then there is nothing to remove.
-  (void)temporary->entry.remove();
+  (void)temporary.entry.remove();
   return cannotWrite(moved.error());
+}
+
+std::optional<ProgramError> whyNotReplaceable(const std::string& path) {
+  const std::variant<Replacement, ProgramError> made = makeReplacement(path);
+  if (const auto* error = std::get_if<ProgramError>(&made)) {
+    return *error;
+  }
+  (void)std::get<Replacement>(made).temporary.entry.remove();
+  return std::nullopt;
 }
 
 }  // namespace accounts

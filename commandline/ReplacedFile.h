@@ -12,6 +12,12 @@ namespace accounts {
 /// file can be read by its owner alone; one that is replaced keeps its owner, group and
 /// permissions. Symbolic links are followed. None when it is done; an error, with nothing changed,
 /// when something other than a regular file is there or the file cannot be made or written.
+/// When a file is to be replaced at the end of some work, whyNotReplaceable() tells at its
+/// beginning whether it could be now.
 std::optional<ProgramError> replaceFile(const std::string& path, std::string_view contents);
+
+/// The error that replaceFile() would give before it writes; none when it would give none. Nothing
+/// is left changed.
+std::optional<ProgramError> whyNotReplaceable(const std::string& path);
 
 }  // namespace accounts

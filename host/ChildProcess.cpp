@@ -18,6 +18,7 @@ namespace {
 
 /// Ends a text that the child wrote in full; a child that dies while writing leaves it out.
 constexpr char kEndMark = '\x04';
+constexpr char kLineEnd = '\n';
 
 ProgramError inputOutputError(const std::string& message) {
   return ProgramError{ExitStatus::InputOutputError, message + ": " + std::strerror(errno)};
@@ -36,7 +37,7 @@ bool writeAll(int file, std::string_view text) {
 
 std::string readFromStart(int file) {
   std::string text;
-  std::array<char, 4096> part{};
+  std::array<char, 65536> part{};
   while (true) {
     const ssize_t count = pread(file, part.data(), part.size(), static_cast<off_t>(text.size()));
     if (count < 0 && errno == EINTR) {
@@ -50,8 +51,7 @@ std::string readFromStart(int file) {
 }
 
 // noexcept: an exception of the plug-in ends the child as an abort, not the host's own main().
-[[noreturn]] void runChild(int result, pid_t parent,
-                           const std::function<std::string()>& function) noexcept {
+[[noreturn]] void runChild(int result, pid_t parent, const ChildFunction& function) noexcept {
   // A migration never goes on unseen: a host that is killed takes its child along. The parent may
   // have ended before the request was made.
   prctl(PR_SET_PDEATHSIG, SIGKILL);
@@ -59,7 +59,11 @@ std::string readFromStart(int file) {
     _exit(EXIT_FAILURE);
   }
   dup2(STDERR_FILENO, STDOUT_FILENO);
-  const bool delivered = writeAll(result, function() + kEndMark);
+  const WriteLine writeLine = [result](std::string_view line) {
+    // A line that does not arrive is missed by people alone.
+    static_cast<void>(writeAll(result, std::string(line) + kLineEnd));
+  };
+  const bool delivered = writeAll(result, function(writeLine) + kEndMark);
   std::exit(delivered ? EXIT_SUCCESS : EXIT_FAILURE);
 }
 
@@ -72,15 +76,31 @@ std::string describeEnd(int status) {
   return "ended the process with exit status " + std::to_string(WEXITSTATUS(status));
 }
 
+/// What the child left in its file, and how it ended.
+ChildOutcome outcomeOf(std::string_view text, int status) {
+  ChildOutcome outcome;
+  for (std::size_t end = text.find(kLineEnd); end != std::string_view::npos;
+       end = text.find(kLineEnd)) {
+    outcome.lines.emplace_back(text.substr(0, end));
+    text.remove_prefix(end + 1);
+  }
+  const bool delivered = text.ends_with(kEndMark);
+  if (!WIFEXITED(status) || WEXITSTATUS(status) != EXIT_SUCCESS || !delivered) {
+    outcome.result = ProgramError{ExitStatus::PluginEnded, "The plug-in " + describeEnd(status)};
+  } else {
+    outcome.result = std::string(text.substr(0, text.size() - 1));
+  }
+  return outcome;
+}
+
 }  // namespace
 
-std::variant<std::string, ProgramError> runInChildProcess(
-    const std::function<std::string()>& function) {
+ChildOutcome runInChildProcess(const ChildFunction& function) {
   // A file in memory rather than a pipe: its reader waits for the child alone, never for some
   // process that the child started and that keeps a pipe open.
   const int result = memfd_create("migration-result", MFD_CLOEXEC);
   if (result < 0) {
-    return inputOutputError("No memory for the plug-in's result");
+    return {{}, inputOutputError("No memory for the plug-in's result")};
   }
   const pid_t parent = getpid();
   const pid_t child = fork();
@@ -88,21 +108,16 @@ std::variant<std::string, ProgramError> runInChildProcess(
     runChild(result, parent, function);
   }
   if (child < 0) {
-    const ProgramError error = inputOutputError("No process for the plug-in");
+    ChildOutcome outcome{{}, inputOutputError("No process for the plug-in")};
     close(result);
-    return error;
+    return outcome;
   }
   int status = 0;
   while (waitpid(child, &status, 0) < 0 && errno == EINTR) {
   }
-  std::string text = readFromStart(result);
+  const std::string text = readFromStart(result);
   close(result);
-  const bool delivered = text.ends_with(kEndMark);
-  if (!WIFEXITED(status) || WEXITSTATUS(status) != EXIT_SUCCESS || !delivered) {
-    return ProgramError{ExitStatus::PluginEnded, "The plug-in " + describeEnd(status)};
-  }
-  text.pop_back();
-  return text;
+  return outcomeOf(text, status);
 }
 
 }  // namespace accounts

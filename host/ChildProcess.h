@@ -2,18 +2,31 @@
 
 #include <functional>
 #include <string>
+#include <string_view>
 #include <variant>
+#include <vector>
 
 #include "commandline/ExitStatus.h"
 
 namespace accounts {
 
-/// Runs a function in a child process of its own and gives the text that it returns. The child's
-/// standard output is its standard error, so that nothing that runs there can spoil what the host
-/// writes; it is killed when the host ends first. An error, with the way the child ended in its
-/// message, when the child ends by a signal or in any other way than by returning the text; an
-/// error too when no child can be made.
-std::variant<std::string, ProgramError> runInChildProcess(
-    const std::function<std::string()>& function);
+/// What a child process left.
+struct ChildOutcome {
+  /// The lines that it wrote while it ran, in order, also when it ended before its time.
+  std::vector<std::string> lines;
+  /// The text that its function gave; an error of the host's own when the child could not be
+  /// started, or ended in another way than by giving one.
+  std::variant<std::string, ProgramError> result;
+};
+
+/// Takes a line, without its end, that the parent process gets whatever becomes of the child.
+using WriteLine = std::function<void(std::string_view line)>;
+/// Runs in the child. Neither a line nor the text that it gives may have a line end in it.
+using ChildFunction = std::function<std::string(const WriteLine& writeLine)>;
+
+/// Runs a function in a child process of its own and waits for its end. The child's standard output
+/// is its standard error, so that nothing that runs there can spoil what the host writes; it is
+/// killed when the host ends first.
+ChildOutcome runInChildProcess(const ChildFunction& function);
 
 }  // namespace accounts

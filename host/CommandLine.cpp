@@ -14,14 +14,18 @@ constexpr const char* kVersion = "migration-host " MIGRATION_HOST_VERSION;
 /// The arguments of every subcommand; those of the one that is chosen are filled.
 struct Arguments {
   RunOptions run;
+  PlanOptions plan;
   RestoreOptions restore;
+  ReportFiles reports;
   bool wantsJSON = false;
+  bool showsSecrets = false;
+
+  [[nodiscard]] Secrets secrets() const { return showsSecrets ? Secrets::Show : Secrets::Hide; }
 };
 
 using Asked = decltype(CommandLine::asked);
 
-void addRun(CLI::App& command, Arguments& arguments) {
-  RunOptions& options = arguments.run;
+void addDeviceOptions(CLI::App& command, DeviceOptions& options) {
   addDevice(command, options.root, options.home);
   addPath(command, "--device", options.deviceDescription, "FILE",
           "The device description (default: the root's /etc/device.plist, if there is one)");
@@ -32,11 +36,39 @@ void addRun(CLI::App& command, Arguments& arguments) {
       ->check(requireDevicePath);
   addPath(command, "--channel", options.channel, "FILE",
           "Append the log channel to FILE, - for standard error (default: off)");
-  command.add_flag("--bare", options.bare, "Run the plug-in without keeping or verifying anything");
+}
+
+void addReports(CLI::App& command, Arguments& arguments) {
+  addPath(command, "--report", arguments.reports.json, "FILE",
+          "Write each stage and every change to FILE, as one JSON object");
+  addPath(command, "--html", arguments.reports.html, "FILE",
+          "Write the same to FILE, as one page for a browser");
+  command.add_flag("--show-secrets", arguments.showsSecrets,
+                   "Show passwords, tokens and the like in reports as well");
+}
+
+void addRun(CLI::App& command, Arguments& arguments) {
+  addDeviceOptions(command, arguments.run.device);
+  addReports(command, arguments);
+  command.add_flag("--bare", arguments.run.bare,
+                   "Run the plug-in without keeping or verifying anything");
 }
 
 Asked runAsked(Arguments& arguments) {
+  if (arguments.reports.areWanted()) {
+    arguments.run.recorded = arguments.secrets();
+  }
   return arguments.run;
+}
+
+void addPlan(CLI::App& command, Arguments& arguments) {
+  addDeviceOptions(command, arguments.plan.device);
+  addReports(command, arguments);
+}
+
+Asked planAsked(Arguments& arguments) {
+  arguments.plan.secrets = arguments.secrets();
+  return arguments.plan;
 }
 
 void addRestore(CLI::App& command, Arguments& arguments) {
@@ -62,6 +94,8 @@ struct Subcommand {
 
 constexpr Subcommand kSubcommands[] = {
     {"run", help::kRun, help::kRunStatuses, help::kRunErrors, help::kRunExamples, addRun, runAsked},
+    {"plan", help::kPlan, help::kPlanStatuses, help::kRunErrors, help::kPlanExamples, addPlan,
+     planAsked},
     {"restore", help::kRestore, help::kRestoreStatuses, help::kRestoreErrors,
      help::kRestoreExamples, addRestore, restoreAsked},
 };
@@ -104,6 +138,7 @@ CommandLine parseCommandLine(int argumentCount, const char* const* arguments) {
   } else if (auto* problem = std::get_if<UnusableArguments>(&parsing)) {
     commandLine.asked = std::move(*problem);
   } else {
+    commandLine.reports = parsed.reports;
     commandLine.asked = askedBy(program, parsed);
   }
   return commandLine;

@@ -5,6 +5,8 @@
 #include <variant>
 
 #include "commandline/ArgumentParsing.h"
+#include "host/PlanCommand.h"
+#include "host/ReportFiles.h"
 #include "host/RestoreCommand.h"
 #include "host/RunCommand.h"
 
@@ -14,9 +16,11 @@ inline constexpr const char* kProgramName = "migration-host";
 
 /// What the arguments ask for.
 struct CommandLine {
-  std::variant<RunOptions, RestoreOptions, RequestedText, UnusableArguments> asked;
+  std::variant<RunOptions, PlanOptions, RestoreOptions, RequestedText, UnusableArguments> asked;
   /// Whether the report is to be a JSON object, that of an error too.
   bool wantsJSON = false;
+  /// Where the report of a run or a plan goes besides.
+  ReportFiles reports;
 };
 
 /// What the arguments of the program ask for. Touches no file.

@@ -8,4 +8,7 @@ namespace accounts {
 /// "20260102T030405Z".
 std::string currentTimeText();
 
+/// The time now as reports have it, in UTC, such as "2026-01-02T03:04:05Z".
+std::string currentTimeForReports();
+
 }  // namespace accounts

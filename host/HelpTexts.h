@@ -7,7 +7,8 @@ inline constexpr const char* kProgram = "Runs the account-settings migration plu
 
 inline constexpr const char* kProgramExamples =
     "Examples:\n"
-    "  migration-host run --root /mnt/image\n"
+    "  migration-host plan --root /mnt/image\n"
+    "  migration-host run --root /mnt/image --html report.html\n"
     "  migration-host restore --root /mnt/image\n"
     "  migration-host run --help\n";
 
@@ -33,8 +34,24 @@ inline constexpr const char* kRunErrors =
 inline constexpr const char* kRunExamples =
     "  migration-host run --root /                             the running device\n"
     "  migration-host run --root /mnt/image --json             an image, for a program to read\n"
+    "  migration-host run --root /mnt/image --html report.html every change, for a browser\n"
     "  migration-host run --root /mnt/image --channel -        the log channel as well\n"
     "  migration-host run --root image --device other.plist    answers of another device\n";
+
+inline constexpr const char* kPlan =
+    "Show what a run would do to one device root.\n\n"
+    "The whole migration runs on the root's files in memory; nothing beneath the root is written,\n"
+    "which may be mounted read-only. Standard output carries each stage with the accounts that it\n"
+    "changes, every property before and after, and the files that it writes or removes. Passwords\n"
+    "and the like are hidden. Fresh identifiers are other ones in each run, and whether the disk\n"
+    "has room is not foreseen.";
+inline constexpr const char* kPlanStatuses =
+    "  0   a run would succeed\n"
+    "  1   the plug-in would report failure\n"
+    "  2   the plug-in would report success, which would not be verified\n";
+inline constexpr const char* kPlanExamples =
+    "  migration-host plan --root /mnt/image\n"
+    "  migration-host plan --root /mnt/image --html plan.html --json > plan.json\n";
 
 inline constexpr const char* kRestore =
     "Put back the settings file and the legacy stores that a run kept.\n\n"

@@ -56,7 +56,7 @@ void setError(RunReport& report, const ProgramError& error) {
   report.error = error.message;
 }
 
-std::string jsonText(const RunReport& report) {
+JSON objectOf(const RunReport& report) {
   JSON broadcasts = JSON::array();
   for (const PreferencesChange& broadcast : report.broadcasts) {
     broadcasts.push_back(
@@ -74,7 +74,11 @@ std::string jsonText(const RunReport& report) {
   if (report.error) {
     object[kErrorKey] = *report.error;
   }
-  return lineOf(object);
+  return object;
+}
+
+std::string jsonText(const RunReport& report) {
+  return lineOf(objectOf(report));
 }
 
 std::optional<RunReport> reportFromJSONText(const std::string& text) {

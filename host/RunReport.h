@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "commandline/ExitStatus.h"
+#include "inspection/PropertyListJSON.h"
 #include "platform/linux/RecordingPreferencesBroadcast.h"
 #include "safetynet/SettingsSaves.h"
 
@@ -36,6 +37,8 @@ struct RunReport {
 /// Notes an error of the host's own in a report.
 void setError(RunReport& report, const ProgramError& error);
 
+/// A report as a JSON object.
+JSON objectOf(const RunReport& report);
 /// A report as one JSON object on one line, without a line end. Bytes that are no UTF-8 are
 /// replaced.
 std::string jsonText(const RunReport& report);

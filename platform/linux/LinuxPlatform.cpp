@@ -106,30 +106,26 @@ struct LinuxPlatform::Parts {
   DescribedProfileRestrictions profileRestrictions;
   RecordingCloudTabService cloudTabService;
   RecordingPreferencesBroadcast preferencesBroadcast;
-  Platform platform = gather(fileSystem);
-
-  Platform gather(FileSystem& files) {
-    return {.bundleResources = bundleResources,
-            .cloudAccountService = cloudAccountService,
-            .cloudTabService = cloudTabService,
-            .consoleLog = consoleLog,
-            .dateFormatter = dateFormatter,
-            .deviceInfoService = deviceInfoService,
-            .externalSyncSources = externalSyncSources,
-            .fileSystem = files,
-            .frameworkLoader = frameworkLoader,
-            .homeDirectory = homeDirectory,
-            .localizedStrings = localizedStrings,
-            .logSystem = logSystem,
-            .mailDirectory = mailDirectory,
-            .pairingValueStore = pairingValueStore,
-            .preferenceDomain = preferenceDomain,
-            .preferencesBroadcast = preferencesBroadcast,
-            .profileRestrictions = profileRestrictions,
-            .propertyLists = propertyLists,
-            .sharedResources = sharedResources,
-            .uuidGenerator = uuidGenerator};
-  }
+  Platform platform = {.bundleResources = bundleResources,
+                       .cloudAccountService = cloudAccountService,
+                       .cloudTabService = cloudTabService,
+                       .consoleLog = consoleLog,
+                       .dateFormatter = dateFormatter,
+                       .deviceInfoService = deviceInfoService,
+                       .externalSyncSources = externalSyncSources,
+                       .fileSystem = fileSystem,
+                       .frameworkLoader = frameworkLoader,
+                       .homeDirectory = homeDirectory,
+                       .localizedStrings = localizedStrings,
+                       .logSystem = logSystem,
+                       .mailDirectory = mailDirectory,
+                       .pairingValueStore = pairingValueStore,
+                       .preferenceDomain = preferenceDomain,
+                       .preferencesBroadcast = preferencesBroadcast,
+                       .profileRestrictions = profileRestrictions,
+                       .propertyLists = propertyLists,
+                       .sharedResources = sharedResources,
+                       .uuidGenerator = uuidGenerator};
 };
 
 std::unique_ptr<LinuxPlatform> LinuxPlatform::create(const LinuxPlatformOptions& options,
@@ -171,10 +167,6 @@ LinuxPlatform::~LinuxPlatform() = default;
 
 Platform& LinuxPlatform::platform() {
   return parts_->platform;
-}
-
-Platform LinuxPlatform::platformWith(FileSystem& fileSystem) {
-  return parts_->gather(fileSystem);
 }
 
 const RecordingPreferencesBroadcast& LinuxPlatform::preferencesBroadcast() const {

@@ -60,8 +60,6 @@ class LinuxPlatform {
 
   /// Valid as long as this object.
   [[nodiscard]] Platform& platform();
-  /// The same platform with another file system in the place of its own.
-  [[nodiscard]] Platform platformWith(FileSystem& fileSystem);
 
   [[nodiscard]] const RecordingPreferencesBroadcast& preferencesBroadcast() const;
   [[nodiscard]] const RecordingCloudTabService& cloudTabService() const;

@@ -16,8 +16,6 @@
 namespace accounts {
 namespace {
 
-constexpr std::string_view kLockDirectory = "/tmp";
-
 // Processes of other users wait on the lock too. Keeping them from opening the file would keep
 // nobody from holding the lock up, since anyone may make a file in the directory first.
 constexpr mode_t kLockFilePermissions = 0644;

@@ -9,6 +9,9 @@
 
 namespace accounts {
 
+/// Where the files of locks are, a device path.
+inline constexpr std::string_view kLockDirectory = "/tmp";
+
 /// Places and locks of the device beneath a root, which must outlive this. The lock NAME is an
 /// exclusive flock on the regular file /tmp/NAME. The file is made if missing, never changed and
 /// never removed; the kernel frees the lock when its holder dies.

@@ -70,8 +70,7 @@ std::optional<EntryKind> OverlayFileSystem::kindOfEntry(std::string_view path) {
   return std::holds_alternative<Directory>(*change) ? EntryKind::Directory : EntryKind::RegularFile;
 }
 
-std::optional<std::vector<std::string>> OverlayFileSystem::directoryEntries(
-    std::string_view path) {
+std::optional<std::vector<std::string>> OverlayFileSystem::directoryEntries(std::string_view path) {
   if (!isDirectory(path)) {
     return std::nullopt;
   }
@@ -214,9 +213,8 @@ Result OverlayFileSystem::renameFile(std::string_view source, std::string_view d
   }
   const Contents contents = contentsOf(source);
   const auto* inMemory = std::get_if<InMemory>(&contents);
-  Result moved =
-      put("rename to", destination,
-          inMemory != nullptr ? Change(*inMemory) : Change(std::get<Beneath>(contents)));
+  Result moved = put("rename to", destination,
+                     inMemory != nullptr ? Change(*inMemory) : Change(std::get<Beneath>(contents)));
   if (moved) {
     changes_.insert_or_assign(std::string(source), Removed{});
   }

@@ -2,8 +2,8 @@
 
 #include <gtest/gtest.h>
 
-#include "accountsctl/DifferenceReport.h"
 #include "inspection/DifferenceJSON.h"
+#include "inspection/DifferenceText.h"
 
 namespace accounts {
 namespace {
@@ -32,7 +32,8 @@ std::string difference(const PropertyDictionary& before, const PropertyDictionar
                        Secrets secrets = Secrets::Hide) {
   const StoreDifference found =
       differenceBetween(before, after, FileKind::AccountSettings, secrets);
-  const std::string text = differenceText(found, *layoutOf(FileKind::AccountSettings), {});
+  const std::string text =
+      differenceText(differenceObject(found, *layoutOf(FileKind::AccountSettings)), {});
   EXPECT_EQ(found.isEmpty(), text.empty());
   return text;
 }

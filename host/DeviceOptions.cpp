@@ -1,0 +1,33 @@
+#include "host/DeviceOptions.h"
+
+#include "commandline/PlatformError.h"
+
+namespace accounts {
+
+std::string temporaryDirectoryOf(const DeviceOptions& options) {
+  return options.temporaryDirectory.value_or(
+      options.home.value_or(LinuxPlatformOptions().homeDirectory) + "/tmp");
+}
+
+std::variant<OpenedDevice, ProgramError> openDevice(const DeviceOptions& options) {
+  std::variant<PluginBundle, ProgramError> bundle = PluginBundle::find(options.plugin);
+  if (const auto* error = std::get_if<ProgramError>(&bundle)) {
+    return *error;
+  }
+  auto& found = std::get<PluginBundle>(bundle);
+  LinuxPlatformOptions wanted;
+  wanted.rootDirectory = options.root;
+  wanted.homeDirectory = options.home.value_or(wanted.homeDirectory);
+  wanted.temporaryDirectory = options.temporaryDirectory;
+  wanted.bundleResourcesDirectory = found.resourcesDirectory().string();
+  wanted.deviceDescriptionFile = options.deviceDescription;
+  wanted.channel = options.channel;
+  LinuxPlatformError error;
+  std::unique_ptr<LinuxPlatform> platform = LinuxPlatform::create(wanted, error);
+  if (platform == nullptr) {
+    return programErrorOf(error);
+  }
+  return OpenedDevice{std::move(found), std::move(platform)};
+}
+
+}  // namespace accounts

@@ -1,0 +1,106 @@
+#include "host/PlanCommand.h"
+
+#include <unistd.h>
+
+#include <memory>
+#include <utility>
+#include <variant>
+
+#include "host/PluginRun.h"
+#include "host/RootLock.h"
+#include "platform/ReplacedParts.h"
+#include "platform/linux/LinuxSharedResources.h"
+#include "platform/linux/OwnerNames.h"
+#include "platform/overlay/OverlayFileSystem.h"
+#include "platform/overlay/OverlayPropertyLists.h"
+#include "platform/overlay/OverlaySharedResources.h"
+#include "safetynet/MigrationCheck.h"
+
+namespace accounts {
+namespace {
+
+/// The kernel's rule: a privileged process gives files to anybody, another one only to itself.
+class KernelOwnershipRule final : public OwnershipRule {
+ public:
+  explicit KernelOwnershipRule(const DeviceRoot& root) : names_(root) {}
+
+  Result canGive(std::string_view ownerName, std::string_view groupName) override {
+    PathError error;
+    const auto user = names_.userIdentifier(std::string(ownerName), error);
+    const auto group = user ? names_.groupIdentifier(std::string(groupName), error) : std::nullopt;
+    if (!group) {
+      return Result::failure(error.text);
+    }
+    const bool isAllowed = ::geteuid() == 0 || (*user == ::geteuid() && *group == ::getegid());
+    return isAllowed ? Result::success()
+                     : Result::failure("A file cannot be given to " + std::string(ownerName) +
+                                       ": Operation not permitted");
+  }
+
+ private:
+  OwnerNames names_;
+};
+
+/// The device's platform with everything that changes files in memory.
+struct PlannedPlatform {
+  PlannedPlatform(LinuxPlatform& linux, std::string temporaryDirectory)
+      : ownership(linux.root()),
+        files(linux.fileSystem(), ownership, std::move(temporaryDirectory)),
+        propertyLists(files, linux.propertyLists()),
+        sharedResources(files, linux.platform().sharedResources, std::string(kLockDirectory)),
+        platform(platformWith(linux.platform(), {.fileSystem = &files,
+                                                 .propertyLists = &propertyLists,
+                                                 .sharedResources = &sharedResources})) {}
+
+  KernelOwnershipRule ownership;
+  OverlayFileSystem files;
+  OverlayPropertyLists propertyLists;
+  OverlaySharedResources sharedResources;
+  Platform platform;
+};
+
+HostOutcome failed(const ProgramError& error) {
+  return {reportOf(error), {}};
+}
+
+HostOutcome planWithPlugin(const PlanOptions& options) {
+  const std::variant<OpenedDevice, ProgramError> opened = openDevice(options.device);
+  if (const auto* error = std::get_if<ProgramError>(&opened)) {
+    return failed(*error);
+  }
+  const auto& device = std::get<OpenedDevice>(opened);
+  LinuxPlatform& linux = *device.platform;
+  PathError lockError;
+  const auto rootLock = RootLock::take(linux.root(), lockError);
+  if (!rootLock) {
+    return failed({ExitStatus::CannotCreate, lockError.text});
+  }
+  PlannedPlatform planned(linux, temporaryDirectoryOf(options.device));
+  const AccountFiles files = accountFilesInHome(linux.platform().homeDirectory.path());
+  PluginOutcome outcome = runPluginInChild(
+      {.bundle = device.bundle,
+       .platform = planned.platform,
+       .linux = linux,
+       .files = files,
+       .recorded = options.secrets,
+       .inspect = [&](const Platform& platform, RunReport& report) {
+         const auto problem = report.result ? whyNotMigrated(platform.propertyLists, files.settings,
+                                                             report.settingsSaves.last)
+                                            : std::nullopt;
+         if (problem) {
+           setError(report,
+                    {ExitStatus::NotVerified, "The result would not be verified: " + *problem});
+         }
+       }});
+  return {reportOf(std::move(outcome.report)), std::move(outcome.recorded)};
+}
+
+}  // namespace
+
+HostOutcome planMigration(const PlanOptions& options) {
+  HostOutcome outcome = planWithPlugin(options);
+  outcome.report.root = options.device.root;
+  return outcome;
+}
+
+}  // namespace accounts
