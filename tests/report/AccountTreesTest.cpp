@@ -10,7 +10,7 @@ namespace {
 using nlohmann::json;
 
 // The accounts of a side as its tree shows them, and the one with a title.
-constexpr std::string_view kTrees = R"(
+constexpr std::string_view kTrees = R"js(
   const textsIn = (part, selector) => [...part.querySelectorAll(selector)].map((each) => each.textContent);
   const describe = (part) =>
     [part.querySelector(".title").textContent, ...textsIn(part, "summary .badge")].join(" ");
@@ -23,20 +23,20 @@ constexpr std::string_view kTrees = R"(
     await pause();
     return part;
   };
-)";
+)js";
 
 json notedOnTrees(const json& report, const std::string& driver) {
   return notedOn(pageOf(report), std::string(kTrees) + driver);
 }
 
 TEST(AccountTreesTest, BothSidesListTheirAccountsWithWhatBecameOfThem) {
-  const json noted = notedOnTrees(sampleReport(), R"(
+  const json noted = notedOnTrees(sampleReport(), R"js(
     note("before", tree("before"));
     note("after", tree("after"));
     const child = accountOn("after", "CalDAV 'Google calendars'");
     note("parent", child.parentElement.parentElement.parentElement.querySelector(".title").textContent);
     note("source", accountOn("before", "EASAccount 'Office'").querySelector(".source").textContent);
-  )");
+  )js");
 
   EXPECT_EQ(noted["before"],
             json({"OnMyDevice 'My Device'", "Gmail 'Ada at Gmail' ≠ changed",
@@ -52,10 +52,10 @@ TEST(AccountTreesTest, BothSidesListTheirAccountsWithWhatBecameOfThem) {
 }
 
 TEST(AccountTreesTest, AnAccountShowsItsDataclassesAndWhichOfThemChanged) {
-  const json noted = notedOnTrees(sampleReport(), R"(
+  const json noted = notedOnTrees(sampleReport(), R"js(
     note("before", textsIn(accountOn("before", "Gmail 'Ada at Gmail'"), ".dataclass"));
     note("after", textsIn(accountOn("after", "Gmail 'Ada at Gmail'"), ".dataclass"));
-  )");
+  )js");
 
   EXPECT_EQ(noted["before"], json({"Mail (enabled, provisioned) ",
                                    "Calendars (not enabled, provisioned, changed) "}));
@@ -64,7 +64,7 @@ TEST(AccountTreesTest, AnAccountShowsItsDataclassesAndWhichOfThemChanged) {
 }
 
 TEST(AccountTreesTest, AnOpenAccountShowsItsPropertiesWithTheChangedOnesMarked) {
-  const json noted = notedOnTrees(sampleReport(), R"(
+  const json noted = notedOnTrees(sampleReport(), R"js(
     note("builtBefore", all(".account .body").length);
     const before = await openOn("before", "Gmail 'Ada at Gmail'");
     note("builtAfter", all(".account .body").length);
@@ -75,7 +75,7 @@ TEST(AccountTreesTest, AnOpenAccountShowsItsPropertiesWithTheChangedOnesMarked) 
     const unchanged = await openOn("after", "IMAP 'Work'");
     note("nested", textsIn(unchanged, ".properties th").filter((path) => path.startsWith("Rules")));
     note("marksOfUnchanged", unchanged.querySelectorAll("ins, del, tr.changed").length);
-  )");
+  )js");
 
   EXPECT_EQ(noted["builtBefore"], 0);
   EXPECT_EQ(noted["builtAfter"], 1);
@@ -90,7 +90,7 @@ TEST(AccountTreesTest, AnOpenAccountShowsItsPropertiesWithTheChangedOnesMarked) 
 }
 
 TEST(AccountTreesTest, AnAccountLeadsToItselfOnTheOtherSideAndPointingAtItMarksIt) {
-  const json noted = notedOnTrees(sampleReport(), R"(
+  const json noted = notedOnTrees(sampleReport(), R"js(
     const before = await openOn("before", "CalDAV 'Google calendars'");
     before.querySelector("summary").focus();
     note("partner", textsIn(page, ".account.partner > summary .title"));
@@ -101,7 +101,7 @@ TEST(AccountTreesTest, AnAccountLeadsToItselfOnTheOtherSideAndPointingAtItMarksI
     note("isOpen", reached.open);
     note("back", textsIn(reached, "button"));
     note("alone", textsIn(await openOn("before", "SubscribedCalendar 'Public holidays'"), "button"));
-  )");
+  )js");
 
   EXPECT_EQ(noted["partner"], json::array({"CalDAV 'Google calendars'"}));
   EXPECT_EQ(noted["reached"], "CalDAV 'Google calendars'");
@@ -111,7 +111,7 @@ TEST(AccountTreesTest, AnAccountLeadsToItselfOnTheOtherSideAndPointingAtItMarksI
 }
 
 TEST(AccountTreesTest, AStepsChangeLeadsToTheAccountAlsoWhenAFilterHidesIt) {
-  const json noted = notedOnTrees(sampleReport(), R"(
+  const json noted = notedOnTrees(sampleReport(), R"js(
     await enter("Convert the Exchange");
     note("hidden", all("#after .account").length);
     all(".stage > summary")[0].click();
@@ -122,7 +122,7 @@ TEST(AccountTreesTest, AStepsChangeLeadsToTheAccountAlsoWhenAFilterHidesIt) {
     await pause();
     note("reached", page.activeElement.querySelector(".title").textContent);
     note("filter", one("#filter").value);
-  )");
+  )js");
 
   EXPECT_EQ(noted["hidden"], 0);
   EXPECT_EQ(noted["reached"], "Exchange 'Office'");
@@ -140,10 +140,10 @@ TEST(AccountTreesTest, AccountsArePairedByIdentifierOrElseByTitleEachWithOneOthe
 
   const json noted = notedOnTrees({{"accountsBefore", {legacy, first, second, anonymous}},
                                    {"accountsAfter", {first, anonymous, anonymous}}},
-                                  R"(
+                                  R"js(
     note("before", tree("before"));
     note("after", tree("after"));
-  )");
+  )js");
 
   EXPECT_EQ(noted["before"],
             json({"Legacy 'First' − removed", "IMAP 'First'",

@@ -19,7 +19,7 @@ constexpr std::string_view kNotesEnd = "</pre>";
 
 // The page is in a frame, so that it can have any width, and whoever drives it is outside: the
 // page's own content security policy and whether it may run scripts do not bind the driver.
-constexpr std::string_view kDriverStart = R"(
+constexpr std::string_view kDriverStart = R"js(
   const frame = document.querySelector("iframe");
   const view = frame.contentWindow;
   const page = frame.contentDocument;
@@ -38,10 +38,10 @@ constexpr std::string_view kDriverStart = R"(
       new view.KeyboardEvent("keydown", { key, bubbles: true, cancelable: true }));
   };
   const drive = async () => {
-)";
+)js";
 
 // The notes are plain ASCII without what a document would escape.
-constexpr std::string_view kDriverEnd = R"(
+constexpr std::string_view kDriverEnd = R"js(
   };
   drive().then(() => {
     const text = JSON.stringify(notes).replace(/[^ -~]|[<>&]/g,
@@ -51,7 +51,7 @@ constexpr std::string_view kDriverEnd = R"(
     element.textContent = text;
     document.documentElement.replaceChildren(element);
   });
-)";
+)js";
 
 /// A directory that is there for as long as this object.
 class ScratchDirectory {

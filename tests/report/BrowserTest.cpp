@@ -26,11 +26,11 @@ TEST(BrowserTest, WhatGoesWrongOnAPageIsSeen) {
 }
 
 TEST(BrowserTest, NothingGoesWrongOnAReport) {
-  const Visit visit = visitPage(pageOf(sampleReport()), R"(
+  const Visit visit = visitPage(pageOf(sampleReport()), R"js(
     one("#expand").click();
     await pause();
     note("open", all("details").every((part) => part.open));
-  )");
+  )js");
 
   EXPECT_EQ(visit.noted["open"], true);
   EXPECT_THAT(visit.consoleLines, IsEmpty());

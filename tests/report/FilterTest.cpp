@@ -10,18 +10,18 @@ namespace {
 using nlohmann::json;
 
 // What the page shows, in short: the titles of steps and of accounts on both sides.
-constexpr std::string_view kShown = R"(
+constexpr std::string_view kShown = R"js(
   const titles = (selector) => all(`${selector} > summary .title`).map((each) => each.textContent);
   const shownNow = () => ({ steps: titles(".stage").length, before: titles("#before .account"),
                             after: titles("#after .account") });
-)";
+)js";
 
 json notedWhileFiltering(const std::string& driver) {
   return notedOn(pageOf(sampleReport()), std::string(kShown) + driver);
 }
 
 TEST(FilterTest, FindsTitlesIdentifiersPropertyNamesAndValuesWhateverTheCase) {
-  const json noted = notedWhileFiltering(R"(
+  const json noted = notedWhileFiltering(R"js(
     await enter("wORK");
     note("title", shownNow());
     await enter("5C4D3E03");
@@ -34,7 +34,7 @@ TEST(FilterTest, FindsTitlesIdentifiersPropertyNamesAndValuesWhateverTheCase) {
     note("value", shownNow());
     await enter("work IMAP 143");
     note("words", shownNow());
-  )");
+  )js");
 
   const json work = {{"steps", 0}, {"before", {"IMAP 'Work'"}}, {"after", {"IMAP 'Work'"}}};
   for (const char* by : {"title", "identifier", "name", "value", "words", "path"}) {
@@ -43,7 +43,7 @@ TEST(FilterTest, FindsTitlesIdentifiersPropertyNamesAndValuesWhateverTheCase) {
 }
 
 TEST(FilterTest, SaysHowMuchIsShownAndMarksTheWords) {
-  const json noted = notedWhileFiltering(R"(
+  const json noted = notedWhileFiltering(R"js(
     note("none", one("#shown").textContent);
     await enter("calendar.google");
     note("some", one("#shown").textContent);
@@ -52,7 +52,7 @@ TEST(FilterTest, SaysHowMuchIsShownAndMarksTheWords) {
     await enter("nothing has this");
     note("nothing", one("#shown").textContent);
     note("texts", all("#steps .content, #before .content").map((each) => each.textContent));
-  )");
+  )js");
 
   EXPECT_EQ(noted["none"], "");
   EXPECT_EQ(noted["some"], "Shown: 1 of 13 steps, 0 of 7 accounts before, 1 of 7 after");
@@ -63,7 +63,7 @@ TEST(FilterTest, SaysHowMuchIsShownAndMarksTheWords) {
 }
 
 TEST(FilterTest, FewMatchesAreOpenedToWhereTheWordsAre) {
-  const json noted = notedWhileFiltering(R"(
+  const json noted = notedWhileFiltering(R"js(
     await enter("folded 'Google");
     note("log", all(".stage[open] .log mark").length > 0);
     note("changes", all(".stage .change").length);
@@ -71,7 +71,7 @@ TEST(FilterTest, FewMatchesAreOpenedToWhereTheWordsAre) {
     note("property", all("#before .account[open] th mark").map((each) => each.textContent));
     await enter("IMAP 'Work'");
     note("inTitle", all("#before .account[open]").length);
-  )");
+  )js");
 
   EXPECT_EQ(noted["log"], true);
   EXPECT_EQ(noted["changes"], 0);
@@ -80,16 +80,16 @@ TEST(FilterTest, FewMatchesAreOpenedToWhereTheWordsAre) {
 }
 
 TEST(FilterTest, AChildThatMatchesIsShownBelowItsParent) {
-  const json noted = notedWhileFiltering(R"(
+  const json noted = notedWhileFiltering(R"js(
     await enter("MobileCalDAVChildAccount");
     note("after", shownNow().after);
-  )");
+  )js");
 
   EXPECT_EQ(noted["after"], json({"Gmail 'Ada at Gmail'", "CalDAV 'Google calendars'"}));
 }
 
 TEST(FilterTest, OnlyWhatChangedLeavesChangedAccountsStepsAndProperties) {
-  const json noted = notedWhileFiltering(R"(
+  const json noted = notedWhileFiltering(R"js(
     one("#changed-only").click();
     await pause();
     const changed = shownNow();
@@ -104,7 +104,7 @@ TEST(FilterTest, OnlyWhatChangedLeavesChangedAccountsStepsAndProperties) {
     await enter("");
     const everything = shownNow();
     note("everything", [everything.steps, everything.before.length, everything.after.length]);
-  )");
+  )js");
 
   EXPECT_EQ(noted["before"], json({"Gmail 'Ada at Gmail'", "CalDAV 'Google calendars'",
                                    "SubscribedCalendar 'Public holidays'", "IMAPAccount 'Family'",
@@ -118,20 +118,20 @@ TEST(FilterTest, OnlyWhatChangedLeavesChangedAccountsStepsAndProperties) {
 }
 
 TEST(FilterTest, ASlashGoesToTheFilterAndIsTextWithinIt) {
-  const json noted = notedWhileFiltering(R"(
+  const json noted = notedWhileFiltering(R"js(
     press("/");
     note("focused", page.activeElement.id);
     const event = new view.KeyboardEvent("keydown", { key: "/", bubbles: true, cancelable: true });
     one("#filter").dispatchEvent(event);
     note("isTaken", event.defaultPrevented);
-  )");
+  )js");
 
   EXPECT_EQ(noted["focused"], "filter");
   EXPECT_EQ(noted["isTaken"], false);
 }
 
 TEST(FilterTest, WhatAPersonOpenedStaysOpenWhileTheFilterChanges) {
-  const json noted = notedWhileFiltering(R"(
+  const json noted = notedWhileFiltering(R"js(
     all("#before .account > summary")[3].click();
     await pause();
     await enter("Work");
@@ -139,7 +139,7 @@ TEST(FilterTest, WhatAPersonOpenedStaysOpenWhileTheFilterChanges) {
     all("#before .account[open] > summary")[0].click();
     await enter("");
     note("closed", titles("#before .account[open]"));
-  )");
+  )js");
 
   EXPECT_EQ(noted["stays"], json::array({"IMAP 'Work'"}));
   EXPECT_EQ(noted["closed"], json::array());

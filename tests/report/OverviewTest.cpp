@@ -14,14 +14,14 @@ using nlohmann::json;
 std::vector<std::string> sentencesOf(const json& reports) {
   // The page's own functions, asked for one report after the other: a browser for each would be
   // slow.
-  const json noted = notedOn(pageOf(json::object()), R"(
-    note("sentences", )" + reports.dump() + R"(.map((report) => {
+  const json noted = notedOn(pageOf(json::object()), "const reports = " + reports.dump() + R"js(;
+    note("sentences", reports.map((report) => {
       const heading = view.document.createElement("div");
       heading.append(...view.overview(report, view.accountsOf(report)).filter((each) => each));
       heading.querySelector(".sign").remove();
       return heading.querySelector("h1").textContent;
     }));
-  )");
+  )js");
   return noted.value("sentences", std::vector<std::string>());
 }
 
@@ -65,13 +65,13 @@ TEST(OverviewTest, OneSentenceSaysWhatCameOfARunOrAPlan) {
 }
 
 TEST(OverviewTest, ShowsTheFactsWarningsKeptInputsAndAnnouncements) {
-  const json noted = notedOn(pageOf(sampleReport()), R"(
+  const json noted = notedOn(pageOf(sampleReport()), R"js(
     note("title", page.title);
     note("badges", all(".counts .badge").map((badge) => badge.textContent));
     note("facts", all("#overview .facts > div").map((fact) => fact.textContent));
     note("notices", all(".notice").map((notice) => notice.innerText));
     note("announcements", all(".announcements li").map((line) => line.textContent));
-  )");
+  )js");
 
   EXPECT_EQ(noted["title"], "Report of a migration: /mnt/image");
   EXPECT_EQ(noted["badges"],
@@ -87,28 +87,29 @@ TEST(OverviewTest, ShowsTheFactsWarningsKeptInputsAndAnnouncements) {
 }
 
 TEST(OverviewTest, WhatAReportDoesNotHoldIsLeftOut) {
-  const json noted = notedOn(pageOf({{"result", false}, {"error", "no such root: /mnt/image"}}), R"(
+  const json noted =
+      notedOn(pageOf({{"result", false}, {"error", "no such root: /mnt/image"}}), R"js(
     note("visible", all("main h1, main h2, main h3, #toolbar")
       .filter((each) => each.checkVisibility()).map((each) => each.textContent));
     note("error", one(".notice.error li").textContent);
-  )");
+  )js");
 
   EXPECT_EQ(noted["visible"], json({"✕The migration failed.", "Error"}));
   EXPECT_EQ(noted["error"], "no such root: /mnt/image");
 }
 
 TEST(OverviewTest, AReportThatIsNoJSONIsSaidToBeUnreadable) {
-  const json noted = notedOn(htmlReport(R"({"root": )"), R"(
+  const json noted = notedOn(htmlReport(R"({"root": )"), R"js(
     note("heading", one("h1").textContent);
-  )");
+  )js");
 
   EXPECT_EQ(noted["heading"], "This report cannot be read.");
 }
 
 TEST(OverviewTest, WithoutScriptsThePageSaysWhatToDo) {
-  const Visit visit = visitPage(pageOf(sampleReport()), R"(
+  const Visit visit = visitPage(pageOf(sampleReport()), R"js(
     note("text", page.body.innerText);
-  )",
+  )js",
                                 {.scripts = View::Scripts::forbidden});
 
   const std::string text = visit.noted.value("text", "");
@@ -117,9 +118,9 @@ TEST(OverviewTest, WithoutScriptsThePageSaysWhatToDo) {
 }
 
 TEST(OverviewTest, WithScriptsItDoesNot) {
-  const json noted = notedOn(pageOf(sampleReport()), R"(
+  const json noted = notedOn(pageOf(sampleReport()), R"js(
     note("text", page.body.innerText);
-  )");
+  )js");
 
   EXPECT_THAT(noted["text"].get<std::string>(), ::testing::Not(::testing::HasSubstr("JavaScript")));
 }

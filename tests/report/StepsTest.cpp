@@ -10,7 +10,7 @@ namespace {
 using nlohmann::json;
 
 // Opens the step whose title begins with a text, and the changed accounts in it.
-constexpr std::string_view kOpenStep = R"(
+constexpr std::string_view kOpenStep = R"js(
   const stepOf = (start) => all(".stage").find((stage) =>
     stage.querySelector(".title").textContent.startsWith(start));
   const openStep = async (start) => {
@@ -22,7 +22,7 @@ constexpr std::string_view kOpenStep = R"(
     return step;
   };
   const textsIn = (part, selector) => [...part.querySelectorAll(selector)].map((each) => each.textContent);
-)";
+)js";
 
 json notedWithSteps(const json& report, const std::string& driver) {
   return notedOn(pageOf(report), std::string(kOpenStep) + driver);
@@ -32,13 +32,13 @@ TEST(StepsTest, TheTimelineListsEveryStepWithResultNumberOfAccountsAndDuration) 
   json report = sampleReport();
   report["stages"][2]["succeeded"] = false;
 
-  const json noted = notedWithSteps(report, R"(
+  const json noted = notedWithSteps(report, R"js(
     note("steps", all(".timeline > li > .stage > summary").slice(0, 4).map((summary) => [
       summary.querySelector(".result .unseen").textContent.trim(),
       summary.querySelector(".title").textContent, summary.querySelector("code").textContent,
       summary.querySelector(".figures > span").textContent, summary.querySelector(".time").textContent]));
     note("count", all(".timeline > li").length);
-  )");
+  )js");
 
   EXPECT_EQ(noted["count"], 13);
   EXPECT_EQ(
@@ -52,13 +52,13 @@ TEST(StepsTest, TheTimelineListsEveryStepWithResultNumberOfAccountsAndDuration) 
 }
 
 TEST(StepsTest, AStepIsFoldedAndBuiltOnlyWhenItIsOpened) {
-  const json noted = notedWithSteps(sampleReport(), R"(
+  const json noted = notedWithSteps(sampleReport(), R"js(
     note("openBefore", all(".stage[open]").length);
     note("builtBefore", all(".stage .body").length);
     await openStep("Upgrade from version 3");
     note("openAfter", all(".stage[open]").length);
     note("builtAfter", all(".stage > .body").length);
-  )");
+  )js");
 
   EXPECT_EQ(noted["openBefore"], 0);
   EXPECT_EQ(noted["builtBefore"], 0);
@@ -67,7 +67,7 @@ TEST(StepsTest, AStepIsFoldedAndBuiltOnlyWhenItIsOpened) {
 }
 
 TEST(StepsTest, AnOpenStepShowsEachChangedPropertyBeforeAndAfterAndWhatDiffersInThem) {
-  const json noted = notedWithSteps(sampleReport(), R"(
+  const json noted = notedWithSteps(sampleReport(), R"js(
     const moved = (await openStep("Upgrade from version 3")).querySelector(".change.moved");
     note("title", moved.querySelector(".title").textContent);
     note("rows", [...moved.querySelectorAll("tbody tr")].map((row) => textsIn(row, "th, td")));
@@ -77,7 +77,7 @@ TEST(StepsTest, AnOpenStepShowsEachChangedPropertyBeforeAndAfterAndWhatDiffersIn
     const colours = ["del", "ins", "th"].map((tag) =>
       view.getComputedStyle(moved.querySelector(`tbody ${tag}`)).backgroundColor);
     note("coloursDiffer", new Set(colours).size);
-  )");
+  )js");
 
   EXPECT_EQ(noted["title"], "CalDAV 'Google calendars'");
   EXPECT_EQ(noted["rows"],
@@ -91,15 +91,15 @@ TEST(StepsTest, AnOpenStepShowsEachChangedPropertyBeforeAndAfterAndWhatDiffersIn
 }
 
 TEST(StepsTest, AnotherKindOfValueIsToldFromTheSameText) {
-  const json noted = notedWithSteps(sampleReport(), R"(
+  const json noted = notedWithSteps(sampleReport(), R"js(
     note("port", textsIn(await openStep("Upgrade from version 5"), ".change td"));
-  )");
+  )js");
 
   EXPECT_EQ(noted["port"], json({"\"993\"", "993"}));
 }
 
 TEST(StepsTest, ShowsFilesLogLinesAndWhatChangedBesideTheAccountsInTheStepTheyBelongTo) {
-  const json noted = notedWithSteps(sampleReport(), R"(
+  const json noted = notedWithSteps(sampleReport(), R"js(
     const step = await openStep("Upgrade from version 3");
     note("files", textsIn(step, ".files li"));
     note("log", textsIn(step, ".log li"));
@@ -107,7 +107,7 @@ TEST(StepsTest, ShowsFilesLogLinesAndWhatChangedBesideTheAccountsInTheStepTheyBe
     const other = await openStep("Upgrade from version 4");
     note("filesOfAnother", textsIn(other, ".files li"));
     note("logOfAnother", textsIn(other, ".log li"));
-  )");
+  )js");
 
   EXPECT_EQ(noted["files"],
             json({"created /var/mobile/tmp/Accounts.Xa81Qz",
@@ -123,14 +123,14 @@ TEST(StepsTest, ShowsFilesLogLinesAndWhatChangedBesideTheAccountsInTheStepTheyBe
 TEST(StepsTest, AStepAndAChangeWithoutAnythingAreShownAllTheSame) {
   const json report = {{"stages", {json::object(), {{"accounts", {json::object()}}}}}};
 
-  const json noted = notedWithSteps(report, R"(
+  const json noted = notedWithSteps(report, R"js(
     all(".stage > summary").forEach((summary) => summary.click());
     await pause();
     all(".change > summary").forEach((summary) => summary.click());
     await pause();
     note("titles", textsIn(page, ".title"));
     note("empty", textsIn(page, ".stage > .body > p"));
-  )");
+  )js");
 
   EXPECT_EQ(noted["titles"], json({"a step", "a step", "an account"}));
   EXPECT_EQ(noted["empty"], json::array({"Nothing to show."}));
