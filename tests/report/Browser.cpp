@@ -121,7 +121,7 @@ ProgramResult runBrowser(const ScratchDirectory& directory, std::vector<std::str
                                   "--hide-scrollbars",
                                   "--enable-logging=stderr",
                                   "--window-size=1300,900",
-                                  "--virtual-time-budget=60000",
+                                  "--virtual-time-budget=30000",
                                   "--user-data-dir=" + directory.pathOf("profile")};
   all.insert(all.end(), arguments.begin(), arguments.end());
   all.push_back("file://" + page);
