@@ -50,17 +50,18 @@ function openPart(part) {
 
 /**
  * A part that folds. `summary` is what is seen of it when it is folded, `build` gives its content, and
- * `item` is what of the report it shows, if a person's opening it is to be remembered.
+ * `item` is what of the report it shows, if a person's opening it is to be remembered. `hasMatch` says
+ * whether the filter's words are in the item, for which it may be opened.
  */
-function makePart(attributes, summary, build, item = null) {
+function makePart(attributes, summary, build, item = null, hasMatch = item !== null) {
   const part = make("details", attributes, make("summary", {}, summary));
   builders.set(part, build);
   if (item !== null) {
     itemOfPart.set(part, item);
   }
   // An item within the content of a folded one would be lost to whoever filters for it.
-  const hidesMatch = filter.words.length > 0 && !hasWords(part.textContent);
-  if (openedItems.has(item) || (hidesMatch && item !== null && matchesAreFew)) {
+  const hidesMatch = hasMatch && filter.words.length > 0 && !hasWords(part.textContent);
+  if (openedItems.has(item) || (hidesMatch && matchesAreFew)) {
     openPart(part);
   }
   return part;

@@ -1,8 +1,12 @@
 // The steps of a migration as a timeline, and what each of them changed, wrote and logged.
 
-/** Whether a step did anything that can be seen in the device's files. */
+// What every upgrade step changes, whether it has work or not.
+const kStamp = "Version";
+
+/** Whether a step did more than put its version on what it found. */
 function changedAnything(stage) {
-  return [stage.accounts, stage.otherProperties, stage.files].some((list) => list?.length > 0);
+  return stage.accounts?.length > 0 || stage.files?.length > 0 ||
+    (stage.otherProperties ?? []).some((property) => property.path !== kStamp);
 }
 
 /** Whether the filter shows a step. */

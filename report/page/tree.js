@@ -17,7 +17,7 @@ function isShown(account) {
 /** An account and, beneath it, its children: all of them if the filter chose the account itself. */
 function accountNode(account, page) {
   account.part = makePart({ class: ["account", ...account.marks].join(" ") }, accountSummary(account),
-    () => accountBody(account, page), account);
+    () => accountBody(account, page), account, isChosen(account));
   page.accountOfPart.set(account.part, account);
   const children = isChosen(account) && !filter.changedOnly ? account.children :
     account.children.filter(isChosen);

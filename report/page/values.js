@@ -20,7 +20,7 @@ function describe(value) {
   const isText = typeof value === "string";
   // With blanks after commas, so that a long list is broken between its elements.
   const text = isText && !kAmbiguous.test(value) ? value :
-    JSON.stringify(value, null, 1).replace(/\n */g, " ");
+    JSON.stringify(value, null, 1).replace(/(?<=[[{])\n *|\n *(?=[\]}])/g, "").replace(/\n */g, " ");
   const whole = shown(text);
   return whole.length <= kLongestText ? whole :
     `${shown(text.slice(0, kLongestText))}… (${text.length} characters)`;

@@ -82,9 +82,9 @@ TEST(AccountTreesTest, AnOpenAccountShowsItsPropertiesWithTheChangedOnesMarked) 
   EXPECT_EQ(noted["paths"], json({"Class", "DisplayName", "Enabled Dataclasses", "Hostname",
                                   "Identifier", "Password", "PortNumber", "Provisioned Dataclasses",
                                   "SSLEnabled", "Type", "Username"}));
-  EXPECT_EQ(noted["removedValues"], json({R"([ "com.quarx.Dataclass.Mail" ])", "\"993\""}));
+  EXPECT_EQ(noted["removedValues"], json({R"(["com.quarx.Dataclass.Mail"])", "\"993\""}));
   EXPECT_EQ(noted["newValues"],
-            json({R"([ "com.quarx.Dataclass.Mail", "com.quarx.Dataclass.Calendars" ])", "993"}));
+            json({R"(["com.quarx.Dataclass.Mail", "com.quarx.Dataclass.Calendars"])", "993"}));
   EXPECT_EQ(noted["nested"], json({"Rules/Archive/Days", "Rules/Archive/Enabled"}));
   EXPECT_EQ(noted["marksOfUnchanged"], 0);
 }
