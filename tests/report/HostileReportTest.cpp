@@ -91,15 +91,15 @@ TEST(HostileReportTest, MarkupAndScriptsInAnyTextAreShownAndDoNothing) {
 TEST(HostileReportTest, UnseenCharactersAndHalvesOfCharactersAreShownAsWhatTheyAre) {
   // A line separator, a right-to-left override, a control character and half of a surrogate pair.
   const std::string report = reportFullOf("PLACE").dump();
-  std::string json;
+  std::string replaced;
   const std::string hostile = R"(a\u2028b\u202ec\u0007d\ud800e\u0000f)";
   for (std::size_t at = 0; at < report.size();) {
     const bool isPlace = report.compare(at, 5, "PLACE") == 0;
-    json += isPlace ? hostile : report.substr(at, 1);
+    replaced += isPlace ? hostile : report.substr(at, 1);
     at += isPlace ? 5 : 1;
   }
 
-  const auto noted = notedOn(htmlReport(json), std::string(kShowEverything) + R"js(
+  const json noted = notedOn(htmlReport(replaced), std::string(kShowEverything) + R"js(
     await enter("");
     note("title", one(".stage .title").textContent);
   )js");
