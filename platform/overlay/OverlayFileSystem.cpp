@@ -121,7 +121,7 @@ Result OverlayFileSystem::put(std::string_view operation, std::string_view path,
 
 Result OverlayFileSystem::copyFile(std::string_view source, std::string_view destination) {
   if (!fileExists(source) || isDirectory(source)) {
-    return failure("copy", source, kNoSuchFile);
+    return failure("open", source, kNoSuchFile);
   }
   if (kindOfEntry(destination) != EntryKind::Nothing) {
     return failure("copy to", destination, kFileExists);
@@ -209,7 +209,7 @@ Result OverlayFileSystem::setOwnerAndGroup(std::string_view path, std::string_vi
 
 Result OverlayFileSystem::renameFile(std::string_view source, std::string_view destination) {
   if (!fileExists(source) || isDirectory(source)) {
-    return failure("rename", source, kNoSuchFile);
+    return failure("open", source, kNoSuchFile);
   }
   const Contents contents = contentsOf(source);
   const auto* inMemory = std::get_if<InMemory>(&contents);

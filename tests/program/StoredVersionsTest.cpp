@@ -7,6 +7,8 @@
 #include <algorithm>
 #include <filesystem>
 #include <fstream>
+#include <map>
+#include <regex>
 #include <sstream>
 
 #include "propertylist/BinaryPropertyList.h"
@@ -79,10 +81,41 @@ class StoredVersions : public DeviceRootFixture, public testing::WithParamInterf
 
   [[nodiscard]] static fs::path directory() { return versionsDirectory() / GetParam(); }
 
-  [[nodiscard]] ProgramResult migrateInEnglish() const {
-    ProgramCall call = migrationCall({"--json"});
+  [[nodiscard]] ProgramCall migrationCallInEnglish(
+      const std::vector<std::string>& arguments) const {
+    ProgramCall call = migrationCall(arguments);
     call.environment = {{"LC_ALL", "C"}, {"LANGUAGE", "en"}};
-    return runProgram(call);
+    return call;
+  }
+  [[nodiscard]] ProgramResult migrateInEnglish() const {
+    return runProgram(migrationCallInEnglish({"--json"}));
+  }
+
+  /// A part of a report as text, without what differs from run to run: how long the stages took,
+  /// and identifiers that the migration made up, which are numbered.
+  [[nodiscard]] std::string comparable(nlohmann::json part) const {
+    if (part.is_array()) {
+      for (nlohmann::json& element : part) {
+        if (element.is_object()) {
+          element.erase("seconds");
+        }
+      }
+    }
+    std::string text = part.dump(2);
+    static const std::regex form("[0-9A-F]{8}(-[0-9A-F]{4}){3}-[0-9A-F]{12}");
+    std::map<std::string, std::string> names;
+    for (std::sregex_iterator found(text.begin(), text.end(), form), end; found != end; ++found) {
+      if (!textsBefore_.contains(found->str())) {
+        names.try_emplace(found->str(), "NEW-" + std::to_string(names.size()));
+      }
+    }
+    for (const auto& [identifier, name] : names) {
+      for (std::size_t at = text.find(identifier); at != std::string::npos;
+           at = text.find(identifier)) {
+        text.replace(at, identifier.size(), name);
+      }
+    }
+    return text;
   }
 
   /// The account settings, with names for the identifiers that the migration made up.
@@ -100,6 +133,22 @@ TEST_P(StoredVersions, EndWithTheAccountsThatAPersonDerived) {
   ASSERT_EQ(result.exitStatus, 0) << result.errors;
   const std::vector<std::string> found = differences(expectedSettings(GetParam()), settingsFound());
   EXPECT_TRUE(found.empty()) << joined(found);
+}
+
+TEST_P(StoredVersions, ArePlannedAsTheyAreThenMigrated) {
+  ProgramCall call = migrationCallInEnglish({"--json"});
+  call.arguments.front() = "plan";
+  const nlohmann::json planned = onlyObject(runProgram(call));
+  const std::string reportFile = onThisMachine("/report.json").string();
+
+  ASSERT_EQ(runProgram(migrationCallInEnglish({"--report", reportFile})).exitStatus, 0);
+
+  const nlohmann::json done = nlohmann::json::parse(readText("/report.json"));
+  EXPECT_EQ(comparable(planned["stages"]), comparable(done["stages"]));
+  for (const char* key :
+       {"versions", "accountsBefore", "accountsAfter", "broadcasts", "cloudTabAnnouncements"}) {
+    EXPECT_EQ(comparable(planned[key]), comparable(done[key])) << key;
+  }
 }
 
 TEST_P(StoredVersions, SayOnTheConsoleWhatHappened) {
