@@ -32,8 +32,10 @@ inline constexpr const char* kShowExamples =
 
 inline constexpr const char* kDiff =
     "Compare two files of one kind, account by account. Accounts are the same if they have the\n"
-    "same identifier, wherever they stand; + is an added account or value, - a removed one, * an\n"
-    "account that changed or moved to another parent. Passwords and the like are hidden.";
+    "same identifier, wherever they stand, or else if they alone have their type and name; + is "
+    "an\n"
+    "added account or value, - a removed one, * an account that changed or moved to another\n"
+    "parent. Passwords and the like are hidden.";
 inline constexpr const char* kDiffStatuses =
     "  0   the files hold the same\n"
     "  1   they differ\n";

@@ -37,30 +37,77 @@ class ArrayComparison {
         secrets_(secrets) {}
 
   void addTo(StoreDifference& difference) {
-    std::unordered_map<std::string, std::deque<std::size_t>> unmatched;
-    for (std::size_t index = 0; index < before_.size(); ++index) {
-      unmatched[matchingKey(before_[index], layout_)].push_back(index);
-    }
-    std::vector<bool> isMatched(before_.size());
-    for (ListedAccount& account : after_) {
-      std::deque<std::size_t>& candidates = unmatched[matchingKey(account, layout_)];
-      if (candidates.empty()) {
-        difference.accounts.emplace_back().after = std::move(account);
-        continue;
+    matchInOrder([&](const ListedAccount& account) { return matchingKey(account, layout_); });
+    matchRenamed();
+    for (std::size_t index = 0; index < after_.size(); ++index) {
+      if (partners_[index]) {
+        addChange(*partners_[index], std::move(after_[index]), difference);
+      } else {
+        difference.accounts.emplace_back().after = std::move(after_[index]);
       }
-      const std::size_t index = candidates.front();
-      candidates.pop_front();
-      isMatched[index] = true;
-      addChange(index, std::move(account), difference);
     }
     for (std::size_t index = 0; index < before_.size(); ++index) {
-      if (!isMatched[index]) {
+      if (!isMatched_[index]) {
         difference.accounts.emplace_back().before = before_[index];
       }
     }
   }
 
  private:
+  void match(std::size_t before, std::size_t after) {
+    partners_[after] = before;
+    isMatched_[before] = true;
+  }
+
+  /// Accounts with one key are the same, in their order.
+  template <class KeyOf>
+  void matchInOrder(const KeyOf& keyOf) {
+    std::unordered_map<std::string, std::deque<std::size_t>> unmatched;
+    for (std::size_t index = 0; index < before_.size(); ++index) {
+      unmatched[keyOf(before_[index])].push_back(index);
+    }
+    for (std::size_t index = 0; index < after_.size(); ++index) {
+      std::deque<std::size_t>& candidates = unmatched[keyOf(after_[index])];
+      if (!candidates.empty()) {
+        match(candidates.front(), index);
+        candidates.pop_front();
+      }
+    }
+  }
+
+  /// The type and name of an account that has both; empty for another one.
+  [[nodiscard]] std::string nameIn(const ListedAccount& account) const {
+    const bool hasBoth = account.properties &&
+                         !wordFor(*account.properties, layout_.nameKey).empty() &&
+                         !wordFor(*account.properties, layout_.typeKey).empty();
+    return hasBoth ? titleOf(account, layout_) : "";
+  }
+
+  /// An account that got another identifier: what is left on both sides is the same where it alone
+  /// has its type and name.
+  void matchRenamed() {
+    struct Namesakes {
+      std::vector<std::size_t> before;
+      std::vector<std::size_t> after;
+    };
+    std::unordered_map<std::string, Namesakes> byName;
+    for (std::size_t index = 0; index < before_.size(); ++index) {
+      if (!isMatched_[index]) {
+        byName[nameIn(before_[index])].before.push_back(index);
+      }
+    }
+    for (std::size_t index = 0; index < after_.size(); ++index) {
+      if (!partners_[index]) {
+        byName[nameIn(after_[index])].after.push_back(index);
+      }
+    }
+    for (const auto& [name, namesakes] : byName) {
+      if (!name.empty() && namesakes.before.size() == 1 && namesakes.after.size() == 1) {
+        match(namesakes.before.front(), namesakes.after.front());
+      }
+    }
+  }
+
   void addChange(std::size_t index, ListedAccount after, StoreDifference& difference) {
     const ListedAccount& before = before_[index];
     AccountChange change;
@@ -81,6 +128,10 @@ class ArrayComparison {
 
   std::vector<ListedAccount> before_;
   std::vector<ListedAccount> after_;
+  /// Of each account in the newer file, the same one in the older file.
+  std::vector<std::optional<std::size_t>> partners_ =
+      std::vector<std::optional<std::size_t>>(after_.size());
+  std::vector<bool> isMatched_ = std::vector<bool>(before_.size());
   const StoreLayout& layout_;
   Secrets secrets_;
   /// The place of the last account that stayed where it was, in the older file.

@@ -38,7 +38,8 @@ struct StoreDifference {
 
 /// Compares two roots of one kind. Accounts are the same if they have the same identifier;
 /// several with one identifier are compared in their order, as are those without one that have the
-/// same type and name.
+/// same type and name. Of what is left, an account that alone has its type and name on both sides
+/// is the same with another identifier.
 StoreDifference differenceBetween(const PropertyDictionary& before, const PropertyDictionary& after,
                                   FileKind kind, Secrets secrets);
 

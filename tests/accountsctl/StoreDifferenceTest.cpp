@@ -38,6 +38,21 @@ std::string difference(const PropertyDictionary& before, const PropertyDictionar
   return text;
 }
 
+TEST(StoreDifference, AnAccountThatAloneHasItsTypeAndNameIsTheSameWithAnotherIdentifier) {
+  EXPECT_EQ(difference(settings({account("A", "Work")}), settings({account("B", "Work")})),
+            "* 1 Mail 'Work' (B)\n"
+            "    - Identifier: A\n"
+            "    + Identifier: B\n");
+}
+
+TEST(StoreDifference, AccountsWithANamesakeAreNotTheSameWithAnotherIdentifier) {
+  EXPECT_EQ(difference(settings({account("A", "Work")}),
+                       settings({account("B", "Work"), account("C", "Work")})),
+            "+ 1 Mail 'Work' (B)\n"
+            "+ 2 Mail 'Work' (C)\n"
+            "- 1 Mail 'Work' (A)\n");
+}
+
 TEST(StoreDifference, EqualFilesDoNotDiffer) {
   const PropertyDictionary file = settings({account("A"), parentOf("B", {account("C")})});
 
@@ -46,17 +61,17 @@ TEST(StoreDifference, EqualFilesDoNotDiffer) {
 }
 
 TEST(StoreDifference, AccountsAreAddedAndRemoved) {
-  EXPECT_EQ(
-      difference(settings({account("A"), account("B")}), settings({account("C"), account("B")})),
-      "+ 1 Mail 'Name' (C)\n"
-      "- 1 Mail 'Name' (A)\n");
+  EXPECT_EQ(difference(settings({account("A", "Old"), account("B")}),
+                       settings({account("C", "New"), account("B")})),
+            "+ 1 Mail 'New' (C)\n"
+            "- 1 Mail 'Old' (A)\n");
 }
 
 TEST(StoreDifference, ChildrenAreAccountsOfTheirOwn) {
-  EXPECT_EQ(difference(settings({parentOf("P", {account("A")})}),
-                       settings({parentOf("P", {account("B")})})),
-            "+ 1.1 Mail 'Name' (B)\n"
-            "- 1.1 Mail 'Name' (A)\n");
+  EXPECT_EQ(difference(settings({parentOf("P", {account("A", "Old")})}),
+                       settings({parentOf("P", {account("B", "New")})})),
+            "+ 1.1 Mail 'New' (B)\n"
+            "- 1.1 Mail 'Old' (A)\n");
 }
 
 TEST(StoreDifference, PropertiesThatChangedAreListedInTheOrderOfTheirKeys) {
