@@ -3,8 +3,10 @@
 #include <unistd.h>
 
 #include <memory>
+#include <string>
 #include <utility>
 #include <variant>
+#include <vector>
 
 #include "host/PluginRun.h"
 #include "host/RootLock.h"
@@ -59,6 +61,24 @@ struct PlannedPlatform {
   Platform platform;
 };
 
+/// What a run's verification would find of a result in memory.
+void foreseeVerification(LinuxPlatform& linux, PropertyLists& planned, const AccountFiles& files,
+                         RunReport& report) {
+  if (const auto problem = whyNotMigrated(planned, files.settings, report.settingsSaves.last)) {
+    setError(report, {ExitStatus::NotVerified, "The result would not be verified: " + *problem});
+    return;
+  }
+  std::vector<std::string> inputs = files.inputs();
+  std::erase_if(inputs,
+                [&](const std::string& path) { return !linux.fileSystem().fileExists(path); });
+  const auto readInput = [&](const std::string& path) {
+    return linux.propertyLists().readDictionary(path);
+  };
+  for (std::string& sentence : whatMayBeMissing(planned, files, inputs, readInput)) {
+    report.warnings.push_back(std::move(sentence) + "; a run would keep the files as they were");
+  }
+}
+
 HostOutcome failed(const ProgramError& error) {
   return {reportOf(error), {}};
 }
@@ -77,21 +97,17 @@ HostOutcome planWithPlugin(const PlanOptions& options) {
   }
   PlannedPlatform planned(linux, temporaryDirectoryOf(options.device));
   const AccountFiles files = accountFilesInHome(linux.platform().homeDirectory.path());
-  PluginOutcome outcome = runPluginInChild(
-      {.bundle = device.bundle,
-       .platform = planned.platform,
-       .linux = linux,
-       .files = files,
-       .recorded = options.secrets,
-       .inspect = [&](const Platform& platform, RunReport& report) {
-         const auto problem = report.result ? whyNotMigrated(platform.propertyLists, files.settings,
-                                                             report.settingsSaves.last)
-                                            : std::nullopt;
-         if (problem) {
-           setError(report,
-                    {ExitStatus::NotVerified, "The result would not be verified: " + *problem});
-         }
-       }});
+  PluginOutcome outcome =
+      runPluginInChild({.bundle = device.bundle,
+                        .platform = planned.platform,
+                        .linux = linux,
+                        .files = files,
+                        .recorded = options.secrets,
+                        .inspect = [&](const Platform& platform, RunReport& report) {
+                          if (report.result) {
+                            foreseeVerification(linux, platform.propertyLists, files, report);
+                          }
+                        }});
   return {reportOf(std::move(outcome.report)), std::move(outcome.recorded)};
 }
 

@@ -114,16 +114,16 @@ std::optional<std::string> whyNotMigrated(PropertyLists& propertyLists, const st
 }
 
 std::vector<std::string> whatMayBeMissing(PropertyLists& propertyLists, const AccountFiles& files,
-                                          const std::vector<std::string>& keptInputs,
-                                          const std::string& folder) {
+                                          const std::vector<std::string>& inputs,
+                                          const ReadInput& readInput) {
   std::vector<std::string> sentences;
   const PropertyDictionary migrated =
       propertyLists.readDictionary(files.settings).value_or(PropertyDictionary());
   const Identifiers identifiers = identifiersOf(migrated);
   Identifiers fromElsewhere = {std::string(kDeviceLocalIdentifier)};
   // The settings file comes last, when what the legacy stores hold is known.
-  for (const std::string& path : keptInputs) {
-    const auto contents = propertyLists.readDictionary(keptPath(folder, path));
+  for (const std::string& path : inputs) {
+    const auto contents = readInput(path);
     if (!contents) {
       sentences.push_back(path + " could not be read as a property list");
     } else if (path == files.settings) {

@@ -67,7 +67,10 @@ void SafetyNet::settleVerified(Settlement& settlement) {
   if (!folder_) {
     return;
   }
-  settlement.warnings = whatMayBeMissing(propertyLists_, accountFiles_, keptInputs_, *folder_);
+  settlement.warnings =
+      whatMayBeMissing(propertyLists_, accountFiles_, keptInputs_, [this](const std::string& path) {
+        return propertyLists_.readDictionary(keptPath(*folder_, path));
+      });
   if (settlement.warnings.empty()) {
     discardFolder(settlement);
     return;

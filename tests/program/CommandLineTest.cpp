@@ -58,6 +58,26 @@ TEST(CommandLine, AnUnknownOptionIsRefused) {
   expectRefused({"run", "--root", "/nowhere", "--rot13"}, "--rot13");
 }
 
+TEST(CommandLine, AMisspeltWordIsNamedWithTheOneThatWasMeant) {
+  expectRefused({"rum"}, "did you mean 'run'?");
+  expectRefused({"plan", "--root", "/nowhere", "--htlm", "x"}, "did you mean '--html'?");
+}
+
+TEST(CommandLine, PlanIsRefusedWhereRunIs) {
+  expectRefused({"plan"}, "--root");
+  expectRefused({"plan", "--root", ""}, "--root");
+  expectRefused({"plan", "--root", "/nowhere", "--bare"}, "--bare");
+}
+
+TEST(CommandLine, HelpOfPlanNamesEveryOption) {
+  const std::string help = textFor({"plan", "--help"});
+
+  for (const char* option : {"--root", "--home", "--device", "--plugin", "--temporary-directory",
+                             "--channel", "--report", "--html", "--show-secrets", "--json"}) {
+    EXPECT_NE(help.find(option), std::string::npos) << option;
+  }
+}
+
 TEST(CommandLine, AStrayArgumentIsRefused) {
   expectRefused({"run", "--root", "/nowhere", "stray"}, "stray");
 }

@@ -170,6 +170,21 @@ TEST_F(Plan, ForeseesThatTheSettingsFileCannotBeGivenToItsOwner) {
   EXPECT_EQ(migrate().exitStatus, 2);
 }
 
+TEST_F(Plan, ForeseesThatAnAccountWouldNotBeCarriedOver) {
+  write(kLegacyMailPath,
+        PropertyDictionary{{"MailAccounts", PropertyArray{PropertyDictionary{
+                                                {"uniqueId", "M"}, {"AccountName", "No class"}}}}});
+
+  const nlohmann::json report = planned();
+
+  EXPECT_EQ(report["exitStatus"], 0);
+  EXPECT_EQ(report["warnings"],
+            (nlohmann::json{"Not every account of " + std::string(kLegacyMailPath) +
+                            " was found in the settings file; a run would keep the files as they "
+                            "were"}));
+  EXPECT_EQ(stageNamed(report, "_migrateMailAccounts:")["succeeded"], false);
+}
+
 TEST_F(Plan, WorksOnARootThatIsMountedReadOnly) {
   const SmallDisk disk(SmallDisk::Kind::Memory, root());
   if (disk.reason()) {
