@@ -18,8 +18,9 @@ class Account {
 
 // Each with the sign that tells it without its colour.
 const kMarks = {
-  added: "+", removed: "−", changed: "≠", moved: "⇄", converted: "⇒",
+  added: "+", removed: "−", changed: "≠", moved: "⇄", converted: "⇒", identified: "#",
 };
+const kMarkNames = { identified: "new identifier" };
 const kSources = { mailStore: "legacy mail store", exchangeStore: "legacy Exchange store" };
 
 /** An account's values by their paths, without the children, which are accounts of their own. */
@@ -77,8 +78,13 @@ function marksOf(account) {
              content.type !== partner.content.type || content.class !== partner.content.class) {
     marks.push("changed");
   }
-  if (account.parent?.content.identifier !== partner.parent?.content.identifier) {
+  const hasSameParent = account.parent === null ? partner.parent === null :
+    partner.parent !== null && account.parent.partner === partner.parent;
+  if (!hasSameParent) {
     marks.push("moved");
+  }
+  if (identityOf(account) !== identityOf(partner)) {
+    marks.push("identified");
   }
   return marks;
 }
@@ -90,6 +96,8 @@ function accountsOf(report) {
   const sides = { before, after, allBefore: flattened(before), allAfter: flattened(after) };
   pairBy((account) => `${account.content.source} ${identityOf(account)}`, sides.allBefore, sides.allAfter);
   pairBy(identityOf, sides.allBefore, sides.allAfter);
+  // A step that gives accounts their identifiers leaves them their names.
+  pairBy((account) => `${account.content.source} ${account.title}`, sides.allBefore, sides.allAfter);
   sides.withIdentifier = { before: new Map(), after: new Map() };
   for (const account of [...sides.allBefore, ...sides.allAfter]) {
     account.marks = marksOf(account);
@@ -115,7 +123,7 @@ function textsOf({ content, properties }) {
 
 function badge(mark) {
   return make("span", { class: `badge ${mark}` },
-    make("span", { "aria-hidden": "true" }, `${kMarks[mark] ?? "•"} `), mark);
+    make("span", { "aria-hidden": "true" }, `${kMarks[mark] ?? "•"} `), kMarkNames[mark] ?? mark);
 }
 
 function shortName(dataclass) {

@@ -90,7 +90,7 @@ function overview(report, accounts) {
     make("h1", { class: outcome }, make("span", { class: "sign", "aria-hidden": "true" },
       outcome === "failed" || outcome === "unverified" ? "✕" : "✓"), sentence),
     make("p", { class: "counts" }, marks.map((mark) => [make("span", { class: `badge ${mark}` },
-      `${counts[mark].toLocaleString("en")} ${mark}`), " "]),
+      `${counts[mark].toLocaleString("en")} ${kMarkNames[mark] ?? mark}`), " "]),
       counts.unchanged > 0 ? make("span", { class: "badge" }, `${counts.unchanged.toLocaleString("en")} unchanged`) : null),
     overviewFacts(report),
     notice("error", "Error", report.error ? [report.error] : []),
@@ -99,12 +99,13 @@ function overview(report, accounts) {
   ];
 }
 
-/** Whom the migration told of its changes; none if nobody. */
+/** Whom the migration told of its changes, or would tell; none if nobody. */
 function announcements(report) {
+  const [was, were] = report.command === "plan" ? ["would be", "would be"] : ["was", "were"];
   const lines = (report.broadcasts ?? []).map((each) => make("li", {},
-    data("code", {}, each.application ?? ""), " was told that ", data("code", {}, each.key ?? ""), " changed"));
+    data("code", {}, each.application ?? ""), ` ${was} told that `, data("code", {}, each.key ?? ""), " changed"));
   if (report.cloudTabAnnouncements > 0) {
-    lines.push(make("li", {}, "Cloud tabs were announced ",
+    lines.push(make("li", {}, `Cloud tabs ${were} announced `,
       report.cloudTabAnnouncements === 1 ? "once" : `${report.cloudTabAnnouncements} times`));
   }
   return lines.length === 0 ? null : make("ul", { class: "announcements" }, lines);

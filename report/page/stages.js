@@ -40,9 +40,15 @@ function resultOf(stage) {
   return stage.succeeded === undefined ? "" : stage.succeeded ? "succeeded" : "failed";
 }
 
+/** What a step did, in a word or two. */
+function amountOf(stage) {
+  const amounts = [["account", stage.accounts], ["file", stage.files]];
+  const [noun, list] = amounts.find(([, each]) => each?.length > 0) ?? [];
+  return noun ? counted(list.length, noun) : changedAnything(stage) ? "" : "no change";
+}
+
 function stageSummary(stage, longest) {
   const result = resultOf(stage);
-  const changed = stage.accounts?.length ?? 0;
   return [
     make("span", { class: "result" },
       make("span", { "aria-hidden": "true" }, { succeeded: "✓", failed: "✕" }[result] ?? "·"),
@@ -51,9 +57,9 @@ function stageSummary(stage, longest) {
       data("strong", { class: "title" }, stage.title ?? stage.name ?? "a step"),
       stage.title && stage.name ? [" ", data("code", {}, stage.name)] : null),
     make("span", { class: "figures" },
-      make("span", { class: changed > 0 ? "count" : "dim" },
-        changed > 0 ? `${counted(changed, "account")}` : changedAnything(stage) ? "" : "no change"),
-      stage.seconds === undefined ? null : make("span", { class: "time" }, duration(stage.seconds),
+      make("span", { class: stage.accounts?.length > 0 ? "count" : "dim" }, amountOf(stage)),
+      typeof stage.seconds !== "number" ? make("span", { class: "time" }) :
+        make("span", { class: "time" }, duration(stage.seconds),
         make("span", { class: "share", "aria-hidden": "true",
                        style: `--share: ${longest > 0 ? stage.seconds / longest : 0}` }))),
   ];

@@ -152,5 +152,41 @@ TEST(AccountTreesTest, AccountsArePairedByIdentifierOrElseByTitleEachWithOneOthe
             json({"IMAP 'First'", "IMAP 'No identifier'", "IMAP 'No identifier' + added"}));
 }
 
+TEST(AccountTreesTest, AnAccountWithANewIdentifierIsTheOldOneAndItsChildrenStayWhereTheyWere) {
+  json before = plainAccount("OLD", "Velmora 'Ada'");
+  const json child = plainAccount("CHILD", "Velmora 'Child'");
+  before["children"].push_back(child);
+  json after = before;
+  after["identifier"] = "NEW";
+  const json other = plainAccount("ANOTHER", "Velmora 'Another name'");
+
+  const json noted = notedOnTrees(
+      {{"accountsBefore", json::array({before})}, {"accountsAfter", json::array({after, other})}},
+      R"js(
+    note("before", tree("before"));
+    note("after", tree("after"));
+  )js");
+
+  EXPECT_EQ(noted["before"], json({"Velmora 'Ada' # new identifier", "Velmora 'Child'"}));
+  EXPECT_EQ(noted["after"], json({"Velmora 'Ada' # new identifier", "Velmora 'Child'",
+                                  "Velmora 'Another name' + added"}));
+}
+
+TEST(AccountTreesTest, AChildThatOutlivesItsParentHasMoved) {
+  json parent = plainAccount("PARENT", "Velmora 'Parent'");
+  const json child = plainAccount("CHILD", "Velmora 'Child'");
+  parent["children"].push_back(child);
+
+  const json noted = notedOnTrees(
+      {{"accountsBefore", json::array({parent})}, {"accountsAfter", json::array({child})}},
+      R"js(
+    note("before", tree("before"));
+    note("after", tree("after"));
+  )js");
+
+  EXPECT_EQ(noted["before"], json({"Velmora 'Parent' − removed", "Velmora 'Child' ⇄ moved"}));
+  EXPECT_EQ(noted["after"], json::array({"Velmora 'Child' ⇄ moved"}));
+}
+
 }  // namespace
 }  // namespace accounts

@@ -86,6 +86,21 @@ TEST(OverviewTest, ShowsTheFactsWarningsKeptInputsAndAnnouncements) {
                                           "Cloud tabs were announced once"}));
 }
 
+TEST(OverviewTest, APlanSaysWhomAMigrationWouldTell) {
+  json plan = sampleReport();
+  plan["command"] = "plan";
+
+  const json noted = notedOn(pageOf(plan), R"js(
+    note("title", page.title);
+    note("announcements", all(".announcements li").map((line) => line.textContent));
+  )js");
+
+  EXPECT_EQ(noted["title"], "Plan of a migration: /mnt/image");
+  EXPECT_EQ(noted["announcements"],
+            json({"com.quarx.mobilemail would be told that MailAccounts changed",
+                  "Cloud tabs would be announced once"}));
+}
+
 TEST(OverviewTest, WhatAReportDoesNotHoldIsLeftOut) {
   const json noted =
       notedOn(pageOf({{"result", false}, {"error", "no such root: /mnt/image"}}), R"js(

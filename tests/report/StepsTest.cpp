@@ -43,7 +43,7 @@ TEST(StepsTest, TheTimelineListsEveryStepWithResultNumberOfAccountsAndDuration) 
   EXPECT_EQ(noted["count"], 13);
   EXPECT_EQ(
       noted["steps"],
-      json({{"succeeded", "Copy the settings file aside", "copySettingsAside", "", "1.1 ms"},
+      json({{"succeeded", "Copy the settings file aside", "copySettingsAside", "1 file", "1.1 ms"},
             {"succeeded", "Convert the Exchange accounts", "_migrateExchangeAccounts:", "1 account",
              "2.3 ms"},
             {"failed", "Convert the mail accounts", "_migrateMailAccounts:", "1 account", "1.9 ms"},
