@@ -11,7 +11,7 @@ namespace accounts {
 struct CheckOptions {
   /// A file of this machine, "-" for standard input.
   std::string file;
-  /// The plug-in's bundle; none for the one beside the program.
+  /// The plug-in's bundle; none for that of the program.
   std::optional<std::string> bundle;
   /// The device description; none for that of this machine.
   std::optional<std::string> device;

@@ -66,7 +66,7 @@ void addShowSecrets(CLI::App& command, Arguments& arguments) {
 
 void addBundle(CLI::App& command, std::optional<std::string>& bundle) {
   addPath(command, "--plugin", bundle, "BUNDLE",
-          "The plug-in bundle (default: accounts.migrator beside the program)");
+          "The plug-in bundle (default: that of the program)");
 }
 
 void addShow(CLI::App& command, Arguments& arguments) {

@@ -20,7 +20,7 @@ DevicePlatform::DevicePlatform(std::unique_ptr<LinuxPlatform> platform)
 std::variant<std::unique_ptr<DevicePlatform>, ProgramError> DevicePlatform::make(
     LinuxPlatformOptions options) {
   if (options.bundleResourcesDirectory.empty()) {
-    options.bundleResourcesDirectory = resourcesOfBundle(bundleBesideProgram()).string();
+    options.bundleResourcesDirectory = resourcesOfBundle(bundleOfProgram()).string();
   }
   LinuxPlatformError error;
   std::unique_ptr<LinuxPlatform> platform = LinuxPlatform::create(options, error);

@@ -15,7 +15,7 @@ namespace accounts {
 class DevicePlatform {
  public:
   /// On the device of the options' root. Options without a directory of resources have that of the
-  /// bundle beside the program. An error when the root, the device description or the resources are
+  /// bundle of the program. An error when the root, the device description or the resources are
   /// missing or unreadable.
   static std::variant<std::unique_ptr<DevicePlatform>, ProgramError> make(
       LinuxPlatformOptions options);

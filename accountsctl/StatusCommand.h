@@ -15,7 +15,7 @@ struct StatusOptions {
   std::optional<std::string> home;
   /// The device description; none for the root's own.
   std::optional<std::string> device;
-  /// The plug-in's bundle; none for the one beside the program.
+  /// The plug-in's bundle; none for that of the program.
   std::optional<std::string> bundle;
   bool reportsJSON = false;
   bool failsIfPending = false;

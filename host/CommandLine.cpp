@@ -30,7 +30,7 @@ void addDeviceOptions(CLI::App& command, DeviceOptions& options) {
   addPath(command, "--device", options.deviceDescription, "FILE",
           "The device description (default: the root's /etc/device.plist, if there is one)");
   addPath(command, "--plugin", options.plugin, "BUNDLE",
-          "The plug-in bundle (default: accounts.migrator beside the program)");
+          "The plug-in bundle (default: that of the program)");
   addPath(command, "--temporary-directory", options.temporaryDirectory, "DIR",
           "Where temporary files go, a device path (default: tmp in the home directory)")
       ->check(requireDevicePath);

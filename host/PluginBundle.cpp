@@ -26,7 +26,7 @@ std::variant<PluginBundle, ProgramError> PluginBundle::find(
     const std::optional<std::filesystem::path>& path) {
   // Absolute, because dlopen would search its own directories for a bare file name.
   std::error_code error;
-  PluginBundle bundle(std::filesystem::absolute(path.value_or(bundleBesideProgram()), error));
+  PluginBundle bundle(std::filesystem::absolute(path ? *path : bundleOfProgram(), error));
   if (!std::filesystem::is_directory(bundle.path_, error)) {
     return missing("No bundle at " + bundle.path_.string());
   }

@@ -15,7 +15,7 @@ namespace accounts {
 /// A plug-in bundle: a directory with the plug-in and its resources.
 class PluginBundle {
  public:
-  /// The bundle at a path, or the one beside the running program. Nothing is loaded yet. An error
+  /// The bundle at a path, or that of the running program. Nothing is loaded yet. An error
   /// when there is no such directory or no plug-in in it.
   static std::variant<PluginBundle, ProgramError> find(
       const std::optional<std::filesystem::path>& path);

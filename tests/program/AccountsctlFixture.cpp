@@ -9,6 +9,7 @@
 
 #include "propertylist/BinaryPropertyList.h"
 #include "propertylist/PropertyListFile.h"
+#include "tests/program/Programs.h"
 
 namespace accounts {
 namespace {
@@ -64,12 +65,13 @@ std::vector<std::string> AccountsctlFixture::files() const {
 }
 
 ProgramResult AccountsctlFixture::run(const std::vector<std::string>& arguments) {
-  return runProgram({.program = ACCOUNTSCTL, .arguments = arguments, .environment = kEnvironment});
+  return runProgram(
+      {.program = accountsctl(), .arguments = arguments, .environment = kEnvironment});
 }
 
 ProgramResult AccountsctlFixture::runRedirected(const std::vector<std::string>& arguments,
                                                 const std::string& redirection) {
-  std::vector<std::string> all = {"-c", "exec \"$0\" \"$@\" " + redirection, ACCOUNTSCTL};
+  std::vector<std::string> all = {"-c", "exec \"$0\" \"$@\" " + redirection, accountsctl()};
   all.insert(all.end(), arguments.begin(), arguments.end());
   return runProgram({.program = "/bin/sh", .arguments = all, .environment = kEnvironment});
 }

@@ -4,6 +4,7 @@
 #include <filesystem>
 
 #include "tests/program/AccountsctlFixture.h"
+#include "tests/program/Programs.h"
 
 namespace accounts {
 namespace {
@@ -85,7 +86,7 @@ TEST_F(AccountsctlMisuse, AFileThatMayNotBeReadIsMissingInput) {
   const std::string file = writeText("file", "x");
   ASSERT_EQ(chmod(file.c_str(), 0), 0);
   std::filesystem::permissions(path(""), std::filesystem::perms(0755));
-  ProgramCall call{.program = ACCOUNTSCTL, .arguments = {"show", file}};
+  ProgramCall call{.program = accountsctl(), .arguments = {"show", file}};
   if (getuid() == 0) {
     // Root may read every file.
     constexpr uid_t kSomeUser = 54321;
@@ -122,9 +123,10 @@ TEST_F(AccountsctlMisuse, AResultThatCannotBeWrittenIsAnError) {
 TEST_F(AccountsctlMisuse, AReaderThatGoesAwayEndsTheProgramWithoutASignal) {
   const std::string file = write("file", PropertyDictionary{{"text", std::string(300'000, 'x')}});
 
-  const ProgramResult result = runProgram(
-      {.program = "/bin/sh",
-       .arguments = {"-c", "{ \"$0\" show \"$1\"; echo $? >&2; } | head -n 1", ACCOUNTSCTL, file}});
+  const ProgramResult result =
+      runProgram({.program = "/bin/sh",
+                  .arguments = {"-c", "{ \"$0\" show \"$1\"; echo $? >&2; } | head -n 1",
+                                accountsctl(), file}});
 
   EXPECT_TRUE(result.hasErrorLine("74")) << result.errors;
 }

@@ -5,6 +5,7 @@
 
 #include "tests/program/AccountsctlFixture.h"
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/Programs.h"
 
 namespace accounts {
 namespace {
@@ -17,7 +18,7 @@ class AccountsctlStatus : public DeviceRootFixture {
     std::vector<std::string> all = {"status", "--root", root()};
     all.insert(all.end(), arguments.begin(), arguments.end());
     return runProgram(
-        {.program = ACCOUNTSCTL, .arguments = all, .environment = {{"COLUMNS", "200"}}});
+        {.program = accountsctl(), .arguments = all, .environment = {{"COLUMNS", "200"}}});
   }
   /// The object that tells of the device, which must be pending or not.
   [[nodiscard]] nlohmann::json statusObject(bool isPending) const {
@@ -148,10 +149,10 @@ TEST_F(AccountsctlStatus, AnotherHomeIsLookedAtOnRequest) {
 }
 
 TEST_F(AccountsctlStatus, WithoutARootOrWithAMissingOneItIsRefused) {
-  expectRefused(runProgram({.program = ACCOUNTSCTL, .arguments = {"status"}}), kUnusableArguments,
+  expectRefused(runProgram({.program = accountsctl(), .arguments = {"status"}}), kUnusableArguments,
                 "--root");
   expectRefused(
-      runProgram({.program = ACCOUNTSCTL, .arguments = {"status", "--root", root() + "/none"}}),
+      runProgram({.program = accountsctl(), .arguments = {"status", "--root", root() + "/none"}}),
       kMissingInput, "none");
   expectRefused(status({"--home", "relative"}), kUnusableArguments, "--home");
 }

@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/Programs.h"
 
 namespace accounts {
 namespace {
@@ -8,7 +9,7 @@ namespace {
 constexpr int kUnusableArguments = 64;
 
 ProgramResult runHost(const std::vector<std::string>& arguments) {
-  return runProgram({.program = MIGRATION_HOST, .arguments = arguments});
+  return runProgram({.program = migrationHost(), .arguments = arguments});
 }
 
 /// The arguments are refused with one clear line that names what is wrong, and nothing else.

@@ -15,6 +15,7 @@
 #include "tests/program/AttributedLog.h"
 #include "tests/program/InterruptedDevice.h"
 #include "tests/program/ListedLocks.h"
+#include "tests/program/Programs.h"
 #include "tests/program/Sanitizers.h"
 #include "tests/program/TracedProgram.h"
 
@@ -122,7 +123,7 @@ class Concurrency : public InterruptedDevice {
     std::ofstream(observed).close();
     const pid_t observer = startProgram(
         {.program = OBSERVE_PROGRAM,
-         .arguments = {"--root", root(), "--bundle", PLUGIN_BUNDLE, "--times", "1000000"},
+         .arguments = {"--root", root(), "--bundle", pluginBundle(), "--times", "1000000"},
          .outputFile = observed},
         STDERR_FILENO, STDERR_FILENO);
     round();
@@ -205,7 +206,7 @@ class StoppedMigration : public InterruptedDevice {
         onThisMachine("/etc/observed").string() + std::to_string(waiting_.size());
     std::ofstream(output).close();
     waiting_[startProgram({.program = OBSERVE_PROGRAM,
-                           .arguments = {"--root", root(), "--bundle", PLUGIN_BUNDLE},
+                           .arguments = {"--root", root(), "--bundle", pluginBundle()},
                            .outputFile = output},
                           STDERR_FILENO, STDERR_FILENO)] = output;
     const auto deadline = std::chrono::steady_clock::now() + kTimeLimit;

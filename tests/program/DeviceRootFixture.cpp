@@ -8,6 +8,7 @@
 
 #include "propertylist/BinaryPropertyList.h"
 #include "propertylist/PropertyListFile.h"
+#include "tests/program/Programs.h"
 
 namespace accounts {
 namespace {
@@ -118,7 +119,7 @@ std::vector<std::string> DeviceRootFixture::files() const {
 }
 
 ProgramCall DeviceRootFixture::migrationCall(const std::vector<std::string>& arguments) const {
-  ProgramCall call{.program = MIGRATION_HOST, .arguments = {"run", "--root", root()}};
+  ProgramCall call{.program = migrationHost(), .arguments = {"run", "--root", root()}};
   call.arguments.insert(call.arguments.end(), arguments.begin(), arguments.end());
   return call;
 }

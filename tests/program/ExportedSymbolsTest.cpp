@@ -5,6 +5,7 @@
 #include <set>
 #include <sstream>
 
+#include "tests/program/Programs.h"
 #include "tests/program/RunProgram.h"
 
 namespace accounts {
@@ -28,7 +29,7 @@ std::set<std::string> listedSymbols() {
 std::set<std::string> exportedSymbols() {
   const ProgramResult result = runProgram(
       {.program = "nm",
-       .arguments = {"-D", "--defined-only", "-j", PLUGIN_BUNDLE "/AccountsDataMigrator.so"}});
+       .arguments = {"-D", "--defined-only", "-j", pluginBundle() + "/AccountsDataMigrator.so"}});
   EXPECT_EQ(result.exitStatus, 0) << result.errors;
   const std::vector<std::string> lines = result.outputLines();
   return {lines.begin(), lines.end()};

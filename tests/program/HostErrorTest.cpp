@@ -1,4 +1,5 @@
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/Programs.h"
 
 namespace accounts {
 namespace {
@@ -34,7 +35,7 @@ TEST_F(HostError, AMissingRootIsNamed) {
   const std::string missing = onThisMachine("/missing").string();
 
   const ProgramResult result =
-      runProgram({.program = MIGRATION_HOST, .arguments = {"run", "--root", missing}});
+      runProgram({.program = migrationHost(), .arguments = {"run", "--root", missing}});
 
   EXPECT_EQ(result.exitStatus, kMissingInput);
   ASSERT_EQ(result.errorLines().size(), 1U) << result.errors;
@@ -45,7 +46,7 @@ TEST_F(HostError, ARootThatIsAFileIsNoRoot) {
   const std::string file = onThisMachine(kSettingsPath).string();
 
   const ProgramResult result =
-      runProgram({.program = MIGRATION_HOST, .arguments = {"run", "--root", file}});
+      runProgram({.program = migrationHost(), .arguments = {"run", "--root", file}});
 
   EXPECT_EQ(result.exitStatus, kMissingInput);
   EXPECT_EQ(result.errorLines().size(), 1U) << result.errors;
@@ -55,7 +56,7 @@ TEST_F(HostError, AMissingRootIsReportedAsAnObjectToo) {
   const std::string missing = onThisMachine("/missing").string();
 
   const ProgramResult result =
-      runProgram({.program = MIGRATION_HOST, .arguments = {"run", "--root", missing, "--json"}});
+      runProgram({.program = migrationHost(), .arguments = {"run", "--root", missing, "--json"}});
 
   const nlohmann::json object = onlyObject(result);
   EXPECT_EQ(object["root"], missing);

@@ -1,6 +1,7 @@
 #include <filesystem>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/Programs.h"
 
 namespace accounts {
 namespace {
@@ -85,7 +86,7 @@ TEST_F(HostReport, TheRootIsReportedAsItWasNamed) {
       parent.string() + "/./" + onThisMachine("/").parent_path().filename().string();
 
   const ProgramResult result =
-      runProgram({.program = MIGRATION_HOST, .arguments = {"run", "--json", "--root", named}});
+      runProgram({.program = migrationHost(), .arguments = {"run", "--json", "--root", named}});
 
   EXPECT_EQ(onlyObject(result)["root"], named);
 }

@@ -1,6 +1,7 @@
 #include <filesystem>
 
 #include "tests/program/HostileRootFixture.h"
+#include "tests/program/Programs.h"
 
 // A program that loads the frameworks of an untrusted device: what it loads is the device's own
 // file or nothing.
@@ -32,7 +33,7 @@ class HostileFramework : public HostileRootFixture,
   /// Whether the notifier of the framework was told of the account.
   [[nodiscard]] bool isNotified() const {
     ProgramCall call = {.program = NOTIFY_PROGRAM,
-                        .arguments = {"--root", root(), "--bundle", PLUGIN_BUNDLE}};
+                        .arguments = {"--root", root(), "--bundle", pluginBundle()}};
     if (GetParam().toOtherUsersOnly) {
       call.user = kSomebody;
     }

@@ -2,6 +2,7 @@
 #include <filesystem>
 
 #include "tests/program/HostileRootFixture.h"
+#include "tests/program/Programs.h"
 
 // Names and texts with line breaks and control characters: a log of one line for each thing that
 // happened must stay one, and a terminal must not be told to do anything.
@@ -18,7 +19,7 @@ class HostileNames : public HostileRootFixture {
 
   [[nodiscard]] static ProgramResult migrateRoot(const std::string& path) {
     return runProgram(
-        {.program = MIGRATION_HOST, .arguments = {"run", "--root", path, "--json", "--bare"}});
+        {.program = migrationHost(), .arguments = {"run", "--root", path, "--json", "--bare"}});
   }
 };
 

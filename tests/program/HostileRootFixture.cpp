@@ -1,4 +1,5 @@
 #include "tests/program/HostileRootFixture.h"
+#include "tests/program/Programs.h"
 
 #include <sys/stat.h>
 #include <unistd.h>
@@ -58,9 +59,9 @@ void HostileRootFixture::put(const HostileKind& kind, const char* devicePath) {
   const fs::path place = onThisMachine(devicePath);
   if (kind.toOtherUsersOnly) {
     const ProgramResult result =
-        runProgram({.program = MIGRATION_HOST, .arguments = {"--version"}, .user = kSomebody});
+        runProgram({.program = migrationHost(), .arguments = {"--version"}, .user = kSomebody});
     if (getuid() != 0 || result.exitStatus != 0) {
-      GTEST_SKIP() << "The test cannot run " << MIGRATION_HOST << " as another user.";
+      GTEST_SKIP() << "The test cannot run " << migrationHost() << " as another user.";
     }
     giveTo(kSomebody);
   }

@@ -1,6 +1,7 @@
 #include <algorithm>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/Programs.h"
 
 // A store opened outside a migration, by the example program, on a device that holds the example
 // frameworks: the lines on standard output are those of the frameworks' notifiers.
@@ -17,7 +18,7 @@ class NotificationsTest : public DeviceRootFixture {
   }
   [[nodiscard]] ProgramResult runNotify() const {
     return runProgram(
-        {.program = NOTIFY_PROGRAM, .arguments = {"--root", root(), "--bundle", PLUGIN_BUNDLE}});
+        {.program = NOTIFY_PROGRAM, .arguments = {"--root", root(), "--bundle", pluginBundle()}});
   }
   void writeAccounts(PropertyArray accounts) const {
     write(kSettingsPath, accountSettings(12, std::move(accounts)));

@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/Programs.h"
 
 namespace accounts {
 namespace {
@@ -70,7 +71,7 @@ TEST_F(PluginEnd, WhatThePluginPrintsStaysOutOfStandardOutput) {
 
 TEST_F(PluginEnd, AFatalAssertionOfThePluginIsReportedAfterItsMessage) {
   // The plug-in cannot go on without the account types that its resources list.
-  std::filesystem::copy(PLUGIN_BUNDLE, onThisMachine("/bundle.migrator"),
+  std::filesystem::copy(pluginBundle(), onThisMachine("/bundle.migrator"),
                         std::filesystem::copy_options::recursive);
   std::filesystem::remove(onThisMachine("/bundle.migrator/Resources/AccountTypesProperties.plist"));
   write(kSettingsPath, accountSettings(11, {PropertyDictionary{{"Type", "CalDAV"}}}));

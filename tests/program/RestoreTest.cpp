@@ -1,5 +1,6 @@
 #include <filesystem>
 
+#include "tests/program/Programs.h"
 #include "tests/program/SafetyNetFixture.h"
 
 namespace accounts {
@@ -85,7 +86,7 @@ TEST_F(Restore, RefusesAFolderThatIsALink) {
 
 TEST_F(Restore, RefusesARootThatIsNotThere) {
   const ProgramResult result = runProgram(
-      {.program = MIGRATION_HOST, .arguments = {"restore", "--root", root() + "missing"}});
+      {.program = migrationHost(), .arguments = {"restore", "--root", root() + "missing"}});
 
   EXPECT_EQ(result.exitStatus, 66);
   EXPECT_EQ(result.errorLines().size(), 1u) << result.errors;

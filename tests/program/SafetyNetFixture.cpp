@@ -1,4 +1,5 @@
 #include "tests/program/SafetyNetFixture.h"
+#include "tests/program/Programs.h"
 
 #include <algorithm>
 #include <filesystem>
@@ -19,7 +20,7 @@ ProgramResult SafetyNetFixture::migrateMisbehaving(const std::string& behaviour)
 
 ProgramResult SafetyNetFixture::restore(std::vector<std::string> arguments) const {
   arguments.insert(arguments.begin(), {"restore", "--root", root()});
-  return runProgram({.program = MIGRATION_HOST, .arguments = arguments});
+  return runProgram({.program = migrationHost(), .arguments = arguments});
 }
 
 std::vector<std::string> SafetyNetFixture::hostFolders() const {

@@ -5,6 +5,7 @@
 #include <fstream>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/Programs.h"
 
 namespace accounts {
 namespace {
@@ -20,9 +21,9 @@ class Unprivileged : public DeviceRootFixture {
       GTEST_SKIP() << "Only root can run the program as another user.";
     }
     const ProgramResult result =
-        runProgram({.program = MIGRATION_HOST, .arguments = {"--version"}, .user = kSomeUser});
+        runProgram({.program = migrationHost(), .arguments = {"--version"}, .user = kSomeUser});
     if (result.exitStatus != 0) {
-      GTEST_SKIP() << "Another user may not run " << MIGRATION_HOST;
+      GTEST_SKIP() << "Another user may not run " << migrationHost();
     }
     write(kSettingsPath, accountSettings(11));
     std::filesystem::permissions(onThisMachine("/"), std::filesystem::perms(0755));

@@ -1,4 +1,4 @@
-#include "examples/frameworks/ExampleAccounts.h"
+#include "../ExampleAccounts.h"
 
 // The smallest framework: one class of each kind, for the cloud accounts. The device-local
 // account's class is the system's own; this framework is only where the account-creation map says

@@ -1,4 +1,4 @@
-#include "examples/frameworks/ExampleAccounts.h"
+#include "../ExampleAccounts.h"
 
 // The framework of calendars, contacts and bookmarks. Its notifier answers the required operation
 // alone.

@@ -1,4 +1,4 @@
-#include "examples/frameworks/ExampleAccounts.h"
+#include "../ExampleAccounts.h"
 
 // The framework of the mail account types. Its notifier answers the optional operations too.
 void RegisterClasses(accounts::ClassRegistry& registry) {

@@ -1,0 +1,82 @@
+# What is installed, by `cmake --install` and in the Debian packages: the programs with all that they
+# need beside them, and what the author of a framework needs to compile against.
+include(CMakePackageConfigHelpers)
+include(GNUInstallDirs)
+
+set(programs_component accounts-migration)
+set(development_component accounts-migration-dev)
+
+# The programs look for the bundle here (commandline/BundleLocation).
+set(library_directory lib/accounts)
+
+install(TARGETS migration-host accountsctl
+  RUNTIME DESTINATION bin COMPONENT ${programs_component})
+install(TARGETS AccountsDataMigrator
+  LIBRARY DESTINATION ${library_directory}/accounts.migrator COMPONENT ${programs_component})
+install(DIRECTORY ${PROJECT_SOURCE_DIR}/resources/
+  DESTINATION ${library_directory}/accounts.migrator/Resources COMPONENT ${programs_component})
+install(FILES ${PROJECT_SOURCE_DIR}/README.md ${PROJECT_SOURCE_DIR}/CHANGELOG.md
+  DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration COMPONENT ${programs_component})
+install(DIRECTORY ${PROJECT_SOURCE_DIR}/docs
+  DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration COMPONENT ${programs_component}
+  FILES_MATCHING PATTERN "*.md")
+
+set(package_directory lib/cmake/AccountsFramework)
+install(TARGETS propertyvalue accountsframework EXPORT AccountsFrameworkTargets
+  ARCHIVE DESTINATION ${library_directory} COMPONENT ${development_component})
+install(EXPORT AccountsFrameworkTargets NAMESPACE accounts::
+  DESTINATION ${package_directory} COMPONENT ${development_component})
+foreach(header
+    platform/AccountFramework.h
+    propertylist/Description.h
+    propertylist/PropertyValue.h
+    propertylist/SharedNode.h
+    propertylist/Text.h)
+  cmake_path(GET header PARENT_PATH folder)
+  install(FILES ${PROJECT_SOURCE_DIR}/${header}
+    DESTINATION include/accounts/${folder} COMPONENT ${development_component})
+endforeach()
+write_basic_package_version_file(${PROJECT_BINARY_DIR}/AccountsFrameworkConfigVersion.cmake
+  COMPATIBILITY SameMinorVersion)
+install(FILES
+    ${CMAKE_CURRENT_LIST_DIR}/AccountsFrameworkConfig.cmake
+    ${CMAKE_CURRENT_LIST_DIR}/AccountsFrameworks.cmake
+    ${PROJECT_BINARY_DIR}/AccountsFrameworkConfigVersion.cmake
+  DESTINATION ${package_directory} COMPONENT ${development_component})
+install(DIRECTORY ${PROJECT_SOURCE_DIR}/examples/frameworks
+  DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration-dev/examples
+  COMPONENT ${development_component})
+
+# Two Debian packages, one a component.
+set(CPACK_GENERATOR DEB)
+set(CPACK_PACKAGE_CONTACT "Accounts Migration <accounts-migration@quarx.example>")
+set(CPACK_PACKAGE_DIRECTORY ${PROJECT_BINARY_DIR}/packages)
+set(CPACK_PACKAGING_INSTALL_PREFIX /usr)
+set(CPACK_STRIP_FILES ON)
+# Whatever the umask of whoever builds them.
+set(CPACK_INSTALL_DEFAULT_DIRECTORY_PERMISSIONS OWNER_READ OWNER_WRITE OWNER_EXECUTE
+  GROUP_READ GROUP_EXECUTE WORLD_READ WORLD_EXECUTE)
+set(CPACK_COMPONENTS_ALL ${programs_component} ${development_component})
+set(CPACK_COMPONENTS_GROUPING IGNORE)
+set(CPACK_DEB_COMPONENT_INSTALL ON)
+set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
+set(CPACK_DEBIAN_ACCOUNTS-MIGRATION_PACKAGE_NAME accounts-migration)
+set(CPACK_DEBIAN_ACCOUNTS-MIGRATION_PACKAGE_SECTION admin)
+set(CPACK_DEBIAN_ACCOUNTS-MIGRATION_PACKAGE_SHLIBDEPS ON)
+# Loaded only when the journal or D-Bus is asked for.
+set(CPACK_DEBIAN_ACCOUNTS-MIGRATION_PACKAGE_SUGGESTS "libsystemd0, parallel")
+set(CPACK_COMPONENT_ACCOUNTS-MIGRATION_DESCRIPTION
+  "Migration of the account settings of mobile devices
+Brings the account settings of a device, or of an image of one, up to the
+current layout after its operating system was updated or restored:
+migration-host runs the migration, accountsctl shows, compares and checks
+files.")
+set(CPACK_DEBIAN_ACCOUNTS-MIGRATION-DEV_PACKAGE_NAME accounts-migration-dev)
+set(CPACK_DEBIAN_ACCOUNTS-MIGRATION-DEV_PACKAGE_SECTION libdevel)
+set(CPACK_DEBIAN_ACCOUNTS-MIGRATION-DEV_PACKAGE_SUGGESTS "accounts-migration, cmake")
+set(CPACK_COMPONENT_ACCOUNTS-MIGRATION-DEV_DESCRIPTION
+  "Development files for frameworks of accounts
+The headers, the library of values and the CMake package that a framework of
+full accounts, sync accounts and notifiers is compiled against, and examples
+of such frameworks.")
+include(CPack)
