@@ -96,7 +96,7 @@ void writeChannelLine(LogChannel& channel, std::string_view operation, std::uint
   line += '"';
   appendFormatted(line, format, arguments);
   line += '"';
-  channel.writeLine(line);
+  channel.write({.text = line, .operation = operation, .sourceLine = sourceLine});
 }
 
 void logToChannel(std::string_view operation, std::string_view message,

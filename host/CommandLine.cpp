@@ -35,7 +35,8 @@ void addDeviceOptions(CLI::App& command, DeviceOptions& options) {
           "Where temporary files go, a device path (default: tmp in the home directory)")
       ->check(requireDevicePath);
   addPath(command, "--channel", options.channel, "FILE",
-          "Append the log channel to FILE, - for standard error (default: off)");
+          "Append the log channel to FILE, - for standard error, journal for the system's journal "
+          "(default: off)");
 }
 
 void addReports(CLI::App& command, Arguments& arguments) {

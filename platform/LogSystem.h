@@ -1,8 +1,19 @@
 #pragma once
 
+#include <cstdint>
 #include <string_view>
 
 namespace accounts {
+
+/// One line for a log channel, and what of it a structured log keeps apart.
+struct LogLine {
+  /// The whole line, without its line end.
+  std::string_view text = {};
+  /// The full name of the operation that logs; the line begins with it.
+  std::string_view operation = {};
+  /// The line of the source that logs.
+  std::uint32_t sourceLine = 0;
+};
 
 /// One log channel of the system, named by a subsystem and a category.
 class LogChannel {
@@ -11,8 +22,8 @@ class LogChannel {
 
   /// Whether lines of the default level are wanted. May be called from any thread.
   [[nodiscard]] virtual bool isEnabled() const = 0;
-  /// Writes one line, without its line end, at the default level. May be called from any thread.
-  virtual void writeLine(std::string_view line) = 0;
+  /// Writes one line at the default level. May be called from any thread.
+  virtual void write(const LogLine& line) = 0;
 };
 
 /// The system's structured log.

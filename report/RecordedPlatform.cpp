@@ -92,9 +92,9 @@ class RecordedLogChannel final : public LogChannel {
       : channel_(channel), recorder_(recorder) {}
 
   [[nodiscard]] bool isEnabled() const override { return channel_.isEnabled(); }
-  void writeLine(std::string_view line) override {
-    channel_.writeLine(line);
-    recorder_.recordLogLine(LogKind::Channel, line);
+  void write(const LogLine& line) override {
+    channel_.write(line);
+    recorder_.recordLogLine(LogKind::Channel, line.text);
   }
 
  private:

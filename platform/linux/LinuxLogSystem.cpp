@@ -23,7 +23,7 @@ class LinuxLogSystem::Channel final : public LogChannel {
   Channel(LinuxLogSystem& log, std::string prefix) : log_(log), prefix_(std::move(prefix)) {}
 
   [[nodiscard]] bool isEnabled() const override { return log_.output_.has_value(); }
-  void writeLine(std::string_view line) override { log_.writeLine(prefix_, line); }
+  void write(const LogLine& line) override { log_.writeLine(prefix_, line.text); }
 
  private:
   LinuxLogSystem& log_;

@@ -33,6 +33,7 @@ namespace {
 using Kind = LinuxPlatformError::Kind;
 
 constexpr std::string_view kTemporaryDirectoryInHome = "tmp";
+constexpr std::string_view kJournal = "journal";
 
 bool fail(LinuxPlatformError& error, Kind kind, std::string text) {
   error = {kind, std::move(text)};
@@ -59,12 +60,24 @@ bool checkResources(const std::string& directory, LinuxPlatformError& error) {
   return true;
 }
 
+/// Null, with `error` set, when the channel cannot be opened.
+std::unique_ptr<LogSystem> makeLogSystem(const LinuxPlatformOptions& options, PathError& error) {
+  if (!options.channel) {
+    return std::make_unique<LinuxLogSystem>();
+  }
+  if (*options.channel == kJournal) {
+    return JournalLogSystem::connect(options.journalSocket, error);
+  }
+  std::optional<FileDescriptor> output = openLogOutput(*options.channel, error);
+  return output ? std::make_unique<LinuxLogSystem>(std::move(output)) : nullptr;
+}
+
 }  // namespace
 
 // Declared in the order in which they need each other.
 struct LinuxPlatform::Parts {
   Parts(const LinuxPlatformOptions& options, DeviceRoot openedRoot, DeviceDescription read,
-        std::optional<FileDescriptor> logOutput)
+        std::unique_ptr<LogSystem> madeLogSystem)
       : root(std::move(openedRoot)),
         description(std::move(read)),
         fileSystem(root, options.temporaryDirectory.value_or(
@@ -77,7 +90,7 @@ struct LinuxPlatform::Parts {
         sharedResources(root),
         bundleResources(options.bundleResourcesDirectory),
         localizedStrings(options.bundleResourcesDirectory, userLanguages(::getenv)),
-        logSystem(std::move(logOutput)),
+        logSystem(std::move(madeLogSystem)),
         cloudAccountService(description),
         deviceInfoService(description),
         externalSyncSources(description),
@@ -96,7 +109,7 @@ struct LinuxPlatform::Parts {
   LinuxBundleResources bundleResources;
   LinuxLocalizedStrings localizedStrings;
   LinuxConsoleLog consoleLog;
-  LinuxLogSystem logSystem;
+  const std::unique_ptr<LogSystem> logSystem;
   LinuxDateFormatter dateFormatter;
   LinuxUUIDGenerator uuidGenerator;
   DescribedCloudAccountService cloudAccountService;
@@ -117,7 +130,7 @@ struct LinuxPlatform::Parts {
                        .frameworkLoader = frameworkLoader,
                        .homeDirectory = homeDirectory,
                        .localizedStrings = localizedStrings,
-                       .logSystem = logSystem,
+                       .logSystem = *logSystem,
                        .mailDirectory = mailDirectory,
                        .pairingValueStore = pairingValueStore,
                        .preferenceDomain = preferenceDomain,
@@ -149,16 +162,13 @@ std::unique_ptr<LinuxPlatform> LinuxPlatform::create(const LinuxPlatformOptions&
     fail(error, Kind::MissingInput, failure.text);
     return nullptr;
   }
-  std::optional<FileDescriptor> logOutput;
-  if (options.channel) {
-    logOutput = openLogOutput(*options.channel, failure);
-    if (!logOutput) {
-      fail(error, Kind::CannotCreate, failure.text);
-      return nullptr;
-    }
+  std::unique_ptr<LogSystem> logSystem = makeLogSystem(options, failure);
+  if (logSystem == nullptr) {
+    fail(error, Kind::CannotCreate, failure.text);
+    return nullptr;
   }
   return std::unique_ptr<LinuxPlatform>(new LinuxPlatform(std::make_unique<Parts>(
-      options, std::move(*root), std::move(*description), std::move(logOutput))));
+      options, std::move(*root), std::move(*description), std::move(logSystem))));
 }
 
 LinuxPlatform::LinuxPlatform(std::unique_ptr<Parts> parts) : parts_(std::move(parts)) {}

@@ -7,6 +7,7 @@
 
 #include "platform/Platform.h"
 #include "platform/linux/DeviceRoot.h"
+#include "platform/linux/JournalLogSystem.h"
 #include "platform/linux/LinuxFileSystem.h"
 #include "platform/linux/LinuxPropertyLists.h"
 #include "platform/linux/RecordingCloudTabService.h"
@@ -27,9 +28,11 @@ struct LinuxPlatformOptions {
   std::string bundleResourcesDirectory;
   /// The device description; none for the device's own, if it has one.
   std::optional<std::string> deviceDescriptionFile;
-  /// The file that lines of log channels are appended to, "-" for standard error; none keeps them
-  /// off.
+  /// The file that lines of log channels are appended to, "-" for standard error, "journal" for the
+  /// system's journal; none keeps them off.
   std::optional<std::string> channel;
+  /// The socket of the system's journal.
+  std::string journalSocket = kJournalSocket;
 };
 
 /// What stands in the way of a platform.
@@ -39,7 +42,7 @@ struct LinuxPlatformError {
     UnusableOption,
     /// The root, the device description or the bundle's resources are missing or unreadable.
     MissingInput,
-    /// The channel's file cannot be created or written.
+    /// The channel cannot be opened.
     CannotCreate,
     /// The system lacks what the platform needs.
     InputOutput

@@ -134,7 +134,7 @@ class FakeLogSystem : public LogSystem {
     std::vector<std::string> lines;
 
     [[nodiscard]] bool isEnabled() const override { return enabled; }
-    void writeLine(std::string_view line) override { lines.emplace_back(line); }
+    void write(const LogLine& line) override { lines.emplace_back(line.text); }
     /// The lines with the source line's number replaced by "N".
     [[nodiscard]] std::vector<std::string> linesWithoutNumbers() const;
   };

@@ -122,8 +122,24 @@ TEST_F(LinuxPlatformTest, TheChannelIsOffUnlessAskedFor) {
   options.channel = (outside() / "channel.log").string();
   const auto on = create();
   ASSERT_TRUE(on);
-  on->platform().logSystem.makeChannel("one", "two").writeLine("line");
+  on->platform().logSystem.makeChannel("one", "two").write({.text = "line"});
   EXPECT_EQ(hostFileContents(outside() / "channel.log"), "[one:two] line\n");
+}
+
+TEST_F(LinuxPlatformTest, TheJournalIsAChannelThatMustBeThere) {
+  options.channel = "journal";
+  options.journalSocket = (outside() / "socket").string();
+  EXPECT_FALSE(create());
+  EXPECT_EQ(error.kind, Kind::CannotCreate);
+  EXPECT_FALSE(fs::exists("journal"));
+}
+
+TEST_F(LinuxPlatformTest, AFileCalledJournalIsNamedWithItsDirectory) {
+  options.channel = (outside() / "journal").string();
+  const auto made = create();
+  ASSERT_TRUE(made);
+  made->platform().logSystem.makeChannel("one", "two").write({.text = "line"});
+  EXPECT_EQ(hostFileContents(outside() / "journal"), "[one:two] line\n");
 }
 
 TEST_F(LinuxPlatformTest, WhatThePluginAnnouncesCanBeReadBack) {

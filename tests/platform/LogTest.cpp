@@ -77,8 +77,8 @@ TEST_F(LogSystemTest, EachLineBeginsWithTheChannelsSubsystemAndCategory) {
   LogChannel& channel = log.makeChannel("com.quarx.accountsettings", "log");
   LogChannel& other = log.makeChannel("other", "category");
   EXPECT_TRUE(channel.isEnabled());
-  channel.writeLine("-[Class operation] (7) \"Saving all accounts\"");
-  other.writeLine("line");
+  channel.write({"-[Class operation] (7) \"Saving all accounts\"", "-[Class operation]", 7});
+  other.write({.text = "line"});
   EXPECT_EQ(hostFileContents(path),
             "[com.quarx.accountsettings:log] -[Class operation] (7) \"Saving all accounts\"\n"
             "[other:category] line\n");
@@ -87,13 +87,13 @@ TEST_F(LogSystemTest, EachLineBeginsWithTheChannelsSubsystemAndCategory) {
 TEST_F(LogSystemTest, ALineIsOneWrite) {
   const PacketPipe pipe;
   LinuxLogSystem log(FileDescriptor(::dup(pipe.writingEnd())));
-  log.makeChannel("one", "two").writeLine("line");
+  log.makeChannel("one", "two").write({.text = "line"});
   EXPECT_EQ(pipe.nextWrite(), "[one:two] line\n");
 }
 
 TEST_F(LogSystemTest, LinesAreAppendedToAnExistingFile) {
   makeHostFile(path, "before\n");
-  LinuxLogSystem(open(path)).makeChannel("one", "two").writeLine("line");
+  LinuxLogSystem(open(path)).makeChannel("one", "two").write({.text = "line"});
   EXPECT_EQ(hostFileContents(path), "before\n[one:two] line\n");
 }
 
@@ -104,7 +104,7 @@ TEST_F(LogSystemTest, ANewFileIsForItsOwnerAlone) {
 
 TEST_F(LogSystemTest, AHyphenStandsForStandardError) {
   ::testing::internal::CaptureStderr();
-  LinuxLogSystem(open("-")).makeChannel("one", "two").writeLine("line");
+  LinuxLogSystem(open("-")).makeChannel("one", "two").write({.text = "line"});
   EXPECT_EQ(::testing::internal::GetCapturedStderr(), "[one:two] line\n");
 }
 
