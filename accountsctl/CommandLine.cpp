@@ -18,6 +18,23 @@ std::string requireForm(const std::string& value) {
   return value == kXMLForm || value == kBinaryForm ? "" : "must be xml or binary";
 }
 
+/// The lists of images that a summary can give in its place.
+constexpr std::pair<std::string_view, Remedy> kLists[] = {
+    {"retry", Remedy::Retry}, {"attention", Remedy::Attention}, {"migrated", Remedy::None}};
+
+std::optional<Remedy> listNamed(std::string_view name) {
+  for (const auto& [known, remedy] : kLists) {
+    if (known == name) {
+      return remedy;
+    }
+  }
+  return std::nullopt;
+}
+
+std::string requireList(const std::string& value) {
+  return listNamed(value) ? "" : "must be retry, attention or migrated";
+}
+
 /// What is said of two names of which only one may be standard input.
 std::optional<std::string> bothStandardInput(const DiffOptions& options) {
   return options.before == kStandardStream && options.after == kStandardStream
@@ -32,10 +49,12 @@ struct Arguments {
   CheckOptions check;
   StatusOptions status;
   ConvertOptions convert;
+  SummarizeOptions summarize;
   bool wantsJSON = false;
   bool wantsXML = false;
   bool showsSecrets = false;
   std::string form;
+  std::string list;
 
   [[nodiscard]] Secrets secrets() const { return showsSecrets ? Secrets::Show : Secrets::Hide; }
 };
@@ -151,6 +170,38 @@ Asked convertAsked(Arguments& arguments) {
   return arguments.convert;
 }
 
+void addSummarize(CLI::App& command, Arguments& arguments) {
+  SummarizeOptions& options = arguments.summarize;
+  command.add_option("FILE", options.files, "The results, - for standard input")
+      ->option_text("...")
+      ->required()
+      ->check(requireText);
+  command
+      .add_option_function<std::size_t>(
+          "--expected", [&options](std::size_t count) { options.expected = count; },
+          "How many images there are; those without a result are counted, too")
+      ->option_text("COUNT")
+      ->check(CLI::NonNegativeNumber);
+  CLI::Option* list =
+      command
+          .add_option("--list", arguments.list,
+                      "Write only the roots of the images to retry, that need attention, or that\n"
+                      "are migrated: WHICH is retry, attention or migrated")
+          ->option_text("WHICH")
+          ->check(requireList);
+  command
+      .add_flag("--null", options.endsWithNull,
+                "End each root of a list with a null character, as xargs -0 takes it")
+      ->needs(list);
+  addJSON(command, arguments)->excludes(list);
+}
+
+Asked summarizeAsked(Arguments& arguments) {
+  arguments.summarize.listed = listNamed(arguments.list);
+  arguments.summarize.reportsJSON = arguments.wantsJSON;
+  return arguments.summarize;
+}
+
 /// A subcommand: how its arguments are declared, and what they ask for once they are parsed.
 struct Subcommand {
   const char* name;
@@ -168,6 +219,8 @@ constexpr Subcommand kSubcommands[] = {
     {"status", help::kStatus, help::kStatusStatuses, help::kStatusExamples, addStatus, statusAsked},
     {"convert", help::kConvert, help::kConvertStatuses, help::kConvertExamples, addConvert,
      convertAsked},
+    {"summarize", help::kSummarize, help::kSummarizeStatuses, help::kSummarizeExamples,
+     addSummarize, summarizeAsked},
 };
 
 void addSubcommand(CLI::App& program, const Subcommand& subcommand, Arguments& arguments) {

@@ -9,6 +9,7 @@
 #include "accountsctl/DiffCommand.h"
 #include "accountsctl/ShowCommand.h"
 #include "accountsctl/StatusCommand.h"
+#include "accountsctl/SummarizeCommand.h"
 #include "commandline/ArgumentParsing.h"
 
 namespace accounts {
@@ -17,8 +18,8 @@ inline constexpr const char* kProgramName = "accountsctl";
 
 /// What the arguments ask for.
 struct CommandLine {
-  std::variant<ShowOptions, DiffOptions, CheckOptions, StatusOptions, ConvertOptions, RequestedText,
-               UnusableArguments>
+  std::variant<ShowOptions, DiffOptions, CheckOptions, StatusOptions, ConvertOptions,
+               SummarizeOptions, RequestedText, UnusableArguments>
       asked;
   /// The subcommand's name; none when the arguments name none.
   std::optional<std::string> subcommand;

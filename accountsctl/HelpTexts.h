@@ -4,7 +4,8 @@
 namespace accounts::help {
 
 inline constexpr const char* kProgram =
-    "Shows, compares, checks and converts the files of account migrations.";
+    "Shows, compares, checks and converts the files of account migrations, and counts their "
+    "results.";
 
 inline constexpr const char* kProgramExamples =
     "Examples:\n"
@@ -73,5 +74,19 @@ inline constexpr const char* kConvertExamples =
     "  accountsctl convert settings.plist settings.xml --to xml\n"
     "  accountsctl convert settings.plist - --to xml | less\n"
     "  accountsctl convert edited.xml settings.plist --to binary\n";
+
+inline constexpr const char* kSummarize =
+    "Count what runs of migration-host with --json on many images reported: by outcome, by step "
+    "and\n"
+    "by error, ROOT standing for an image's root. An image that was run several times counts with\n"
+    "its last result. While results come in, a terminal at standard error shows how many did.";
+inline constexpr const char* kSummarizeStatuses =
+    "  0   every image is migrated, or a list was asked for\n"
+    "  1   an image is not migrated or has no result, or a line is no result\n";
+inline constexpr const char* kSummarizeExamples =
+    "  accountsctl summarize results.jsonl\n"
+    "  accountsctl summarize results.jsonl --list retry > again.txt\n"
+    "  parallel migration-host run --json --root {} :::: roots.txt | tee results.jsonl |\n"
+    "    accountsctl summarize --expected 5000 -\n";
 
 }  // namespace accounts::help

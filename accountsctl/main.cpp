@@ -25,6 +25,9 @@ CommandResult runCommand(const StatusOptions& options) {
 CommandResult runCommand(const ConvertOptions& options) {
   return convert(options);
 }
+CommandResult runCommand(const SummarizeOptions& options) {
+  return summarize(options, standardOutputTerminal(::getenv));
+}
 CommandResult runCommand(const RequestedText& requested) {
   return CommandReport{requested.text};
 }

@@ -1,0 +1,175 @@
+#include "accountsctl/SummarizeCommand.h"
+
+#include <fmt/format.h>
+
+#include <cerrno>
+#include <cstring>
+#include <fstream>
+#include <iostream>
+
+#include "accountsctl/FleetSummary.h"
+#include "accountsctl/JSONText.h"
+#include "accountsctl/ProgressLine.h"
+#include "accountsctl/PropertyListInput.h"
+#include "accountsctl/TextTable.h"
+
+namespace accounts {
+namespace {
+
+/// People look for what is frequent; the JSON object has the others as well.
+constexpr std::size_t kShownErrors = 10;
+
+/// Reads every line of a stream; whether it came to its end.
+bool addLines(std::istream& stream, const SummarizeOptions& options, FleetSummary& summary,
+              ProgressLine& progress) {
+  for (std::string line; std::getline(stream, line);) {
+    summary.addLine(line);
+    if (progress.wantsText()) {
+      progress.show(progressText(summary, options.expected));
+    }
+  }
+  return !stream.bad();
+}
+
+std::optional<ProgramError> addFile(const std::string& file, const SummarizeOptions& options,
+                                    FleetSummary& summary, ProgressLine& progress) {
+  errno = 0;
+  bool isRead = false;
+  if (file == kStandardStream) {
+    isRead = addLines(std::cin, options, summary, progress);
+  } else {
+    std::ifstream stream(file, std::ios::binary);
+    isRead = stream.is_open() && addLines(stream, options, summary, progress);
+  }
+  if (isRead) {
+    return std::nullopt;
+  }
+  return ProgramError{ExitStatus::MissingInput,
+                      fmt::format("Cannot read {}: {}", file, std::strerror(errno))};
+}
+
+std::size_t missingCount(const SummarizeOptions& options, const FleetSummary& summary) {
+  const std::size_t expected = options.expected.value_or(0);
+  return expected > summary.imageCount() ? expected - summary.imageCount() : 0;
+}
+
+std::string listText(const std::vector<std::string>& roots, bool endsWithNull) {
+  std::string text;
+  for (const std::string& root : roots) {
+    text += root;
+    text += endsWithNull ? '\0' : '\n';
+  }
+  return text;
+}
+
+std::string outcomesText(const SummarizeOptions& options, const FleetSummary& summary,
+                         const Terminal& terminal) {
+  TextTable table({"Images", "Status", "Outcome"});
+  for (const auto& [exitStatus, count] : summary.exitStatuses()) {
+    table.addRow({std::to_string(count), std::to_string(exitStatus),
+                  std::string(outcomeOf(exitStatus).words)});
+  }
+  if (const std::size_t missing = missingCount(options, summary); missing > 0) {
+    table.addRow({std::to_string(missing), "", "no result yet"});
+  }
+  table.addRow({std::to_string(summary.imageCount()), "", "all results"});
+  return table.text(terminal);
+}
+
+std::string countsText(const char* heading, const Counts<std::string>& counts, std::size_t shown,
+                       const Terminal& terminal) {
+  if (counts.empty()) {
+    return "";
+  }
+  TextTable table({"Images", heading});
+  for (std::size_t row = 0; row < std::min(shown, counts.size()); ++row) {
+    table.addRow({std::to_string(counts[row].second), counts[row].first});
+  }
+  std::string text = "\n" + table.text(terminal);
+  if (counts.size() > shown) {
+    text += fmt::format("and {} others\n", counts.size() - shown);
+  }
+  return text;
+}
+
+std::string remarksText(const FleetSummary& summary) {
+  struct Remark {
+    std::size_t count;
+    const char* words;
+  };
+  const Remark remarks[] = {
+      {summary.warningCount(), "migrated with warnings"},
+      {summary.countOf(Remedy::Retry), "to run again: --list retry"},
+      {summary.countOf(Remedy::Attention),
+       "to look at before they are run again: --list attention"},
+      {summary.replacedCount(), "results replaced by later ones of the same image"},
+      {summary.unreadableLineCount(), "lines that are no results"},
+  };
+  std::string text;
+  for (const Remark& remark : remarks) {
+    if (remark.count > 0) {
+      text += fmt::format("{}{} {}\n", text.empty() ? "\n" : "", remark.count, remark.words);
+    }
+  }
+  return text;
+}
+
+JSON jsonOf(const Counts<std::string>& counts, const char* key) {
+  JSON list = JSON::array();
+  for (const auto& [text, count] : counts) {
+    list.push_back({{key, text}, {"images", count}});
+  }
+  return list;
+}
+
+std::string objectLine(const SummarizeOptions& options, const FleetSummary& summary,
+                       ExitStatus exitStatus) {
+  JSON outcomes = JSON::array();
+  for (const auto& [status, count] : summary.exitStatuses()) {
+    outcomes.push_back(
+        {{"exitStatus", status}, {"outcome", outcomeOf(status).name}, {"images", count}});
+  }
+  JSON object = reportObject("summarize");
+  object["images"] = summary.imageCount();
+  object["expected"] = options.expected ? JSON(*options.expected) : JSON(nullptr);
+  object["outcomes"] = std::move(outcomes);
+  object["steps"] = jsonOf(summary.steps(), "step");
+  object["errors"] = jsonOf(summary.errors(), "error");
+  object["migratedWithWarnings"] = summary.warningCount();
+  object["replacedResults"] = summary.replacedCount();
+  object["unreadableLines"] = summary.unreadableLineCount();
+  object["retry"] = summary.rootsWith(Remedy::Retry);
+  object["attention"] = summary.rootsWith(Remedy::Attention);
+  return lineOf(std::move(object), exitStatus);
+}
+
+}  // namespace
+
+CommandResult summarize(const SummarizeOptions& options, const Terminal& terminal) {
+  FleetSummary summary;
+  {
+    ProgressLine progress;
+    for (const std::string& file : options.files) {
+      if (std::optional<ProgramError> error = addFile(file, options, summary, progress)) {
+        return *std::move(error);
+      }
+    }
+  }
+  if (options.listed) {
+    return CommandReport{listText(summary.rootsWith(*options.listed), options.endsWithNull),
+                         ExitStatus::Success};
+  }
+  const bool isDone = summary.countOf(Remedy::None) == summary.imageCount() &&
+                      missingCount(options, summary) == 0 && summary.unreadableLineCount() == 0;
+  const ExitStatus exitStatus = isDone ? ExitStatus::Success : ExitStatus::Attention;
+  if (options.reportsJSON) {
+    return CommandReport{objectLine(options, summary, exitStatus), exitStatus};
+  }
+  return CommandReport{outcomesText(options, summary, terminal) +
+                           countsText("Step", summary.steps(), summary.steps().size(), terminal) +
+                           countsText("Error", summary.errors(), kShownErrors, terminal) +
+                           remarksText(summary),
+                       exitStatus};
+}
+
+}  // namespace accounts

@@ -1,0 +1,31 @@
+#pragma once
+
+#include <cstddef>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "accountsctl/CommandResult.h"
+#include "accountsctl/RunResult.h"
+#include "commandline/Terminal.h"
+
+namespace accounts {
+
+struct SummarizeOptions {
+  /// Files with the lines that runs wrote, "-" for standard input; not empty.
+  std::vector<std::string> files;
+  /// How many images there are; none if that is not known.
+  std::optional<std::size_t> expected;
+  /// Gives the roots of the images with this remedy in the place of the summary.
+  std::optional<Remedy> listed;
+  /// Whether listed roots end with a null character rather than with the line.
+  bool endsWithNull = false;
+  bool reportsJSON = false;
+};
+
+/// Counts what runs of migration-host on many images reported: by outcome, stage and error. While
+/// it reads, a terminal at standard error shows how far the fleet has come. The exit status of the
+/// report is ExitStatus::Attention unless every image is migrated; that of a list is success.
+CommandResult summarize(const SummarizeOptions& options, const Terminal& terminal);
+
+}  // namespace accounts

@@ -1,0 +1,112 @@
+#include "tests/program/AccountsctlFixture.h"
+#include "tests/program/Programs.h"
+
+namespace accounts {
+namespace {
+
+constexpr const char* kResults =
+    R"({"root":"/i/1","exitStatus":0,"steps":["7A149"],"warnings":["Kept"]})"
+    "\n"
+    R"({"root":"/i/2","exitStatus":75,"error":"No space left on device"})"
+    "\n"
+    R"({"root":"/i/3","exitStatus":66,"error":"Cannot open /i/3: Missing"})"
+    "\n";
+
+/// The real `accountsctl summarize`.
+class AccountsctlSummarize : public AccountsctlFixture {
+ protected:
+  [[nodiscard]] std::string results() const { return writeText("results.jsonl", kResults); }
+};
+
+TEST_F(AccountsctlSummarize, ShowsCountsByOutcomeStepAndError) {
+  const ProgramResult result = run({"summarize", results(), "--expected", "5"});
+
+  EXPECT_EQ(result.exitStatus, kAttention);
+  EXPECT_EQ(result.errors, "");
+  EXPECT_EQ(result.output,
+            "Images  Status  Outcome\n"
+            "1       0       migrated\n"
+            "1       66      no such root, description or bundle\n"
+            "1       75      something that may pass\n"
+            "2               no result yet\n"
+            "3               all results\n"
+            "\n"
+            "Images  Step\n"
+            "1       7A149\n"
+            "\n"
+            "Images  Error\n"
+            "1       Cannot open ROOT: Missing\n"
+            "1       No space left on device\n"
+            "\n"
+            "1 migrated with warnings\n"
+            "1 to run again: --list retry\n"
+            "1 to look at before they are run again: --list attention\n");
+}
+
+TEST_F(AccountsctlSummarize, WritesOneJSONObject) {
+  const nlohmann::json object = onlyObject(run({"summarize", results(), "--json"}));
+
+  EXPECT_EQ(object["command"], "summarize");
+  EXPECT_EQ(object["images"], 3);
+  EXPECT_EQ(object["expected"], nullptr);
+  EXPECT_EQ(object["outcomes"][0],
+            (nlohmann::json{{"exitStatus", 0}, {"outcome", "migrated"}, {"images", 1}}));
+  EXPECT_EQ(object["steps"][0], (nlohmann::json{{"step", "7A149"}, {"images", 1}}));
+  EXPECT_EQ(object["errors"][0],
+            (nlohmann::json{{"error", "Cannot open ROOT: Missing"}, {"images", 1}}));
+  EXPECT_EQ(object["retry"], nlohmann::json::array({"/i/2"}));
+  EXPECT_EQ(object["attention"], nlohmann::json::array({"/i/3"}));
+  EXPECT_EQ(object["exitStatus"], kAttention);
+}
+
+TEST_F(AccountsctlSummarize, AFleetThatIsMigratedIsASuccess) {
+  const std::string file = writeText("results.jsonl", R"({"root":"/a","exitStatus":0})");
+  EXPECT_EQ(run({"summarize", file}).exitStatus, 0);
+  EXPECT_EQ(run({"summarize", file, "--expected", "1"}).exitStatus, 0);
+  EXPECT_EQ(run({"summarize", file, "--expected", "2"}).exitStatus, kAttention);
+}
+
+TEST_F(AccountsctlSummarize, ListsRootsForTheNextRun) {
+  EXPECT_EQ(run({"summarize", results(), "--list", "retry"}).output, "/i/2\n");
+  EXPECT_EQ(run({"summarize", results(), "--list", "attention"}).output, "/i/3\n");
+  EXPECT_EQ(run({"summarize", results(), "--list", "migrated", "--null"}).output,
+            std::string("/i/1\0", 5));
+  EXPECT_EQ(run({"summarize", results(), "--list", "retry"}).exitStatus, 0);
+}
+
+TEST_F(AccountsctlSummarize, ReadsSeveralFilesAndStandardInput) {
+  const std::string later = writeText("later.jsonl", R"({"root":"/i/2","exitStatus":0})");
+  const nlohmann::json object =
+      onlyObject(runRedirected({"summarize", results(), "-", "--json"}, "< " + later));
+  EXPECT_EQ(object["replacedResults"], 1);
+  EXPECT_EQ(object["retry"], nlohmann::json::array());
+}
+
+TEST_F(AccountsctlSummarize, AMissingFileIsMissingInput) {
+  expectRefused(run({"summarize", path("none")}), kMissingInput, "No such file");
+  expectRefused(run({"summarize", path("")}), kMissingInput, "Is a directory");
+}
+
+TEST_F(AccountsctlSummarize, UnusableArgumentsAreRefused) {
+  expectRefused(run({"summarize"}), kUnusableArguments, "FILE");
+  expectRefused(run({"summarize", "a", "--list", "all"}), kUnusableArguments,
+                "must be retry, attention or migrated");
+  expectRefused(run({"summarize", "a", "--null"}), kUnusableArguments, "--list");
+  expectRefused(run({"summarize", "a", "--expected", "-1"}), kUnusableArguments, "--expected");
+}
+
+TEST_F(AccountsctlSummarize, ATerminalShowsProgressAndThenTheSummaryAlone) {
+  // script(1) gives the program a terminal; the summary goes to a file.
+  const std::string command =
+      accountsctl() + " summarize " + results() + " --expected 3 > " + path("summary");
+  const ProgramResult result =
+      runProgram({.program = "script",
+                  .arguments = {"--quiet", "--return", "--command", command, "/dev/null"}});
+
+  EXPECT_NE(result.output.find("1 of 3 images: 1 migrated"), std::string::npos) << result.output;
+  EXPECT_TRUE(result.output.ends_with("\r\033[K")) << result.output;
+  EXPECT_TRUE(readText("summary").starts_with("Images  Status")) << readText("summary");
+}
+
+}  // namespace
+}  // namespace accounts
