@@ -109,7 +109,7 @@ function standing(where, side, page) {
     return null;
   }
   const parent = where.parent;
-  const title = page.accounts.withIdentifier[side].get(parent)?.title ?? parent;
+  const title = accountOn(side, parent, page.accounts)?.title ?? parent;
   return parent ? `${where.place}, below ${title}` : `${where.place}`;
 }
 
@@ -117,8 +117,8 @@ function changeBody(change, page) {
   const before = standing(change.before, "before", page);
   const after = standing(change.after, "after", page);
   const links = ["before", "after"]
-    .map((side) => [side, page.accounts.withIdentifier[side].get(change.identifier)])
-    .filter(([, account]) => account !== undefined)
+    .map((side) => [side, accountOn(side, change.identifier, page.accounts)])
+    .filter(([, account]) => account !== null)
     .map(([side, account]) => [button(`Show it ${side}`, () => page.reveal(account)), " "]);
   return [
     change.properties?.length > 0 ? differenceTable(change.properties) : null,

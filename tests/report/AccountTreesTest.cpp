@@ -152,24 +152,47 @@ TEST(AccountTreesTest, AccountsArePairedByIdentifierOrElseByTitleEachWithOneOthe
             json({"IMAP 'First'", "IMAP 'No identifier'", "IMAP 'No identifier' + added"}));
 }
 
-TEST(AccountTreesTest, AnAccountWithANewIdentifierIsTheOldOneAndItsChildrenStayWhereTheyWere) {
-  json before = plainAccount("OLD", "Velmora 'Ada'");
-  const json child = plainAccount("CHILD", "Velmora 'Child'");
-  before["children"].push_back(child);
-  json after = before;
-  after["identifier"] = "NEW";
-  const json other = plainAccount("ANOTHER", "Velmora 'Another name'");
+TEST(AccountTreesTest, AnAccountThatAloneHasItsNameIsTheSameWithANewIdentifier) {
+  const json name = {{"DisplayName", "Ada"}};
+  const json children = json::array({plainAccount("CHILD", "IMAP 'Child'")});
+  json before = plainAccount("OLD", "IMAP 'Ada'", name);
+  before["children"] = children;
+  json after = plainAccount("NEW", "IMAP 'Ada'", name);
+  after["children"] = children;
+  const json change = {{"change", "changed"}, {"identifier", "NEW"}};
 
-  const json noted = notedOnTrees(
-      {{"accountsBefore", json::array({before})}, {"accountsAfter", json::array({after, other})}},
-      R"js(
+  const json noted =
+      notedOnTrees({{"accountsBefore", json::array({before})},
+                    {"accountsAfter", json::array({after})},
+                    {"stages", json::array({{{"accounts", json::array({change})}}})}},
+                   R"js(
+    note("before", tree("before"));
+    note("after", tree("after"));
+    one("#expand").click();
+    await pause();
+    all(".change button").find((each) => each.textContent === "Show it before").click();
+    note("reached", page.activeElement.closest("#before .account").querySelector(".facts dd").textContent);
+  )js");
+
+  EXPECT_EQ(noted["before"], json({"IMAP 'Ada' # new identifier", "IMAP 'Child'"}));
+  EXPECT_EQ(noted["after"], json({"IMAP 'Ada' # new identifier", "IMAP 'Child'"}));
+  EXPECT_EQ(noted["reached"], "OLD");
+}
+
+TEST(AccountTreesTest, AccountsWithANamesakeAreNotTheSameWithANewIdentifier) {
+  const json name = {{"DisplayName", "Ada"}};
+
+  const json noted =
+      notedOnTrees({{"accountsBefore", json::array({plainAccount("OLD", "IMAP 'Ada'", name)})},
+                    {"accountsAfter", json::array({plainAccount("NEW", "IMAP 'Ada'", name),
+                                                   plainAccount("OTHER", "IMAP 'Ada'", name)})}},
+                   R"js(
     note("before", tree("before"));
     note("after", tree("after"));
   )js");
 
-  EXPECT_EQ(noted["before"], json({"Velmora 'Ada' # new identifier", "Velmora 'Child'"}));
-  EXPECT_EQ(noted["after"], json({"Velmora 'Ada' # new identifier", "Velmora 'Child'",
-                                  "Velmora 'Another name' + added"}));
+  EXPECT_EQ(noted["before"], json::array({"IMAP 'Ada' − removed"}));
+  EXPECT_EQ(noted["after"], json({"IMAP 'Ada' + added", "IMAP 'Ada' + added"}));
 }
 
 TEST(AccountTreesTest, AChildThatOutlivesItsParentHasMoved) {
