@@ -26,7 +26,9 @@ enum class ExitStatus : int {
   /// An output file, or one of the program's own, cannot be created.
   CannotCreate = EX_CANTCREAT,
   /// A file or stream cannot be written or read.
-  InputOutputError = EX_IOERR
+  InputOutputError = EX_IOERR,
+  /// What stands in the way may pass: the same again may succeed.
+  TemporaryFailure = EX_TEMPFAIL
 };
 
 /// Why a program could not do what it was asked to.

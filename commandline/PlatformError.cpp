@@ -17,10 +17,22 @@ ExitStatus exitStatusOf(LinuxPlatformError::Kind kind) {
   return ExitStatus::InputOutputError;
 }
 
+ExitStatus exitStatusOf(FailureKind kind, ExitStatus lasting) {
+  return kind == FailureKind::MayPass ? ExitStatus::TemporaryFailure : lasting;
+}
+
 }  // namespace
 
 ProgramError programErrorOf(const LinuxPlatformError& error) {
-  return ProgramError{exitStatusOf(error.kind), error.text};
+  return {exitStatusOf(error.failure, exitStatusOf(error.kind)), error.text};
+}
+
+ProgramError programErrorOf(const PathError& error, ExitStatus lasting) {
+  return {exitStatusOf(failureKind(error.number), lasting), error.text};
+}
+
+ProgramError programErrorOf(const Result& failure, ExitStatus lasting) {
+  return {exitStatusOf(failure.kind(), lasting), failure.error()};
 }
 
 }  // namespace accounts

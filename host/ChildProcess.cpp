@@ -3,6 +3,7 @@
 #include <fcntl.h>
 #include <sys/mman.h>
 #include <sys/prctl.h>
+#include <sys/syscall.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -20,8 +21,12 @@ namespace {
 constexpr char kEndMark = '\x04';
 constexpr char kLineEnd = '\n';
 
-ProgramError inputOutputError(const std::string& message) {
-  return ProgramError{ExitStatus::InputOutputError, message + ": " + std::strerror(errno)};
+// A migration takes far less; one that takes longer waits for something.
+constexpr auto kGrace = std::chrono::seconds(5);
+
+/// The system lacks what a child process needs; at another time it may have it.
+ProgramError temporaryFailure(const std::string& message) {
+  return ProgramError{ExitStatus::TemporaryFailure, message + ": " + std::strerror(errno)};
 }
 
 bool writeAll(int file, std::string_view text) {
@@ -95,12 +100,12 @@ ChildOutcome outcomeOf(std::string_view text, int status) {
 
 }  // namespace
 
-ChildOutcome runInChildProcess(const ChildFunction& function) {
+ChildOutcome runInChildProcess(const ChildFunction& function, StopSignals& stop) {
   // A file in memory rather than a pipe: its reader waits for the child alone, never for some
   // process that the child started and that keeps a pipe open.
   const int result = memfd_create("migration-result", MFD_CLOEXEC);
   if (result < 0) {
-    return {{}, inputOutputError("No memory for the plug-in's result")};
+    return {{}, temporaryFailure("No memory for the plug-in's result")};
   }
   const pid_t parent = getpid();
   const pid_t child = fork();
@@ -108,16 +113,26 @@ ChildOutcome runInChildProcess(const ChildFunction& function) {
     runChild(result, parent, function);
   }
   if (child < 0) {
-    ChildOutcome outcome{{}, inputOutputError("No process for the plug-in")};
+    ChildOutcome outcome{{}, temporaryFailure("No process for the plug-in")};
     close(result);
     return outcome;
+  }
+  const FileDescriptor process(static_cast<int>(syscall(SYS_pidfd_open, child, 0)));
+  const bool endedByItself = process.number() < 0 || stop.waitForEndOf(process, kGrace);
+  if (!endedByItself) {
+    kill(child, SIGKILL);
   }
   int status = 0;
   while (waitpid(child, &status, 0) < 0 && errno == EINTR) {
   }
   const std::string text = readFromStart(result);
   close(result);
-  return outcomeOf(text, status);
+  ChildOutcome outcome = outcomeOf(text, status);
+  if (!endedByItself) {
+    outcome.result = ProgramError{ExitStatus::TemporaryFailure,
+                                  std::string(kStopped) + " before the plug-in was done"};
+  }
+  return outcome;
 }
 
 }  // namespace accounts

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "commandline/ExitStatus.h"
+#include "host/StopSignals.h"
 
 namespace accounts {
 
@@ -26,7 +27,8 @@ using ChildFunction = std::function<std::string(const WriteLine& writeLine)>;
 
 /// Runs a function in a child process of its own and waits for its end. The child's standard output
 /// is its standard error, so that nothing that runs there can spoil what the host writes; it is
-/// killed when the host ends first.
-ChildOutcome runInChildProcess(const ChildFunction& function);
+/// killed when the host ends first. A host that is asked to stop gives it five seconds to end by
+/// itself and then kills it: an error that may pass.
+ChildOutcome runInChildProcess(const ChildFunction& function, StopSignals& stop);
 
 }  // namespace accounts

@@ -11,6 +11,9 @@ namespace {
 
 constexpr const char* kVersion = "migration-host " MIGRATION_HOST_VERSION;
 
+// A month, which is as good as no limit.
+constexpr unsigned kLongestLockTimeout = 31 * 24 * 60 * 60;
+
 /// The arguments of every subcommand; those of the one that is chosen are filled.
 struct Arguments {
   RunOptions run;
@@ -37,6 +40,13 @@ void addDeviceOptions(CLI::App& command, DeviceOptions& options) {
   addPath(command, "--channel", options.channel, "FILE",
           "Append the log channel to FILE, - for standard error, journal for the system's journal "
           "(default: off)");
+  command
+      .add_option_function<unsigned>(
+          "--lock-timeout",
+          [&options](unsigned seconds) { options.lockTimeout = std::chrono::seconds(seconds); },
+          "How long another host on the root is waited for (default: as long as it takes)")
+      ->option_text("SECONDS")
+      ->check(CLI::Range(0U, kLongestLockTimeout));
 }
 
 void addReports(CLI::App& command, Arguments& arguments) {
@@ -51,6 +61,13 @@ void addReports(CLI::App& command, Arguments& arguments) {
 void addRun(CLI::App& command, Arguments& arguments) {
   addDeviceOptions(command, arguments.run.device);
   addReports(command, arguments);
+  command
+      .add_option_function<std::string>(
+          "--broadcast",
+          [&arguments](const std::string&) { arguments.run.broadcastsOnDBus = true; },
+          "Announce changed preferences and cloud tabs on BUS, which is dbus (default: not at all)")
+      ->option_text("BUS")
+      ->check(CLI::IsMember({"dbus"}));
   command.add_flag("--bare", arguments.run.bare,
                    "Run the plug-in without keeping or verifying anything");
 }

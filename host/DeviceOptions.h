@@ -1,5 +1,6 @@
 #pragma once
 
+#include <chrono>
 #include <memory>
 #include <optional>
 #include <string>
@@ -19,12 +20,15 @@ struct DeviceOptions {
   std::optional<std::string> home;
   /// None for the root's own description.
   std::optional<std::string> deviceDescription;
-  /// None for the bundle beside the program.
+  /// None for the bundle of the program.
   std::optional<std::string> plugin;
   /// A device path; none for the one in the home directory.
   std::optional<std::string> temporaryDirectory;
-  /// Where the log channel goes, "-" for standard error; none keeps the channel off.
+  /// Where the log channel goes, "-" for standard error, "journal" for the system's journal;
+  /// none keeps the channel off.
   std::optional<std::string> channel;
+  /// How long another host on the root is waited for; none for as long as it takes.
+  std::optional<std::chrono::seconds> lockTimeout;
 };
 
 /// The device path of the directory for temporary files.

@@ -30,12 +30,16 @@ inline constexpr const char* kRunStatuses =
 inline constexpr const char* kRunErrors =
     "  70  the plug-in ended by an assertion or a signal\n"
     "  73  a file of the host's own cannot be created\n"
-    "  74  a file or stream of the host's own cannot be written or read\n";
+    "  74  a file or stream of the host's own cannot be written or read\n"
+    "  75  what stands in the way may pass: another host has the root, no room, a device that\n"
+    "      does not answer, the host was asked to stop\n";
 inline constexpr const char* kRunExamples =
     "  migration-host run --root /                             the running device\n"
     "  migration-host run --root /mnt/image --json             an image, for a program to read\n"
     "  migration-host run --root /mnt/image --html report.html every change, for a browser\n"
     "  migration-host run --root /mnt/image --channel -        the log channel as well\n"
+    "  migration-host run --root image --json --lock-timeout 60 one of many images\n"
+    "  migration-host run --root / --channel journal --broadcast dbus\n"
     "  migration-host run --root image --device other.plist    answers of another device\n";
 
 inline constexpr const char* kPlan =
@@ -61,7 +65,8 @@ inline constexpr const char* kRestore =
 inline constexpr const char* kRestoreStatuses = "  0   the files are back\n";
 inline constexpr const char* kRestoreErrors =
     "  73  what would be replaced cannot be kept; nothing was changed\n"
-    "  74  the files cannot be put back; the folder is still whole\n";
+    "  74  the files cannot be put back; the folder is still whole\n"
+    "  75  what stands in the way may pass; nothing was changed\n";
 inline constexpr const char* kRestoreExamples =
     "  migration-host restore --root /mnt/image\n"
     "  migration-host restore --root /mnt/image --from Kept-20260102T030405Z\n";

@@ -90,10 +90,11 @@ HostOutcome planWithPlugin(const PlanOptions& options) {
   }
   const auto& device = std::get<OpenedDevice>(opened);
   LinuxPlatform& linux = *device.platform;
-  PathError lockError;
-  const auto rootLock = RootLock::take(linux.root(), lockError);
+  StopSignals stop;
+  ProgramError lockError;
+  const auto rootLock = RootLock::take(linux.root(), options.device.lockTimeout, &stop, lockError);
   if (!rootLock) {
-    return failed({ExitStatus::CannotCreate, lockError.text});
+    return failed(lockError);
   }
   PlannedPlatform planned(linux, temporaryDirectoryOf(options.device));
   const AccountFiles files = accountFilesInHome(linux.platform().homeDirectory.path());
@@ -103,11 +104,13 @@ HostOutcome planWithPlugin(const PlanOptions& options) {
                         .linux = linux,
                         .files = files,
                         .recorded = options.secrets,
-                        .inspect = [&](const Platform& platform, RunReport& report) {
-                          if (report.result) {
-                            foreseeVerification(linux, platform.propertyLists, files, report);
-                          }
-                        }});
+                        .inspect =
+                            [&](const Platform& platform, RunReport& report) {
+                              if (report.result) {
+                                foreseeVerification(linux, platform.propertyLists, files, report);
+                              }
+                            }},
+                       stop);
   return {reportOf(std::move(outcome.report)), std::move(outcome.recorded)};
 }
 

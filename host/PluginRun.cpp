@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "host/ChildProcess.h"
+#include "host/StageNames.h"
 #include "platform/ReplacedParts.h"
 #include "report/MigrationRecorder.h"
 #include "report/RecordedPlatform.h"
@@ -17,7 +18,8 @@ namespace {
 /// Loads the plug-in and lets it migrate, all in this process.
 RunReport runPlugin(const PluginRun& run, Platform& platform) {
   SaveObserver saves(platform.fileSystem, run.files.settings);
-  Platform observed = platformWith(platform, {.fileSystem = &saves});
+  StageNames stages(platform.migrationObserver);
+  Platform observed = platformWith(platform, {.fileSystem = &saves, .migrationObserver = &stages});
   RunReport report;
   std::variant<std::unique_ptr<MigrationPluginBase>, ProgramError> made =
       run.bundle.makePlugin(observed);
@@ -30,6 +32,7 @@ RunReport runPlugin(const PluginRun& run, Platform& platform) {
   report.result = plugin->performMigration();
   plugin.reset();
 
+  report.steps = stages.names();
   report.settingsSaves = saves.saves();
   report.broadcasts = run.linux.preferencesBroadcast().changes();
   const std::vector<CloudTabs>& announcements = run.linux.cloudTabService().announcements();
@@ -70,11 +73,14 @@ RunReport runRecordedPlugin(const PluginRun& run, const WriteLine& writeLine) {
 
 }  // namespace
 
-PluginOutcome runPluginInChild(const PluginRun& run) {
-  ChildOutcome child = runInChildProcess([&](const WriteLine& writeLine) {
-    Platform platform = run.platform;
-    return jsonText(run.recorded ? runRecordedPlugin(run, writeLine) : runPlugin(run, platform));
-  });
+PluginOutcome runPluginInChild(const PluginRun& run, StopSignals& stop) {
+  ChildOutcome child = runInChildProcess(
+      [&](const WriteLine& writeLine) {
+        Platform platform = run.platform;
+        return jsonText(run.recorded ? runRecordedPlugin(run, writeLine)
+                                     : runPlugin(run, platform));
+      },
+      stop);
   PluginOutcome outcome;
   outcome.recorded = RecordedMigration::fromLines(child.lines);
   if (const auto* error = std::get_if<ProgramError>(&child.result)) {

@@ -8,6 +8,7 @@
 #include "commandline/ExitStatus.h"
 #include "host/PluginBundle.h"
 #include "host/RunReport.h"
+#include "host/StopSignals.h"
 #include "platform/Platform.h"
 #include "platform/linux/LinuxPlatform.h"
 #include "propertylist/SecretKeys.h"
@@ -38,8 +39,8 @@ struct PluginOutcome {
 };
 
 /// Loads the plug-in and lets it migrate in a child process, so that whatever ends it leaves
-/// someone to report it.
-PluginOutcome runPluginInChild(const PluginRun& run);
+/// someone to report it; stops it as runInChildProcess() says.
+PluginOutcome runPluginInChild(const PluginRun& run, StopSignals& stop);
 
 /// The report of a run, also of one that gave an error alone.
 RunReport reportOf(std::variant<RunReport, ProgramError> outcome);

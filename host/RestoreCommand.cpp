@@ -33,9 +33,11 @@ Restoration runRestoration(const RestoreOptions& options) {
   if (!root) {
     return failed(ExitStatus::MissingInput, error.text);
   }
-  const auto rootLock = RootLock::take(*root, error);
+  ProgramError lockError;
+  const auto rootLock =
+      RootLock::take(*root, /*timeLimit=*/std::nullopt, /*stop=*/nullptr, lockError);
   if (!rootLock) {
-    return failed(ExitStatus::CannotCreate, error.text);
+    return failed(lockError.exitStatus, lockError.message);
   }
   LinuxSharedResources sharedResources(*root);
   const HeldLock migrationLock(sharedResources, kMigrationLockName);

@@ -1,10 +1,12 @@
 #pragma once
 
+#include <chrono>
 #include <optional>
 
+#include "commandline/ExitStatus.h"
+#include "host/StopSignals.h"
 #include "platform/linux/DeviceRoot.h"
 #include "platform/linux/FileDescriptor.h"
-#include "platform/linux/PathError.h"
 
 namespace accounts {
 
@@ -12,9 +14,13 @@ namespace accounts {
 /// directory, so that no file is made for it. It is freed with this object or its process.
 class RootLock {
  public:
-  /// Takes the lock, waiting while another host has it. None, with `error` set, when the directory
-  /// cannot be read or its file system has no such locks.
-  static std::optional<RootLock> take(const DeviceRoot& root, PathError& error);
+  /// Takes the lock, waiting while another host has it: without end, or for as long as `timeLimit`
+  /// says, and until a stop signal arrives (null where one ends the process). None, with `error`
+  /// set, when it is not obtained: that may pass, unless the directory cannot be read or its file
+  /// system has no such locks.
+  static std::optional<RootLock> take(const DeviceRoot& root,
+                                      std::optional<std::chrono::seconds> timeLimit,
+                                      StopSignals* stop, ProgramError& error);
 
   RootLock(RootLock&&) = default;
   RootLock& operator=(RootLock&&) = delete;

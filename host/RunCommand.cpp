@@ -5,6 +5,8 @@
 #include <utility>
 #include <variant>
 
+#include "commandline/PlatformError.h"
+#include "host/Broadcasting.h"
 #include "host/CurrentTime.h"
 #include "host/HeldLock.h"
 #include "host/PluginRun.h"
@@ -35,24 +37,29 @@ HostOutcome failed(const ProgramError& error) {
 }
 
 /// Runs the plug-in with its inputs kept around it.
-HostOutcome runPluginSafely(const RunOptions& options, const PluginRun& run) {
-  PathError lockError;
-  const auto rootLock = RootLock::take(run.linux.root(), lockError);
+HostOutcome runPluginSafely(const RunOptions& options, const PluginRun& run, StopSignals& stop) {
+  ProgramError lockError;
+  const auto rootLock =
+      RootLock::take(run.linux.root(), options.device.lockTimeout, &stop, lockError);
   if (!rootLock) {
-    return failed({ExitStatus::CannotCreate, lockError.text});
+    return failed(lockError);
   }
   SafetyNet safetyNet(run.linux.fileSystem(), run.platform.propertyLists, run.files,
                       restoreCommand(options.device));
   if (const Result kept = safetyNet.keepInputs(currentTimeText()); !kept) {
-    return failed({ExitStatus::CannotCreate, "The files cannot be kept: " + kept.error()});
+    ProgramError error = programErrorOf(kept, ExitStatus::CannotCreate);
+    error.message.insert(0, "The files cannot be kept: ");
+    return failed(error);
   }
-  PluginOutcome outcome = runPluginInChild(run);
+  PluginOutcome outcome = runPluginInChild(run, stop);
   const PluginEnd end = endOf(outcome.report);
   RunReport report = reportOf(std::move(outcome.report));
   std::optional<HeldLock> migrationLock;
-  if (end == PluginEnd::Died || report.dataClassName) {
+  const bool isStopped = report.exitStatus == ExitStatus::TemporaryFailure;
+  if ((end == PluginEnd::Died && !isStopped) || report.dataClassName) {
     // Readers that wait for the migration wait until it is verified or undone, too. Where the
-    // plug-in could not be loaded, not even the lock's file is made.
+    // plug-in could not be loaded, not even the lock's file is made; nor does a host that is to
+    // stop, perhaps because it waits for the lock, wait for it again.
     migrationLock.emplace(run.platform.sharedResources, kMigrationLockName);
   }
   Settlement settlement = safetyNet.settle(end, report.settingsSaves);
@@ -65,6 +72,7 @@ HostOutcome runPluginSafely(const RunOptions& options, const PluginRun& run) {
 }
 
 HostOutcome findAndRunPlugin(const RunOptions& options) {
+  StopSignals stop;
   const std::variant<OpenedDevice, ProgramError> opened = openDevice(options.device);
   if (const auto* error = std::get_if<ProgramError>(&opened)) {
     return failed(*error);
@@ -79,9 +87,9 @@ HostOutcome findAndRunPlugin(const RunOptions& options) {
                       .recorded = options.recorded,
                       .inspect = nullptr};
   if (!options.bare) {
-    return runPluginSafely(options, run);
+    return runPluginSafely(options, run, stop);
   }
-  PluginOutcome outcome = runPluginInChild(run);
+  PluginOutcome outcome = runPluginInChild(run, stop);
   return {reportOf(std::move(outcome.report)), std::move(outcome.recorded)};
 }
 
@@ -90,6 +98,9 @@ HostOutcome findAndRunPlugin(const RunOptions& options) {
 HostOutcome runMigration(const RunOptions& options) {
   HostOutcome outcome = findAndRunPlugin(options);
   outcome.report.root = options.device.root;
+  if (options.broadcastsOnDBus) {
+    broadcastOnDBus(outcome.report);
+  }
   return outcome;
 }
 

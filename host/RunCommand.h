@@ -14,6 +14,8 @@ struct RunOptions {
   DeviceOptions device;
   /// Runs the plug-in without the safety net.
   bool bare = false;
+  /// Whether what the plug-in announces is announced on the system's D-Bus, too.
+  bool broadcastsOnDBus = false;
   /// How values are recorded; none for a run that is not recorded.
   std::optional<Secrets> recorded;
 };

@@ -9,6 +9,7 @@ namespace {
 constexpr const char* kRootKey = "root";
 constexpr const char* kDataClassNameKey = "dataClassName";
 constexpr const char* kResultKey = "result";
+constexpr const char* kStepsKey = "steps";
 constexpr const char* kBroadcastsKey = "broadcasts";
 constexpr const char* kApplicationKey = "application";
 constexpr const char* kPreferenceKey = "key";
@@ -65,6 +66,7 @@ JSON objectOf(const RunReport& report) {
   JSON object = {{kRootKey, textOrNull(report.root)},
                  {kDataClassNameKey, textOrNull(report.dataClassName)},
                  {kResultKey, report.result},
+                 {kStepsKey, report.steps},
                  {kBroadcastsKey, std::move(broadcasts)},
                  {kCloudTabAnnouncementsKey, report.cloudTabAnnouncements},
                  {kSettingsSavesKey, jsonOf(report.settingsSaves)},
@@ -88,6 +90,7 @@ std::optional<RunReport> reportFromJSONText(const std::string& text) {
     report.root = optionalText(object, kRootKey);
     report.dataClassName = optionalText(object, kDataClassNameKey);
     report.result = object.at(kResultKey).get<bool>();
+    report.steps = object.at(kStepsKey).get<std::vector<std::string>>();
     for (const JSON& broadcast : object.at(kBroadcastsKey)) {
       report.broadcasts.push_back({broadcast.at(kApplicationKey).get<std::string>(),
                                    broadcast.at(kPreferenceKey).get<std::string>()});

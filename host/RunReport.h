@@ -20,6 +20,8 @@ struct RunReport {
   std::optional<std::string> dataClassName;
   /// What the migration gave; false when it gave nothing.
   bool result = false;
+  /// The operations of the stages that the migration went through, in order.
+  std::vector<std::string> steps;
   std::vector<PreferencesChange> broadcasts;
   /// How often cloud tabs were announced to be on.
   std::size_t cloudTabAnnouncements = 0;

@@ -34,8 +34,9 @@ MigrationStage::MigrationStage(std::string_view operation, std::string_view purp
 
 void MigrationStage::end(bool succeeded, const AccountsManager* store) {
   if (MigrationObserver* const told = observer()) {
-    told->stageEnded(succeeded,
-                     store != nullptr ? std::optional(accountSettings(*store)) : std::nullopt);
+    told->stageEnded(succeeded, store != nullptr && told->wantsAccounts()
+                                    ? std::optional(accountSettings(*store))
+                                    : std::nullopt);
   }
 }
 

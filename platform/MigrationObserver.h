@@ -13,12 +13,16 @@ class MigrationObserver {
  public:
   virtual ~MigrationObserver() = default;
 
+  /// Whether stageEnded() is to have the accounts, which takes longer the more there are.
+  [[nodiscard]] virtual bool wantsAccounts() const { return true; }
+
   /// A stage begins. `operation` is the name of the operation that it runs, `purpose` says in a
   /// few words for people what that is for.
   virtual void stageBegan(std::string_view operation, std::string_view purpose) = 0;
 
   /// The stage that began last has ended. `accountSettings` is what a settings file of the accounts
-  /// in memory would hold now; none where they are not in memory.
+  /// in memory would hold now; none where they are not in memory or not
+  /// wanted.
   virtual void stageEnded(bool succeeded,
                           const std::optional<PropertyDictionary>& accountSettings) = 0;
 };

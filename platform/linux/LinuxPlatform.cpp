@@ -36,7 +36,12 @@ constexpr std::string_view kTemporaryDirectoryInHome = "tmp";
 constexpr std::string_view kJournal = "journal";
 
 bool fail(LinuxPlatformError& error, Kind kind, std::string text) {
-  error = {kind, std::move(text)};
+  error = {.kind = kind, .text = std::move(text)};
+  return false;
+}
+
+bool fail(LinuxPlatformError& error, Kind kind, const PathError& reason) {
+  error = {.kind = kind, .failure = failureKind(reason.number), .text = reason.text};
   return false;
 }
 
@@ -52,9 +57,8 @@ bool checkDevicePath(std::string_view option, const std::string& path, LinuxPlat
 bool checkResources(const std::string& directory, LinuxPlatformError& error) {
   const int number = ::open(directory.c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC);
   if (number < 0) {
-    const int reason = errno;
     return fail(error, Kind::MissingInput,
-                pathError("open the bundle's resources", directory, reason).text);
+                pathError("open the bundle's resources", directory, errno));
   }
   ::close(number);
   return true;
@@ -152,19 +156,19 @@ std::unique_ptr<LinuxPlatform> LinuxPlatform::create(const LinuxPlatformOptions&
   PathError failure;
   auto root = DeviceRoot::openRoot(options.rootDirectory, failure);
   if (!root) {
-    fail(error, failure.number == ENOSYS ? Kind::InputOutput : Kind::MissingInput, failure.text);
+    fail(error, failure.number == ENOSYS ? Kind::InputOutput : Kind::MissingInput, failure);
     return nullptr;
   }
   auto description = options.deviceDescriptionFile
                          ? readHostDeviceDescription(*options.deviceDescriptionFile, failure)
                          : readDeviceDescription(*root, failure);
   if (!description) {
-    fail(error, Kind::MissingInput, failure.text);
+    fail(error, Kind::MissingInput, failure);
     return nullptr;
   }
   std::unique_ptr<LogSystem> logSystem = makeLogSystem(options, failure);
   if (logSystem == nullptr) {
-    fail(error, Kind::CannotCreate, failure.text);
+    fail(error, Kind::CannotCreate, failure);
     return nullptr;
   }
   return std::unique_ptr<LinuxPlatform>(new LinuxPlatform(std::make_unique<Parts>(

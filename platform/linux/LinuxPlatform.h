@@ -48,6 +48,8 @@ struct LinuxPlatformError {
     InputOutput
   };
   Kind kind = Kind::InputOutput;
+  /// Whether trying again may help.
+  FailureKind failure = FailureKind::Lasting;
   /// One line for a person, without a full stop.
   std::string text;
 };

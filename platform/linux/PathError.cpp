@@ -1,6 +1,8 @@
 #include "platform/linux/PathError.h"
 
+#include <algorithm>
 #include <cerrno>
+#include <iterator>
 #include <system_error>
 
 namespace accounts {
@@ -15,6 +17,10 @@ constexpr FileKind kOtherKinds[] = {
     {S_IFDIR, "a directory"}, {S_IFLNK, "a symbolic link"},    {S_IFIFO, "a named pipe"},
     {S_IFSOCK, "a socket"},   {S_IFCHR, "a character device"}, {S_IFBLK, "a block device"},
 };
+
+// Room, media, and what the system has too little of at times.
+constexpr int kPassingNumbers[] = {EAGAIN, EDQUOT, EIO,    EMFILE,   ENFILE,
+                                   ENOMEM, ENOSPC, ESTALE, ETIMEDOUT};
 
 std::string_view nameOfKind(mode_t mode) {
   for (const FileKind& kind : kOtherKinds) {
@@ -32,6 +38,13 @@ std::string text(std::string_view operation, std::string_view path, std::string_
 }
 
 }  // namespace
+
+FailureKind failureKind(int number) {
+  return std::find(std::begin(kPassingNumbers), std::end(kPassingNumbers), number) !=
+                 std::end(kPassingNumbers)
+             ? FailureKind::MayPass
+             : FailureKind::Lasting;
+}
 
 bool PathError::isMissing() const {
   return number == ENOENT || number == ENOTDIR;

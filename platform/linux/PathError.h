@@ -5,6 +5,8 @@
 #include <string>
 #include <string_view>
 
+#include "platform/Result.h"
+
 namespace accounts {
 
 /// Why an operation on a path failed.
@@ -17,6 +19,10 @@ struct PathError {
   /// Whether the reason is that nothing exists at the path.
   [[nodiscard]] bool isMissing() const;
 };
+
+/// The kind of failure that a system error number stands for: those of room, of media and of the
+/// system's own means may pass.
+FailureKind failureKind(int number);
 
 /// The error "Cannot OPERATION PATH: REASON" for a system error number. `operation` is a verb with
 /// what belongs to it, such as "open".

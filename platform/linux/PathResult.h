@@ -9,7 +9,7 @@ namespace accounts {
 
 /// The failure that an error on a path is for the caller of a platform operation.
 inline Result asResult(const PathError& error) {
-  return Result::failure(error.text);
+  return Result::failure(error.text, failureKind(error.number));
 }
 
 /// Success for the system error number 0, otherwise the failure "Cannot OPERATION PATH: REASON".

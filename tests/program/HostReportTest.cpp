@@ -20,6 +20,7 @@ TEST_F(HostReport, TheObjectTellsEverythingInTheAgreedKeys) {
       {"root", root()},
       {"dataClassName", "accounts"},
       {"result", true},
+      {"steps", object["steps"]},
       {"broadcasts", {{{"application", kMobileMail}, {"key", "MailAccounts"}}}},
       {"cloudTabAnnouncements", 0},
       {"settingsSaves", {{"lastWritten", true}, {"replacedFile", true}}},
