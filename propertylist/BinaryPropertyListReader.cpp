@@ -76,11 +76,11 @@ class Reader {
     // The top object's place is an array of one element that is in no file.
     references_.push_back(layout_.topObject);
     openContainers_.emplace_back();
-    openContainers_.back().elements.reserve(1);
+    openContainers_.back().elements = PropertyArray::withRoomFor(1);
     openContainers_.back().childCount = 1;
     while (readChildren()) {
       if (openContainers_.size() == 1) {
-        return std::move(openContainers_.front().elements.front());
+        return openContainers_.front().elements.at(0);
       }
       if (!close()) {
         break;
@@ -107,8 +107,8 @@ class Reader {
   /// A container whose children are being read.
   struct Container {
     /// One of the two, by kind. It has its room from the beginning: what is in it keeps its place.
-    std::vector<PropertyValue> elements;
-    std::vector<PropertyEntry> entries;
+    PropertyArray elements;
+    PropertyEntries entries;
     Kind kind = Kind::Array;
     std::uint16_t height = 1;
     Reference object = 0;
@@ -179,11 +179,10 @@ class Reader {
     if (container.kind == Kind::Dictionary) {
       const Object& key = objects_[references_[container.firstReference + container.nextChild]];
       container.expandedCount += key.expandedCount - 1;
-      container.entries.push_back({*static_cast<const Text*>(key.place), std::move(value)});
-      place = &container.entries.back().value;
+      place =
+          &container.entries.append(*static_cast<const Text*>(key.place), std::move(value)).value;
     } else {
-      container.elements.push_back(std::move(value));
-      place = &container.elements.back();
+      place = &container.elements.append(std::move(value));
     }
     ++container.nextChild;
     Object& object = objects_[child];
@@ -283,9 +282,9 @@ class Reader {
     objects_[reference].state = State::Open;
     Container& container = openContainers_.emplace_back();
     if (isDictionary) {
-      container.entries.reserve(childCount);
+      container.entries = PropertyEntries(childCount);
     } else {
-      container.elements.reserve(childCount);
+      container.elements = PropertyArray::withRoomFor(childCount);
     }
     container.kind = head.kind;
     container.object = reference;
@@ -325,20 +324,19 @@ class Reader {
     objects_[closed.object].height = closed.height;
     PropertyValue value = closed.kind == Kind::Dictionary
                               ? PropertyValue(makeDictionary(closed))
-                              : PropertyArray(std::move(closed.elements));
+                              : PropertyValue(std::move(closed.elements));
     references_.resize(closed.firstReference);
     add(openContainers_.back(), closed.object, std::move(value));
     return true;
   }
 
   PropertyDictionary makeDictionary(Container& container) {
-    std::vector<PropertyEntry>& entries = container.entries;
     if (areOrdered(container)) {
-      return PropertyDictionary::ofOrderedEntries(std::move(entries));
+      return container.entries.takeOrdered();
     }
     // What was made in these entries must keep its place, which sorting would change.
-    unorderedEntries_.push_back(std::move(entries));
-    return PropertyDictionary(unorderedEntries_.back());
+    const PropertyEntries& entries = unorderedEntries_.emplace_back(std::move(container.entries));
+    return PropertyDictionary(std::vector<PropertyEntry>(entries.begin(), entries.end()));
   }
 
   /// Whether a dictionary's keys are in order. Most dictionaries have the same keys as others: only
@@ -350,7 +348,7 @@ class Reader {
     if (std::equal(begin, end, known.begin(), known.end())) {
       return true;
     }
-    if (!PropertyDictionary::areOrdered(container.entries)) {
+    if (!container.entries.areOrdered()) {
       return false;
     }
     known.assign(begin, end);
@@ -367,7 +365,7 @@ class Reader {
   std::vector<Reference> references_;
   /// Texts that were first met as keys.
   std::deque<Text> keys_;
-  std::vector<std::vector<PropertyEntry>> unorderedEntries_;
+  std::vector<PropertyEntries> unorderedEntries_;
   /// The keys of dictionaries that were in order, one for each remainder of their number.
   std::array<std::vector<Reference>, 32> orderedKeys_;
 };

@@ -4,44 +4,61 @@
 
 namespace accounts {
 
-struct PropertyArray::Node : SharedNodeBase {
-  explicit Node(std::vector<PropertyValue> values) : elements(std::move(values)) {}
-  std::vector<PropertyValue> elements;
-};
+namespace {
 
-struct PropertyDictionary::Node : SharedNodeBase {
-  explicit Node(std::vector<PropertyEntry> sortedEntries) : entries(std::move(sortedEntries)) {}
-  std::vector<PropertyEntry> entries;
-};
+/// The run that a handle holds, to be changed: it is shared with nobody and has room for `more`
+/// elements.
+template <class Element, class Owner>
+SharedRun<Element>& runToChange(SharedNode<Owner>& handle, std::size_t more) {
+  using Run = SharedRun<Element>;
+  Run* const run = static_cast<Run*>(handle.get());
+  const std::size_t size = run != nullptr ? run->size() : 0;
+  const bool isOurs = run != nullptr && run->isUnshared();
+  if (isOurs && run->capacity() - size >= more) {
+    return *run;
+  }
+  // The rest of the room grows with the size, so that adding many one by one is no quadratic work.
+  SharedNode<Owner> changed(Run::make(size + more + (more > 0 ? size / 4 : 0)));
+  Run& changedRun = *static_cast<Run*>(changed.get());
+  for (std::size_t index = 0; index < size; ++index) {
+    Element& element = run->begin()[index];
+    changedRun.append(isOurs ? std::move(element) : element);
+  }
+  handle = std::move(changed);
+  return changedRun;
+}
+
+/// A handle to a run of these elements; null for none.
+template <class Owner, class Element>
+SharedNode<Owner> runOf(std::vector<Element> elements) {
+  if (elements.empty()) {
+    return {};
+  }
+  SharedNode<Owner> handle(SharedRun<Element>::make(elements.size()));
+  for (Element& element : elements) {
+    static_cast<SharedRun<Element>*>(handle.get())->append(std::move(element));
+  }
+  return handle;
+}
+
+}  // namespace
 
 PropertyArray::PropertyArray(std::initializer_list<PropertyValue> values)
     : PropertyArray(std::vector<PropertyValue>(values)) {}
 
 PropertyArray::PropertyArray(std::vector<PropertyValue> values)
-    : node_(values.empty() ? nullptr : new Node(std::move(values))) {}
+    : node_(runOf<PropertyArray>(std::move(values))) {}
 
-PropertyArray::Node* PropertyArray::node() const {
-  return static_cast<Node*>(node_.get());
-}
-
-void PropertyArray::destroyNode(SharedNodeBase* node) {
-  delete static_cast<Node*>(node);
-}
-
-std::size_t PropertyArray::size() const {
-  return node_ ? node()->elements.size() : 0;
+PropertyArray PropertyArray::withRoomFor(std::size_t count) {
+  PropertyArray array;
+  if (count > 0) {
+    runToChange<PropertyValue>(array.node_, count);
+  }
+  return array;
 }
 
 const PropertyValue& PropertyArray::at(std::size_t index) const {
-  return node()->elements.at(index);
-}
-
-const PropertyValue* PropertyArray::begin() const {
-  return node_ ? node()->elements.data() : nullptr;
-}
-
-const PropertyValue* PropertyArray::end() const {
-  return begin() + size();
+  return begin()[index];
 }
 
 bool PropertyArray::containsText(std::string_view text) const {
@@ -50,30 +67,22 @@ bool PropertyArray::containsText(std::string_view text) const {
   });
 }
 
-void PropertyArray::append(PropertyValue value) {
-  elementsToChange().push_back(std::move(value));
+const PropertyValue& PropertyArray::append(PropertyValue value) {
+  return runToChange<PropertyValue>(node_, 1).append(std::move(value));
 }
 
 void PropertyArray::replace(std::size_t index, PropertyValue value) {
-  elementsToChange().at(index) = std::move(value);
+  runToChange<PropertyValue>(node_, 0).begin()[index] = std::move(value);
 }
 
 void PropertyArray::removeText(std::string_view text) {
   if (!containsText(text)) {
     return;
   }
-  std::erase_if(elementsToChange(), [&](const PropertyValue& element) {
+  Run& run = runToChange<PropertyValue>(node_, 0);
+  run.truncate(std::remove_if(run.begin(), run.end(), [&](const PropertyValue& element) {
     return element.asText() != nullptr && *element.asText() == text;
-  });
-}
-
-std::vector<PropertyValue>& PropertyArray::elementsToChange() {
-  if (!node_) {
-    node_ = SharedNode<PropertyArray>(new Node({}));
-  } else if (!node()->isUnshared()) {
-    node_ = SharedNode<PropertyArray>(new Node(node()->elements));
-  }
-  return node()->elements;
+  }));
 }
 
 bool operator==(const PropertyArray& left, const PropertyArray& right) {
@@ -86,10 +95,16 @@ bool keyIsBefore(const PropertyEntry& entry, std::string_view key) {
   return entry.key.view() < key;
 }
 
+bool areInOrder(const PropertyEntry* begin, const PropertyEntry* end) {
+  return std::adjacent_find(begin, end, [](const PropertyEntry& left, const PropertyEntry& right) {
+           return left.key.view() >= right.key.view();
+         }) == end;
+}
+
 /// Sorts by key; of entries with the same key only the last one is left.
 std::vector<PropertyEntry> sortedByKey(std::vector<PropertyEntry> entries) {
   // Files of our own are written in key order: most dictionaries need no sorting.
-  if (PropertyDictionary::areOrdered(entries)) {
+  if (areInOrder(entries.data(), entries.data() + entries.size())) {
     return entries;
   }
   std::stable_sort(entries.begin(), entries.end(),
@@ -114,41 +129,20 @@ PropertyDictionary::PropertyDictionary(std::initializer_list<PropertyEntry> entr
     : PropertyDictionary(std::vector<PropertyEntry>(entries)) {}
 
 PropertyDictionary::PropertyDictionary(std::vector<PropertyEntry> entries)
-    : node_(entries.empty() ? nullptr : new Node(sortedByKey(std::move(entries)))) {}
+    : node_(runOf<PropertyDictionary>(sortedByKey(std::move(entries)))) {}
 
-PropertyDictionary PropertyDictionary::ofOrderedEntries(std::vector<PropertyEntry> entries) {
-  PropertyDictionary dictionary;
-  if (!entries.empty()) {
-    dictionary.node_ = SharedNode<PropertyDictionary>(new Node(std::move(entries)));
+PropertyEntries::PropertyEntries(std::size_t count) {
+  if (count > 0) {
+    runToChange<PropertyEntry>(entries_.node_, count);
   }
-  return dictionary;
 }
 
-bool PropertyDictionary::areOrdered(const std::vector<PropertyEntry>& entries) {
-  return std::adjacent_find(entries.begin(), entries.end(),
-                            [](const PropertyEntry& left, const PropertyEntry& right) {
-                              return left.key.view() >= right.key.view();
-                            }) == entries.end();
+const PropertyEntry& PropertyEntries::append(Text key, PropertyValue value) {
+  return entries_.run()->append({std::move(key), std::move(value)});
 }
 
-PropertyDictionary::Node* PropertyDictionary::node() const {
-  return static_cast<Node*>(node_.get());
-}
-
-void PropertyDictionary::destroyNode(SharedNodeBase* node) {
-  delete static_cast<Node*>(node);
-}
-
-std::size_t PropertyDictionary::size() const {
-  return node_ ? node()->entries.size() : 0;
-}
-
-const PropertyEntry* PropertyDictionary::begin() const {
-  return node_ ? node()->entries.data() : nullptr;
-}
-
-const PropertyEntry* PropertyDictionary::end() const {
-  return begin() + size();
+bool PropertyEntries::areOrdered() const {
+  return areInOrder(begin(), end());
 }
 
 const PropertyValue* PropertyDictionary::find(std::string_view key) const {
@@ -175,12 +169,12 @@ std::optional<PropertyDictionary> PropertyDictionary::dictionaryForKey(std::stri
 }
 
 void PropertyDictionary::set(Text key, PropertyValue value) {
-  std::vector<PropertyEntry>& entries = entriesToChange();
-  const auto place = std::lower_bound(entries.begin(), entries.end(), key.view(), keyIsBefore);
-  if (place != entries.end() && place->key == key) {
-    place->value = std::move(value);
+  const auto index = std::lower_bound(begin(), end(), key.view(), keyIsBefore) - begin();
+  if (index < end() - begin() && begin()[index].key == key) {
+    runToChange<PropertyEntry>(node_, 0).begin()[index].value = std::move(value);
   } else {
-    entries.insert(place, PropertyEntry{std::move(key), std::move(value)});
+    Run& run = runToChange<PropertyEntry>(node_, 1);
+    run.insert(run.begin() + index, PropertyEntry{std::move(key), std::move(value)});
   }
 }
 
@@ -192,20 +186,11 @@ std::optional<PropertyValue> PropertyDictionary::take(std::string_view key) {
   if (!contains(key)) {
     return std::nullopt;
   }
-  std::vector<PropertyEntry>& entries = entriesToChange();
-  const auto place = std::lower_bound(entries.begin(), entries.end(), key, keyIsBefore);
+  Run& run = runToChange<PropertyEntry>(node_, 0);
+  PropertyEntry* const place = std::lower_bound(run.begin(), run.end(), key, keyIsBefore);
   std::optional<PropertyValue> value(std::move(place->value));
-  entries.erase(place);
+  run.truncate(std::move(place + 1, run.end(), place));
   return value;
-}
-
-std::vector<PropertyEntry>& PropertyDictionary::entriesToChange() {
-  if (!node_) {
-    node_ = SharedNode<PropertyDictionary>(new Node({}));
-  } else if (!node()->isUnshared()) {
-    node_ = SharedNode<PropertyDictionary>(new Node(node()->entries));
-  }
-  return node()->entries;
 }
 
 bool operator==(const PropertyDictionary& left, const PropertyDictionary& right) {

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "propertylist/SharedNode.h"
+#include "propertylist/SharedRun.h"
 #include "propertylist/Text.h"
 
 namespace accounts {
@@ -50,8 +51,11 @@ class PropertyArray {
   PropertyArray() = default;
   PropertyArray(std::initializer_list<PropertyValue> values);
   explicit PropertyArray(std::vector<PropertyValue> values);
+  /// An empty array with room for a number of elements: as many are appended without moving those
+  /// before, as long as there is no copy.
+  static PropertyArray withRoomFor(std::size_t count);
 
-  [[nodiscard]] std::size_t size() const;
+  [[nodiscard]] std::size_t size() const { return node_ ? run()->size() : 0; }
   [[nodiscard]] bool empty() const { return size() == 0; }
   /// The element at an index, which must be below size().
   [[nodiscard]] const PropertyValue& at(std::size_t index) const;
@@ -60,7 +64,8 @@ class PropertyArray {
   /// True when an element is the given text.
   [[nodiscard]] bool containsText(std::string_view text) const;
 
-  void append(PropertyValue value);
+  /// Returns the element in its place.
+  const PropertyValue& append(PropertyValue value);
   /// Puts a value in the place of the one at an index, which must be below size().
   void replace(std::size_t index, PropertyValue value);
   /// Removes every element that is the given text.
@@ -78,10 +83,9 @@ class PropertyArray {
  private:
   friend class SharedNode<PropertyArray>;
   friend class PropertyContent;
-  struct Node;
-  std::vector<PropertyValue>& elementsToChange();
-  [[nodiscard]] Node* node() const;
-  static void destroyNode(SharedNodeBase* node);
+  using Run = SharedRun<PropertyValue>;
+  [[nodiscard]] Run* run() const { return static_cast<Run*>(node_.get()); }
+  static void destroyNode(SharedNodeBase* node) { Run::destroy(node); }
   SharedNode<PropertyArray> node_;
 };
 
@@ -93,12 +97,7 @@ class PropertyDictionary {
   PropertyDictionary(std::initializer_list<PropertyEntry> entries);
   /// Takes entries in any order, in O(n log n); of entries with the same key the last one holds.
   explicit PropertyDictionary(std::vector<PropertyEntry> entries);
-  /// Takes entries whose keys are known to be all different and in order, and spares the look.
-  static PropertyDictionary ofOrderedEntries(std::vector<PropertyEntry> entries);
-  /// Whether entries are as `ofOrderedEntries` needs them.
-  [[nodiscard]] static bool areOrdered(const std::vector<PropertyEntry>& entries);
-
-  [[nodiscard]] std::size_t size() const;
+  [[nodiscard]] std::size_t size() const { return node_ ? run()->size() : 0; }
   [[nodiscard]] bool empty() const { return size() == 0; }
   /// The entries in key order.
   [[nodiscard]] const PropertyEntry* begin() const;
@@ -129,10 +128,10 @@ class PropertyDictionary {
  private:
   friend class SharedNode<PropertyDictionary>;
   friend class PropertyContent;
-  struct Node;
-  std::vector<PropertyEntry>& entriesToChange();
-  [[nodiscard]] Node* node() const;
-  static void destroyNode(SharedNodeBase* node);
+  friend class PropertyEntries;
+  using Run = SharedRun<PropertyEntry>;
+  [[nodiscard]] Run* run() const { return static_cast<Run*>(node_.get()); }
+  static void destroyNode(SharedNodeBase* node) { Run::destroy(node); }
   SharedNode<PropertyDictionary> node_;
 };
 
@@ -298,5 +297,39 @@ struct PropertyEntry {
   Text key;
   PropertyValue value;
 };
+
+/// The entries of a dictionary in the making, of which the number is known: each keeps its place in
+/// memory, in the dictionary that is made of them too.
+class PropertyEntries {
+ public:
+  PropertyEntries() = default;
+  explicit PropertyEntries(std::size_t count);
+
+  [[nodiscard]] const PropertyEntry* begin() const { return entries_.begin(); }
+  [[nodiscard]] const PropertyEntry* end() const { return entries_.end(); }
+  /// Adds an entry, not more of them than the number given, and returns it in its place.
+  const PropertyEntry& append(Text key, PropertyValue value);
+  /// Whether the keys are all different and in order.
+  [[nodiscard]] bool areOrdered() const;
+  /// The dictionary of entries that are ordered.
+  [[nodiscard]] PropertyDictionary takeOrdered() { return std::move(entries_); }
+
+ private:
+  /// One only when it is taken.
+  PropertyDictionary entries_;
+};
+
+inline const PropertyValue* PropertyArray::begin() const {
+  return node_ ? run()->begin() : nullptr;
+}
+inline const PropertyValue* PropertyArray::end() const {
+  return node_ ? run()->end() : nullptr;
+}
+inline const PropertyEntry* PropertyDictionary::begin() const {
+  return node_ ? run()->begin() : nullptr;
+}
+inline const PropertyEntry* PropertyDictionary::end() const {
+  return node_ ? run()->end() : nullptr;
+}
 
 }  // namespace accounts
