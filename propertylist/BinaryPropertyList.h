@@ -40,8 +40,10 @@ class BinaryPropertyListWriter {
   BinaryPropertyListWriter& operator=(const BinaryPropertyListWriter&) = delete;
   ~BinaryPropertyListWriter();
 
-  /// See `writeBinaryPropertyList`.
-  std::optional<std::string> write(const PropertyValue& value, PropertyListError& error);
+  /// See `writeBinaryPropertyList`. `memory` is a text of which only the room is used, for the
+  /// result: that of bytes no longer needed spares the system the finding of new memory.
+  std::optional<std::string> write(const PropertyValue& value, PropertyListError& error,
+                                   std::string memory = {});
 
  private:
   std::unique_ptr<binaryplist::Catalogue> catalogue_;

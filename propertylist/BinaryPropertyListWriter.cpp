@@ -2,6 +2,7 @@
 #include <bit>
 #include <string>
 #include <type_traits>
+#include <utility>
 
 #include "propertylist/BinaryPropertyList.h"
 #include "propertylist/BinaryPropertyListCatalogue.h"
@@ -237,9 +238,16 @@ class File {
     offsetSize_ = sizeToHold(table_);
   }
 
-  [[nodiscard]] std::string write() const {
+  [[nodiscard]] std::string write(std::string bytes) const {
     const std::size_t trailer = table_ + order_.objectCount() * offsetSize_;
-    std::string bytes(trailer + kTrailerSize, '\0');
+    const std::size_t fileSize = trailer + kTrailerSize;
+    if (bytes.capacity() < fileSize) {
+      bytes = std::string();
+      // The next stage of the same file is often a little larger.
+      bytes.reserve(fileSize + fileSize / 16);
+    }
+    bytes.resize(fileSize);
+    std::fill_n(bytes.data() + trailer, kTrailerSize, '\0');
     withConstantSize(offsetSize_, [&](auto size) { writeObjects<size()>(bytes.data()); });
     char* const place = bytes.data() + trailer;
     place[kOffsetSizePosition] = static_cast<char>(offsetSize_);
@@ -296,17 +304,18 @@ BinaryPropertyListWriter::BinaryPropertyListWriter()
 BinaryPropertyListWriter::~BinaryPropertyListWriter() = default;
 
 std::optional<std::string> BinaryPropertyListWriter::write(const PropertyValue& value,
-                                                           PropertyListError& error) {
+                                                           PropertyListError& error,
+                                                           std::string memory) {
   using binaryplist::Catalogue;
   const bool isFirst = catalogue_->objectCount() == 0;
   const std::optional<Catalogue::Reference> top = catalogue_->add(value, error);
   if (!top) {
     catalogue_ = std::make_unique<Catalogue>();
     // What was written before may have used up the room for objects.
-    return isFirst ? std::nullopt : write(value, error);
+    return isFirst ? std::nullopt : write(value, error, std::move(memory));
   }
   const binaryplist::FileOrder order(*catalogue_, *top);
-  std::string bytes = binaryplist::File(*catalogue_, order).write();
+  std::string bytes = binaryplist::File(*catalogue_, order).write(std::move(memory));
   lastValue_ = value;
   // More than as much again that only earlier values had is not worth its memory.
   if (catalogue_->objectCount() > 2 * order.objectCount()) {

@@ -12,7 +12,8 @@ namespace {
 
 constexpr std::size_t kBlockSize = std::size_t{64} << 10;
 
-// Passes the bytes of an open file to `take` block by block; `take` returns whether to go on.
+// Passes the bytes of an open file to `take` block by block, with the size that the file says it
+// has; `take` returns whether to go on.
 template <class Take>
 bool readBlocks(const FileDescriptor& file, std::string_view path, PathError& error, Take take) {
   const auto status = fileStatus(file, path, error);
@@ -43,7 +44,8 @@ bool readBlocks(const FileDescriptor& file, std::string_view path, PathError& er
       error = pathError("read", path, EFBIG);
       return false;
     }
-    if (!take(std::string_view(block.data(), static_cast<std::size_t>(count)))) {
+    if (!take(std::string_view(block.data(), static_cast<std::size_t>(count)),
+              static_cast<std::size_t>(status->st_size))) {
       return false;
     }
   }
@@ -71,13 +73,15 @@ std::optional<ComparedContents> readAndCompare(const FileDescriptor& file, std::
                                                std::string_view path, PathError& error) {
   ComparedContents contents{.areKnown = true, .bytes = {}};
   std::size_t equalSize = 0;
-  const bool read = readBlocks(file, path, error, [&](std::string_view block) {
+  const bool read = readBlocks(file, path, error, [&](std::string_view block, std::size_t size) {
     if (contents.areKnown && known.substr(equalSize).starts_with(block)) {
       equalSize += block.size();
       return true;
     }
     if (contents.areKnown) {
-      contents = {.areKnown = false, .bytes = std::string(known.substr(0, equalSize))};
+      contents.areKnown = false;
+      contents.bytes.reserve(size);
+      contents.bytes = known.substr(0, equalSize);
     }
     contents.bytes.append(block);
     return true;
@@ -128,7 +132,7 @@ int writeAll(int descriptor, std::string_view bytes) {
 bool copyContents(const FileDescriptor& source, std::string_view sourcePath,
                   const FileDescriptor& destination, std::string_view destinationPath,
                   PathError& error) {
-  return readBlocks(source, sourcePath, error, [&](std::string_view block) {
+  return readBlocks(source, sourcePath, error, [&](std::string_view block, std::size_t) {
     const int number = writeAll(destination.number(), block);
     if (number != 0) {
       error = pathError("write", destinationPath, number);

@@ -31,21 +31,29 @@ std::optional<PropertyDictionary> LinuxPropertyLists::readDictionary(std::string
   if (dictionary && contents->bytes.size() >= known.size()) {
     rememberedBytes_ = std::move(contents->bytes);
     rememberedValue_ = dictionary;
+    areBytesOurs_ = false;
   }
   return dictionary;
 }
 
 Result LinuxPropertyLists::serializeBinary(const PropertyValue& value, std::string_view& bytes) {
+  const PropertyDictionary* dictionary = value.asDictionary();
+  if (areBytesOurs_ && rememberedValue_ && dictionary != nullptr &&
+      *dictionary == *rememberedValue_) {
+    bytes = rememberedBytes_;
+    return Result::success();
+  }
   PropertyListError error;
-  std::optional<std::string> written = writer_.write(value, error);
+  std::optional<std::string> written = writer_.write(value, error, std::move(rememberedBytes_));
   rememberedBytes_ = std::move(written).value_or(std::string());
   rememberedValue_ = std::nullopt;
   bytes = rememberedBytes_;
   if (!written) {
     return Result::failure(std::move(error.text));
   }
-  if (const PropertyDictionary* dictionary = value.asDictionary()) {
+  if (dictionary != nullptr) {
     rememberedValue_ = *dictionary;
+    areBytesOurs_ = true;
   }
   return Result::success();
 }

@@ -13,7 +13,8 @@ namespace accounts {
 
 /// The property-list files beneath a device root, which must outlive this. What was read or written
 /// last is remembered with its value: a file that is found to hold it again, as every save finds
-/// the file of the save before, is read but not decoded.
+/// the file of the save before, is read but not decoded, and a value that was written last is not
+/// encoded again.
 class LinuxPropertyLists final : public PropertyLists {
  public:
   explicit LinuxPropertyLists(const DeviceRoot& root) : root_(root) {}
@@ -31,6 +32,8 @@ class LinuxPropertyLists final : public PropertyLists {
   std::string rememberedBytes_;
   /// The dictionary that the bytes stand for, if they do.
   std::optional<PropertyDictionary> rememberedValue_;
+  /// Whether the bytes are of our own making: a file may be written otherwise than we would.
+  bool areBytesOurs_ = false;
 };
 
 }  // namespace accounts

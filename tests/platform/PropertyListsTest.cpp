@@ -93,6 +93,33 @@ TEST_F(PropertyListsTest, WhatWasWrittenOtherThanADictionaryIsNoDictionaryWhenRe
   EXPECT_FALSE(propertyLists.readDictionary("/file.plist"));
 }
 
+TEST_F(PropertyListsTest, AnEqualValueIsNotEncodedAgain) {
+  std::string_view first;
+  ASSERT_TRUE(propertyLists.serializeBinary(PropertyDictionary{{"Version", 12}}, first));
+  std::string_view second;
+  ASSERT_TRUE(propertyLists.serializeBinary(PropertyDictionary{{"Version", 12}}, second));
+  EXPECT_EQ(static_cast<const void*>(second.data()), static_cast<const void*>(first.data()));
+}
+
+TEST_F(PropertyListsTest, AnotherValueIsEncodedAsItIs) {
+  std::string_view bytes;
+  ASSERT_TRUE(propertyLists.serializeBinary(PropertyDictionary{{"Version", 12}}, bytes));
+  const std::string first(bytes);
+  ASSERT_TRUE(propertyLists.serializeBinary(PropertyDictionary{{"Version", 13}}, bytes));
+  EXPECT_NE(bytes, first);
+  ASSERT_TRUE(propertyLists.serializeBinary(PropertyDictionary{{"Version", 12}}, bytes));
+  EXPECT_EQ(bytes, first);
+}
+
+TEST_F(PropertyListsTest, AValueThatWasReadIsEncodedOurWayAndNotTheFilesOwn) {
+  makeFile("/file.plist", xmlDictionary("<key>Version</key><integer>12</integer>"));
+  const auto read = propertyLists.readDictionary("/file.plist");
+  ASSERT_TRUE(read);
+  std::string_view bytes;
+  ASSERT_TRUE(propertyLists.serializeBinary(*read, bytes));
+  EXPECT_TRUE(bytes.starts_with("bplist00"));
+}
+
 TEST_F(PropertyListsTest, AMissingFileIsToldFromAnUnreadableOne) {
   makeFile("/malformed.plist", "bplist00 and no more");
   EXPECT_FALSE(propertyLists.readDictionary("/missing.plist", error));
