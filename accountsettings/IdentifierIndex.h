@@ -1,12 +1,11 @@
 #pragma once
 
-#include <algorithm>
 #include <cstdint>
 #include <string_view>
-#include <unordered_map>
 #include <utility>
 #include <vector>
 
+#include "propertylist/ContentTable.h"
 #include "propertylist/Text.h"
 
 namespace accounts {
@@ -18,65 +17,97 @@ class IdentifierIndex {
  public:
   /// The value under an identifier, null for none; valid until the index changes.
   [[nodiscard]] const Value* find(std::string_view identifier) const {
-    const auto place = entries_.find(identifier);
-    return place != entries_.end() ? &place->second.value : nullptr;
+    const std::uint32_t number = table_.find(hash_(identifier), hasIdentifier(identifier));
+    return number != ContentTable::kNone ? &entries_[number].value : nullptr;
   }
   [[nodiscard]] bool contains(std::string_view identifier) const {
     return find(identifier) != nullptr;
   }
-  [[nodiscard]] std::size_t size() const { return entries_.size(); }
+  [[nodiscard]] std::size_t size() const { return entries_.size() - removedCount_; }
   /// Grows whenever the index changes, so that what was made from it can tell that it is out of
   /// date.
   [[nodiscard]] std::uint64_t changeCount() const { return changeCount_; }
 
+  /// The value under an identifier, to be changed at once; a fresh one at the end of the order if
+  /// there was none.
+  Value& operator[](const Text& identifier) {
+    ++changeCount_;
+    const auto newNumber = static_cast<std::uint32_t>(entries_.size());
+    // Before the table knows its number, which must never be one of no entry.
+    entries_.push_back({identifier, Value(), State::Present});
+    const std::uint32_t number =
+        table_.findOrAdd(hash_(identifier.view()), newNumber, hasIdentifier(identifier));
+    if (number != newNumber) {
+      entries_.pop_back();
+    }
+    return entries_[number].value;
+  }
   /// Puts a value in; one that is there under the identifier is replaced and keeps its place in the
   /// order.
-  void set(const Text& identifier, Value value) {
-    const auto [place, isNew] = entries_.try_emplace(identifier, Entry{nextPosition_, {}});
-    place->second.value = std::move(value);
-    nextPosition_ += isNew ? 1 : 0;
-    ++changeCount_;
-  }
+  void set(const Text& identifier, Value value) { (*this)[identifier] = std::move(value); }
   void remove(std::string_view identifier) {
-    const auto place = entries_.find(identifier);
-    if (place != entries_.end()) {
-      entries_.erase(place);
-      ++changeCount_;
+    const std::uint32_t number = table_.find(hash_(identifier), hasIdentifier(identifier));
+    if (number == ContentTable::kNone) {
+      return;
+    }
+    // The table keeps its number, under which nothing is found any more.
+    entries_[number] = {Text(), Value(), State::Removed};
+    ++removedCount_;
+    ++changeCount_;
+    if (2 * removedCount_ > entries_.size()) {
+      dropRemovedEntries();
     }
   }
   void clear() {
     entries_.clear();
+    table_ = ContentTable();
+    removedCount_ = 0;
     ++changeCount_;
   }
   void reserve(std::size_t count) { entries_.reserve(count); }
 
-  /// All identifiers with their values, in order; O(n log n).
+  /// All identifiers with their values, in order.
   [[nodiscard]] std::vector<std::pair<Text, Value>> inOrder() const {
-    std::vector<const typename Entries::value_type*> places;
-    places.reserve(entries_.size());
-    for (const auto& place : entries_) {
-      places.push_back(&place);
-    }
-    std::sort(places.begin(), places.end(), [](const auto* left, const auto* right) {
-      return left->second.position < right->second.position;
-    });
     std::vector<std::pair<Text, Value>> result;
-    result.reserve(places.size());
-    for (const auto* place : places) {
-      result.emplace_back(place->first, place->second.value);
+    result.reserve(size());
+    for (const Entry& entry : entries_) {
+      if (entry.state == State::Present) {
+        result.emplace_back(entry.identifier, entry.value);
+      }
     }
     return result;
   }
 
  private:
+  enum class State : std::uint8_t { Present, Removed };
   struct Entry {
-    std::uint64_t position;
+    Text identifier;
     Value value;
+    State state;
   };
-  using Entries = std::unordered_map<Text, Entry, TextHash, std::equal_to<>>;
-  Entries entries_;
-  std::uint64_t nextPosition_ = 0;
+
+  [[nodiscard]] auto hasIdentifier(std::string_view identifier) const {
+    return [this, identifier](std::uint32_t number) {
+      const Entry& entry = entries_[number];
+      return entry.state == State::Present && entry.identifier == identifier;
+    };
+  }
+
+  void dropRemovedEntries() {
+    std::erase_if(entries_, [](const Entry& entry) { return entry.state == State::Removed; });
+    removedCount_ = 0;
+    table_ = ContentTable();
+    for (std::uint32_t number = 0; number < entries_.size(); ++number) {
+      table_.findOrAdd(hash_(entries_[number].identifier.view()), number,
+                       [](std::uint32_t) { return false; });
+    }
+  }
+
+  std::vector<Entry> entries_;
+  std::size_t removedCount_ = 0;
   std::uint64_t changeCount_ = 0;
+  KeyedHash hash_;
+  ContentTable table_;
 };
 
 }  // namespace accounts

@@ -7,29 +7,70 @@
 
 namespace accounts {
 
-namespace {
-
-/// Takes a number out of the set under a key; a set that becomes empty goes with its key.
-template <class Index, class Key, class Number>
-void takeFromIndex(Index& index, const Key& key, Number number) {
-  const auto entry = index.find(key);
-  if (entry == index.end()) {
+void OrderedAccounts::PlaceNumbers::insert(PlaceNumber number) {
+  if (!first_) {
+    first_ = number;
     return;
   }
-  entry->second.erase(number);
-  if (entry->second.empty()) {
-    index.erase(entry);
+  if (number == *first_) {
+    return;
+  }
+  if (others_ == nullptr) {
+    others_ = std::make_unique<std::set<PlaceNumber>>();
+  }
+  others_->insert(std::max(*first_, number));
+  first_ = std::min(*first_, number);
+}
+
+void OrderedAccounts::PlaceNumbers::erase(PlaceNumber number) {
+  if (others_ != nullptr) {
+    if (number == *first_) {
+      first_ = *others_->begin();
+    }
+    others_->erase(std::max(*first_, number));
+    if (others_->empty()) {
+      others_.reset();
+    }
+  } else if (number == first_) {
+    first_.reset();
   }
 }
 
-}  // namespace
+OrderedAccounts::PlaceNumber OrderedAccounts::PlaceNumbers::last() const {
+  return others_ != nullptr ? *others_->rbegin() : *first_;
+}
+
+std::vector<OrderedAccounts::PlaceNumber> OrderedAccounts::PlaceNumbers::all() const {
+  std::vector<PlaceNumber> numbers;
+  if (first_) {
+    numbers.push_back(*first_);
+  }
+  if (others_ != nullptr) {
+    numbers.insert(numbers.end(), others_->begin(), others_->end());
+  }
+  return numbers;
+}
 
 const std::vector<BasicAccountReference>& OrderedAccounts::accounts() const {
   dropRemovedPlaces();
   return accounts_;
 }
 
+bool OrderedAccounts::haveDifferentIdentifiers() const {
+  const IdentifierStamp now = {Process::current().identifierChanges, listChanges_};
+  if (identifierStamp_ != now) {
+    IdentifierIndex<bool> identifiers;
+    identifiersDiffer_ = std::ranges::all_of(accounts(), [&](const auto& account) {
+      const std::optional<Text> identifier = account->identifier();
+      return identifier && !std::exchange(identifiers[*identifier], true);
+    });
+    identifierStamp_ = now;
+  }
+  return identifiersDiffer_;
+}
+
 void OrderedAccounts::append(BasicAccountReference account) {
+  ++listChanges_;
   accounts_.push_back(std::move(account));
   addPlace();
   if (hasIndexes_) {
@@ -38,6 +79,7 @@ void OrderedAccounts::append(BasicAccountReference account) {
 }
 
 void OrderedAccounts::assign(std::vector<BasicAccountReference> accounts) {
+  ++listChanges_;
   hasIndexes_ = false;
   accounts_ = std::move(accounts);
   places_.clear();
@@ -50,12 +92,11 @@ void OrderedAccounts::assign(std::vector<BasicAccountReference> accounts) {
 bool OrderedAccounts::replaceAll(std::string_view identifier,
                                  const BasicAccountReference& account) {
   bringIndexesUpToDate();
-  const auto entry = placesByIdentifier_.find(identifier);
-  if (entry == placesByIdentifier_.end()) {
+  const PlaceNumbers* places = placesByIdentifier_.find(identifier);
+  if (places == nullptr) {
     return false;
   }
-  const PlaceNumbers numbers = entry->second;
-  for (const PlaceNumber number : numbers) {
+  for (const PlaceNumber number : places->all()) {
     replaceAt(number, account);
   }
   return true;
@@ -68,19 +109,18 @@ bool OrderedAccounts::replaceFirst(const BasicAccountReference& oldAccount,
   if (entry == placesByRecord_.end()) {
     return false;
   }
-  replaceAt(*entry->second.begin(), newAccount);
+  replaceAt(entry->second.first(), newAccount);
   return true;
 }
 
 bool OrderedAccounts::removeLast(std::string_view identifier) {
   bringIndexesUpToDate();
-  const auto entry = placesByIdentifier_.find(identifier);
-  if (entry == placesByIdentifier_.end()) {
+  const PlaceNumbers* places = placesByIdentifier_.find(identifier);
+  if (places == nullptr) {
     return false;
   }
-  const BasicAccountReference account = accounts_[positionOf(*entry->second.rbegin())];
-  const PlaceNumbers numbers = placesByRecord_.at(account.get());
-  for (const PlaceNumber number : numbers) {
+  const BasicAccountReference account = accounts_[positionOf(places->last())];
+  for (const PlaceNumber number : placesByRecord_.at(account.get()).all()) {
     remove(number);
   }
   if (removedCount_ * 2 > accounts_.size()) {
@@ -103,6 +143,7 @@ void OrderedAccounts::addPlace() {
 void OrderedAccounts::replaceAt(PlaceNumber number, const BasicAccountReference& account) {
   BasicAccountReference& occupant = accounts_[positionOf(number)];
   if (occupant != account) {
+    ++listChanges_;
     takeFromIndexes(number, *occupant);
     occupant = account;
     enterInIndexes(number, *occupant);
@@ -113,6 +154,7 @@ void OrderedAccounts::remove(PlaceNumber number) {
   const std::size_t position = positionOf(number);
   takeFromIndexes(number, *accounts_[position]);
   places_[position].isRemoved = true;
+  ++listChanges_;
   ++removedCount_;
 }
 
@@ -156,9 +198,19 @@ void OrderedAccounts::enterInIndexes(PlaceNumber number, const BasicAccount& acc
 }
 
 void OrderedAccounts::takeFromIndexes(PlaceNumber number, const BasicAccount& account) {
-  takeFromIndex(placesByRecord_, &account, number);
-  if (const std::optional<Text> identifier = account.identifier()) {
-    takeFromIndex(placesByIdentifier_, *identifier, number);
+  if (const auto entry = placesByRecord_.find(&account); entry != placesByRecord_.end()) {
+    entry->second.erase(number);
+    if (entry->second.empty()) {
+      placesByRecord_.erase(entry);
+    }
+  }
+  const std::optional<Text> identifier = account.identifier();
+  if (identifier && placesByIdentifier_.contains(*identifier)) {
+    PlaceNumbers& numbers = placesByIdentifier_[*identifier];
+    numbers.erase(number);
+    if (numbers.empty()) {
+      placesByIdentifier_.remove(*identifier);
+    }
   }
 }
 

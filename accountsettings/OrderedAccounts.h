@@ -2,13 +2,15 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <functional>
+#include <memory>
+#include <optional>
 #include <set>
 #include <string_view>
 #include <unordered_map>
 #include <vector>
 
 #include "accountsettings/BasicAccount.h"
+#include "accountsettings/IdentifierIndex.h"
 
 namespace accounts {
 
@@ -23,6 +25,9 @@ class OrderedAccounts {
   [[nodiscard]] const std::vector<BasicAccountReference>& accounts() const;
   /// The number of accounts; O(1).
   [[nodiscard]] std::size_t size() const { return accounts_.size() - removedCount_; }
+  /// Whether each account has an identifier and no two have the same. O(n) when the list or an
+  /// identifier has changed since the last call.
+  [[nodiscard]] bool haveDifferentIdentifiers() const;
 
   void append(BasicAccountReference account);
   /// Puts other accounts in the place of all.
@@ -40,10 +45,31 @@ class OrderedAccounts {
   // A place keeps its number as long as it exists, so that the indexes outlive the removal of other
   // places. Numbers increase along the list.
   using PlaceNumber = std::uint64_t;
-  using PlaceNumbers = std::set<PlaceNumber>;
+  /// Numbers in order. Nearly always there is one, which needs no memory of its own.
+  class PlaceNumbers {
+   public:
+    void insert(PlaceNumber number);
+    void erase(PlaceNumber number);
+    [[nodiscard]] bool empty() const { return !first_; }
+    /// The smallest and the largest; there must be one.
+    [[nodiscard]] PlaceNumber first() const { return *first_; }
+    [[nodiscard]] PlaceNumber last() const;
+    [[nodiscard]] std::vector<PlaceNumber> all() const;
+
+   private:
+    std::optional<PlaceNumber> first_;
+    /// The others; null for none.
+    std::unique_ptr<std::set<PlaceNumber>> others_;
+  };
   struct Place {
     PlaceNumber number;
     bool isRemoved;
+  };
+
+  struct IdentifierStamp {
+    std::uint64_t identifierChanges;
+    std::uint64_t listChanges;
+    bool operator==(const IdentifierStamp&) const = default;
   };
 
   [[nodiscard]] std::size_t positionOf(PlaceNumber number) const;
@@ -61,12 +87,17 @@ class OrderedAccounts {
   mutable std::vector<Place> places_;
   mutable std::size_t removedCount_ = 0;
   PlaceNumber nextNumber_ = 0;
+  std::uint64_t listChanges_ = 0;
+
+  // What was last found out about the identifiers, and when.
+  mutable std::optional<IdentifierStamp> identifierStamp_;
+  mutable bool identifiersDiffer_ = false;
 
   // Made when first needed, and again when a record's identifier has changed since.
   bool hasIndexes_ = false;
   std::uint64_t identifierChangesAtIndexing_ = 0;
   std::unordered_map<const BasicAccount*, PlaceNumbers> placesByRecord_;
-  std::unordered_map<Text, PlaceNumbers, TextHash, std::equal_to<>> placesByIdentifier_;
+  IdentifierIndex<PlaceNumbers> placesByIdentifier_;
 };
 
 }  // namespace accounts

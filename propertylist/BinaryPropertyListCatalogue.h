@@ -9,8 +9,8 @@
 #include <vector>
 
 #include "propertylist/BinaryPropertyListFormat.h"
+#include "propertylist/ContentTable.h"
 #include "propertylist/PropertyListError.h"
-#include "propertylist/PropertyListUniquing.h"
 #include "propertylist/PropertyValue.h"
 
 namespace accounts::binaryplist {

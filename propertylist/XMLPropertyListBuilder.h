@@ -6,7 +6,7 @@
 #include <string_view>
 #include <vector>
 
-#include "propertylist/PropertyListUniquing.h"
+#include "propertylist/ContentTable.h"
 #include "propertylist/PropertyValue.h"
 #include "propertylist/XMLPropertyListScalars.h"
 

@@ -72,6 +72,30 @@ TEST(IdentifierIndex, NothingIsLeftAfterClearing) {
   EXPECT_EQ(index.find("A"), nullptr);
 }
 
+TEST(IdentifierIndex, WhatIsLeftIsFoundHoweverManyOthersWereRemoved) {
+  IdentifierIndex<int> index;
+  for (int number = 0; number < 1000; ++number) {
+    index.set(std::to_string(number), number);
+  }
+  for (int number = 0; number < 1000; ++number) {
+    if (number % 100 != 0) {
+      index.remove(std::to_string(number));
+    }
+  }
+  EXPECT_EQ(index.size(), 10u);
+  EXPECT_EQ(*index.find("900"), 900);
+  EXPECT_EQ(index.find("901"), nullptr);
+  EXPECT_EQ(contentOf(index),
+            "0=0 100=100 200=200 300=300 400=400 500=500 600=600 700=700 800=800 900=900");
+}
+
+TEST(IdentifierIndex, AValueIsChangedInItsPlaceOrBeginsAsADefault) {
+  IdentifierIndex<int> index;
+  index["A"] += 2;
+  index["A"] += 3;
+  EXPECT_EQ(contentOf(index), "A=5");
+}
+
 TEST(IdentifierIndex, EveryChangeRaisesTheCountOfChanges) {
   IdentifierIndex<int> index;
   std::uint64_t before = index.changeCount();

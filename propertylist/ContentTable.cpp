@@ -1,4 +1,4 @@
-#include "propertylist/PropertyListUniquing.h"
+#include "propertylist/ContentTable.h"
 
 #include <chrono>
 #include <utility>

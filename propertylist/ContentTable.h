@@ -6,8 +6,8 @@
 #include <string_view>
 #include <vector>
 
-/// The tables by which readers and writers find what they have met already. Nothing that can be
-/// seen depends on the order in them.
+/// The tables by which readers, writers and indexes find what they have met already. Nothing that
+/// can be seen depends on the order in them.
 namespace accounts {
 
 inline constexpr std::size_t kInitialSlotCount = 256;
@@ -72,6 +72,22 @@ class KeyedHash {
 /// Finds numbers by the hash of a content that the caller keeps.
 class ContentTable {
  public:
+  /// No number.
+  static constexpr std::uint32_t kNone = UINT32_MAX;
+
+  /// The number under this hash of which `hasContent(number)` is true; `kNone` if there is none.
+  template <class HasContent>
+  [[nodiscard]] std::uint32_t find(std::uint32_t hash, const HasContent& hasContent) const {
+    const std::size_t mask = slots_.size() - 1;
+    for (std::size_t place = hash & mask; slots_[place].numberPlusOne != 0;
+         place = (place + 1) & mask) {
+      if (slots_[place].hash == hash && hasContent(slots_[place].numberPlusOne - 1)) {
+        return slots_[place].numberPlusOne - 1;
+      }
+    }
+    return kNone;
+  }
+
   /// Says that a hash will be looked for soon: memory then has its answer ready. Worth it for
   /// several hashes in a row, since a table of many entries is not in the nearest cache.
   void announce(std::uint32_t hash) const {
