@@ -8,15 +8,6 @@
 
 namespace accounts {
 
-namespace {
-
-// The property, not the record's own answer: a record may answer otherwise.
-std::optional<Text> identifierProperty(const BasicAccount& account) {
-  return account.textPropertyForKey(kAccountIdentifier);
-}
-
-}  // namespace
-
 struct AccountsManager::Replacement {
   Accounts orderedAccounts;
   IdentifierIndex<BasicAccountReference> accountsByID;
@@ -41,7 +32,7 @@ void AccountsManager::_keepOrReplaceAccounts(const Types& types, const Accounts&
                                              Replacement& replacement) {
   IdentifierIndex<BasicAccountReference> newAccountsByID;
   for (const BasicAccountReference& account : accounts) {
-    if (const std::optional<Text> identifier = identifierProperty(*account)) {
+    if (const std::optional<Text> identifier = account->identifierProperty()) {
       newAccountsByID.set(*identifier, account);
     }
   }
@@ -49,7 +40,8 @@ void AccountsManager::_keepOrReplaceAccounts(const Types& types, const Accounts&
   const Accounts& present = _orderedTopLevelAccounts.accounts();
   for (std::size_t index = present.size(); index-- > 0;) {
     const BasicAccountReference& account = present[index];
-    const std::optional<Text> identifier = identifierProperty(*account);
+    // The property, not the record's own answer: a record may answer otherwise.
+    const std::optional<Text> identifier = account->identifierProperty();
     const BasicAccountReference* newAccount =
         identifier ? newAccountsByID.find(*identifier) : nullptr;
     const std::optional<Text> type = account->type();
@@ -65,9 +57,10 @@ void AccountsManager::_keepOrReplaceAccounts(const Types& types, const Accounts&
   std::reverse(kept.begin(), kept.end());
   for (const BasicAccountReference& account : kept) {
     // The walk ends with the first account: of several with one identifier it is the one to find.
-    const std::optional<Text> identifier = identifierProperty(*account);
-    if (identifier && !replacement.accountsByID.contains(*identifier)) {
-      replacement.accountsByID.set(*identifier, account);
+    const std::optional<Text> identifier = account->identifierProperty();
+    if (identifier) {
+      BasicAccountReference& found = replacement.accountsByID[*identifier];
+      found = found != nullptr ? found : account;
     }
   }
   _loadChildrenOfPlacedAccounts(replacement);
@@ -98,7 +91,7 @@ void AccountsManager::_addRemainingAccounts(const Accounts& accounts, Replacemen
       continue;
     }
     replacement.orderedAccounts.push_back(account);
-    if (const std::optional<Text> identifier = identifierProperty(*account)) {
+    if (const std::optional<Text> identifier = account->identifierProperty()) {
       replacement.accountsByID.set(*identifier, account);
     }
     placement.indexChildrenOf(account);

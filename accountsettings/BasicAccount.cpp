@@ -22,6 +22,10 @@ BasicAccountReference BasicAccount::initWithProperties(const PropertyDictionary&
   return account->acceptProperties(properties) ? account : nullptr;
 }
 
+bool BasicAccount::hasAcceptableProperties() const {
+  return _ownClass && !_ownClass->empty() && _isValidAccountType(_ownType);
+}
+
 bool BasicAccount::acceptProperties(const PropertyDictionary& properties) {
   static constexpr std::string_view operation = "-[BasicAccount initWithProperties:]";
   const std::optional<Text> type = properties.textForKey(kAccountType);
@@ -39,9 +43,13 @@ bool BasicAccount::acceptProperties(const PropertyDictionary& properties) {
   }
   _originalProperties = properties;
   _properties = properties;
-  if (!_properties.textForKey(kAccountIdentifier)) {
+  _ownType = type;
+  _ownClass = accountClass;
+  _ownIdentifier = _properties.textForKey(kAccountIdentifier);
+  if (!_ownIdentifier) {
     if (const std::optional<Text> identifier = createNewAccountUID()) {
       _properties.set(kAccountIdentifier, *identifier);
+      _ownIdentifier = identifier;
       if (!_properties.textForKey(kAccountSyncIdentifier)) {
         _properties.set(kAccountSyncIdentifier, *identifier);
       }

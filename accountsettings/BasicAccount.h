@@ -5,7 +5,7 @@
 #include <optional>
 #include <string>
 #include <string_view>
-#include <unordered_set>
+#include <vector>
 
 #include "accountsettings/AccountVocabulary.h"
 #include "platform/AccountFramework.h"
@@ -54,6 +54,8 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   static bool isMultitaskingEnabled();
   /// The fourteen dataclasses in canonical order; always the same object.
   static const PropertyArray& allSupportedDataclasses();
+  /// The account types that the configuration knows, in the order of their texts.
+  static std::vector<Text> knownAccountTypes();
   /// The dataclasses of a type in the order its configuration lists them; none for an unknown type.
   static std::optional<PropertyArray> supportedDataclassesForAccountType(std::string_view type);
   /// The actions offered when a dataclass is switched on (off) for a type; none for an unknown
@@ -106,6 +108,8 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   [[nodiscard]] const std::optional<PropertyDictionary>& originalProperties() const {
     return _originalProperties;
   }
+  /// Whether initWithProperties() would make a record of properties().
+  [[nodiscard]] bool hasAcceptableProperties() const;
   /// Takes a new snapshot.
   void setOriginalProperties(std::optional<PropertyDictionary> properties);
 
@@ -113,6 +117,10 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   /// and "Short Type String", own or inherited; none when there is no text.
   [[nodiscard]] std::optional<Text> type() const override;
   [[nodiscard]] std::optional<Text> identifier() const override;
+  /// The text under "Identifier", whatever a record of another class answers above.
+  [[nodiscard]] std::optional<Text> identifierProperty() const;
+  /// Whether properties() has a text under "Identifier".
+  [[nodiscard]] bool hasOwnIdentifier() const { return _ownIdentifier.has_value(); }
   [[nodiscard]] virtual std::optional<Text> syncStoreIdentifier() const;
   [[nodiscard]] std::optional<Text> accountClass() const;
   [[nodiscard]] virtual std::optional<Text> displayName() const;
@@ -199,11 +207,18 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   [[nodiscard]] bool acceptProperties(const PropertyDictionary& properties);
 
  private:
+  /// The account's own value for a key, else its parent's; null when neither has one.
+  [[nodiscard]] const PropertyValue* valueForKey(std::string_view key) const;
   /// Told after every change of an own value.
-  static void noteChangeOfKey(std::string_view key);
+  void noteChangeOfKey(std::string_view key);
 
   std::optional<PropertyDictionary> _originalProperties;
   PropertyDictionary _properties;
+  // The own texts under "Type", "Class" and "Identifier", at hand because every walk through a
+  // store asks for them: its accounts' dictionaries are more than the processor's caches hold.
+  std::optional<Text> _ownType;
+  std::optional<Text> _ownClass;
+  std::optional<Text> _ownIdentifier;
   FullAccountReference _fullAccount;
   SyncAccountReference _syncAccount;
   BasicAccountReference _parentAccount;

@@ -123,6 +123,14 @@ std::optional<PropertyArray> BasicAccount::supportedDataclassesForAccountType(
   return arrayOfType(type, kPropertiesSupportedDataclasses);
 }
 
+std::vector<Text> BasicAccount::knownAccountTypes() {
+  std::vector<Text> types;
+  for (const PropertyEntry& entry : accountTypesTable()) {
+    types.push_back(entry.key);
+  }
+  return types;
+}
+
 std::optional<PropertyArray> BasicAccount::userActionsToEnableDataclass_forAccountType(
     std::string_view dataclass, std::string_view type) {
   return toggleActions(dataclass, type, kPropertiesEnableDataclassActions);

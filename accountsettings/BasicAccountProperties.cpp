@@ -3,43 +3,48 @@
 
 namespace accounts {
 
-std::optional<PropertyValue> BasicAccount::accountPropertyForKey(std::string_view key) const {
+const PropertyValue* BasicAccount::valueForKey(std::string_view key) const {
   for (const BasicAccount* account = this; account != nullptr;
        account = account->_parentAccount.get()) {
     if (const PropertyValue* value = account->_properties.find(key)) {
-      return *value;
+      return value;
     }
   }
-  return std::nullopt;
+  return nullptr;
+}
+
+std::optional<PropertyValue> BasicAccount::accountPropertyForKey(std::string_view key) const {
+  const PropertyValue* value = valueForKey(key);
+  return value != nullptr ? std::optional(*value) : std::nullopt;
 }
 
 std::optional<Text> BasicAccount::textPropertyForKey(std::string_view key) const {
-  const std::optional<PropertyValue> value = accountPropertyForKey(key);
-  const Text* text = value ? value->asText() : nullptr;
+  const PropertyValue* value = valueForKey(key);
+  const Text* text = value != nullptr ? value->asText() : nullptr;
   return text != nullptr ? std::optional(*text) : std::nullopt;
 }
 
 std::optional<PropertyArray> BasicAccount::arrayPropertyForKey(std::string_view key) const {
-  const std::optional<PropertyValue> value = accountPropertyForKey(key);
-  const PropertyArray* array = value ? value->asArray() : nullptr;
+  const PropertyValue* value = valueForKey(key);
+  const PropertyArray* array = value != nullptr ? value->asArray() : nullptr;
   return array != nullptr ? std::optional(*array) : std::nullopt;
 }
 
 std::optional<PropertyDictionary> BasicAccount::dictionaryPropertyForKey(
     std::string_view key) const {
-  const std::optional<PropertyValue> value = accountPropertyForKey(key);
-  const PropertyDictionary* dictionary = value ? value->asDictionary() : nullptr;
+  const PropertyValue* value = valueForKey(key);
+  const PropertyDictionary* dictionary = value != nullptr ? value->asDictionary() : nullptr;
   return dictionary != nullptr ? std::optional(*dictionary) : std::nullopt;
 }
 
 std::optional<bool> BasicAccount::booleanPropertyForKey(std::string_view key) const {
-  const std::optional<PropertyValue> value = accountPropertyForKey(key);
-  return value ? value->booleanValue() : std::nullopt;
+  const PropertyValue* value = valueForKey(key);
+  return value != nullptr ? value->booleanValue() : std::nullopt;
 }
 
 std::optional<std::int64_t> BasicAccount::integerPropertyForKey(std::string_view key) const {
-  const std::optional<PropertyValue> value = accountPropertyForKey(key);
-  return value ? value->integerValue() : std::nullopt;
+  const PropertyValue* value = valueForKey(key);
+  return value != nullptr ? value->integerValue() : std::nullopt;
 }
 
 void BasicAccount::setAccountProperty_forKey(std::optional<PropertyValue> value,
@@ -71,9 +76,14 @@ void BasicAccount::removeAccountPropertyForKey(std::string_view key) {
 
 void BasicAccount::noteChangeOfKey(std::string_view key) {
   if (key == kAccountIdentifier) {
+    _ownIdentifier = _properties.textForKey(key);
     ++Process::current().identifierChanges;
   } else if (key == kAccountSyncIdentifier) {
     ++Process::current().syncIdentifierChanges;
+  } else if (key == kAccountType) {
+    _ownType = _properties.textForKey(key);
+  } else if (key == kAccountClass) {
+    _ownClass = _properties.textForKey(key);
   }
 }
 
@@ -82,11 +92,15 @@ void BasicAccount::setOriginalProperties(std::optional<PropertyDictionary> prope
 }
 
 std::optional<Text> BasicAccount::type() const {
-  return textPropertyForKey(kAccountType);
+  return _ownType ? _ownType : textPropertyForKey(kAccountType);
 }
 
 std::optional<Text> BasicAccount::identifier() const {
-  return textPropertyForKey(kAccountIdentifier);
+  return identifierProperty();
+}
+
+std::optional<Text> BasicAccount::identifierProperty() const {
+  return _ownIdentifier ? _ownIdentifier : textPropertyForKey(kAccountIdentifier);
 }
 
 std::optional<Text> BasicAccount::syncStoreIdentifier() const {
@@ -94,7 +108,7 @@ std::optional<Text> BasicAccount::syncStoreIdentifier() const {
 }
 
 std::optional<Text> BasicAccount::accountClass() const {
-  return textPropertyForKey(kAccountClass);
+  return _ownClass ? _ownClass : textPropertyForKey(kAccountClass);
 }
 
 std::optional<Text> BasicAccount::displayName() const {

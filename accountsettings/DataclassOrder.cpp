@@ -10,7 +10,9 @@ namespace {
 
 /// The index of a text in a short list; the list's size when it is not there.
 std::size_t indexOfText(const PropertyArray& list, const Text& text) {
-  const auto* place = std::find(list.begin(), list.end(), PropertyValue(text));
+  const auto* place = std::find_if(list.begin(), list.end(), [&](const PropertyValue& member) {
+    return member.asText() != nullptr && *member.asText() == text;
+  });
   return static_cast<std::size_t>(place - list.begin());
 }
 

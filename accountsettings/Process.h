@@ -47,6 +47,7 @@ class Process {
 
   Once<LogChannel*> logChannel;
   Once<PropertyDictionary> accountTypesTable;
+  Once<PropertyDictionary> orderedSupportedDataclasses;
   Once<std::optional<PropertyDictionary>> dataclassesTable;
   Once<PropertyArray> canonicalDataclasses;
   Once<std::optional<PropertyDictionary>> accountCreationMap;

@@ -33,10 +33,6 @@ void setStatus(BasicAccount& account, CloudStatus status) {
                                     cloudAccountService().statusKey());
 }
 
-bool contains(const std::optional<PropertyArray>& dataclasses, std::string_view dataclass) {
-  return dataclasses && dataclasses->containsText(dataclass);
-}
-
 bool isPrimary(const BasicAccount& account) {
   return account.booleanPropertyForKey(primaryAccountKey).value_or(false);
 }
@@ -53,7 +49,7 @@ void makePrimary(BasicAccount& account) {
 
 void addReminders(BasicAccount& account) {
   if (account.supportedDataclasses().containsText(kAccountDataclassReminders) &&
-      contains(account.enabledDataclasses(), kAccountDataclassCalendars)) {
+      account.isEnabledForDataclass(kAccountDataclassCalendars)) {
     account.setEnabled_forDataclass(true, kAccountDataclassReminders);
   }
 }
@@ -74,7 +70,7 @@ bool settleHostedServiceStatus(BasicAccount& account) {
   if (account.displayName() == kVelmoraAccountType) {
     account.setDisplayName(typeName);
   }
-  const bool locatesDevice = contains(account.enabledDataclasses(), kAccountDataclassDeviceLocator);
+  const bool locatesDevice = account.isEnabledForDataclass(kAccountDataclassDeviceLocator);
   if (locatesDevice) {
     makePrimary(account);
   }
@@ -199,7 +195,7 @@ bool AccountsDataMigrator::_migrateAccountsFrom9B176(AccountsManager& store) {
       addShoebox(*account);
     }
     // Kept on purpose: once for each such account, not once in all.
-    if (contains(account->enabledDataclasses(), kAccountDataclassBookmarks)) {
+    if (account->isEnabledForDataclass(kAccountDataclassBookmarks)) {
       Process::current().platform.cloudTabService.announce(CloudTabs::On);
     }
   }
