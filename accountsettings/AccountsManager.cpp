@@ -36,16 +36,12 @@ std::unique_ptr<AccountsManager> AccountsManager::init() {
 }
 
 std::unique_ptr<AccountsManager> AccountsManager::initInsideOfMigration() {
-  return _initFromFile(Extent::Whole);
-}
-
-std::unique_ptr<AccountsManager> AccountsManager::_initFromFile(Extent extent) {
   const PropertyDictionary root =
       Process::current()
           .platform.propertyLists.readDictionary(fullPathToAccountSettingsPlist())
           .value_or(PropertyDictionary());
   std::unique_ptr<AccountsManager> store =
-      _initWithAccountsInfo(root.arrayForKey(kPlistAccountsKey), extent);
+      _initWithAccountsInfo(root.arrayForKey(kPlistAccountsKey));
   if (const PropertyValue* version = root.find(kPlistVersionKey)) {
     store->_dataVersion = static_cast<std::uint64_t>(version->integerValue().value_or(0));
   }
@@ -54,11 +50,11 @@ std::unique_ptr<AccountsManager> AccountsManager::_initFromFile(Extent extent) {
 
 std::unique_ptr<AccountsManager> AccountsManager::initWithAccounsInfoArray(
     const PropertyArray& accounts) {
-  return _initWithAccountsInfo(accounts, Extent::Whole);
+  return _initWithAccountsInfo(accounts);
 }
 
 std::unique_ptr<AccountsManager> AccountsManager::_initWithAccountsInfo(
-    const std::optional<PropertyArray>& accounts, Extent extent) {
+    const std::optional<PropertyArray>& accounts) {
   std::unique_ptr<AccountsManager> store(new AccountsManager());
   store->_runtimeFixers = _createRuntimeFixers();
   bool fixersChangedAccounts = false;
@@ -72,33 +68,22 @@ std::unique_ptr<AccountsManager> AccountsManager::_initWithAccountsInfo(
     }
     const FixResult result = store->_fixAccount(*account, "loading accounts");
     fixersChangedAccounts |= result != FixResult::Unchanged;
-    if (result == FixResult::CannotBeKept) {
-      continue;
-    }
-    if (extent == Extent::Whole) {
+    if (result != FixResult::CannotBeKept) {
       store->_takeIn(account);
-    } else {
-      store->_takeInWithoutChildren(account);
     }
   }
   if (fixersChangedAccounts) {
     store->_tellRuntimeFixers(false);
   }
-  if (extent == Extent::Whole) {
-    store->_setOriginalAccountDictionaries();
-  }
+  store->_setOriginalAccountDictionaries();
   return store;
 }
 
-void AccountsManager::_takeInWithoutChildren(const BasicAccountReference& account) {
+void AccountsManager::_takeIn(const BasicAccountReference& account) {
   if (const std::optional<Text> identifier = account->identifier()) {
     _topLevelAccountsByID.set(*identifier, account);
   }
   _orderedTopLevelAccounts.append(account);
-}
-
-void AccountsManager::_takeIn(const BasicAccountReference& account) {
-  _takeInWithoutChildren(account);
   _loadChildrenFromAccount(account);
 }
 

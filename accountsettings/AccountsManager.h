@@ -194,18 +194,9 @@ class AccountsManager {
   AccountsManager() = default;
 
   // Loading
-  /// How much of a store is made at once.
-  enum class Extent {
-    Whole,
-    /// The top-level accounts alone, without their children and without a baseline.
-    TopLevelAccounts
-  };
-  static std::unique_ptr<AccountsManager> _initFromFile(Extent extent);
   static std::unique_ptr<AccountsManager> _initWithAccountsInfo(
-      const std::optional<PropertyArray>& accounts, Extent extent);
-  /// Puts a record at the end of the top-level accounts and indexes it, its children apart.
-  void _takeInWithoutChildren(const BasicAccountReference& account);
-  /// The same and indexes its children as well.
+      const std::optional<PropertyArray>& accounts);
+  /// Puts a record at the end of the top-level accounts and indexes it and its children.
   void _takeIn(const BasicAccountReference& account);
   /// Runs every fixer on a record; the gravest result.
   FixResult _fixAccount(BasicAccount& account, std::string_view occasion);
@@ -223,15 +214,13 @@ class AccountsManager {
   void _addRemainingAccounts(const Accounts& accounts, Replacement& replacement);
 
   // Saving
-  /// Runs the fixers on all top-level accounts; whether one of them changed something.
-  bool _fixAccountsBeforeSaving();
+  /// Runs the fixers on all top-level accounts; the gravest result.
+  FixResult _fixAccountsBeforeSaving();
   /// Tells every notifier class, in one call each, what changed since the baseline was taken.
   void _sendNotificationsForChangedAccounts() const;
-  /// The properties of each top-level account as they are on disk now; none where the disk has no
-  /// such account.
-  [[nodiscard]] std::vector<std::optional<PropertyDictionary>> _onDiskProperties() const;
   /// The contents of the file to write: all top-level accounts, merged with the file as it is now.
-  [[nodiscard]] PropertyDictionary _mergedRoot() const;
+  /// The fixers' gravest result is needed.
+  [[nodiscard]] PropertyDictionary _mergedRoot(FixResult fixing) const;
 
   IdentifierIndex<BasicAccountReference> _topLevelAccountsByID;
   OrderedAccounts _orderedTopLevelAccounts;

@@ -1,8 +1,10 @@
+#include <algorithm>
 #include <string>
 #include <utility>
 
 #include "accountsettings/AccountsManager.h"
 #include "accountsettings/Log.h"
+#include "accountsettings/OnDiskAccounts.h"
 #include "accountsettings/Process.h"
 #include "accountsettings/ThreeWayMerge.h"
 
@@ -14,6 +16,14 @@ constexpr std::string_view saveOperation = "-[AccountsManager saveAllAccounts]";
 
 /// The user and the group that the account settings file belongs to.
 constexpr std::string_view fileOwner = "mobile";
+
+/// The array of account dictionaries in the account settings file; empty when there is none.
+PropertyArray accountsOnDisk() {
+  const std::optional<PropertyDictionary> root =
+      Process::current().platform.propertyLists.readDictionary(
+          AccountsManager::fullPathToAccountSettingsPlist());
+  return root ? root->arrayForKey(kPlistAccountsKey).value_or(PropertyArray()) : PropertyArray();
+}
 
 /// The bytes of the account settings file, valid until the platform's property lists are used
 /// again; none, with a channel line, when they cannot be made.
@@ -82,14 +92,14 @@ PropertyDictionary AccountsManager::mergeInMemoryProperties_originalProperties_o
 
 void AccountsManager::saveAllAccounts() {
   logToChannel(saveOperation, "Saving all accounts");
-  const bool fixersChangedAccounts = _fixAccountsBeforeSaving();
-  const bool isSaved = writeSettingsFile(_mergedRoot());
+  const FixResult fixing = _fixAccountsBeforeSaving();
+  const bool isSaved = writeSettingsFile(_mergedRoot(fixing));
   if (isSaved) {
     for (const BasicAccountReference& account : _orderedTopLevelAccounts.accounts()) {
       account->setOriginalProperties(account->propertiesToSave());
     }
   }
-  if (fixersChangedAccounts) {
+  if (fixing != FixResult::Unchanged) {
     // Kept on purpose: also after a failed save. What matters to the fixers is that an attempt was
     // made.
     _tellRuntimeFixers(true);
@@ -102,56 +112,37 @@ void AccountsManager::saveAllAccounts() {
   }
 }
 
-bool AccountsManager::_fixAccountsBeforeSaving() {
-  bool fixersChangedAccounts = false;
+FixResult AccountsManager::_fixAccountsBeforeSaving() {
+  FixResult gravest = FixResult::Unchanged;
   const Accounts& accounts = _orderedTopLevelAccounts.accounts();
   for (std::size_t index = accounts.size(); index-- > 0;) {
     const FixResult result = _fixAccount(*accounts[index], "saving accounts");
-    fixersChangedAccounts |= result != FixResult::Unchanged;
-    const std::optional<Text> identifier = accounts[index]->identifier();
+    gravest = std::max(gravest, result);
+    if (result != FixResult::CannotBeKept) {
+      continue;
+    }
     // Kept on purpose: the account leaves the indexes only. It stays in the list and is written, so
     // that what a person has set up is not lost by a save.
-    if (result == FixResult::CannotBeKept && identifier) {
+    if (const std::optional<Text> identifier = accounts[index]->identifier()) {
       _removeChildrenForAccountWithIdentifier(identifier);
       _topLevelAccountsByID.remove(*identifier);
     }
   }
-  return fixersChangedAccounts;
+  return gravest;
 }
 
-std::vector<std::optional<PropertyDictionary>> AccountsManager::_onDiskProperties() const {
-  // Of the accounts on disk only the top-level ones are needed, unless one is looked for that is
-  // not among them. What else there is of a store could be seen in the channel's lines alone.
-  const bool isWatched = _ASLogSystem()->isEnabled();
-  std::unique_ptr<AccountsManager> onDisk =
-      _initFromFile(isWatched ? Extent::Whole : Extent::TopLevelAccounts);
-  bool hasChildren = isWatched;
-  std::vector<std::optional<PropertyDictionary>> result;
-  result.reserve(_orderedTopLevelAccounts.size());
-  for (const BasicAccountReference& account : _orderedTopLevelAccounts.accounts()) {
-    const std::optional<Text> identifier = account->identifier();
-    if (!hasChildren && identifier && !onDisk->_topLevelAccountsByID.contains(*identifier)) {
-      for (const BasicAccountReference& parent : onDisk->_orderedTopLevelAccounts.accounts()) {
-        onDisk->_loadChildrenFromAccount(parent);
-      }
-      hasChildren = true;
-    }
-    const BasicAccountReference diskAccount =
-        identifier ? onDisk->accountWithIdentifier(*identifier) : nullptr;
-    result.push_back(diskAccount ? std::optional(diskAccount->propertiesToSave()) : std::nullopt);
-  }
-  return result;
-}
-
-PropertyDictionary AccountsManager::_mergedRoot() const {
-  const std::vector<std::optional<PropertyDictionary>> onDisk = _onDiskProperties();
+PropertyDictionary AccountsManager::_mergedRoot(FixResult fixing) const {
+  OnDiskAccounts onDisk(accountsOnDisk(), _orderedTopLevelAccounts,
+                        fixing != FixResult::CannotBeKept ? OnDiskAccounts::InMemory::AllCanBeKept
+                                                          : OnDiskAccounts::InMemory::Unknown);
   const Accounts& accounts = _orderedTopLevelAccounts.accounts();
   std::vector<PropertyValue> mergedAccounts;
   mergedAccounts.reserve(accounts.size());
   for (std::size_t index = 0; index < accounts.size(); ++index) {
     const BasicAccount& account = *accounts[index];
     PropertyDictionary merged = mergeInMemoryProperties_originalProperties_onDiskProperties(
-        account.propertiesToSave(), account.originalProperties(), onDisk[index]);
+        account.propertiesToSave(), account.originalProperties(),
+        onDisk.propertiesForAccountAt(index));
     logToChannel(
         saveOperation, "Calculated Properties - Type: %@, Properties: %@, Dataclasses: %@",
         [&] { return logArguments(account.type(), merged, account.enabledDataclasses()); });

@@ -63,6 +63,11 @@ PropertyDictionary mergeThreeWays(const PropertyDictionary& inMemory,
   if (original.empty() || onDisk.empty()) {
     return inMemory;
   }
+  // Memory's changes of what the disk holds lead to what memory holds. To say so keeps one
+  // dictionary for both.
+  if (onDisk.isSameAs(original) || onDisk.isSameAs(inMemory)) {
+    return inMemory;
+  }
   const std::vector<Change> changes = changesSince(original, inMemory);
   return changes.empty() ? onDisk : applyChanges(changes, onDisk);
 }

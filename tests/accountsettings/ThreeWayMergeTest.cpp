@@ -131,5 +131,16 @@ TEST(ThreeWayMerge, WithoutAChangeInMemoryTheDisksDictionaryIsUsedAsItIs) {
   EXPECT_TRUE(mergeThreeWays({{"a", 1}}, {{"a", 1}}, onDisk).isSameAs(onDisk));
 }
 
+TEST(ThreeWayMerge, WithoutAChangeOnDiskMemorysDictionaryIsUsedAsItIs) {
+  const PropertyDictionary original = {{"a", 1}, {"b", 2}};
+  const PropertyDictionary inMemory = {{"a", 2}, {"c", 3}};
+  EXPECT_TRUE(mergeThreeWays(inMemory, original, original).isSameAs(inMemory));
+}
+
+TEST(ThreeWayMerge, WhereDiskAndMemoryShareADictionaryItIsUsedAsItIs) {
+  const PropertyDictionary both = {{"a", 2}, {"c", 3}};
+  EXPECT_TRUE(mergeThreeWays(both, {{"a", 1}, {"b", 2}}, both).isSameAs(both));
+}
+
 }  // namespace
 }  // namespace accounts
