@@ -21,6 +21,14 @@ install(DIRECTORY ${PROJECT_SOURCE_DIR}/docs
   DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration COMPONENT ${programs_component}
   FILES_MATCHING PATTERN "*.md")
 
+install(DIRECTORY ${PROJECT_SOURCE_DIR}/examples/fleet
+  DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration/examples
+  COMPONENT ${programs_component} USE_SOURCE_PERMISSIONS)
+install(FILES ${PROJECT_SOURCE_DIR}/docs/man/migration-host.1 ${PROJECT_SOURCE_DIR}/docs/man/accountsctl.1
+  DESTINATION ${CMAKE_INSTALL_MANDIR}/man1 COMPONENT ${programs_component})
+install(FILES ${PROJECT_SOURCE_DIR}/completion/migration-host ${PROJECT_SOURCE_DIR}/completion/accountsctl
+  DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/bash-completion/completions COMPONENT ${programs_component})
+
 set(package_directory lib/cmake/AccountsFramework)
 install(TARGETS propertyvalue accountsframework EXPORT AccountsFrameworkTargets
   ARCHIVE DESTINATION ${library_directory} COMPONENT ${development_component})

@@ -1,0 +1,140 @@
+#include <fcntl.h>
+#include <sys/file.h>
+#include <sys/mman.h>
+#include <sys/stat.h>
+
+#include <csignal>
+#include <fstream>
+#include <sstream>
+#include <thread>
+
+#include "tests/fleet/FleetFixture.h"
+#include "tests/program/DeviceRootFixture.h"
+#include "tests/program/ListedLocks.h"
+
+namespace accounts {
+namespace {
+
+namespace fs = std::filesystem;
+
+constexpr int kImages = 50;
+// Some of the images.
+constexpr int kMissing = 7;
+constexpr int kWithPipe = 11;
+constexpr int kWithBrokenDescription = 23;
+constexpr int kBusy = 31;
+
+/// GNU parallel and examples/fleet/migrate-fleet over 50 images.
+class Parallel : public FleetFixture {
+ protected:
+  Parallel() { environment["JOBS"] = "4"; }
+
+  [[nodiscard]] ProgramCall fleetCall() const {
+    return call(example("migrate-fleet"), {(directory() / "roots.txt").string(), results()});
+  }
+  [[nodiscard]] ProgramResult migrateFleet() const { return runProgram(fleetCall()); }
+  [[nodiscard]] std::string results() const { return (directory() / "results").string(); }
+  [[nodiscard]] std::string textOf(const std::string& name) const {
+    std::ostringstream text;
+    text << std::ifstream(fs::path(results()) / name).rdbuf();
+    return text.str();
+  }
+  [[nodiscard]] nlohmann::json summary() const {
+    return onlyObject(
+        runProgram(call("accountsctl", {"summarize", "--json", "--expected",
+                                        std::to_string(kImages), results() + "/results.jsonl"})));
+  }
+  [[nodiscard]] std::size_t lineCount(const std::string& name) const {
+    const std::string text = textOf(name);
+    return static_cast<std::size_t>(std::count(text.begin(), text.end(), '\n'));
+  }
+
+  /// Holds the lock that the migration of an image waits for.
+  [[nodiscard]] int holdMigrationLock(int number) const {
+    const int lock = open(lockOf(number).c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0600);
+    EXPECT_EQ(flock(lock, LOCK_EX), 0);
+    return lock;
+  }
+  [[nodiscard]] fs::path lockOf(int number) const {
+    return image(number) / fs::path(kLockPath).relative_path();
+  }
+  void expectMigratedBut(const std::set<int>& others) const {
+    for (int number = 1; number <= kImages; ++number) {
+      if (!others.contains(number)) {
+        EXPECT_EQ(versionOf(number), 12) << number;
+      }
+    }
+  }
+};
+
+TEST_F(Parallel, EachImageIsMigratedOnceAndTheBrokenOnesAreReported) {
+  (void)makeImages(kImages);
+  fs::remove_all(image(kMissing));
+  fs::remove(image(kWithPipe) / fs::path(kSettingsPath).relative_path());
+  mkfifo((image(kWithPipe) / fs::path(kSettingsPath).relative_path()).c_str(), 0600);
+  std::ofstream(image(kWithBrokenDescription) / "etc/device.plist") << "broken";
+
+  const ProgramResult first = migrateFleet();
+
+  EXPECT_EQ(first.exitStatus, 1) << first.output << first.errors;
+  expectMigratedBut({kMissing, kWithPipe, kWithBrokenDescription});
+  const nlohmann::json counted = summary();
+  EXPECT_EQ(counted["images"], kImages);
+  EXPECT_EQ(counted["unreadableLines"], 0);
+  EXPECT_EQ(counted["outcomes"],
+            nlohmann::json::parse(R"([{"exitStatus":0,"outcome":"migrated","images":47},
+                                      {"exitStatus":66,"outcome":"missingInput","images":2},
+                                      {"exitStatus":73,"outcome":"cannotCreate","images":1}])"));
+  EXPECT_EQ(counted["retry"], nlohmann::json::array());
+
+  // Nothing is left that another run could do.
+  EXPECT_EQ(migrateFleet().exitStatus, 1);
+  EXPECT_EQ(lineCount("results.jsonl"), kImages);
+}
+
+TEST_F(Parallel, AnImageOfWhichAnotherRunMayHelpIsRunAgain) {
+  (void)makeImages(kImages);
+  const int root = open(image(kBusy).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+  ASSERT_EQ(flock(root, LOCK_EX), 0);
+  environment["LOCK_TIMEOUT"] = "0";
+
+  EXPECT_EQ(migrateFleet().exitStatus, 1);
+  EXPECT_EQ(summary()["retry"], nlohmann::json::array({image(kBusy).string()}));
+  EXPECT_EQ(versionOf(kBusy), 11);
+
+  close(root);
+  const ProgramResult resumed = migrateFleet();
+  EXPECT_EQ(resumed.exitStatus, 0) << resumed.output << resumed.errors;
+  expectMigratedBut({});
+  EXPECT_EQ(lineCount("results.jsonl"), kImages + 1);
+}
+
+TEST_F(Parallel, AFleetThatIsKilledIsResumed) {
+  (void)makeImages(kImages);
+  const int lock = holdMigrationLock(kBusy);
+  ProgramCall killed = fleetCall();
+  // In a process group of its own, all of which is killed.
+  killed.arguments.insert(killed.arguments.begin(), killed.program);
+  killed.program = "setsid";
+  const int output = memfd_create("output", MFD_CLOEXEC);
+  const pid_t fleet = startProgram(killed, output, output);
+  while (listedLockWaiters(lockOf(kBusy)) == 0) {
+    std::this_thread::yield();
+  }
+  ASSERT_EQ(kill(-fleet, SIGKILL), 0);
+  waitForEnd(fleet, std::chrono::seconds(60));
+  EXPECT_EQ(versionOf(kBusy), 11);
+  close(lock);
+
+  const ProgramResult resumed = migrateFleet();
+
+  EXPECT_EQ(resumed.exitStatus, 0) << resumed.output << resumed.errors << textOf("log");
+  expectMigratedBut({});
+  const nlohmann::json counted = summary();
+  EXPECT_EQ(counted["images"], kImages);
+  EXPECT_EQ(counted["attention"], nlohmann::json::array());
+  close(output);
+}
+
+}  // namespace
+}  // namespace accounts
