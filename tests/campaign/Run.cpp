@@ -216,8 +216,9 @@ PluginEnd runPlugin(Run& run) {
 
 /// What the host does around the plug-in (host/RunCommand.cpp).
 void migrateSafely(DeviceProcess& device, unsigned number, Run& run) {
-  PathError error;
-  const std::optional<RootLock> rootLock = RootLock::take(device.root, error);
+  ProgramError error;
+  const std::optional<RootLock> rootLock =
+      RootLock::take(device.root, std::nullopt, nullptr, error);
   SafetyNet safetyNet(device.fileSystem, device.propertyLists, accountFilesInHome(kHome),
                       "restore");
   if (!rootLock || !safetyNet.keepInputs(timeText(number))) {
@@ -232,8 +233,9 @@ void migrateSafely(DeviceProcess& device, unsigned number, Run& run) {
 
 /// What the host does to put kept files back (host/RestoreCommand.cpp).
 void restore(DeviceProcess& device, unsigned number, Run& run) {
-  PathError error;
-  const std::optional<RootLock> rootLock = RootLock::take(device.root, error);
+  ProgramError error;
+  const std::optional<RootLock> rootLock =
+      RootLock::take(device.root, std::nullopt, nullptr, error);
   const HeldLock migrationLock(device.sharedResources, kMigrationLockName);
   run.wasRefused = !rootLock || !migrationLock.isHeld();
   run.succeeded = !run.wasRefused && !restoreKeptFiles(device.fileSystem, accountFilesInHome(kHome),

@@ -7,6 +7,7 @@
 #include <map>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/Programs.h"
 #include "tests/program/SmallDisk.h"
 
 namespace accounts {
@@ -205,7 +206,7 @@ TEST_F(Plan, WorksOnARootThatIsMountedReadOnly) {
 
 TEST_F(Plan, OfAMissingRootIsAnErrorWithoutStages) {
   const ProgramResult result = runProgram(
-      {.program = MIGRATION_HOST, .arguments = {"plan", "--root", root() + "/none", "--json"}});
+      {.program = migrationHost(), .arguments = {"plan", "--root", root() + "/none", "--json"}});
 
   EXPECT_EQ(result.exitStatus, 66);
   EXPECT_TRUE(onlyObject(result)["stages"].empty());

@@ -5,6 +5,7 @@
 #include <fstream>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/Programs.h"
 
 namespace accounts {
 namespace {
@@ -106,7 +107,7 @@ TEST_F(ReportFilesOfARun, ThatAreNotEmptyPathsAreNeeded) {
 
 TEST_F(ReportFilesOfARun, TellHowFarAPluginCameThatEndedTheProcess) {
   // The plug-in cannot go on without the account types that its resources list.
-  fs::copy(PLUGIN_BUNDLE, onThisMachine("/bundle.migrator"), fs::copy_options::recursive);
+  fs::copy(pluginBundle(), onThisMachine("/bundle.migrator"), fs::copy_options::recursive);
   fs::remove(onThisMachine("/bundle.migrator/Resources/AccountTypesProperties.plist"));
 
   const ProgramResult result = migrate(
