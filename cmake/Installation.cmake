@@ -39,6 +39,7 @@ foreach(header
     propertylist/Description.h
     propertylist/PropertyValue.h
     propertylist/SharedNode.h
+    propertylist/SharedRun.h
     propertylist/Text.h)
   cmake_path(GET header PARENT_PATH folder)
   install(FILES ${PROJECT_SOURCE_DIR}/${header}
