@@ -19,7 +19,8 @@ inline constexpr const char* kErrors =
     "  65  a file is not what it has to be\n"
     "  66  a file or the root is missing or unreadable\n"
     "  73  the output file cannot be created\n"
-    "  74  a file or standard output cannot be written or read\n";
+    "  74  a file or standard output cannot be written or read\n"
+    "  75  what stands in the way may pass\n";
 
 inline constexpr const char* kShow =
     "Show a settings file, a legacy store, a migration-information file, a device description or\n"
