@@ -37,15 +37,6 @@ std::string_view nameOf(Element element) {
       ->name;
 }
 
-/// The elements of an open container move into a vector of their exact number.
-template <class Value>
-std::vector<Value> takeFrom(std::vector<Value>& stack, std::size_t first) {
-  const auto begin = stack.begin() + static_cast<std::ptrdiff_t>(first);
-  std::vector<Value> taken(std::make_move_iterator(begin), std::make_move_iterator(stack.end()));
-  stack.erase(begin, stack.end());
-  return taken;
-}
-
 /// The value of an element that holds characters but no text, none when they are not in its form.
 std::optional<PropertyValue> valueOf(Element element, std::string_view characters) {
   switch (element) {
@@ -173,23 +164,40 @@ bool ValueBuilder::endScalar(Element element) {
 
 bool ValueBuilder::endContainer() {
   const Container container = containers_.back();
-  if (container.element == Element::Array) {
-    containers_.pop_back();
-    return addValue(PropertyArray(takeFrom(values_, container.firstValue)), 1);
-  }
-  if (hasKeyWithoutValue()) {
+  if (container.element == Element::Dictionary && hasKeyWithoutValue()) {
     return fail("a key without a value");
   }
-  std::vector<PropertyEntry> entries;
-  entries.reserve(keys_.size() - container.firstKey);
+  containers_.pop_back();
+  return addValue(container.element == Element::Dictionary
+                      ? PropertyValue(takeDictionary(container))
+                      : PropertyValue(takeArray(container)),
+                  1);
+}
+
+PropertyDictionary ValueBuilder::takeDictionary(const Container& container) {
+  PropertyEntries entries(keys_.size() - container.firstKey);
   for (std::size_t key = container.firstKey, value = container.firstValue; key < keys_.size();
        ++key, ++value) {
-    entries.push_back({std::move(keys_[key]), std::move(values_[value])});
+    entries.append(std::move(keys_[key]), std::move(values_[value]));
   }
   keys_.resize(container.firstKey);
-  values_.erase(values_.begin() + static_cast<std::ptrdiff_t>(container.firstValue), values_.end());
-  containers_.pop_back();
-  return addValue(PropertyDictionary(std::move(entries)), 1);
+  dropValuesFrom(container.firstValue);
+  return entries.areOrdered()
+             ? entries.takeOrdered()
+             : PropertyDictionary(std::vector<PropertyEntry>(entries.begin(), entries.end()));
+}
+
+PropertyArray ValueBuilder::takeArray(const Container& container) {
+  PropertyArray array = PropertyArray::withRoomFor(values_.size() - container.firstValue);
+  for (std::size_t value = container.firstValue; value < values_.size(); ++value) {
+    array.append(std::move(values_[value]));
+  }
+  dropValuesFrom(container.firstValue);
+  return array;
+}
+
+void ValueBuilder::dropValuesFrom(std::size_t first) {
+  values_.erase(values_.begin() + static_cast<std::ptrdiff_t>(first), values_.end());
 }
 
 bool ValueBuilder::addKey() {

@@ -74,6 +74,9 @@ class ValueBuilder {
   [[nodiscard]] bool hasKeyWithoutValue() const;
   bool endScalar(Element element);
   bool endContainer();
+  PropertyDictionary takeDictionary(const Container& container);
+  PropertyArray takeArray(const Container& container);
+  void dropValuesFrom(std::size_t first);
   bool addKey();
   bool addValue(PropertyValue value, std::uint64_t expandedCount);
   bool count(std::uint64_t expandedCount);
