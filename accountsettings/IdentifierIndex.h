@@ -33,10 +33,10 @@ class IdentifierIndex {
   Value& operator[](const Text& identifier) {
     ++changeCount_;
     const auto newNumber = static_cast<std::uint32_t>(entries_.size());
+    const std::string_view text = identifier;
     // Before the table knows its number, which must never be one of no entry.
     entries_.push_back({identifier, Value(), State::Present});
-    const std::uint32_t number =
-        table_.findOrAdd(hash_(identifier.view()), newNumber, hasIdentifier(identifier));
+    const std::uint32_t number = table_.findOrAdd(hash_(text), newNumber, hasIdentifier(text));
     if (number != newNumber) {
       entries_.pop_back();
     }
