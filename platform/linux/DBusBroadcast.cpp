@@ -6,7 +6,6 @@
 #include <cstdlib>
 #include <cstring>
 #include <utility>
-#include <variant>
 
 #include "platform/linux/SystemdLibrary.h"
 
@@ -26,11 +25,11 @@ constexpr const char* kCloudTabsSwitched = "CloudTabsSwitched";
 }  // namespace
 
 struct DBusBroadcast::Signal {
-  struct Preferences {
-    std::string application;
-    std::string key;
-  };
-  std::variant<Preferences, CloudTabs> content;
+  /// The state that cloud tabs were switched to; none for a changed preference, which has the
+  /// others.
+  std::optional<CloudTabs> cloudTabs;
+  std::string application;
+  std::string key;
 };
 
 /// One connection to a bus. The library's functions return a negative error number for failure.
@@ -49,12 +48,12 @@ class DBusBroadcast::Connection {
 
   /// Queues a signal.
   void emit(const Signal& signal) {
-    if (const auto* preferences = std::get_if<Signal::Preferences>(&signal.content)) {
-      require(library_.emitSignal, kObject, kInterface, kPreferencesChanged, "ss",
-              preferences->application.c_str(), preferences->key.c_str());
-    } else {
-      const int isOn = std::get<CloudTabs>(signal.content) == CloudTabs::On ? 1 : 0;
+    if (signal.cloudTabs) {
+      const int isOn = *signal.cloudTabs == CloudTabs::On ? 1 : 0;
       require(library_.emitSignal, kObject, kInterface, kCloudTabsSwitched, "b", isOn);
+    } else {
+      require(library_.emitSignal, kObject, kInterface, kPreferencesChanged, "ss",
+              signal.application.c_str(), signal.key.c_str());
     }
   }
 
@@ -112,11 +111,11 @@ DBusBroadcast::DBusBroadcast(DBusOptions options) : options_(std::move(options))
 DBusBroadcast::~DBusBroadcast() = default;
 
 void DBusBroadcast::announceChange(std::string_view application, std::string_view key) {
-  signals_.push_back({Signal::Preferences{std::string(application), std::string(key)}});
+  signals_.push_back({std::nullopt, std::string(application), std::string(key)});
 }
 
 void DBusBroadcast::announce(CloudTabs state) {
-  signals_.push_back({state});
+  signals_.push_back({state, "", ""});
 }
 
 Result DBusBroadcast::deliver() {
