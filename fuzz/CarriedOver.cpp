@@ -3,6 +3,7 @@
 #include <algorithm>
 
 #include "accountsettings/AccountsManager.h"
+#include "accountsettings/DeviceLocalAccount.h"
 #include "fuzz/FuzzTarget.h"
 
 namespace accounts {
@@ -48,10 +49,27 @@ bool areUpToDate(const PropertyDictionary& settings) {
          static_cast<std::uint64_t>(*number) >= AccountsManager::currentVersion();
 }
 
+bool isOnDevice(const PropertyDictionary& account) {
+  return account.textForKey(kAccountType) == Text(kOnMyDeviceAccountType);
+}
+
+/// Whether no account has an identifier of another one, nor that of the on-device account, which a
+/// migration makes anew and which takes the place of whatever has its identifier.
+bool havePlainIdentifiers(const PropertyArray& accounts) {
+  PropertyArray migrated{
+      PropertyDictionary{{kAccountIdentifier, DeviceLocalAccount::_identifier()}}};
+  for (const PropertyValue& account : accounts) {
+    if (!isOnDevice(*account.asDictionary())) {
+      migrated.append(account);
+    }
+  }
+  return haveDistinctIdentifiers(accounts) && haveDistinctIdentifiers(migrated);
+}
+
 /// Two steps take accounts away: one makes the on-device account anew, the other folds calendars
 /// into the mail accounts that they belong to.
 bool canBeTakenAway(const PropertyDictionary& account) {
-  return account.textForKey(kAccountType) == Text(kOnMyDeviceAccountType) ||
+  return isOnDevice(account) ||
          account.textForKey(kAccountClass) == Text("MobileCalDAVAccount");
 }
 
@@ -79,7 +97,7 @@ CarriedOver::CarriedOver(FuzzedDevice& device) {
   }
   const PropertyDictionary marked = withMarks(*settings, *accounts);
   accounts_ = loadedAccounts(device, marked);
-  isPlain_ = haveDistinctIdentifiers(accounts_);
+  isPlain_ = havePlainIdentifiers(accounts_);
   isUpToDate_ = areUpToDate(*settings);
   for (const PropertyValue& account : accounts_) {
     if (!canBeTakenAway(*account.asDictionary())) {

@@ -9,7 +9,7 @@ namespace accounts {
 
 /// What a migration must carry over of a device's account settings. It looks at devices alone whose
 /// rules are plain: without legacy stores, whose accounts replace others, and without identifiers
-/// that several accounts share.
+/// that several accounts share, the on-device account among them, which a migration makes.
 class CarriedOver {
  public:
   /// Looks at a device before its migration. The account settings file is rewritten with a mark in
