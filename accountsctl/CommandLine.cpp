@@ -2,10 +2,12 @@
 
 #include <CLI/CLI.hpp>
 #include <string_view>
+#include <utility>
 
 #include "accountsctl/HelpTexts.h"
 #include "accountsctl/PropertyListInput.h"
 #include "commandline/OptionDeclarations.h"
+#include "commandline/Subcommands.h"
 
 namespace accounts {
 namespace {
@@ -202,70 +204,33 @@ Asked summarizeAsked(Arguments& arguments) {
   return arguments.summarize;
 }
 
-/// A subcommand: how its arguments are declared, and what they ask for once they are parsed.
-struct Subcommand {
-  const char* name;
-  const char* description;
-  const char* exitStatuses;
-  const char* examples;
-  void (*add)(CLI::App& command, Arguments& arguments);
-  Asked (*asked)(Arguments& arguments);
-};
+constexpr ProgramTexts kProgram = {kProgramName, kVersion, help::kProgram, help::kProgramExamples,
+                                   help::kErrors};
 
-constexpr Subcommand kSubcommands[] = {
-    {"show", help::kShow, help::kShowStatuses, help::kShowExamples, addShow, showAsked},
-    {"diff", help::kDiff, help::kDiffStatuses, help::kDiffExamples, addDiff, diffAsked},
-    {"check", help::kCheck, help::kCheckStatuses, help::kCheckExamples, addCheck, checkAsked},
-    {"status", help::kStatus, help::kStatusStatuses, help::kStatusExamples, addStatus, statusAsked},
-    {"convert", help::kConvert, help::kConvertStatuses, help::kConvertExamples, addConvert,
+constexpr Subcommand<Arguments, Asked> kSubcommands[] = {
+    {{"show", help::kShow, help::kShowStatuses, "", help::kShowExamples}, addShow, showAsked},
+    {{"diff", help::kDiff, help::kDiffStatuses, "", help::kDiffExamples}, addDiff, diffAsked},
+    {{"check", help::kCheck, help::kCheckStatuses, "", help::kCheckExamples}, addCheck, checkAsked},
+    {{"status", help::kStatus, help::kStatusStatuses, "", help::kStatusExamples},
+     addStatus,
+     statusAsked},
+    {{"convert", help::kConvert, help::kConvertStatuses, "", help::kConvertExamples},
+     addConvert,
      convertAsked},
-    {"summarize", help::kSummarize, help::kSummarizeStatuses, help::kSummarizeExamples,
-     addSummarize, summarizeAsked},
+    {{"summarize", help::kSummarize, help::kSummarizeStatuses, "", help::kSummarizeExamples},
+     addSummarize,
+     summarizeAsked},
 };
-
-void addSubcommand(CLI::App& program, const Subcommand& subcommand, Arguments& arguments) {
-  CLI::App& command = *program.add_subcommand(subcommand.name, subcommand.description);
-  addHelpAndVersion(command, kVersion);
-  command.footer(std::string("Exit status:\n") + subcommand.exitStatuses + help::kErrors +
-                 "\nExamples:\n" + subcommand.examples);
-  subcommand.add(command, arguments);
-}
-
-/// What the chosen subcommand asks for.
-Asked askedBy(std::string_view chosen, Arguments& arguments) {
-  for (const Subcommand& subcommand : kSubcommands) {
-    if (subcommand.name == chosen) {
-      return subcommand.asked(arguments);
-    }
-  }
-  return unusable("A subcommand is required");
-}
 
 }  // namespace
 
 CommandLine parseCommandLine(int argumentCount, const char* const* arguments) {
   Arguments parsed;
-  CLI::App program(help::kProgram, kProgramName);
-  addHelpAndVersion(program, kVersion);
-  program.footer(help::kProgramExamples);
-  for (const Subcommand& subcommand : kSubcommands) {
-    addSubcommand(program, subcommand, parsed);
-  }
-
-  ArgumentParsing parsing = parseArguments(program, argumentCount, arguments);
-  CommandLine commandLine;
-  commandLine.wantsJSON = hasArgument(argumentCount, arguments, "--json");
-  if (!program.get_subcommands().empty()) {
-    commandLine.subcommand = program.get_subcommands().front()->get_name();
-  }
-  if (auto* text = std::get_if<RequestedText>(&parsing)) {
-    commandLine.asked = std::move(*text);
-  } else if (auto* problem = std::get_if<UnusableArguments>(&parsing)) {
-    commandLine.asked = std::move(*problem);
-  } else {
-    commandLine.asked = askedBy(commandLine.subcommand.value_or(""), parsed);
-  }
-  return commandLine;
+  auto [asked, subcommand] =
+      parseSubcommands<Arguments, Asked>(kProgram, kSubcommands, argumentCount, arguments, parsed);
+  return {.asked = std::move(asked),
+          .subcommand = std::move(subcommand),
+          .wantsJSON = hasArgument(argumentCount, arguments, "--json")};
 }
 
 }  // namespace accounts

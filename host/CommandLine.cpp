@@ -4,6 +4,7 @@
 #include <utility>
 
 #include "commandline/OptionDeclarations.h"
+#include "commandline/Subcommands.h"
 #include "host/HelpTexts.h"
 
 namespace accounts {
@@ -58,6 +59,11 @@ void addReports(CLI::App& command, Arguments& arguments) {
                    "Show passwords, tokens and the like in reports as well");
 }
 
+void addJSON(CLI::App& command, Arguments& arguments) {
+  command.add_flag("--json", arguments.wantsJSON,
+                   "Write one JSON object on one line to standard output");
+}
+
 void addRun(CLI::App& command, Arguments& arguments) {
   addDeviceOptions(command, arguments.run.device);
   addReports(command, arguments);
@@ -70,6 +76,7 @@ void addRun(CLI::App& command, Arguments& arguments) {
       ->check(CLI::IsMember({"dbus"}));
   command.add_flag("--bare", arguments.run.bare,
                    "Run the plug-in without keeping or verifying anything");
+  addJSON(command, arguments);
 }
 
 Asked runAsked(Arguments& arguments) {
@@ -82,6 +89,7 @@ Asked runAsked(Arguments& arguments) {
 void addPlan(CLI::App& command, Arguments& arguments) {
   addDeviceOptions(command, arguments.plan.device);
   addReports(command, arguments);
+  addJSON(command, arguments);
 }
 
 Asked planAsked(Arguments& arguments) {
@@ -93,73 +101,39 @@ void addRestore(CLI::App& command, Arguments& arguments) {
   addDevice(command, arguments.restore.root, arguments.restore.home);
   addPath(command, "--from", arguments.restore.folder, "FOLDER",
           "The folder of kept files, by its name or device path (default: the only one)");
+  addJSON(command, arguments);
 }
 
 Asked restoreAsked(Arguments& arguments) {
   return arguments.restore;
 }
 
-/// A subcommand: how its arguments are declared, and what they ask for once they are parsed.
-struct Subcommand {
-  const char* name;
-  const char* description;
-  const char* exitStatuses;
-  const char* errors;
-  const char* examples;
-  void (*add)(CLI::App& command, Arguments& arguments);
-  Asked (*asked)(Arguments& arguments);
-};
+constexpr ProgramTexts kProgram = {kProgramName, kVersion, help::kProgram, help::kProgramExamples,
+                                   help::kErrors};
 
-constexpr Subcommand kSubcommands[] = {
-    {"run", help::kRun, help::kRunStatuses, help::kRunErrors, help::kRunExamples, addRun, runAsked},
-    {"plan", help::kPlan, help::kPlanStatuses, help::kRunErrors, help::kPlanExamples, addPlan,
+constexpr Subcommand<Arguments, Asked> kSubcommands[] = {
+    {{"run", help::kRun, help::kRunStatuses, help::kRunErrors, help::kRunExamples},
+     addRun,
+     runAsked},
+    {{"plan", help::kPlan, help::kPlanStatuses, help::kRunErrors, help::kPlanExamples},
+     addPlan,
      planAsked},
-    {"restore", help::kRestore, help::kRestoreStatuses, help::kRestoreErrors,
-     help::kRestoreExamples, addRestore, restoreAsked},
+    {{"restore", help::kRestore, help::kRestoreStatuses, help::kRestoreErrors,
+      help::kRestoreExamples},
+     addRestore,
+     restoreAsked},
 };
-
-void addSubcommand(CLI::App& program, const Subcommand& subcommand, Arguments& arguments) {
-  CLI::App& command = *program.add_subcommand(subcommand.name, subcommand.description);
-  addHelpAndVersion(command, kVersion);
-  command.footer(std::string("Exit status:\n") + subcommand.exitStatuses + help::kErrors +
-                 subcommand.errors + "\nExamples:\n" + subcommand.examples);
-  subcommand.add(command, arguments);
-  command.add_flag("--json", arguments.wantsJSON,
-                   "Write one JSON object on one line to standard output");
-}
-
-/// What the chosen subcommand asks for.
-Asked askedBy(const CLI::App& program, Arguments& arguments) {
-  for (const Subcommand& subcommand : kSubcommands) {
-    if (program.got_subcommand(subcommand.name)) {
-      return subcommand.asked(arguments);
-    }
-  }
-  return UnusableArguments{"A subcommand is required"};
-}
 
 }  // namespace
 
 CommandLine parseCommandLine(int argumentCount, const char* const* arguments) {
   Arguments parsed;
-  CLI::App program(help::kProgram, kProgramName);
-  addHelpAndVersion(program, kVersion);
-  program.footer(help::kProgramExamples);
-  for (const Subcommand& subcommand : kSubcommands) {
-    addSubcommand(program, subcommand, parsed);
-  }
-  ArgumentParsing parsing = parseArguments(program, argumentCount, arguments);
-  CommandLine commandLine;
-  commandLine.wantsJSON = hasArgument(argumentCount, arguments, "--json");
-  if (auto* text = std::get_if<RequestedText>(&parsing)) {
-    commandLine.asked = std::move(*text);
-  } else if (auto* problem = std::get_if<UnusableArguments>(&parsing)) {
-    commandLine.asked = std::move(*problem);
-  } else {
-    commandLine.reports = parsed.reports;
-    commandLine.asked = askedBy(program, parsed);
-  }
-  return commandLine;
+  Asked asked =
+      parseSubcommands<Arguments, Asked>(kProgram, kSubcommands, argumentCount, arguments, parsed)
+          .asked;
+  return {.asked = std::move(asked),
+          .wantsJSON = hasArgument(argumentCount, arguments, "--json"),
+          .reports = std::move(parsed.reports)};
 }
 
 }  // namespace accounts
