@@ -77,7 +77,7 @@ class Tables {
     line = emphasized(terminal_, Emphasis::Heading, line);
     if (kind == FileKind::AccountSettings && content.asDictionary() != nullptr) {
       const std::string version = wordFor(*content.asDictionary(), kPlistVersionKey);
-      line += version.empty() ? ", without a version" : ", version " + escaped(version);
+      line += version.empty() ? ", without a version" : ", version " + escapedText(version);
       line += fmt::format(" (current is {})", AccountsManager::currentVersion());
     }
     text_ += line + "\n";
@@ -148,7 +148,7 @@ class Tables {
       if (account.properties) {
         addLine("");
         addLine(emphasized(terminal_, Emphasis::Heading,
-                           escaped(account.place + " " + titleOf(account, layout))));
+                           escapedText(account.place + " " + titleOf(account, layout))));
         PropertyDictionary own = *account.properties;
         // Children have a place of their own, if they are children at all.
         if (!account.isChild && own.arrayForKey(layout.childrenKey)) {
@@ -182,12 +182,6 @@ class Tables {
   }
 
   void addLine(const std::string& line) { text_ += line + "\n"; }
-
-  static std::string escaped(std::string_view text) {
-    std::string line;
-    appendEscapedText(line, text);
-    return line;
-  }
 
   const ShowOptions& options_;
   const Terminal& terminal_;

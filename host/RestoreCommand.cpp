@@ -19,12 +19,6 @@ Restoration failed(ExitStatus exitStatus, const std::string& message) {
   return restoration;
 }
 
-std::string escapedLine(const std::string& beginning, const std::string& text) {
-  std::string line = beginning;
-  appendEscapedText(line, text);
-  return line + "\n";
-}
-
 }  // namespace
 
 Restoration runRestoration(const RestoreOptions& options) {
@@ -70,10 +64,10 @@ std::string jsonText(const Restoration& restoration, const std::string& root) {
 std::string summaryText(const Restoration& restoration) {
   std::string summary;
   for (const std::string& path : restoration.restored) {
-    summary += escapedLine("Put back ", path);
+    summary += "Put back " + escapedText(path) + "\n";
   }
   if (restoration.replaced) {
-    summary += escapedLine("What was there is kept in ", *restoration.replaced);
+    summary += "What was there is kept in " + escapedText(*restoration.replaced) + "\n";
   }
   return summary;
 }

@@ -44,12 +44,6 @@ SettingsSaves settingsSavesFrom(const JSON& object) {
   return saves;
 }
 
-std::string escaped(const std::string& text) {
-  std::string line;
-  appendEscapedText(line, text);
-  return line;
-}
-
 }  // namespace
 
 void setError(RunReport& report, const ProgramError& error) {
@@ -113,10 +107,10 @@ std::string summaryText(const RunReport& report) {
   }
   std::string summary =
       (report.result && !report.error ? "Migrated the " : "Failed to migrate the ") +
-      escaped(*report.dataClassName) + " of " + escaped(report.root.value_or("")) + ".\n";
+      escapedText(*report.dataClassName) + " of " + escapedText(report.root.value_or("")) + ".\n";
   for (const PreferencesChange& broadcast : report.broadcasts) {
-    summary += "  Told " + escaped(broadcast.application) + " that its " + escaped(broadcast.key) +
-               " changed.\n";
+    summary += "  Told " + escapedText(broadcast.application) + " that its " +
+               escapedText(broadcast.key) + " changed.\n";
   }
   if (report.cloudTabAnnouncements > 0) {
     summary += "  Announced cloud tabs, " + std::to_string(report.cloudTabAnnouncements) +

@@ -9,15 +9,9 @@ namespace {
 
 constexpr std::string_view kIndentation = "    ";
 
-std::string escaped(std::string_view text) {
-  std::string line;
-  appendEscapedText(line, text);
-  return line;
-}
-
 /// A text as it is, anything else as JSON.
 std::string described(const JSON& value) {
-  return value.is_string() ? escaped(value.get_ref<const std::string&>()) : lineOf(value);
+  return value.is_string() ? escapedText(value.get_ref<const std::string&>()) : lineOf(value);
 }
 
 std::string textOr(const JSON& value, const char* otherwise) {
@@ -26,14 +20,15 @@ std::string textOr(const JSON& value, const char* otherwise) {
 
 /// "3 Mail 'Post' (IDENTIFIER)".
 std::string lineFor(const JSON& account, const JSON& place) {
-  return escaped(fmt::format("{} {} ({})", textOr(place["place"], ""), textOr(account["title"], ""),
-                             textOr(account["identifier"], "none")));
+  return escapedText(fmt::format("{} {} ({})", textOr(place["place"], ""),
+                                 textOr(account["title"], ""),
+                                 textOr(account["identifier"], "none")));
 }
 
 std::string whereMoved(const JSON& place) {
   // A child has a place such as "3.1".
   const bool isChild = textOr(place["place"], "").find('.') != std::string::npos;
-  return isChild ? "now a child of " + escaped(textOr(place["parent"], "none"))
+  return isChild ? "now a child of " + escapedText(textOr(place["parent"], "none"))
                  : "now a top-level account";
 }
 
@@ -60,7 +55,7 @@ class DifferenceLines {
   }
 
   void addProperty(const JSON& change, std::string_view indentation) {
-    const std::string path = escaped(textOr(change["path"], "")) + ": ";
+    const std::string path = escapedText(textOr(change["path"], "")) + ": ";
     if (const auto before = change.find("before"); before != change.end()) {
       addLine(Emphasis::Removed, fmt::format("{}- {}{}", indentation, path, described(*before)));
     }

@@ -257,4 +257,10 @@ void appendEscapedText(std::string& line, std::string_view text) {
   appendText(line, text, Quoting::None);
 }
 
+std::string escapedText(std::string_view text) {
+  std::string line;
+  appendEscapedText(line, text);
+  return line;
+}
+
 }  // namespace accounts

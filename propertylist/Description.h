@@ -15,5 +15,7 @@ void appendDescription(std::string& line, const PropertyValue& value);
 /// Appends a text with line breaks, control characters, marks that reorder text and
 /// ill-formed sequences escaped.
 void appendEscapedText(std::string& line, std::string_view text);
+/// A text with the same escaped.
+std::string escapedText(std::string_view text);
 
 }  // namespace accounts

@@ -10,20 +10,14 @@ namespace {
 
 constexpr std::string_view kIndentation = "    ";
 
-std::string escaped(std::string_view text) {
-  std::string line;
-  appendEscapedText(line, text);
-  return line;
-}
-
 std::string textIn(const JSON& object, const char* key) {
   const auto found = object.find(key);
-  return found != object.end() && found->is_string() ? escaped(found->get<std::string>()) : "";
+  return found != object.end() && found->is_string() ? escapedText(found->get<std::string>()) : "";
 }
 
 std::string versionIn(const JSON& versions, const char* key) {
   const JSON& version = versions[key];
-  return version.is_null() ? "none" : escaped(lineOf(version));
+  return version.is_null() ? "none" : escapedText(lineOf(version));
 }
 
 std::size_t countAccounts(const JSON& accounts) {
