@@ -4,11 +4,6 @@
 
 namespace accounts {
 
-std::string temporaryDirectoryOf(const DeviceOptions& options) {
-  return options.temporaryDirectory.value_or(
-      options.home.value_or(LinuxPlatformOptions().homeDirectory) + "/tmp");
-}
-
 std::variant<OpenedDevice, ProgramError> openDevice(const DeviceOptions& options) {
   std::variant<PluginBundle, ProgramError> bundle = PluginBundle::find(options.plugin);
   if (const auto* error = std::get_if<ProgramError>(&bundle)) {

@@ -31,9 +31,6 @@ struct DeviceOptions {
   std::optional<std::chrono::seconds> lockTimeout;
 };
 
-/// The device path of the directory for temporary files.
-std::string temporaryDirectoryOf(const DeviceOptions& options);
-
 /// A device with the plug-in that is to run on it.
 struct OpenedDevice {
   PluginBundle bundle;

@@ -2,10 +2,8 @@
 
 #include <unistd.h>
 
-#include <memory>
 #include <string>
 #include <utility>
-#include <variant>
 #include <vector>
 
 #include "host/PluginRun.h"
@@ -79,47 +77,37 @@ void foreseeVerification(LinuxPlatform& linux, PropertyLists& planned, const Acc
   }
 }
 
-HostOutcome failed(const ProgramError& error) {
-  return {reportOf(error), {}};
-}
-
-HostOutcome planWithPlugin(const PlanOptions& options) {
-  const std::variant<OpenedDevice, ProgramError> opened = openDevice(options.device);
-  if (const auto* error = std::get_if<ProgramError>(&opened)) {
-    return failed(*error);
-  }
-  const auto& device = std::get<OpenedDevice>(opened);
+HostOutcome planWithPlugin(const PlanOptions& options, const OpenedDevice& device,
+                           StopSignals& stop) {
   LinuxPlatform& linux = *device.platform;
-  StopSignals stop;
   ProgramError lockError;
   const auto rootLock = RootLock::take(linux.root(), options.device.lockTimeout, &stop, lockError);
   if (!rootLock) {
-    return failed(lockError);
+    return failedOutcome(lockError);
   }
-  PlannedPlatform planned(linux, temporaryDirectoryOf(options.device));
+  PlannedPlatform planned(linux, linux.fileSystem().temporaryDirectory());
   const AccountFiles files = accountFilesInHome(linux.platform().homeDirectory.path());
-  PluginOutcome outcome =
-      runPluginInChild({.bundle = device.bundle,
-                        .platform = planned.platform,
-                        .linux = linux,
-                        .files = files,
-                        .recorded = options.secrets,
-                        .inspect =
-                            [&](const Platform& platform, RunReport& report) {
-                              if (report.result) {
-                                foreseeVerification(linux, platform.propertyLists, files, report);
-                              }
-                            }},
-                       stop);
-  return {reportOf(std::move(outcome.report)), std::move(outcome.recorded)};
+  return outcomeOf(runPluginInChild({.bundle = device.bundle,
+                                     .platform = planned.platform,
+                                     .linux = linux,
+                                     .files = files,
+                                     .recorded = options.secrets,
+                                     .inspect =
+                                         [&](const Platform& platform, RunReport& report) {
+                                           if (report.result) {
+                                             foreseeVerification(linux, platform.propertyLists,
+                                                                 files, report);
+                                           }
+                                         }},
+                                    stop));
 }
 
 }  // namespace
 
 HostOutcome planMigration(const PlanOptions& options) {
-  HostOutcome outcome = planWithPlugin(options);
-  outcome.report.root = options.device.root;
-  return outcome;
+  return outcomeOnDevice(options.device, [&](const OpenedDevice& device, StopSignals& stop) {
+    return planWithPlugin(options, device, stop);
+  });
 }
 
 }  // namespace accounts

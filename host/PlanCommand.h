@@ -1,6 +1,8 @@
 #pragma once
 
-#include "host/RunCommand.h"
+#include "host/DeviceOptions.h"
+#include "host/HostOutcome.h"
+#include "propertylist/SecretKeys.h"
 
 namespace accounts {
 

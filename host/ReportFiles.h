@@ -5,7 +5,7 @@
 #include <string_view>
 
 #include "commandline/ExitStatus.h"
-#include "host/RunCommand.h"
+#include "host/HostOutcome.h"
 #include "inspection/PropertyListJSON.h"
 
 namespace accounts {

@@ -1,6 +1,5 @@
 #include "host/RunCommand.h"
 
-#include <memory>
 #include <string>
 #include <utility>
 #include <variant>
@@ -32,24 +31,20 @@ PluginEnd endOf(const std::variant<RunReport, ProgramError>& outcome) {
   return PluginEnd::Died;
 }
 
-HostOutcome failed(const ProgramError& error) {
-  return {reportOf(error), {}};
-}
-
 /// Runs the plug-in with its inputs kept around it.
 HostOutcome runPluginSafely(const RunOptions& options, const PluginRun& run, StopSignals& stop) {
   ProgramError lockError;
   const auto rootLock =
       RootLock::take(run.linux.root(), options.device.lockTimeout, &stop, lockError);
   if (!rootLock) {
-    return failed(lockError);
+    return failedOutcome(lockError);
   }
   SafetyNet safetyNet(run.linux.fileSystem(), run.platform.propertyLists, run.files,
                       restoreCommand(options.device));
   if (const Result kept = safetyNet.keepInputs(currentTimeText()); !kept) {
     ProgramError error = programErrorOf(kept, ExitStatus::CannotCreate);
     error.message.insert(0, "The files cannot be kept: ");
-    return failed(error);
+    return failedOutcome(error);
   }
   PluginOutcome outcome = runPluginInChild(run, stop);
   const PluginEnd end = endOf(outcome.report);
@@ -71,13 +66,7 @@ HostOutcome runPluginSafely(const RunOptions& options, const PluginRun& run, Sto
   return {std::move(report), std::move(outcome.recorded)};
 }
 
-HostOutcome findAndRunPlugin(const RunOptions& options) {
-  StopSignals stop;
-  const std::variant<OpenedDevice, ProgramError> opened = openDevice(options.device);
-  if (const auto* error = std::get_if<ProgramError>(&opened)) {
-    return failed(*error);
-  }
-  const auto& device = std::get<OpenedDevice>(opened);
+HostOutcome runPlugin(const RunOptions& options, const OpenedDevice& device, StopSignals& stop) {
   LinuxPlatform& linux = *device.platform;
   const AccountFiles files = accountFilesInHome(linux.platform().homeDirectory.path());
   const PluginRun run{.bundle = device.bundle,
@@ -89,15 +78,16 @@ HostOutcome findAndRunPlugin(const RunOptions& options) {
   if (!options.bare) {
     return runPluginSafely(options, run, stop);
   }
-  PluginOutcome outcome = runPluginInChild(run, stop);
-  return {reportOf(std::move(outcome.report)), std::move(outcome.recorded)};
+  return outcomeOf(runPluginInChild(run, stop));
 }
 
 }  // namespace
 
 HostOutcome runMigration(const RunOptions& options) {
-  HostOutcome outcome = findAndRunPlugin(options);
-  outcome.report.root = options.device.root;
+  HostOutcome outcome =
+      outcomeOnDevice(options.device, [&](const OpenedDevice& device, StopSignals& stop) {
+        return runPlugin(options, device, stop);
+      });
   if (options.broadcastsOnDBus) {
     broadcastOnDBus(outcome.report);
   }

@@ -3,9 +3,8 @@
 #include <optional>
 
 #include "host/DeviceOptions.h"
-#include "host/RunReport.h"
+#include "host/HostOutcome.h"
 #include "propertylist/SecretKeys.h"
-#include "report/RecordedMigration.h"
 
 namespace accounts {
 
@@ -18,13 +17,6 @@ struct RunOptions {
   bool broadcastsOnDBus = false;
   /// How values are recorded; none for a run that is not recorded.
   std::optional<Secrets> recorded;
-};
-
-/// What a command of the host came to.
-struct HostOutcome {
-  RunReport report;
-  /// Empty unless it was asked for.
-  RecordedMigration recorded;
 };
 
 /// Runs one migration on one device root, in a child process, and reports it; also every error,

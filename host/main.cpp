@@ -53,7 +53,9 @@ ExitStatus finish(const RunOptions& options, const CommandLine& commandLine) {
     return finish(*error, options.device.root, commandLine.wantsJSON);
   }
   HostOutcome outcome = runMigration(options);
-  finishReports(commandLine, outcome, fullReport("run", outcome));
+  if (commandLine.reports.areWanted()) {
+    finishReports(commandLine, outcome, fullReport("run", outcome));
+  }
   return finish(outcome.report, commandLine.wantsJSON);
 }
 

@@ -23,6 +23,9 @@ class LinuxFileSystem final : public FileSystem {
   /// parent must exist. `root` must outlive this.
   LinuxFileSystem(const DeviceRoot& root, std::string temporaryDirectory);
 
+  /// A device path.
+  [[nodiscard]] const std::string& temporaryDirectory() const { return temporaryDirectory_; }
+
   bool fileExists(std::string_view path) override;
   bool isDirectory(std::string_view path) override;
   std::optional<EntryKind> kindOfEntry(std::string_view path) override;
