@@ -59,6 +59,12 @@ std::vector<std::string> textsIn(const JSON& object, const char* key) {
   return texts;
 }
 
+/// Whether a value is what a process can end with: no other number may pass for one by being cut.
+bool isExitStatus(const JSON& value) {
+  constexpr int kLargest = 255;
+  return value.is_number_integer() && value >= 0 && value <= kLargest;
+}
+
 }  // namespace
 
 std::optional<RunResult> runResultFrom(std::string_view line) {
@@ -67,7 +73,7 @@ std::optional<RunResult> runResultFrom(std::string_view line) {
     return std::nullopt;
   }
   const auto exitStatus = object.find("exitStatus");
-  if (exitStatus == object.end() || !exitStatus->is_number_integer() || !object.contains("root")) {
+  if (exitStatus == object.end() || !isExitStatus(*exitStatus) || !object.contains("root")) {
     return std::nullopt;
   }
   RunResult result;

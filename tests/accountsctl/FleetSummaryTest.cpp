@@ -92,6 +92,15 @@ TEST(FleetSummary, WhatIsNoResultIsCountedAsALine) {
   EXPECT_EQ(summary.imageCount(), 0U);
 }
 
+TEST(FleetSummary, ANumberThatNoProcessEndsWithIsNoExitStatus) {
+  // Cut to 32 bits, the last one would be a success.
+  const FleetSummary summary =
+      summaryOf({R"({"root":"/a","exitStatus":-1})", R"({"root":"/b","exitStatus":256})",
+                 R"({"root":"/c","exitStatus":4294967296})"});
+  EXPECT_EQ(summary.unreadableLineCount(), 3U);
+  EXPECT_EQ(summary.imageCount(), 0U);
+}
+
 TEST(FleetSummary, ProgressSaysHowManyOfHowMany) {
   const FleetSummary summary = summaryOf({line("/a", 0), line("/b", 75), line("/c", 70)});
   EXPECT_EQ(progressText(summary, 5), "3 of 5 images: 1 migrated, 1 to retry, 1 need attention");
