@@ -69,8 +69,7 @@ bool havePlainIdentifiers(const PropertyArray& accounts) {
 /// Two steps take accounts away: one makes the on-device account anew, the other folds calendars
 /// into the mail accounts that they belong to.
 bool canBeTakenAway(const PropertyDictionary& account) {
-  return isOnDevice(account) ||
-         account.textForKey(kAccountClass) == Text("MobileCalDAVAccount");
+  return isOnDevice(account) || account.textForKey(kAccountClass) == Text("MobileCalDAVAccount");
 }
 
 /// The marks of accounts and of their children.

@@ -1,0 +1,1 @@
+// Nothing but the precompiled header that all tests share.
