@@ -1,1 +1,0 @@
-// Nothing but the precompiled header that all tests share.
