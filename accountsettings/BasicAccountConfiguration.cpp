@@ -43,10 +43,10 @@ PropertyDictionary loadAccountTypesTable() {
     failAssertion(operation, sourceFile, "Could not load the dataclasses configuration file");
   }
   const bool isMultitaskingEnabled = BasicAccount::isMultitaskingEnabled();
-  std::vector<PropertyEntry> table;
+  std::vector<KeyedValue> table;
   table.reserve(file->size());
   for (const auto& [type, configured] : *file) {
-    PropertyValue& stored = table.emplace_back(PropertyEntry{type, configured}).value;
+    PropertyValue& stored = table.emplace_back(KeyedValue{type, configured}).value;
     const PropertyDictionary* properties = configured.asDictionary();
     if (properties == nullptr) {
       continue;

@@ -29,7 +29,7 @@ const std::array<Restriction, 5>& restrictions() {
 
 /// What each account type supports, in canonical order. Asked for several times for each account.
 PropertyDictionary orderedSupportedDataclasses() {
-  std::vector<PropertyEntry> byType;
+  std::vector<KeyedValue> byType;
   for (const Text& type : BasicAccount::knownAccountTypes()) {
     byType.push_back({type, BasicAccount::_orderedDataclasses(
                                 BasicAccount::supportedDataclassesForAccountType(type))});

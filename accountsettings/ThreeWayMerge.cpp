@@ -20,7 +20,7 @@ std::vector<Change> changesSince(const PropertyDictionary& original,
   if (inMemory.isSameAs(original)) {
     return changes;
   }
-  const PropertyEntry* before = original.begin();
+  auto before = original.begin();
   for (const PropertyEntry& entry : inMemory) {
     for (; before != original.end() && before->key < entry.key; ++before) {
       changes.push_back({&before->key, nullptr});
@@ -39,19 +39,21 @@ std::vector<Change> changesSince(const PropertyDictionary& original,
 
 PropertyDictionary applyChanges(const std::vector<Change>& changes,
                                 const PropertyDictionary& onDisk) {
-  std::vector<PropertyEntry> result;
+  std::vector<KeyedValue> result;
   result.reserve(onDisk.size() + changes.size());
-  const PropertyEntry* disk = onDisk.begin();
+  auto disk = onDisk.begin();
   for (const Change& change : changes) {
     for (; disk != onDisk.end() && disk->key < *change.key; ++disk) {
-      result.push_back(*disk);
+      result.push_back({disk->key, disk->value});
     }
     if (change.value != nullptr) {
       result.push_back({*change.key, *change.value});
     }
     disk += disk != onDisk.end() && disk->key == *change.key ? 1 : 0;
   }
-  result.insert(result.end(), disk, onDisk.end());
+  for (; disk != onDisk.end(); ++disk) {
+    result.push_back({disk->key, disk->value});
+  }
   return PropertyDictionary(std::move(result));
 }
 

@@ -58,7 +58,7 @@ class DictionaryBuilder {
   PropertyDictionary build() && { return PropertyDictionary(std::move(entries_)); }
 
  private:
-  std::vector<PropertyEntry> entries_;
+  std::vector<KeyedValue> entries_;
 };
 
 PropertyDictionary principalConfiguration(const AccountKind& kind, const std::string& login) {

@@ -37,6 +37,7 @@ install(EXPORT AccountsFrameworkTargets NAMESPACE accounts::
 foreach(header
     platform/AccountFramework.h
     propertylist/Description.h
+    propertylist/PropertyKeys.h
     propertylist/PropertyValue.h
     propertylist/SharedNode.h
     propertylist/SharedRun.h

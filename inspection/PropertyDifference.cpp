@@ -12,8 +12,8 @@ class Comparison {
     if (before.isSameAs(after)) {
       return;
     }
-    const PropertyEntry* left = before.begin();
-    const PropertyEntry* right = after.begin();
+    auto left = before.begin();
+    auto right = after.begin();
     while (left != before.end() || right != after.end()) {
       const bool takesLeft =
           right == after.end() || (left != before.end() && left->key <= right->key);

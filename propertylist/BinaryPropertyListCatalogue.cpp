@@ -13,13 +13,6 @@ static_assert(kMaximumObjectCount < Catalogue::kContainerBit);
 
 namespace {
 
-Kind kindOfContainer(const PropertyArray&) {
-  return Kind::Array;
-}
-Kind kindOfContainer(const PropertyDictionary&) {
-  return Kind::Dictionary;
-}
-
 bool isGeneralisedUTF8(std::string_view text) {
   while (!text.empty()) {
     const std::size_t length = decodeCodePoint(text).length;
@@ -60,9 +53,10 @@ bool Catalogue::visit(const PropertyValue& value, std::size_t depth, Size& paren
       ++parent.expandedCount;
       return visitText(*value.asText(), parent);
     case PropertyKind::Dictionary:
-      return visitContainer(*value.asDictionary(), depth, parent);
+      return visitContainer(*value.asDictionary(), value.asDictionary()->values(), depth, parent);
     case PropertyKind::Array:
-      return visitContainer(*value.asArray(), depth, parent);
+      return visitContainer(*value.asArray(), {value.asArray()->begin(), value.asArray()->end()},
+                            depth, parent);
     case PropertyKind::Integer:
       return value.asSigned() != nullptr
                  ? visitNumber(ScalarKind::SignedInteger,
@@ -149,7 +143,8 @@ bool Catalogue::addBytes(ScalarKind kind, const SharedBytes& bytes) {
 }
 
 template <class Container>
-bool Catalogue::visitContainer(const Container& container, std::size_t depth, Size& parent) {
+bool Catalogue::visitContainer(const Container& container, std::span<const PropertyValue> children,
+                               std::size_t depth, Size& parent) {
   if (depth == kMaximumNestingDepth) {
     return fail("containers nested deeper than the limit");
   }
@@ -158,13 +153,13 @@ bool Catalogue::visitContainer(const Container& container, std::size_t depth, Si
     containers_[node->note()].walk = walk_;
     return addToParent(node->note(), depth, parent);
   }
-  const std::size_t firstPending = pending_.size();
   Size size;
-  if (!visitChildren(container, depth + 1, size)) {
+  const std::optional<std::uint32_t> keys = visitKeys(container, size);
+  const std::size_t firstPending = pending_.size();
+  if (!keys || !visitChildren(children, depth + 1, size)) {
     return false;
   }
-  const std::optional<Reference> number =
-      findOrAddContainer(kindOfContainer(container), firstPending, size);
+  const std::optional<Reference> number = findOrAddContainer(*keys, firstPending, size);
   if (!number) {
     return false;
   }
@@ -184,33 +179,70 @@ bool Catalogue::isKnownContainer(const SharedNodeBase* node) const {
   return container.node == node && walk_ - container.walk <= 1;
 }
 
-bool Catalogue::visitChildren(const PropertyArray& array, std::size_t depth, Size& size) {
-  return visitEach(array, depth, size,
-                   [](const PropertyValue& element) -> const PropertyValue& { return element; });
+std::optional<std::uint32_t> Catalogue::visitKeys(const PropertyArray&, Size&) {
+  return CatalogueContainer::kArray;
 }
 
-bool Catalogue::visitChildren(const PropertyDictionary& dictionary, std::size_t depth, Size& size) {
-  return std::all_of(dictionary.begin(), dictionary.end(),
-                     [&](const PropertyEntry& entry) { return visitText(entry.key, size); }) &&
-         visitEach(dictionary, depth, size,
-                   [](const PropertyEntry& entry) -> const PropertyValue& { return entry.value; });
+std::optional<std::uint32_t> Catalogue::visitKeys(const PropertyDictionary& dictionary,
+                                                  Size& size) {
+  const std::optional<std::uint32_t> number = findOrAddKeys(dictionary.keys());
+  size.expandedCount += number ? keys_[*number].expandedCount : 0;
+  return number;
 }
 
-template <class Container, class ValueOf>
-bool Catalogue::visitEach(const Container& container, std::size_t depth, Size& size,
-                          const ValueOf& valueOf) {
+std::optional<std::uint32_t> Catalogue::findOrAddKeys(const PropertyKeys& keys) {
+  const SharedNodeBase* const node = keys.sharedNode();
+  if (node != nullptr && node->note() < sharedKeys_.size() &&
+      sharedKeys_[node->note()].first.isSameAs(keys)) {
+    return sharedKeys_[node->note()].second;
+  }
+  const std::size_t firstPending = pending_.size();
+  Size size{.expandedCount = 0};
+  if (!std::all_of(keys.begin(), keys.end(),
+                   [&](const Text& key) { return visitText(key, size); })) {
+    return std::nullopt;
+  }
+  if (size.expandedCount > kMaximumExpandedValueCount) {
+    fail("a container that stands for more values than the limit");
+    return std::nullopt;
+  }
+  const std::span<const Reference> content = std::span(pending_).subspan(firstPending);
+  const auto newNumber = static_cast<std::uint32_t>(keys_.size());
+  const std::uint32_t number =
+      keysTable_.findOrAdd(hash_(asBytes(content)), newNumber, [&](std::uint32_t candidate) {
+        return asBytes(referencesOf(keys_[candidate])) == asBytes(content);
+      });
+  if (number == newNumber) {
+    keys_.push_back({.firstReference = static_cast<std::uint32_t>(references_.size()),
+                     .count = static_cast<std::uint32_t>(content.size()),
+                     .expandedCount = static_cast<std::uint32_t>(size.expandedCount)});
+    if (!moveToReferences(firstPending)) {
+      return std::nullopt;
+    }
+  }
+  pending_.resize(firstPending);
+  // Keys of one dictionary alone are not worth the memory that they would keep.
+  if (node != nullptr && !node->isUnshared()) {
+    node->setNote(static_cast<std::uint32_t>(sharedKeys_.size()));
+    sharedKeys_.emplace_back(keys, number);
+  }
+  return number;
+}
+
+bool Catalogue::visitChildren(std::span<const PropertyValue> children, std::size_t depth,
+                              Size& size) {
   // Tables are looked into for a handful of values at once, which saves a seventh of the time for
   // a large file: the memory's answers come while others are waited for.
-  constexpr std::ptrdiff_t kAnnouncedAtOnce = 16;
-  const auto* next = container.begin();
-  while (next != container.end()) {
-    const auto* const end = next + std::min(kAnnouncedAtOnce, container.end() - next);
-    std::for_each(next, end, [&](const auto& child) { announce(valueOf(child)); });
-    for (; next != end; ++next) {
-      if (!visit(valueOf(*next), depth, size)) {
-        return false;
-      }
+  constexpr std::size_t kAnnouncedAtOnce = 16;
+  while (!children.empty()) {
+    const std::span<const PropertyValue> next =
+        children.first(std::min(kAnnouncedAtOnce, children.size()));
+    std::ranges::for_each(next, [&](const PropertyValue& child) { announce(child); });
+    if (!std::ranges::all_of(
+            next, [&](const PropertyValue& child) { return visit(child, depth, size); })) {
+      return false;
     }
+    children = children.subspan(next.size());
   }
   return true;
 }
@@ -226,8 +258,9 @@ void Catalogue::announce(const PropertyValue& value) const {
   }
 }
 
-/// The number of the container whose references are the last pending ones, which it takes away.
-std::optional<Catalogue::Reference> Catalogue::findOrAddContainer(Kind kind,
+/// The number of the container whose children's references are the last pending ones, which it
+/// takes away.
+std::optional<Catalogue::Reference> Catalogue::findOrAddContainer(std::uint32_t keys,
                                                                   std::size_t firstPending,
                                                                   const Size& size) {
   if (size.expandedCount > kMaximumExpandedValueCount) {
@@ -236,21 +269,31 @@ std::optional<Catalogue::Reference> Catalogue::findOrAddContainer(Kind kind,
   }
   const std::span<const Reference> content = std::span(pending_).subspan(firstPending);
   const auto newNumber = static_cast<Reference>(containers_.size());
-  const Reference number =
-      containerTable_.findOrAdd(hash_(asBytes(content)), newNumber, [&](Reference candidate) {
-        const CatalogueContainer& other = containers_[candidate];
-        return other.kind == kind && asBytes(referencesOf(other)) == asBytes(content);
-      });
+  const std::uint32_t hash = hash_(asBytes(content)) ^ hash_(std::uint64_t{keys});
+  const Reference number = containerTable_.findOrAdd(hash, newNumber, [&](Reference candidate) {
+    const CatalogueContainer& other = containers_[candidate];
+    return other.keys == keys && asBytes(childrenOf(other)) == asBytes(content);
+  });
   if (number == newNumber) {
-    containers_.push_back({.firstReference = references_.size(),
-                           .referenceCount = static_cast<std::uint32_t>(content.size()),
+    containers_.push_back({.firstReference = static_cast<std::uint32_t>(references_.size()),
+                           .childCount = static_cast<std::uint32_t>(content.size()),
+                           .keys = keys,
                            .expandedCount = static_cast<std::uint32_t>(size.expandedCount),
-                           .height = static_cast<std::uint16_t>(size.height),
-                           .kind = kind});
-    references_.insert(references_.end(), content.begin(), content.end());
+                           .height = size.height});
+    if (!moveToReferences(firstPending)) {
+      return std::nullopt;
+    }
   }
   pending_.resize(firstPending);
   return checkObjectCount() ? std::optional(number) : std::nullopt;
+}
+
+/// Keeps the last pending references. They are counted in 32 bits, of which a fresh catalogue never
+/// comes near the end.
+bool Catalogue::moveToReferences(std::size_t firstPending) {
+  references_.insert(references_.end(),
+                     pending_.begin() + static_cast<std::ptrdiff_t>(firstPending), pending_.end());
+  return references_.size() <= UINT32_MAX || fail("more references than the limit");
 }
 
 bool Catalogue::addToParent(Reference number, std::size_t depth, Size& parent) {

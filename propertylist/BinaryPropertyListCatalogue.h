@@ -68,23 +68,32 @@ class CatalogueScalar {
 };
 static_assert(sizeof(CatalogueScalar) == 16);
 
-/// A container that a file may hold: its references are a run of the catalogue's. The keys of a
-/// dictionary come first.
-struct CatalogueContainer {
-  std::size_t firstReference = 0;
-  std::uint32_t referenceCount = 0;
+/// The keys of dictionaries that a file may hold: their references are a run of the catalogue's.
+struct CatalogueKeys {
+  std::uint32_t firstReference = 0;
+  std::uint32_t count = 0;
+  /// What the keys count beyond their values.
   std::uint32_t expandedCount = 0;
-  std::uint16_t height = 0;
-  Kind kind = Kind::Array;
+};
+
+/// A container that a file may hold: the references of its children are a run of the catalogue's.
+struct CatalogueContainer {
+  /// In place of the number of the keys of a dictionary.
+  static constexpr std::uint32_t kArray = UINT32_MAX;
+
+  std::uint32_t firstReference = 0;
+  std::uint32_t childCount = 0;
+  std::uint32_t keys = kArray;
+  std::uint32_t expandedCount = 0;
+  std::uint32_t height = 0;
   /// The walk that met it last, by number, and the node that it was met in. Its node is only kept
   /// alive, and its address only tells something, until the next walk has ended.
   std::uint32_t walk = 0;
   const SharedNodeBase* node = nullptr;
 
-  [[nodiscard]] std::uint32_t childCount() const {
-    return kind == Kind::Dictionary ? referenceCount / 2 : referenceCount;
-  }
+  [[nodiscard]] bool isDictionary() const { return keys != kArray; }
 };
+static_assert(sizeof(CatalogueContainer) == 32);
 
 /// The distinct contents of the values that a writer met, containers too. What a value refers to
 /// depends on its content alone and not on which of its parts happen to share memory. A part that
@@ -108,8 +117,15 @@ class Catalogue {
   [[nodiscard]] std::size_t scalarCount() const { return scalars_.size(); }
   [[nodiscard]] std::size_t containerCount() const { return containers_.size(); }
   [[nodiscard]] std::size_t objectCount() const { return scalarCount() + containerCount(); }
-  [[nodiscard]] std::span<const Reference> referencesOf(const CatalogueContainer& container) const {
-    return {references_.data() + container.firstReference, container.referenceCount};
+  /// The keys of a container that is a dictionary; those with the same references have the same
+  /// number.
+  [[nodiscard]] const CatalogueKeys& keys(std::uint32_t number) const { return keys_[number]; }
+  [[nodiscard]] std::size_t keysCount() const { return keys_.size(); }
+  [[nodiscard]] std::span<const Reference> childrenOf(const CatalogueContainer& container) const {
+    return {references_.data() + container.firstReference, container.childCount};
+  }
+  [[nodiscard]] std::span<const Reference> referencesOf(const CatalogueKeys& keys) const {
+    return {references_.data() + keys.firstReference, keys.count};
   }
 
  private:
@@ -125,17 +141,19 @@ class Catalogue {
   bool visitNumber(ScalarKind kind, std::uint64_t bits, Size& parent);
   bool visitData(const SharedBytes& bytes, Size& parent);
   template <class Container>
-  bool visitContainer(const Container& container, std::size_t depth, Size& parent);
-  bool visitChildren(const PropertyArray& array, std::size_t depth, Size& size);
-  bool visitChildren(const PropertyDictionary& dictionary, std::size_t depth, Size& size);
-  template <class Container, class ValueOf>
-  bool visitEach(const Container& container, std::size_t depth, Size& size, const ValueOf& valueOf);
+  bool visitContainer(const Container& container, std::span<const PropertyValue> children,
+                      std::size_t depth, Size& parent);
+  bool visitChildren(std::span<const PropertyValue> children, std::size_t depth, Size& size);
+  std::optional<std::uint32_t> visitKeys(const PropertyArray& array, Size& size);
+  std::optional<std::uint32_t> visitKeys(const PropertyDictionary& dictionary, Size& size);
+  std::optional<std::uint32_t> findOrAddKeys(const PropertyKeys& keys);
   [[nodiscard]] bool isKnown(const SharedNodeBase* bytes) const;
   [[nodiscard]] bool isKnownContainer(const SharedNodeBase* node) const;
   void announce(const PropertyValue& value) const;
   bool addBytes(ScalarKind kind, const SharedBytes& bytes);
-  std::optional<Reference> findOrAddContainer(Kind kind, std::size_t firstPending,
+  std::optional<Reference> findOrAddContainer(std::uint32_t keys, std::size_t firstPending,
                                               const Size& size);
+  bool moveToReferences(std::size_t firstPending);
   bool addToParent(Reference number, std::size_t depth, Size& parent);
   [[nodiscard]] bool checkObjectCount() const;
 
@@ -148,8 +166,12 @@ class Catalogue {
   ContentTable numberTable_;
   ContentTable bytesTable_;
   std::vector<CatalogueContainer> containers_;
-  std::vector<Reference> references_;
   ContentTable containerTable_;
+  std::vector<CatalogueKeys> keys_;
+  ContentTable keysTable_;
+  /// Keys that several dictionaries share in memory, kept alive, with their numbers.
+  std::vector<std::pair<PropertyKeys, std::uint32_t>> sharedKeys_;
+  std::vector<Reference> references_;
   /// References of the containers that are being walked, the innermost one's last.
   std::vector<Reference> pending_;
 };

@@ -1,5 +1,4 @@
 #include <algorithm>
-#include <array>
 #include <deque>
 #include <string>
 #include <vector>
@@ -7,6 +6,8 @@
 #include "propertylist/BinaryPropertyList.h"
 #include "propertylist/BinaryPropertyListFormat.h"
 #include "propertylist/BinaryPropertyListScalars.h"
+#include "propertylist/ContentTable.h"
+#include "propertylist/KeyList.h"
 #include "propertylist/PropertyListLimits.h"
 
 namespace accounts {
@@ -74,10 +75,11 @@ class Reader {
 
   std::optional<PropertyValue> read() {
     // The top object's place is an array of one element that is in no file.
-    references_.push_back(layout_.topObject);
     openContainers_.emplace_back();
     openContainers_.back().elements = PropertyArray::withRoomFor(1);
-    openContainers_.back().childCount = 1;
+    if (!readChild(openContainers_.back(), layout_.topObject)) {
+      return std::nullopt;
+    }
     while (readChildren()) {
       if (openContainers_.size() == 1) {
         return openContainers_.front().elements.at(0);
@@ -104,19 +106,29 @@ class Reader {
     State state = State::Unread;
   };
 
+  /// The keys of all dictionaries that refer to the same objects for them.
+  struct DictionaryKeys {
+    std::string_view references;
+    KeyList list;
+    /// What the keys count beyond their values.
+    std::uint64_t expandedCount;
+  };
+
   /// A container whose children are being read.
   struct Container {
-    /// One of the two, by kind. It has its room from the beginning: what is in it keeps its place.
+    /// The values of a dictionary whose keys are in order; other containers have elements. They
+    /// have their room from the beginning: what is in them keeps its place.
+    OrderedValues values;
     PropertyArray elements;
-    PropertyEntries entries;
-    Kind kind = Kind::Array;
-    std::uint16_t height = 1;
+    bool hasValues = false;
+    /// Of a dictionary.
+    const DictionaryKeys* keys = nullptr;
     Reference object = 0;
+    std::uint32_t height = 1;
     std::size_t offset = 0;
-    /// In `references_`: the keys of a dictionary, then the children.
-    std::size_t firstReference = 0;
-    std::size_t childCount = 0;
-    std::size_t nextChild = 0;
+    /// The references to the children that are not read yet.
+    const char* nextChild = nullptr;
+    const char* endOfChildren = nullptr;
     std::uint64_t expandedCount = 1;
   };
 
@@ -127,30 +139,39 @@ class Reader {
   bool readChildren() {
     for (;;) {
       Container& container = openContainers_.back();
-      if (container.nextChild == container.childCount) {
+      if (container.nextChild == container.endOfChildren) {
         return true;
       }
-      const std::size_t place = container.firstReference + container.nextChild;
-      const bool isDictionary = container.kind == Kind::Dictionary;
-      if (isDictionary && !readKey(references_[place], container)) {
+      Reference child = 0;
+      if (!readReference(container.nextChild, child)) {
         return false;
       }
-      const Reference child = references_[isDictionary ? place + container.childCount : place];
+      container.nextChild += layout_.referenceSize;
       if (!readChild(container, child)) {
         return false;
       }
     }
   }
 
+  bool readReference(const char* place, Reference& reference) {
+    const std::uint64_t stored = load(place, layout_.referenceSize);
+    if (stored >= layout_.objectCount) {
+      return fail("a reference to an object that does not exist",
+                  static_cast<std::size_t>(place - layout_.objects.data()));
+    }
+    reference = static_cast<Reference>(stored);
+    return true;
+  }
+
   /// Adds the next child to a container, or opens it if it is a container not read before.
   bool readChild(Container& container, Reference child) {
-    const Object& object = objects_[child];
+    Object& object = objects_[child];
     switch (object.state) {
       case State::Text:
-        add(container, child, *static_cast<const Text*>(object.place));
+        add(container, object, *static_cast<const Text*>(object.place));
         return true;
       case State::OtherValue:
-        add(container, child, *static_cast<const PropertyValue*>(object.place));
+        add(container, object, *static_cast<const PropertyValue*>(object.place));
         return true;
       case State::Open:
         return fail("a container that contains itself", container.offset);
@@ -165,42 +186,58 @@ class Reader {
     if (head.kind == Kind::Array || head.kind == Kind::Dictionary) {
       return open(child, offset, head);
     }
-    std::optional<PropertyValue> scalar = readScalar(child, offset, head);
+    std::optional<PropertyValue> scalar = readScalar(object, offset, head);
     if (!scalar) {
       return false;
     }
-    add(container, child, std::move(*scalar));
+    notePlace(object, add(container, object, std::move(*scalar)));
     return true;
   }
 
-  /// Adds the next child to a container, under its key.
-  void add(Container& container, Reference child, PropertyValue value) {
-    const PropertyValue* place = nullptr;
-    if (container.kind == Kind::Dictionary) {
-      const Object& key = objects_[references_[container.firstReference + container.nextChild]];
-      container.expandedCount += key.expandedCount - 1;
-      place =
-          &container.entries.append(*static_cast<const Text*>(key.place), std::move(value)).value;
-    } else {
-      place = &container.elements.append(std::move(value));
-    }
-    ++container.nextChild;
-    Object& object = objects_[child];
-    if (object.place == nullptr) {
-      const Text* text = place->asText();
-      object.state = text != nullptr ? State::Text : State::OtherValue;
-      object.place = text != nullptr ? static_cast<const void*>(text) : place;
-    }
+  /// Adds the next child to a container and returns it in its place.
+  static const PropertyValue& add(Container& container, const Object& object, PropertyValue value) {
     container.expandedCount += object.expandedCount;
-    container.height = std::max(container.height, static_cast<std::uint16_t>(object.height + 1));
+    container.height = std::max(container.height, std::uint32_t{object.height} + 1);
+    return container.hasValues ? container.values.append(std::move(value))
+                               : container.elements.append(std::move(value));
   }
 
-  /// Reads a dictionary's next key, unless it was read before; false when it is no text.
-  bool readKey(Reference key, const Container& dictionary) {
+  static void notePlace(Object& object, const PropertyValue& place) {
+    const Text* const text = place.asText();
+    object.state = text != nullptr ? State::Text : State::OtherValue;
+    object.place = text != nullptr ? static_cast<const void*>(text) : &place;
+  }
+
+  /// The keys of the dictionary at an offset, of which the references are given; null when one is
+  /// no text. Most dictionaries have the same as others: only the first of those looks at each key.
+  const DictionaryKeys* keysOf(std::string_view references, std::size_t dictionary) {
+    const auto newNumber = static_cast<std::uint32_t>(keys_.size());
+    const std::uint32_t number = keyTable_.findOrAdd(
+        hash_(references), newNumber,
+        [&](std::uint32_t candidate) { return keys_[candidate].references == references; });
+    if (number != newNumber) {
+      return &keys_[number];
+    }
+    std::vector<Text> keys;
+    std::uint64_t expandedCount = 0;
+    for (std::size_t place = 0; place < references.size(); place += layout_.referenceSize) {
+      Reference key = 0;
+      if (!readReference(references.data() + place, key) || !readKey(key, dictionary)) {
+        return nullptr;
+      }
+      keys.push_back(*static_cast<const Text*>(objects_[key].place));
+      expandedCount += objects_[key].expandedCount - 1;
+    }
+    return &keys_.emplace_back(DictionaryKeys{references, KeyList(keys), expandedCount});
+  }
+
+  /// Reads a key of the dictionary at an offset, unless it was read before; false when it is no
+  /// text.
+  bool readKey(Reference key, std::size_t dictionary) {
     constexpr std::string_view kError = "a dictionary with a key that is no text";
-    const State state = objects_[key].state;
-    if (state != State::Unread) {
-      return state == State::Text || fail(kError, dictionary.offset);
+    Object& object = objects_[key];
+    if (object.state != State::Unread) {
+      return object.state == State::Text || fail(kError, dictionary);
     }
     ObjectHead head;
     std::size_t offset = 0;
@@ -208,15 +245,13 @@ class Reader {
       return false;
     }
     if (head.kind != Kind::ASCIIText && head.kind != Kind::UTF16Text) {
-      return fail(kError, dictionary.offset);
+      return fail(kError, dictionary);
     }
-    const std::optional<PropertyValue> text = readScalar(key, offset, head);
+    std::optional<PropertyValue> text = readScalar(object, offset, head);
     if (!text) {
       return false;
     }
-    keys_.push_back(*text->asText());
-    objects_[key].place = &keys_.back();
-    objects_[key].state = State::Text;
+    notePlace(object, keyTexts_.emplace_back(*std::move(text)));
     return true;
   }
 
@@ -232,7 +267,7 @@ class Reader {
     return readHead(layout_.objects, offset, head, error_);
   }
 
-  std::optional<PropertyValue> readScalar(Reference reference, std::size_t offset,
+  std::optional<PropertyValue> readScalar(Object& object, std::size_t offset,
                                           const ObjectHead& head) {
     std::size_t end = 0;
     std::optional<PropertyValue> value = scalars_.read(offset, head, end);
@@ -240,7 +275,7 @@ class Reader {
       return std::nullopt;
     }
     // Long enough encodings alone stand for more values than one.
-    objects_[reference].expandedCount = static_cast<std::uint32_t>(
+    object.expandedCount = static_cast<std::uint32_t>(
         std::min(kMaximumExpandedValueCount + 1, 1 + expandedCountOf(*value)));
     return value;
   }
@@ -273,39 +308,32 @@ class Reader {
       return fail("a container that ends beyond the objects", offset);
     }
     const auto childCount = static_cast<std::size_t>(head.length);
-    const std::size_t firstReference = references_.size();
-    const std::size_t referenceCount = childCount * referencesPerChild;
-    if (!countBytes(offset, head.content + referenceCount * layout_.referenceSize) ||
-        !readReferences(head.content, referenceCount)) {
+    const std::size_t size = childCount * layout_.referenceSize;
+    const std::size_t firstChild = head.content + (isDictionary ? size : 0);
+    if (!countBytes(offset, firstChild + size)) {
       return false;
+    }
+    const DictionaryKeys* keys = nullptr;
+    if (isDictionary) {
+      keys = keysOf(layout_.objects.substr(head.content, size), offset);
+      if (keys == nullptr) {
+        return false;
+      }
     }
     objects_[reference].state = State::Open;
     Container& container = openContainers_.emplace_back();
-    if (isDictionary) {
-      container.entries = PropertyEntries(childCount);
+    container.hasValues = isDictionary && keys->list.isOrdered();
+    if (container.hasValues) {
+      container.values = OrderedValues(keys->list.keys());
     } else {
       container.elements = PropertyArray::withRoomFor(childCount);
     }
-    container.kind = head.kind;
+    container.keys = keys;
     container.object = reference;
     container.offset = offset;
-    container.firstReference = firstReference;
-    container.childCount = childCount;
-    return true;
-  }
-
-  bool readReferences(std::size_t begin, std::size_t count) {
-    const std::size_t first = references_.size();
-    references_.resize(first + count);
-    const char* place = layout_.objects.data() + begin;
-    for (std::size_t index = 0; index < count; ++index, place += layout_.referenceSize) {
-      const std::uint64_t reference = load(place, layout_.referenceSize);
-      if (reference >= layout_.objectCount) {
-        return fail("a reference to an object that does not exist",
-                    begin + index * layout_.referenceSize);
-      }
-      references_[first + index] = static_cast<Reference>(reference);
-    }
+    container.nextChild = layout_.objects.data() + firstChild;
+    container.endOfChildren = container.nextChild + size;
+    container.expandedCount += isDictionary ? keys->expandedCount : 0;
     return true;
   }
 
@@ -320,39 +348,23 @@ class Reader {
     if (closed.height > kMaximumNestingDepth) {
       return fail("containers nested deeper than the limit", closed.offset);
     }
-    objects_[closed.object].expandedCount = static_cast<std::uint32_t>(closed.expandedCount);
-    objects_[closed.object].height = closed.height;
-    PropertyValue value = closed.kind == Kind::Dictionary
-                              ? PropertyValue(makeDictionary(closed))
-                              : PropertyValue(std::move(closed.elements));
-    references_.resize(closed.firstReference);
-    add(openContainers_.back(), closed.object, std::move(value));
+    Object& object = objects_[closed.object];
+    object.expandedCount = static_cast<std::uint32_t>(closed.expandedCount);
+    object.height = static_cast<std::uint16_t>(closed.height);
+    notePlace(object, add(openContainers_.back(), object, valueOf(closed)));
     return true;
   }
 
-  PropertyDictionary makeDictionary(Container& container) {
-    if (areOrdered(container)) {
-      return container.entries.takeOrdered();
+  PropertyValue valueOf(Container& container) {
+    if (container.hasValues) {
+      return PropertyDictionary(container.values.take());
     }
-    // What was made in these entries must keep its place, which sorting would change.
-    const PropertyEntries& entries = unorderedEntries_.emplace_back(std::move(container.entries));
-    return PropertyDictionary(std::vector<PropertyEntry>(entries.begin(), entries.end()));
-  }
-
-  /// Whether a dictionary's keys are in order. Most dictionaries have the same keys as others: only
-  /// the first of those compares texts.
-  bool areOrdered(const Container& container) {
-    const auto begin = references_.begin() + static_cast<std::ptrdiff_t>(container.firstReference);
-    const auto end = begin + static_cast<std::ptrdiff_t>(container.childCount);
-    std::vector<Reference>& known = orderedKeys_[container.childCount % orderedKeys_.size()];
-    if (std::equal(begin, end, known.begin(), known.end())) {
-      return true;
+    if (container.keys == nullptr) {
+      return PropertyArray(std::move(container.elements));
     }
-    if (!container.entries.areOrdered()) {
-      return false;
-    }
-    known.assign(begin, end);
-    return true;
+    // What was made in these elements must keep its place, which sorting would change.
+    const PropertyArray& values = unsortedValues_.emplace_back(std::move(container.elements));
+    return container.keys->list.dictionaryOf({values.begin(), values.end()});
   }
 
   const Layout& layout_;
@@ -361,13 +373,12 @@ class Reader {
   std::size_t bytesRead_ = 0;
   std::vector<Object> objects_;
   std::vector<Container> openContainers_;
-  /// Those of the open containers, the innermost one's last.
-  std::vector<Reference> references_;
+  std::deque<DictionaryKeys> keys_;
+  KeyedHash hash_;
+  ContentTable keyTable_;
   /// Texts that were first met as keys.
-  std::deque<Text> keys_;
-  std::vector<PropertyEntries> unorderedEntries_;
-  /// The keys of dictionaries that were in order, one for each remainder of their number.
-  std::array<std::vector<Reference>, 32> orderedKeys_;
+  std::deque<PropertyValue> keyTexts_;
+  std::vector<PropertyArray> unsortedValues_;
 };
 
 }  // namespace

@@ -1,5 +1,6 @@
 #include <algorithm>
 #include <bit>
+#include <span>
 #include <string>
 #include <type_traits>
 #include <utility>
@@ -167,7 +168,8 @@ class FileOrder {
   FileOrder(const Catalogue& catalogue, Catalogue::Reference top)
       : catalogue_(catalogue),
         scalarNumbers_(catalogue.scalarCount(), kNone),
-        containerNumbers_(catalogue.containerCount(), kNone) {
+        containerNumbers_(catalogue.containerCount(), kNone),
+        hasKeys_(catalogue.keysCount(), false) {
     visit(top);
   }
 
@@ -197,8 +199,15 @@ class FileOrder {
     if (containerNumbers_[container] != kNone) {
       return;
     }
-    for (const Catalogue::Reference child :
-         catalogue_.referencesOf(catalogue_.container(container))) {
+    const CatalogueContainer& visited = catalogue_.container(container);
+    if (visited.isDictionary() && !hasKeys_[visited.keys]) {
+      hasKeys_[visited.keys] = true;
+      for (const Catalogue::Reference key :
+           catalogue_.referencesOf(catalogue_.keys(visited.keys))) {
+        visit(key);
+      }
+    }
+    for (const Catalogue::Reference child : catalogue_.childrenOf(visited)) {
       visit(child);
     }
     leave(container, containerNumbers_, containers_);
@@ -215,6 +224,8 @@ class FileOrder {
   const Catalogue& catalogue_;
   std::vector<Catalogue::Reference> scalarNumbers_;
   std::vector<Catalogue::Reference> containerNumbers_;
+  /// Whether the keys with a number have their places.
+  std::vector<bool> hasKeys_;
   std::vector<Catalogue::Reference> scalars_;
   std::vector<Catalogue::Reference> containers_;
 };
@@ -233,7 +244,8 @@ class File {
     }
     for (const Catalogue::Reference number : order.containers()) {
       const CatalogueContainer& container = catalogue.container(number);
-      table_ += sizeOfHead(container.childCount()) + container.referenceCount * referenceSize_;
+      table_ += sizeOfHead(container.childCount) +
+                (container.isDictionary() ? 2 : 1) * container.childCount * referenceSize_;
     }
     offsetSize_ = sizeToHold(table_);
   }
@@ -270,17 +282,36 @@ class File {
       scalarOffsets.putNumber<OffsetSize>(offset());
       output.putScalar(catalogue_.scalar(number));
     }
+    std::vector<const char*> placesOfKeys(catalogue_.keysCount());
     const auto& containers = order_.containers();
     for (auto number = containers.rbegin(); number != containers.rend(); ++number) {
       const CatalogueContainer& container = catalogue_.container(*number);
       containerOffsets.putNumber<OffsetSize>(offset());
-      output.putHead(container.kind, container.childCount());
-      withConstantSize(referenceSize_, [&](auto size) {
-        for (const Catalogue::Reference reference : catalogue_.referencesOf(container)) {
-          output.putNumber<size()>(order_.numberInFile(reference));
-        }
-      });
+      output.putHead(container.isDictionary() ? Kind::Dictionary : Kind::Array,
+                     container.childCount);
+      if (container.isDictionary()) {
+        putKeys(output, container.keys, placesOfKeys[container.keys]);
+      }
+      putReferences(output, catalogue_.childrenOf(container));
     }
+  }
+
+  /// Puts the keys with a number down, as they stand in a place if they were put down before.
+  void putKeys(Output& output, std::uint32_t number, const char*& place) const {
+    const CatalogueKeys& keys = catalogue_.keys(number);
+    if (place != nullptr) {
+      return output.putBytes({place, keys.count * referenceSize_});
+    }
+    place = output.place();
+    putReferences(output, catalogue_.referencesOf(keys));
+  }
+
+  void putReferences(Output& output, std::span<const Catalogue::Reference> references) const {
+    withConstantSize(referenceSize_, [&](auto size) {
+      for (const Catalogue::Reference reference : references) {
+        output.putNumber<size()>(order_.numberInFile(reference));
+      }
+    });
   }
 
   const Catalogue& catalogue_;

@@ -7,9 +7,9 @@ namespace accounts {
 
 namespace {
 
-/// Tables grow by four: those outgrown on the way then take a third of the last one's memory, not
-/// as much again.
-constexpr std::size_t kGrowth = 4;
+/// The largest tables are tens of megabytes: with a larger step the last one could be four times
+/// what is needed.
+constexpr std::size_t kGrowth = 2;
 
 }  // namespace
 

@@ -203,7 +203,7 @@ void appendArray(std::string& line, const PropertyArray& array) {
 void appendDictionary(std::string& line, const PropertyDictionary& dictionary) {
   line.push_back('{');
   for (const PropertyEntry& entry : dictionary) {
-    if (&entry != dictionary.begin()) {
+    if (&entry.value != dictionary.values().data()) {
       line.push_back(',');
     }
     appendQuoted(line, entry.key);

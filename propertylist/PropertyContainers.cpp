@@ -8,9 +8,8 @@ namespace {
 
 /// The run that a handle holds, to be changed: it is shared with nobody and has room for `more`
 /// elements.
-template <class Element, class Owner>
-SharedRun<Element>& runToChange(SharedNode<Owner>& handle, std::size_t more) {
-  using Run = SharedRun<Element>;
+template <class Run, class Owner>
+Run& runToChange(SharedNode<Owner>& handle, std::size_t more) {
   Run* const run = static_cast<Run*>(handle.get());
   const std::size_t size = run != nullptr ? run->size() : 0;
   const bool isOurs = run != nullptr && run->isUnshared();
@@ -18,27 +17,15 @@ SharedRun<Element>& runToChange(SharedNode<Owner>& handle, std::size_t more) {
     return *run;
   }
   // The rest of the room grows with the size, so that adding many one by one is no quadratic work.
-  SharedNode<Owner> changed(Run::make(size + more + (more > 0 ? size / 4 : 0)));
+  // A copy of what is shared has none: as a rule it is changed once.
+  SharedNode<Owner> changed(Run::make(size + more + (isOurs ? size / 4 : 0)));
   Run& changedRun = *static_cast<Run*>(changed.get());
   for (std::size_t index = 0; index < size; ++index) {
-    Element& element = run->begin()[index];
+    PropertyValue& element = run->begin()[index];
     changedRun.append(isOurs ? std::move(element) : element);
   }
   handle = std::move(changed);
   return changedRun;
-}
-
-/// A handle to a run of these elements; null for none.
-template <class Owner, class Element>
-SharedNode<Owner> runOf(std::vector<Element> elements) {
-  if (elements.empty()) {
-    return {};
-  }
-  SharedNode<Owner> handle(SharedRun<Element>::make(elements.size()));
-  for (Element& element : elements) {
-    static_cast<SharedRun<Element>*>(handle.get())->append(std::move(element));
-  }
-  return handle;
 }
 
 }  // namespace
@@ -47,12 +34,16 @@ PropertyArray::PropertyArray(std::initializer_list<PropertyValue> values)
     : PropertyArray(std::vector<PropertyValue>(values)) {}
 
 PropertyArray::PropertyArray(std::vector<PropertyValue> values)
-    : node_(runOf<PropertyArray>(std::move(values))) {}
+    : PropertyArray(withRoomFor(values.size())) {
+  for (PropertyValue& value : values) {
+    run()->append(std::move(value));
+  }
+}
 
 PropertyArray PropertyArray::withRoomFor(std::size_t count) {
   PropertyArray array;
   if (count > 0) {
-    runToChange<PropertyValue>(array.node_, count);
+    array.node_ = SharedNode<PropertyArray>(Run::make(count));
   }
   return array;
 }
@@ -68,18 +59,18 @@ bool PropertyArray::containsText(std::string_view text) const {
 }
 
 const PropertyValue& PropertyArray::append(PropertyValue value) {
-  return runToChange<PropertyValue>(node_, 1).append(std::move(value));
+  return runToChange<Run>(node_, 1).append(std::move(value));
 }
 
 void PropertyArray::replace(std::size_t index, PropertyValue value) {
-  runToChange<PropertyValue>(node_, 0).begin()[index] = std::move(value);
+  runToChange<Run>(node_, 0).begin()[index] = std::move(value);
 }
 
 void PropertyArray::removeText(std::string_view text) {
   if (!containsText(text)) {
     return;
   }
-  Run& run = runToChange<PropertyValue>(node_, 0);
+  Run& run = runToChange<Run>(node_, 0);
   run.truncate(std::remove_if(run.begin(), run.end(), [&](const PropertyValue& element) {
     return element.asText() != nullptr && *element.asText() == text;
   }));
@@ -91,63 +82,71 @@ bool operator==(const PropertyArray& left, const PropertyArray& right) {
 
 namespace {
 
-bool keyIsBefore(const PropertyEntry& entry, std::string_view key) {
-  return entry.key.view() < key;
+bool keyIsBefore(const KeyedValue& left, const KeyedValue& right) {
+  return left.key.view() < right.key.view();
 }
 
-bool areInOrder(const PropertyEntry* begin, const PropertyEntry* end) {
-  return std::adjacent_find(begin, end, [](const PropertyEntry& left, const PropertyEntry& right) {
-           return left.key.view() >= right.key.view();
-         }) == end;
-}
-
-/// Sorts by key; of entries with the same key only the last one is left.
-std::vector<PropertyEntry> sortedByKey(std::vector<PropertyEntry> entries) {
-  // Files of our own are written in key order: most dictionaries need no sorting.
-  if (areInOrder(entries.data(), entries.data() + entries.size())) {
-    return entries;
-  }
-  std::stable_sort(entries.begin(), entries.end(),
-                   [](const PropertyEntry& left, const PropertyEntry& right) {
-                     return left.key.view() < right.key.view();
-                   });
-  std::vector<PropertyEntry> unique;
-  unique.reserve(entries.size());
-  for (PropertyEntry& entry : entries) {
-    if (!unique.empty() && unique.back().key == entry.key) {
-      unique.back() = std::move(entry);
+/// Sorts by key; of values with the same key only the last one is left.
+std::vector<KeyedValue> sortedByKey(std::vector<KeyedValue> values) {
+  std::stable_sort(values.begin(), values.end(), keyIsBefore);
+  std::vector<KeyedValue> unique;
+  unique.reserve(values.size());
+  for (KeyedValue& value : values) {
+    if (!unique.empty() && unique.back().key == value.key) {
+      unique.back() = std::move(value);
     } else {
-      unique.push_back(std::move(entry));
+      unique.push_back(std::move(value));
     }
   }
   return unique;
 }
 
+bool areInOrder(const std::vector<KeyedValue>& values) {
+  return std::adjacent_find(values.begin(), values.end(),
+                            [](const KeyedValue& left, const KeyedValue& right) {
+                              return !keyIsBefore(left, right);
+                            }) == values.end();
+}
+
 }  // namespace
 
-PropertyDictionary::PropertyDictionary(std::initializer_list<PropertyEntry> entries)
-    : PropertyDictionary(std::vector<PropertyEntry>(entries)) {}
-
-PropertyDictionary::PropertyDictionary(std::vector<PropertyEntry> entries)
-    : node_(runOf<PropertyDictionary>(sortedByKey(std::move(entries)))) {}
-
-PropertyEntries::PropertyEntries(std::size_t count) {
-  if (count > 0) {
-    runToChange<PropertyEntry>(entries_.node_, count);
+/// A dictionary with room for the values, and none of them.
+PropertyDictionary::PropertyDictionary(PropertyKeys keys, std::size_t room)
+    : node_(room > 0 ? Run::make(room) : nullptr) {
+  if (node_) {
+    run()->keys = std::move(keys);
   }
 }
 
-const PropertyEntry& PropertyEntries::append(Text key, PropertyValue value) {
-  return entries_.run()->append({std::move(key), std::move(value)});
+PropertyDictionary::PropertyDictionary(std::initializer_list<KeyedValue> values)
+    : PropertyDictionary(std::vector<KeyedValue>(values)) {}
+
+PropertyDictionary::PropertyDictionary(std::vector<KeyedValue> values) {
+  if (!areInOrder(values)) {
+    values = sortedByKey(std::move(values));
+  }
+  std::vector<Text> keys;
+  keys.reserve(values.size());
+  for (KeyedValue& value : values) {
+    keys.push_back(std::move(value.key));
+  }
+  *this = PropertyDictionary(PropertyKeys(keys), keys.size());
+  for (KeyedValue& value : values) {
+    run()->append(std::move(value.value));
+  }
 }
 
-bool PropertyEntries::areOrdered() const {
-  return areInOrder(begin(), end());
+OrderedValues::OrderedValues(PropertyKeys keys) {
+  const std::size_t count = keys.size();
+  values_ = PropertyDictionary(std::move(keys), count);
 }
 
 const PropertyValue* PropertyDictionary::find(std::string_view key) const {
-  const PropertyEntry* place = std::lower_bound(begin(), end(), key, keyIsBefore);
-  return place != end() && place->key == key ? &place->value : nullptr;
+  if (!node_) {
+    return nullptr;
+  }
+  const PropertyKeys::Place place = run()->keys.find(key);
+  return place.isThere ? run()->begin() + place.index : nullptr;
 }
 
 std::optional<Text> PropertyDictionary::textForKey(std::string_view key) const {
@@ -168,13 +167,18 @@ std::optional<PropertyDictionary> PropertyDictionary::dictionaryForKey(std::stri
   return dictionary != nullptr ? std::optional(*dictionary) : std::nullopt;
 }
 
-void PropertyDictionary::set(Text key, PropertyValue value) {
-  const auto index = std::lower_bound(begin(), end(), key.view(), keyIsBefore) - begin();
-  if (index < end() - begin() && begin()[index].key == key) {
-    runToChange<PropertyEntry>(node_, 0).begin()[index].value = std::move(value);
+void PropertyDictionary::set(std::string_view key, PropertyValue value) {
+  PropertyKeys keys = this->keys();
+  const auto [index, isThere] = keys.find(key);
+  if (!isThere) {
+    keys = keys.with(key, index);
+  }
+  Run& run = runToChange<Run>(node_, isThere ? 0 : 1);
+  run.keys = std::move(keys);
+  if (isThere) {
+    run.begin()[index] = std::move(value);
   } else {
-    Run& run = runToChange<PropertyEntry>(node_, 1);
-    run.insert(run.begin() + index, PropertyEntry{std::move(key), std::move(value)});
+    run.insert(run.begin() + index, std::move(value));
   }
 }
 
@@ -183,22 +187,22 @@ void PropertyDictionary::remove(std::string_view key) {
 }
 
 std::optional<PropertyValue> PropertyDictionary::take(std::string_view key) {
-  if (!contains(key)) {
+  PropertyKeys keys = this->keys();
+  const auto [index, isThere] = keys.find(key);
+  if (!isThere) {
     return std::nullopt;
   }
-  Run& run = runToChange<PropertyEntry>(node_, 0);
-  PropertyEntry* const place = std::lower_bound(run.begin(), run.end(), key, keyIsBefore);
-  std::optional<PropertyValue> value(std::move(place->value));
+  Run& run = runToChange<Run>(node_, 0);
+  run.keys = keys.without(index);
+  PropertyValue* const place = run.begin() + index;
+  std::optional<PropertyValue> value(std::move(*place));
   run.truncate(std::move(place + 1, run.end(), place));
   return value;
 }
 
 bool operator==(const PropertyDictionary& left, const PropertyDictionary& right) {
   return left.isSameAs(right) ||
-         std::equal(left.begin(), left.end(), right.begin(), right.end(),
-                    [](const PropertyEntry& leftEntry, const PropertyEntry& rightEntry) {
-                      return leftEntry.key == rightEntry.key && leftEntry.value == rightEntry.value;
-                    });
+         (left.keys() == right.keys() && std::ranges::equal(left.values(), right.values()));
 }
 
 }  // namespace accounts

@@ -1,13 +1,17 @@
 #pragma once
 
 #include <concepts>
+#include <cstddef>
 #include <cstdint>
 #include <initializer_list>
+#include <iterator>
 #include <optional>
+#include <span>
 #include <string_view>
 #include <utility>
 #include <vector>
 
+#include "propertylist/PropertyKeys.h"
 #include "propertylist/SharedNode.h"
 #include "propertylist/SharedRun.h"
 #include "propertylist/Text.h"
@@ -15,7 +19,8 @@
 namespace accounts {
 
 class PropertyValue;
-struct PropertyEntry;
+class PropertyEntryIterator;
+struct KeyedValue;
 
 /// The kinds of value that a property list holds. Boolean is a kind of its own: the integer 1 is
 /// not true.
@@ -94,14 +99,17 @@ class PropertyArray {
 class PropertyDictionary {
  public:
   PropertyDictionary() = default;
-  PropertyDictionary(std::initializer_list<PropertyEntry> entries);
-  /// Takes entries in any order, in O(n log n); of entries with the same key the last one holds.
-  explicit PropertyDictionary(std::vector<PropertyEntry> entries);
+  PropertyDictionary(std::initializer_list<KeyedValue> values);
+  /// Takes values in any order, in O(n log n); of those with the same key the last one holds.
+  explicit PropertyDictionary(std::vector<KeyedValue> values);
   [[nodiscard]] std::size_t size() const { return node_ ? run()->size() : 0; }
   [[nodiscard]] bool empty() const { return size() == 0; }
   /// The entries in key order.
-  [[nodiscard]] const PropertyEntry* begin() const;
-  [[nodiscard]] const PropertyEntry* end() const;
+  [[nodiscard]] PropertyEntryIterator begin() const;
+  [[nodiscard]] PropertyEntryIterator end() const;
+  /// The keys alone, and the values alone, in the same order.
+  [[nodiscard]] const PropertyKeys& keys() const;
+  [[nodiscard]] std::span<const PropertyValue> values() const;
 
   /// The value under a key, null for none; valid until the dictionary changes or goes.
   [[nodiscard]] const PropertyValue* find(std::string_view key) const;
@@ -111,12 +119,12 @@ class PropertyDictionary {
   [[nodiscard]] std::optional<PropertyArray> arrayForKey(std::string_view key) const;
   [[nodiscard]] std::optional<PropertyDictionary> dictionaryForKey(std::string_view key) const;
 
-  void set(Text key, PropertyValue value);
+  void set(std::string_view key, PropertyValue value);
   void remove(std::string_view key);
   /// Removes the value under a key and returns it; none when there was none.
   std::optional<PropertyValue> take(std::string_view key);
 
-  /// True when both share the same entries in memory: equal without a comparison.
+  /// True when both share the same keys and values in memory: equal without a comparison.
   [[nodiscard]] bool isSameAs(const PropertyDictionary& other) const {
     return node_.get() == other.node_.get();
   }
@@ -128,8 +136,12 @@ class PropertyDictionary {
  private:
   friend class SharedNode<PropertyDictionary>;
   friend class PropertyContent;
-  friend class PropertyEntries;
-  using Run = SharedRun<PropertyEntry>;
+  friend class OrderedValues;
+  struct Head : SharedNodeBase {
+    PropertyKeys keys;
+  };
+  using Run = SharedRun<PropertyValue, Head>;
+  PropertyDictionary(PropertyKeys keys, std::size_t room);
   [[nodiscard]] Run* run() const { return static_cast<Run*>(node_.get()); }
   static void destroyNode(SharedNodeBase* node) { Run::destroy(node); }
   SharedNode<PropertyDictionary> node_;
@@ -292,31 +304,69 @@ class PropertyValue {
   PropertyContent content_;
 };
 
-/// One key of a dictionary with its value.
-struct PropertyEntry {
+/// A value with the key that it is to have in a dictionary.
+struct KeyedValue {
   Text key;
   PropertyValue value;
 };
 
-/// The entries of a dictionary in the making, of which the number is known: each keeps its place in
-/// memory, in the dictionary that is made of them too.
-class PropertyEntries {
- public:
-  PropertyEntries() = default;
-  explicit PropertyEntries(std::size_t count);
+/// One key of a dictionary with its value, both valid until the dictionary changes or goes.
+struct PropertyEntry {
+  const Text& key;
+  const PropertyValue& value;
+};
 
-  [[nodiscard]] const PropertyEntry* begin() const { return entries_.begin(); }
-  [[nodiscard]] const PropertyEntry* end() const { return entries_.end(); }
-  /// Adds an entry, not more of them than the number given, and returns it in its place.
-  const PropertyEntry& append(Text key, PropertyValue value);
-  /// Whether the keys are all different and in order.
-  [[nodiscard]] bool areOrdered() const;
-  /// The dictionary of entries that are ordered.
-  [[nodiscard]] PropertyDictionary takeOrdered() { return std::move(entries_); }
+/// Goes through the entries of a dictionary.
+class PropertyEntryIterator {
+ public:
+  using iterator_concept = std::forward_iterator_tag;
+  using iterator_category = std::input_iterator_tag;
+  using difference_type = std::ptrdiff_t;
+  using value_type = PropertyEntry;
+  using reference = PropertyEntry;
+  struct pointer {
+    PropertyEntry entry;
+    const PropertyEntry* operator->() const { return &entry; }
+  };
+
+  PropertyEntryIterator() = default;
+  PropertyEntryIterator(const Text* key, const PropertyValue* value) : key_(key), value_(value) {}
+
+  PropertyEntry operator*() const { return {*key_, *value_}; }
+  pointer operator->() const { return {**this}; }
+  PropertyEntryIterator& operator++() { return *this += 1; }
+  PropertyEntryIterator operator++(int) { return std::exchange(*this, {key_ + 1, value_ + 1}); }
+  PropertyEntryIterator& operator+=(difference_type count) {
+    key_ += count;
+    value_ += count;
+    return *this;
+  }
+  friend bool operator==(const PropertyEntryIterator& left, const PropertyEntryIterator& right) {
+    return left.value_ == right.value_;
+  }
+
+ private:
+  const Text* key_ = nullptr;
+  const PropertyValue* value_ = nullptr;
+};
+
+/// The values of a dictionary in the making, of which the keys are known: each keeps its place in
+/// memory, in the dictionary that is made of them too.
+class OrderedValues {
+ public:
+  OrderedValues() = default;
+  explicit OrderedValues(PropertyKeys keys);
+
+  /// Adds the next key's value, not more of them than there are keys, and returns it in its place.
+  const PropertyValue& append(PropertyValue value) {
+    return values_.run()->append(std::move(value));
+  }
+  /// The dictionary, once each key has its value.
+  [[nodiscard]] PropertyDictionary take() { return std::move(values_); }
 
  private:
   /// One only when it is taken.
-  PropertyDictionary entries_;
+  PropertyDictionary values_;
 };
 
 inline const PropertyValue* PropertyArray::begin() const {
@@ -325,11 +375,21 @@ inline const PropertyValue* PropertyArray::begin() const {
 inline const PropertyValue* PropertyArray::end() const {
   return node_ ? run()->end() : nullptr;
 }
-inline const PropertyEntry* PropertyDictionary::begin() const {
-  return node_ ? run()->begin() : nullptr;
+inline PropertyEntryIterator PropertyDictionary::begin() const {
+  return node_ ? PropertyEntryIterator(run()->keys.begin(), run()->begin())
+               : PropertyEntryIterator();
 }
-inline const PropertyEntry* PropertyDictionary::end() const {
-  return node_ ? run()->end() : nullptr;
+inline PropertyEntryIterator PropertyDictionary::end() const {
+  return node_ ? PropertyEntryIterator(run()->keys.begin() + run()->size(), run()->end())
+               : PropertyEntryIterator();
+}
+inline const PropertyKeys& PropertyDictionary::keys() const {
+  static const PropertyKeys kNone;
+  return node_ ? run()->keys : kNone;
+}
+inline std::span<const PropertyValue> PropertyDictionary::values() const {
+  return node_ ? std::span<const PropertyValue>(run()->begin(), run()->size())
+               : std::span<const PropertyValue>();
 }
 
 }  // namespace accounts

@@ -13,8 +13,9 @@ namespace accounts {
 
 /// A shared node with a run of elements in its own memory: they are found, made and freed with the
 /// node, not by a second piece of memory. It never moves; what does not fit goes into a larger one.
-template <class Element>
-class SharedRun : public SharedNodeBase {
+/// `Head` is what the node has besides its elements.
+template <class Element, class Head = SharedNodeBase>
+class SharedRun : public Head {
  public:
   /// An empty run with room for a number of elements.
   static SharedRun* make(std::size_t capacity) {

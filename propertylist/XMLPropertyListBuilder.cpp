@@ -59,14 +59,31 @@ std::optional<PropertyValue> valueOf(Element element, std::string_view character
 
 }  // namespace
 
-Text KeyTable::textFor(std::string_view key) {
+std::uint32_t KeyTable::numberOf(std::string_view key) {
   const auto newNumber = static_cast<std::uint32_t>(keys_.size());
   const std::uint32_t number = numbers_.findOrAdd(
       hash_(key), newNumber, [&](std::uint32_t candidate) { return keys_[candidate] == key; });
   if (number == newNumber) {
     keys_.emplace_back(key);
   }
-  return keys_[number];
+  return number;
+}
+
+const KeyList& KeyTable::listOf(std::span<const std::uint32_t> numbers) {
+  const std::string_view bytes(reinterpret_cast<const char*>(numbers.data()), numbers.size_bytes());
+  const auto newNumber = static_cast<std::uint32_t>(lists_.size());
+  const std::uint32_t number =
+      listNumbers_.findOrAdd(hash_(bytes), newNumber, [&](std::uint32_t candidate) {
+        return std::ranges::equal(lists_[candidate].numbers, numbers);
+      });
+  if (number == newNumber) {
+    std::vector<Text> keys;
+    for (const std::uint32_t key : numbers) {
+      keys.push_back(keys_[key]);
+    }
+    lists_.push_back({{numbers.begin(), numbers.end()}, KeyList(keys)});
+  }
+  return lists_[number].list;
 }
 
 bool ValueBuilder::fail(std::string_view what) {
@@ -175,16 +192,21 @@ bool ValueBuilder::endContainer() {
 }
 
 PropertyDictionary ValueBuilder::takeDictionary(const Container& container) {
-  PropertyEntries entries(keys_.size() - container.firstKey);
-  for (std::size_t key = container.firstKey, value = container.firstValue; key < keys_.size();
-       ++key, ++value) {
-    entries.append(std::move(keys_[key]), std::move(values_[value]));
+  const KeyList& list = keyTable_.listOf(std::span(keys_).subspan(container.firstKey));
+  const std::span<PropertyValue> values = std::span(values_).subspan(container.firstValue);
+  PropertyDictionary dictionary;
+  if (list.isOrdered()) {
+    OrderedValues ordered(list.keys());
+    for (PropertyValue& value : values) {
+      ordered.append(std::move(value));
+    }
+    dictionary = ordered.take();
+  } else {
+    dictionary = list.dictionaryOf(values);
   }
   keys_.resize(container.firstKey);
   dropValuesFrom(container.firstValue);
-  return entries.areOrdered()
-             ? entries.takeOrdered()
-             : PropertyDictionary(std::vector<PropertyEntry>(entries.begin(), entries.end()));
+  return dictionary;
 }
 
 PropertyArray ValueBuilder::takeArray(const Container& container) {
@@ -201,7 +223,7 @@ void ValueBuilder::dropValuesFrom(std::size_t first) {
 }
 
 bool ValueBuilder::addKey() {
-  keys_.push_back(keyTable_.textFor(characters_));
+  keys_.push_back(keyTable_.numberOf(characters_));
   return count(expandedCountOfBytes(characters_.size()));
 }
 

@@ -1,12 +1,15 @@
 #pragma once
 
 #include <cstdint>
+#include <deque>
 #include <optional>
+#include <span>
 #include <string>
 #include <string_view>
 #include <vector>
 
 #include "propertylist/ContentTable.h"
+#include "propertylist/KeyList.h"
 #include "propertylist/PropertyValue.h"
 #include "propertylist/XMLPropertyListScalars.h"
 
@@ -27,15 +30,24 @@ enum class Element : std::uint8_t {
   Data
 };
 
-/// One text for each key, however often it occurs: records repeat the same few keys.
+/// The keys of a document, numbered, and the lists of them that its dictionaries have: records
+/// repeat the same few.
 class KeyTable {
  public:
-  Text textFor(std::string_view key);
+  std::uint32_t numberOf(std::string_view key);
+  /// The list of keys with these numbers; valid as long as the table.
+  const KeyList& listOf(std::span<const std::uint32_t> numbers);
 
  private:
+  struct NumberedList {
+    std::vector<std::uint32_t> numbers;
+    KeyList list;
+  };
   KeyedHash hash_;
   ContentTable numbers_;
   std::vector<Text> keys_;
+  ContentTable listNumbers_;
+  std::deque<NumberedList> lists_;
 };
 
 /// Builds a value from the events of an XML document in their order. The document must be
@@ -83,7 +95,8 @@ class ValueBuilder {
 
   std::vector<Container> containers_;
   std::vector<PropertyValue> values_;
-  std::vector<Text> keys_;
+  /// Their numbers.
+  std::vector<std::uint32_t> keys_;
   KeyTable keyTable_;
   /// The element that is open and holds characters, with what it holds so far.
   std::optional<Element> scalar_;

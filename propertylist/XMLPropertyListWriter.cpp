@@ -66,8 +66,9 @@ class Writer {
     if (container.array != nullptr) {
       return put(container.array->at(index));
     }
-    const PropertyEntry& entry = container.dictionary->begin()[index];
-    return putCharacters("key", entry.key) && put(entry.value);
+    const PropertyDictionary& dictionary = *container.dictionary;
+    return putCharacters("key", dictionary.keys().begin()[index]) &&
+           put(dictionary.values()[index]);
   }
 
   bool put(const PropertyValue& value) {
@@ -169,7 +170,7 @@ class Writer {
       path += '/';
       const std::size_t index = container.next - 1;
       if (container.dictionary != nullptr) {
-        path += container.dictionary->begin()[index].key.view();
+        path += container.dictionary->keys().begin()[index].view();
       } else {
         path += std::to_string(index);
       }

@@ -228,6 +228,25 @@ TEST(BinaryStructure, AValueMadeInADictionaryOutOfOrderIsSharedWithOthers) {
                                         PropertyArray{"a"}}));
 }
 
+TEST(BinaryStructure, DictionariesThatListTheSameKeysShareThemInMemory) {
+  for (const bool isOrdered : {true, false}) {
+    BinaryFile file;
+    const std::size_t first = file.add(isOrdered ? "\x51x" : "\x51y");
+    const std::size_t second = file.add(isOrdered ? "\x51y" : "\x51x");
+    const std::size_t one = file.addContainer(kDictionaryOfTwo, {first, second, first, second});
+    const std::size_t other = file.addContainer(kDictionaryOfTwo, {first, second, second, first});
+    file.addContainer(kArrayOfTwo, {one, other});
+
+    const PropertyValue value = readBinary(file.build());
+
+    const PropertyDictionary& left = *value.asArray()->at(0).asDictionary();
+    const PropertyDictionary& right = *value.asArray()->at(1).asDictionary();
+    EXPECT_EQ(left, (PropertyDictionary{{"x", "x"}, {"y", "y"}}));
+    EXPECT_EQ(right, (PropertyDictionary{{"x", "y"}, {"y", "x"}}));
+    EXPECT_TRUE(left.keys().isSameAs(right.keys()));
+  }
+}
+
 TEST(BinaryStructure, AKeyThatIsNoTextIsRefused) {
   for (const char* key : {"\x10\x01", "\x09", "\x41x", "\xA0", "\xD0"}) {
     BinaryFile file;

@@ -8,6 +8,7 @@
 namespace accounts {
 namespace {
 
+using namespace std::string_literals;
 using testing::contains;
 using testing::errorOfReadingXML;
 using testing::inPropertyList;
@@ -74,15 +75,19 @@ TEST(XMLStructure, OfTheSameKeyTwiceTheLastOneHolds) {
             PropertyValue(PropertyDictionary{{"k", 2}}));
 }
 
-TEST(XMLStructure, TheSameKeyOfDifferentDictionariesIsSharedInMemory) {
-  const PropertyValue value = readXML(inPropertyList(
-      "<array><dict><key>k</key><true/></dict><dict><key>k</key><false/></dict></array>"));
+TEST(XMLStructure, DictionariesThatListTheSameKeysShareThemInMemory) {
+  for (const char* keys : {"<dict><key>a</key><true/><key>b</key><true/></dict>",
+                           "<dict><key>b</key><true/><key>a</key><true/></dict>"}) {
+    const PropertyValue value =
+        readXML(inPropertyList("<array>"s + keys + keys + "<dict/></array>"));
 
-  const auto keyOf = [&](std::size_t index) {
-    return value.asArray()->at(index).asDictionary()->begin()->key;
-  };
-  ASSERT_EQ(value.asArray()->size(), 2U);
-  EXPECT_EQ(keyOf(0).bytes().sharedNode(), keyOf(1).bytes().sharedNode());
+    const PropertyArray& dictionaries = *value.asArray();
+    ASSERT_EQ(dictionaries.size(), 3U);
+    EXPECT_EQ(dictionaries.at(0), PropertyValue(PropertyDictionary{{"a", true}, {"b", true}}));
+    EXPECT_TRUE(dictionaries.at(0).asDictionary()->keys().isSameAs(
+        dictionaries.at(1).asDictionary()->keys()));
+    EXPECT_EQ(dictionaries.at(2), PropertyValue(PropertyDictionary()));
+  }
 }
 
 TEST(XMLStructure, ContainersMayNestAsDeepAsTheLimit) {
