@@ -24,6 +24,9 @@ Run& runToChange(SharedNode<Owner>& handle, std::size_t more) {
     PropertyValue& element = run->begin()[index];
     changedRun.append(isOurs ? std::move(element) : element);
   }
+  if constexpr (requires { run->keys; }) {
+    changedRun.keys = run != nullptr ? run->keys : PropertyKeys();
+  }
   handle = std::move(changed);
   return changedRun;
 }
@@ -168,16 +171,12 @@ std::optional<PropertyDictionary> PropertyDictionary::dictionaryForKey(std::stri
 }
 
 void PropertyDictionary::set(std::string_view key, PropertyValue value) {
-  PropertyKeys keys = this->keys();
-  const auto [index, isThere] = keys.find(key);
-  if (!isThere) {
-    keys = keys.with(key, index);
-  }
+  const auto [index, isThere] = keys().find(key);
   Run& run = runToChange<Run>(node_, isThere ? 0 : 1);
-  run.keys = std::move(keys);
   if (isThere) {
     run.begin()[index] = std::move(value);
   } else {
+    run.keys = run.keys.with(key, index);
     run.insert(run.begin() + index, std::move(value));
   }
 }
@@ -187,13 +186,12 @@ void PropertyDictionary::remove(std::string_view key) {
 }
 
 std::optional<PropertyValue> PropertyDictionary::take(std::string_view key) {
-  PropertyKeys keys = this->keys();
-  const auto [index, isThere] = keys.find(key);
+  const auto [index, isThere] = keys().find(key);
   if (!isThere) {
     return std::nullopt;
   }
   Run& run = runToChange<Run>(node_, 0);
-  run.keys = keys.without(index);
+  run.keys = run.keys.without(index);
   PropertyValue* const place = run.begin() + index;
   std::optional<PropertyValue> value(std::move(*place));
   run.truncate(std::move(place + 1, run.end(), place));

@@ -102,9 +102,11 @@ const PropertyKeys* PropertyKeys::knownChange(std::string_view key, std::size_t 
   return nullptr;
 }
 
-/// New keys, remembered as what the change at an index leads to.
+/// New keys, remembered as what the change at an index leads to if there may be another dictionary
+/// to change in the same way.
 PropertyKeys PropertyKeys::changed(std::span<const Text> ordered, std::size_t index) const {
-  if (ordered.empty() || !node_ || node()->changesInARow == kMostChangesInARow) {
+  if (ordered.empty() || !node_ || node()->isUnshared() ||
+      node()->changesInARow == kMostChangesInARow) {
     return PropertyKeys(ordered);
   }
   PropertyKeys result;

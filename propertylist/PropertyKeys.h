@@ -32,8 +32,8 @@ class PropertyKeys {
   /// O(log n).
   [[nodiscard]] Place find(std::string_view key) const;
 
-  /// These keys and one more, which has its place at an index. The same change of the same keys
-  /// gives the same ones in memory again, unless there were many different changes.
+  /// These keys and one more, which has its place at an index. The same change of keys that are
+  /// shared gives the same ones in memory again, unless there were many different changes.
   [[nodiscard]] PropertyKeys with(std::string_view key, std::size_t index) const;
   /// These keys without the one at an index; in memory again like those above.
   [[nodiscard]] PropertyKeys without(std::size_t index) const;

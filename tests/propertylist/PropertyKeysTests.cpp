@@ -63,8 +63,9 @@ TEST(PropertyKeysChanges, AKeyIsAddedInItsPlaceAndRemovedFromIt) {
   EXPECT_EQ(keys, keysOf({"a", "c"}));
 }
 
-TEST(PropertyKeysChanges, TheSameChangeGivesTheSameKeysInMemory) {
+TEST(PropertyKeysChanges, TheSameChangeOfSharedKeysGivesTheSameKeysInMemory) {
   const PropertyKeys keys = keysOf({"a", "c"});
+  const PropertyKeys sharing = keys;
 
   EXPECT_TRUE(withKey(keys, "b").isSameAs(withKey(keys, "b")));
   EXPECT_TRUE(withoutKey(keys, "c").isSameAs(withoutKey(keys, "c")));
@@ -72,6 +73,7 @@ TEST(PropertyKeysChanges, TheSameChangeGivesTheSameKeysInMemory) {
 
 TEST(PropertyKeysChanges, OtherChangesGiveOtherKeys) {
   const PropertyKeys keys = keysOf({"a", "d"});
+  const PropertyKeys sharing = keys;
 
   EXPECT_EQ(withKey(keys, "b"), keysOf({"a", "b", "d"}));
   EXPECT_EQ(withKey(keys, "c"), keysOf({"a", "c", "d"}));
@@ -81,6 +83,7 @@ TEST(PropertyKeysChanges, OtherChangesGiveOtherKeys) {
 
 TEST(PropertyKeysChanges, HoweverManyChangesThereWereTheNextOneIsRight) {
   const PropertyKeys keys = keysOf({"a", "z"});
+  const PropertyKeys sharing = keys;
 
   for (int number = 0; number < 100; ++number) {
     const std::string key = "k" + std::to_string(number);
@@ -93,8 +96,10 @@ TEST(PropertyKeysChanges, ChangesMayFollowEachOtherWithoutEnd) {
   PropertyKeys keys = first;
 
   for (int count = 0; count < 1000; ++count) {
+    const PropertyKeys shared = keys;
     keys = withKey(keys, "b");
     ASSERT_EQ(keys, keysOf({"a", "b"}));
+    const PropertyKeys alsoShared = keys;
     keys = withoutKey(keys, "b");
     ASSERT_EQ(keys, first);
   }
