@@ -4,6 +4,7 @@
 
 #include <benchmark/benchmark.h>
 #include <expat.h>
+#include <malloc.h>
 
 #include <cstring>
 #include <string>
@@ -51,9 +52,10 @@ void copyBytes(benchmark::State& state) {
 BENCHMARK(copyBytes)->Unit(benchmark::kMillisecond);
 
 void readBinary(benchmark::State& state) {
+  const std::string& file = binaryFile();
   PropertyListError error;
   for (auto _ : state) {
-    std::optional<PropertyValue> value = readBinaryPropertyList(binaryFile(), error);
+    std::optional<PropertyValue> value = readBinaryPropertyList(file, error);
     benchmark::DoNotOptimize(value);
     state.PauseTiming();
     value.reset();
@@ -64,9 +66,10 @@ void readBinary(benchmark::State& state) {
 BENCHMARK(readBinary)->Unit(benchmark::kMillisecond);
 
 void readBinaryAndLetGo(benchmark::State& state) {
+  const std::string& file = binaryFile();
   PropertyListError error;
   for (auto _ : state) {
-    std::optional<PropertyValue> value = readBinaryPropertyList(binaryFile(), error);
+    std::optional<PropertyValue> value = readBinaryPropertyList(file, error);
     benchmark::DoNotOptimize(value);
   }
   countBytes(state, binaryFile().size());
@@ -96,9 +99,10 @@ void writeBinaryBuiltInMemory(benchmark::State& state) {
 BENCHMARK(writeBinaryBuiltInMemory)->Unit(benchmark::kMillisecond);
 
 void readXML(benchmark::State& state) {
+  const std::string& file = xmlFile();
   PropertyListError error;
   for (auto _ : state) {
-    std::optional<PropertyValue> value = readXMLPropertyList(xmlFile(), error);
+    std::optional<PropertyValue> value = readXMLPropertyList(file, error);
     benchmark::DoNotOptimize(value);
     state.PauseTiming();
     value.reset();
@@ -110,12 +114,12 @@ BENCHMARK(readXML)->Unit(benchmark::kMillisecond);
 
 // What expat takes to deliver the same file's events to somebody who does nothing with them.
 void expatAlone(benchmark::State& state) {
+  const std::string& file = xmlFile();
   for (auto _ : state) {
     const XML_Parser parser = XML_ParserCreate(nullptr);
     XML_SetElementHandler(
         parser, [](void*, const char*, const char**) {}, [](void*, const char*) {});
     XML_SetCharacterDataHandler(parser, [](void*, const char*, int) {});
-    const std::string& file = xmlFile();
     const XML_Status status =
         XML_Parse(parser, file.data(), static_cast<int>(file.size()), /*isFinal=*/1);
     benchmark::DoNotOptimize(status);
@@ -128,4 +132,15 @@ BENCHMARK(expatAlone)->Unit(benchmark::kMillisecond);
 }  // namespace
 }  // namespace accounts::bench
 
-BENCHMARK_MAIN();
+int main(int argumentCount, char** arguments) {
+  // Memory that one run lets go of stays for the next one. Otherwise it would depend on where the
+  // last piece happens to lie whether the system finds and clears all of it anew for each run.
+  mallopt(M_MMAP_MAX, 0);
+  mallopt(M_TRIM_THRESHOLD, 1 << 30);
+  benchmark::Initialize(&argumentCount, arguments);
+  if (benchmark::ReportUnrecognizedArguments(argumentCount, arguments)) {
+    return 1;
+  }
+  benchmark::RunSpecifiedBenchmarks();
+  return 0;
+}
