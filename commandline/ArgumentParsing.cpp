@@ -52,14 +52,17 @@ std::optional<std::string> problemOfUntakenWords(const CLI::App& program) {
     return std::nullopt;
   }
   const CLI::App& part = chosenPart(program);
+  const std::vector<std::string> subcommands = subcommandNames(part);
+  // Options belong to a subcommand that is not known yet.
+  if (!subcommands.empty() && !untaken.front().starts_with('-')) {
+    return unknown("subcommand", untaken.front(), subcommands);
+  }
   const auto option = std::find_if(untaken.begin(), untaken.end(),
                                    [](const std::string& word) { return word.starts_with('-'); });
   if (option != untaken.end()) {
     return unknown("option", option->substr(0, option->find('=')), optionNames(part));
   }
-  const std::vector<std::string> subcommands = subcommandNames(part);
-  return subcommands.empty() ? "Unexpected argument: " + untaken.front()
-                             : unknown("subcommand", untaken.front(), subcommands);
+  return "Unexpected argument: " + untaken.front();
 }
 
 std::string missingSubcommand(const CLI::App& program) {

@@ -61,6 +61,11 @@ TEST_F(ArgumentParsingTest, AMisspeltSubcommandIsNamedWithASuggestion) {
             "Unknown subcommand: shwo; did you mean 'show'? (--help explains)");
 }
 
+TEST_F(ArgumentParsingTest, AMisspeltSubcommandIsNamedRatherThanItsOptions) {
+  EXPECT_EQ(problemOf({"shwo", "--json", "FILE"}),
+            "Unknown subcommand: shwo; did you mean 'show'? (--help explains)");
+}
+
 TEST_F(ArgumentParsingTest, ASubcommandLikeNoneIsNamedWithoutASuggestion) {
   EXPECT_EQ(problemOf({"migrate"}), "Unknown subcommand: migrate (--help explains)");
 }
