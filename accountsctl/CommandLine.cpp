@@ -63,10 +63,6 @@ struct Arguments {
 
 using Asked = decltype(CommandLine::asked);
 
-Asked unusable(const std::string& message) {
-  return UnusableArguments{message + " (--help explains)"};
-}
-
 void addFile(CLI::App& command, const std::string& name, std::string& destination,
              const std::string& description) {
   command.add_option(name, destination, description)
@@ -117,7 +113,7 @@ void addDiff(CLI::App& command, Arguments& arguments) {
 
 Asked diffAsked(Arguments& arguments) {
   if (const std::optional<std::string> problem = bothStandardInput(arguments.diff)) {
-    return unusable(*problem);
+    return unusableArguments(*problem);
   }
   arguments.diff.reportsJSON = arguments.wantsJSON;
   arguments.diff.secrets = arguments.secrets();
@@ -164,7 +160,7 @@ void addConvert(CLI::App& command, Arguments& arguments) {
 
 Asked convertAsked(Arguments& arguments) {
   if (arguments.wantsJSON && arguments.convert.output == kStandardStream) {
-    return unusable("OUT cannot be standard output with --json, which is for a report");
+    return unusableArguments("OUT cannot be standard output with --json, which is for a report");
   }
   arguments.convert.form =
       arguments.form == kXMLForm ? PropertyListForm::XML : PropertyListForm::Binary;

@@ -73,11 +73,11 @@ std::string missingSubcommand(const CLI::App& program) {
   return message;
 }
 
-UnusableArguments unusable(const std::string& message) {
-  return UnusableArguments{message + " (--help explains)"};
-}
-
 }  // namespace
+
+UnusableArguments unusableArguments(const std::string& reason) {
+  return UnusableArguments{reason + " (--help explains)"};
+}
 
 ArgumentParsing parseArguments(CLI::App& program, int argumentCount, const char* const* arguments) {
   program.require_subcommand(0, 1);
@@ -89,10 +89,10 @@ ArgumentParsing parseArguments(CLI::App& program, int argumentCount, const char*
     return RequestedText{std::string(request.what()) + "\n"};
   } catch (const CLI::Error& error) {
     // A word that is misspelt is what is wrong, rather than the one that it leaves missing.
-    return unusable(problemOfUntakenWords(program).value_or(error.what()));
+    return unusableArguments(problemOfUntakenWords(program).value_or(error.what()));
   }
   if (program.get_subcommands().empty() && !subcommandNames(program).empty()) {
-    return unusable(missingSubcommand(program));
+    return unusableArguments(missingSubcommand(program));
   }
   return ParsedArguments{};
 }

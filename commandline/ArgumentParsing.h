@@ -20,6 +20,9 @@ struct UnusableArguments {
   std::string message;
 };
 
+/// Arguments that cannot be used for the reason given, with a word on where help is.
+UnusableArguments unusableArguments(const std::string& reason);
+
 using ArgumentParsing = std::variant<ParsedArguments, RequestedText, UnusableArguments>;
 
 /// Parses a program's arguments, the program's name included. A program that has subcommands needs
