@@ -1,7 +1,9 @@
 #include "propertylist/BinaryPropertyListCatalogue.h"
 
 #include <algorithm>
+#include <array>
 #include <bit>
+#include <numeric>
 #include <optional>
 
 #include "propertylist/GeneralisedUTF8.h"
@@ -36,7 +38,7 @@ std::optional<Catalogue::Reference> Catalogue::add(const PropertyValue& value,
   ++walk_;
   pending_.clear();
   Size size;
-  return visit(value, 0, size) ? std::optional(pending_.back()) : std::nullopt;
+  return visit(value, announce(value), 0, size) ? std::optional(pending_.back()) : std::nullopt;
 }
 
 bool Catalogue::fail(std::string_view what) const {
@@ -45,130 +47,193 @@ bool Catalogue::fail(std::string_view what) const {
   return false;
 }
 
-/// Appends a value's reference to the pending ones and adds the value to its parent's size. `depth`
-/// is the number of containers around it; it bounds the recursion.
-bool Catalogue::visit(const PropertyValue& value, std::size_t depth, Size& parent) {
+/// Appends the references of values or texts to the pending ones and adds them to their parent's
+/// size.
+template <class Element>
+bool Catalogue::visitAll(std::span<const Element> elements, std::size_t depth, Size& parent) {
+  // Memory is asked for a handful of elements at once, which saves a seventh of the time for a
+  // large file: its answers come while others are waited for.
+  std::array<Announced, 16> announced;
+  while (!elements.empty()) {
+    const std::size_t count = std::min(announced.size(), elements.size());
+    for (std::size_t index = 0; index < count; ++index) {
+      announced[index] = announce(elements[index]);
+    }
+    for (std::size_t index = 0; index < count; ++index) {
+      if (!visit(elements[index], announced[index], depth, parent)) {
+        return false;
+      }
+    }
+    elements = elements.subspan(count);
+  }
+  return true;
+}
+
+Catalogue::Announced Catalogue::announce(const PropertyValue& value) const {
+  switch (value.kind()) {
+    case PropertyKind::String:
+      return announce(*value.asText());
+    case PropertyKind::Data:
+      return announceBytes(ScalarKind::Data, value.asData()->bytes);
+    case PropertyKind::Dictionary:
+      __builtin_prefetch(value.asDictionary()->sharedNode());
+      return {};
+    case PropertyKind::Array:
+      __builtin_prefetch(value.asArray()->sharedNode());
+      return {};
+    default:
+      return announceHash(hash_(numberOf(value).bits));
+  }
+}
+
+Catalogue::Announced Catalogue::announce(const Text& text) const {
+  return announceBytes(ScalarKind::ASCIIText, text.bytes());
+}
+
+Catalogue::Announced Catalogue::announceBytes(ScalarKind kind, const SharedBytes& bytes) const {
+  const SharedNodeBase* const node = bytes.sharedNode();
+  if (node != nullptr && node->note() < scalars_.size()) {
+    const CatalogueScalar& scalar = scalars_[node->note()];
+    if (scalar.isNode(node) && scalar.isAlike(kind)) {
+      return {.number = node->note()};
+    }
+  }
+  return announceHash(hash_(bytes.view()));
+}
+
+Catalogue::Announced Catalogue::announceHash(std::uint32_t hash) const {
+  scalarTable_.announce(hash);
+  return {.hash = hash};
+}
+
+/// `depth` is the number of containers around the value; it bounds the recursion.
+bool Catalogue::visit(const PropertyValue& value, Announced announced, std::size_t depth,
+                      Size& parent) {
   switch (value.kind()) {
     case PropertyKind::String:
       ++parent.expandedCount;
-      return visitText(*value.asText(), parent);
-    case PropertyKind::Dictionary:
-      return visitContainer(*value.asDictionary(), value.asDictionary()->values(), depth, parent);
-    case PropertyKind::Array:
-      return visitContainer(*value.asArray(), {value.asArray()->begin(), value.asArray()->end()},
-                            depth, parent);
-    case PropertyKind::Integer:
-      return value.asSigned() != nullptr
-                 ? visitNumber(ScalarKind::SignedInteger,
-                               static_cast<std::uint64_t>(*value.asSigned()), parent)
-                 : visitNumber(ScalarKind::LargeInteger, *value.asLargeUnsigned(), parent);
-    case PropertyKind::Boolean:
-      return visitNumber(ScalarKind::Boolean, *value.asBoolean() ? 1 : 0, parent);
-    case PropertyKind::Real:
-      return visitNumber(ScalarKind::Real, std::bit_cast<std::uint64_t>(*value.asReal()), parent);
-    case PropertyKind::Date:
-      return visitNumber(ScalarKind::Date,
-                         std::bit_cast<std::uint64_t>(value.asDate()->secondsSinceReferenceDate),
-                         parent);
+      return visit(*value.asText(), announced, depth, parent);
     case PropertyKind::Data:
-      return visitData(value.asData()->bytes, parent);
+      ++parent.expandedCount;
+      return visitBytes(ScalarKind::Data, value.asData()->bytes, announced, parent);
+    case PropertyKind::Dictionary: {
+      const PropertyDictionary& dictionary = *value.asDictionary();
+      return visitContainer(dictionary.sharedNode(), &dictionary.keys(), dictionary.values(), depth,
+                            parent);
+    }
+    case PropertyKind::Array: {
+      const PropertyArray& array = *value.asArray();
+      return visitContainer(array.sharedNode(), nullptr, {array.begin(), array.end()}, depth,
+                            parent);
+    }
+    default:
+      return visitNumber(numberOf(value), announced, parent);
   }
-  return false;
+}
+/// A key counts its bytes alone.
+bool Catalogue::visit(const Text& text, Announced announced, std::size_t /*depth*/, Size& parent) {
+  return visitBytes(ScalarKind::ASCIIText, text.bytes(), announced, parent);
 }
 
-bool Catalogue::visitNumber(ScalarKind kind, std::uint64_t bits, Size& parent) {
+Catalogue::Number Catalogue::numberOf(const PropertyValue& value) {
+  if (const std::int64_t* integer = value.asSigned()) {
+    return {ScalarKind::SignedInteger, static_cast<std::uint64_t>(*integer)};
+  }
+  if (const bool* boolean = value.asBoolean()) {
+    return {ScalarKind::Boolean, *boolean ? std::uint64_t{1} : 0};
+  }
+  if (const double* real = value.asReal()) {
+    return {ScalarKind::Real, std::bit_cast<std::uint64_t>(*real)};
+  }
+  if (const PropertyDate* date = value.asDate()) {
+    return {ScalarKind::Date, std::bit_cast<std::uint64_t>(date->secondsSinceReferenceDate)};
+  }
+  return {ScalarKind::LargeInteger, *value.asLargeUnsigned()};
+}
+
+bool Catalogue::visitNumber(Number number, Announced announced, Size& parent) {
   ++parent.expandedCount;
   const auto newNumber = static_cast<Reference>(scalars_.size());
-  const Reference number = numberTable_.findOrAdd(hash_(bits), newNumber, [&](Reference candidate) {
-    return scalars_[candidate].kind() == kind && scalars_[candidate].bits() == bits;
-  });
-  pending_.push_back(number);
-  if (number != newNumber) {
+  const Reference found =
+      scalarTable_.findOrAdd(announced.hash, newNumber, [&](Reference candidate) {
+        return scalars_[candidate].kind() == number.kind &&
+               scalars_[candidate].bits() == number.bits;
+      });
+  pending_.push_back(found);
+  if (found != newNumber) {
     return true;
   }
-  scalars_.emplace_back(kind, bits);
+  scalars_.emplace_back(number.kind, number.bits);
+  firstHolders_.push_back(ContentTable::kNone);
   return checkObjectCount();
 }
 
-bool Catalogue::visitData(const SharedBytes& bytes, Size& parent) {
-  parent.expandedCount += 1 + expandedCountOfBytes(bytes.view().size());
-  return addBytes(ScalarKind::Data, bytes);
-}
-
-bool Catalogue::visitText(const Text& text, Size& parent) {
-  parent.expandedCount += expandedCountOfBytes(text.view().size());
-  return addBytes(ScalarKind::ASCIIText, text.bytes());
-}
-
-bool Catalogue::isKnown(const SharedNodeBase* bytes) const {
-  return bytes != nullptr && bytes->note() < scalars_.size() &&
-         scalars_[bytes->note()].isNode(bytes);
-}
-
 /// Finds or adds a data or a text. Of a text the kind given is ASCII, and may become the other one.
-bool Catalogue::addBytes(ScalarKind kind, const SharedBytes& bytes) {
-  const SharedNodeBase* const node = bytes.sharedNode();
-  const bool isData = kind == ScalarKind::Data;
-  const auto isOfKind = [&](Reference candidate) {
-    return (scalars_[candidate].kind() == ScalarKind::Data) == isData;
-  };
-  if (isKnown(node) && isOfKind(node->note())) {
-    pending_.push_back(node->note());
+bool Catalogue::visitBytes(ScalarKind kind, const SharedBytes& bytes, Announced announced,
+                           Size& parent) {
+  const std::string_view content = bytes.view();
+  parent.expandedCount += expandedCountOfBytes(content.size());
+  if (announced.number != ContentTable::kNone) {
+    pending_.push_back(announced.number);
     return true;
   }
-  const std::string_view content = bytes.view();
   if (expandedCountOfBytes(content.size()) > kMaximumExpandedValueCount) {
     return fail("a text or data longer than the limit");
   }
   const auto newNumber = static_cast<Reference>(scalars_.size());
   const Reference number =
-      bytesTable_.findOrAdd(hash_(content), newNumber, [&](Reference candidate) {
-        return isOfKind(candidate) && scalars_[candidate].view() == content;
+      scalarTable_.findOrAdd(announced.hash, newNumber, [&](Reference candidate) {
+        return scalars_[candidate].isAlike(kind) && scalars_[candidate].view() == content;
       });
   pending_.push_back(number);
   if (number != newNumber) {
     return true;
   }
-  if (!isData && !isASCII(content)) {
+  if (kind != ScalarKind::Data && !isASCII(content)) {
     if (!isGeneralisedUTF8(content)) {
       return fail("a text that is not well-formed UTF-8");
     }
     kind = ScalarKind::UTF16Text;
   }
   scalars_.emplace_back(kind, bytes);
-  if (node != nullptr) {
+  firstHolders_.push_back(ContentTable::kNone);
+  if (const SharedNodeBase* const node = bytes.sharedNode()) {
     node->setNote(number);
   }
   return checkObjectCount();
 }
 
-template <class Container>
-bool Catalogue::visitContainer(const Container& container, std::span<const PropertyValue> children,
-                               std::size_t depth, Size& parent) {
+/// `keys` are those of a dictionary, null for an array; `node` is null for an empty container.
+bool Catalogue::visitContainer(const SharedNodeBase* node, const PropertyKeys* keys,
+                               std::span<const PropertyValue> children, std::size_t depth,
+                               Size& parent) {
   if (depth == kMaximumNestingDepth) {
     return fail("containers nested deeper than the limit");
   }
-  const SharedNodeBase* const node = container.sharedNode();
   if (isKnownContainer(node)) {
     containers_[node->note()].walk = walk_;
     return addToParent(node->note(), depth, parent);
   }
   Size size;
-  const std::optional<std::uint32_t> keys = visitKeys(container, size);
-  const std::size_t firstPending = pending_.size();
-  if (!keys || !visitChildren(children, depth + 1, size)) {
-    return false;
+  std::uint32_t keysNumber = CatalogueContainer::kArray;
+  if (keys != nullptr) {
+    if (!findOrAddKeys(*keys, keysNumber)) {
+      return false;
+    }
+    size.expandedCount += keys_[keysNumber].expandedCount;
   }
-  const std::optional<Reference> number = findOrAddContainer(*keys, firstPending, size);
-  if (!number) {
+  const Pending pending = {.firstChild = pending_.size(), .firstNewScalar = scalars_.size()};
+  Reference number = 0;
+  if (!visitAll(children, depth + 1, size) ||
+      !findOrAddContainer(keysNumber, pending, size, number)) {
     return false;
   }
   if (node != nullptr) {
-    containers_[*number].walk = walk_;
-    containers_[*number].node = node;
-    node->setNote(*number);
+    containers_[number].walk = walk_;
+    containers_[number].node = node;
+    node->setNote(number);
   }
-  return addToParent(*number, depth, parent);
+  return addToParent(number, depth, parent);
 }
 
 bool Catalogue::isKnownContainer(const SharedNodeBase* node) const {
@@ -179,45 +244,32 @@ bool Catalogue::isKnownContainer(const SharedNodeBase* node) const {
   return container.node == node && walk_ - container.walk <= 1;
 }
 
-std::optional<std::uint32_t> Catalogue::visitKeys(const PropertyArray&, Size&) {
-  return CatalogueContainer::kArray;
-}
-
-std::optional<std::uint32_t> Catalogue::visitKeys(const PropertyDictionary& dictionary,
-                                                  Size& size) {
-  const std::optional<std::uint32_t> number = findOrAddKeys(dictionary.keys());
-  size.expandedCount += number ? keys_[*number].expandedCount : 0;
-  return number;
-}
-
-std::optional<std::uint32_t> Catalogue::findOrAddKeys(const PropertyKeys& keys) {
+bool Catalogue::findOrAddKeys(const PropertyKeys& keys, std::uint32_t& number) {
   const SharedNodeBase* const node = keys.sharedNode();
   if (node != nullptr && node->note() < sharedKeys_.size() &&
       sharedKeys_[node->note()].first.isSameAs(keys)) {
-    return sharedKeys_[node->note()].second;
+    number = sharedKeys_[node->note()].second;
+    return true;
   }
   const std::size_t firstPending = pending_.size();
   Size size{.expandedCount = 0};
-  if (!std::all_of(keys.begin(), keys.end(),
-                   [&](const Text& key) { return visitText(key, size); })) {
-    return std::nullopt;
+  if (!visitAll(std::span<const Text>(keys.begin(), keys.end()), 0, size)) {
+    return false;
   }
   if (size.expandedCount > kMaximumExpandedValueCount) {
-    fail("a container that stands for more values than the limit");
-    return std::nullopt;
+    return fail("a container that stands for more values than the limit");
   }
   const std::span<const Reference> content = std::span(pending_).subspan(firstPending);
   const auto newNumber = static_cast<std::uint32_t>(keys_.size());
-  const std::uint32_t number =
-      keysTable_.findOrAdd(hash_(asBytes(content)), newNumber, [&](std::uint32_t candidate) {
-        return asBytes(referencesOf(keys_[candidate])) == asBytes(content);
-      });
+  number = keysTable_.findOrAdd(hash_(asBytes(content)), newNumber, [&](std::uint32_t candidate) {
+    return asBytes(referencesOf(keys_[candidate])) == asBytes(content);
+  });
   if (number == newNumber) {
     keys_.push_back({.firstReference = static_cast<std::uint32_t>(references_.size()),
                      .count = static_cast<std::uint32_t>(content.size()),
                      .expandedCount = static_cast<std::uint32_t>(size.expandedCount)});
-    if (!moveToReferences(firstPending)) {
-      return std::nullopt;
+    if (!keepReferences(content)) {
+      return false;
     }
   }
   pending_.resize(firstPending);
@@ -226,73 +278,64 @@ std::optional<std::uint32_t> Catalogue::findOrAddKeys(const PropertyKeys& keys) 
     node->setNote(static_cast<std::uint32_t>(sharedKeys_.size()));
     sharedKeys_.emplace_back(keys, number);
   }
-  return number;
-}
-
-bool Catalogue::visitChildren(std::span<const PropertyValue> children, std::size_t depth,
-                              Size& size) {
-  // Tables are looked into for a handful of values at once, which saves a seventh of the time for
-  // a large file: the memory's answers come while others are waited for.
-  constexpr std::size_t kAnnouncedAtOnce = 16;
-  while (!children.empty()) {
-    const std::span<const PropertyValue> next =
-        children.first(std::min(kAnnouncedAtOnce, children.size()));
-    std::ranges::for_each(next, [&](const PropertyValue& child) { announce(child); });
-    if (!std::ranges::all_of(
-            next, [&](const PropertyValue& child) { return visit(child, depth, size); })) {
-      return false;
-    }
-    children = children.subspan(next.size());
-  }
   return true;
 }
 
-void Catalogue::announce(const PropertyValue& value) const {
-  constexpr std::size_t kLongestAnnounced = 128;
-  const Text* text = value.asText();
-  if (text == nullptr || isKnown(text->bytes().sharedNode())) {
-    return;
-  }
-  if (const std::string_view bytes = *text; bytes.size() <= kLongestAnnounced) {
-    bytesTable_.announce(hash_(bytes));
-  }
-}
-
-/// The number of the container whose children's references are the last pending ones, which it
-/// takes away.
-std::optional<Catalogue::Reference> Catalogue::findOrAddContainer(std::uint32_t keys,
-                                                                  std::size_t firstPending,
-                                                                  const Size& size) {
+/// Takes the references of the container's children away from the pending ones.
+bool Catalogue::findOrAddContainer(std::uint32_t keys, Pending pending, const Size& size,
+                                   Reference& number) {
   if (size.expandedCount > kMaximumExpandedValueCount) {
-    fail("a container that stands for more values than the limit");
-    return std::nullopt;
+    return fail("a container that stands for more values than the limit");
   }
-  const std::span<const Reference> content = std::span(pending_).subspan(firstPending);
+  const std::span<const Reference> content = std::span(pending_).subspan(pending.firstChild);
   const auto newNumber = static_cast<Reference>(containers_.size());
-  const std::uint32_t hash = hash_(asBytes(content)) ^ hash_(std::uint64_t{keys});
-  const Reference number = containerTable_.findOrAdd(hash, newNumber, [&](Reference candidate) {
-    const CatalogueContainer& other = containers_[candidate];
-    return other.keys == keys && asBytes(childrenOf(other)) == asBytes(content);
-  });
+  number = findContainer(keys, content, pending.firstNewScalar, newNumber);
   if (number == newNumber) {
     containers_.push_back({.firstReference = static_cast<std::uint32_t>(references_.size()),
                            .childCount = static_cast<std::uint32_t>(content.size()),
                            .keys = keys,
                            .expandedCount = static_cast<std::uint32_t>(size.expandedCount),
                            .height = size.height});
-    if (!moveToReferences(firstPending)) {
-      return std::nullopt;
+    if (!keepReferences(content)) {
+      return false;
     }
   }
-  pending_.resize(firstPending);
-  return checkObjectCount() ? std::optional(number) : std::nullopt;
+  pending_.resize(pending.firstChild);
+  return checkObjectCount();
 }
 
-/// Keeps the last pending references. They are counted in 32 bits, of which a fresh catalogue never
-/// comes near the end.
-bool Catalogue::moveToReferences(std::size_t firstPending) {
-  references_.insert(references_.end(),
-                     pending_.begin() + static_cast<std::ptrdiff_t>(firstPending), pending_.end());
+/// The number of a container with these keys and children; `newNumber`, which it has from now on,
+/// if there is none.
+Catalogue::Reference Catalogue::findContainer(std::uint32_t keys,
+                                              std::span<const Reference> content,
+                                              std::size_t firstNewScalar, Reference newNumber) {
+  const auto isSought = [&](Reference candidate) {
+    const CatalogueContainer& other = containers_[candidate];
+    return other.keys == keys && asBytes(childrenOf(other)) == asBytes(content);
+  };
+  // Most containers hold a scalar that nothing before them held. No other one is equal to such a
+  // container, and it is found again by that scalar: it needs no place in a table, of which the
+  // memory would be waited for. References to containers are negative here.
+  const auto largest = std::accumulate(content.begin(), content.end(), std::int32_t{-1},
+                                       [](std::int32_t known, Reference child) {
+                                         return std::max(known, static_cast<std::int32_t>(child));
+                                       });
+  if (largest >= 0) {
+    Reference& holder = firstHolders_[static_cast<std::size_t>(largest)];
+    if (holder != ContentTable::kNone && isSought(holder)) {
+      return holder;
+    }
+    if (holder == ContentTable::kNone && static_cast<std::size_t>(largest) >= firstNewScalar) {
+      return holder = newNumber;
+    }
+  }
+  const std::uint32_t hash = hash_(asBytes(content)) ^ hash_(std::uint64_t{keys});
+  return containerTable_.findOrAdd(hash, newNumber, isSought);
+}
+
+/// References are counted in 32 bits, of which a fresh catalogue never comes near the end.
+bool Catalogue::keepReferences(std::span<const Reference> references) {
+  references_.insert(references_.end(), references.begin(), references.end());
   return references_.size() <= UINT32_MAX || fail("more references than the limit");
 }
 

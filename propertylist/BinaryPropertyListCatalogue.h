@@ -57,6 +57,10 @@ class CatalogueScalar {
   [[nodiscard]] bool isNode(const SharedNodeBase* node) const {
     return holdsBytes() && bytes_.sharedNode() == node;
   }
+  /// Whether both are texts, both data, or both numbers of the same kind.
+  [[nodiscard]] bool isAlike(ScalarKind kind) const {
+    return kind_ == kind || (kind_ > ScalarKind::Data && kind > ScalarKind::Data);
+  }
 
  private:
   union {
@@ -114,6 +118,8 @@ class Catalogue {
   [[nodiscard]] const CatalogueContainer& container(Reference number) const {
     return containers_[number];
   }
+  /// Whether all that the catalogue holds are the parts of one value.
+  [[nodiscard]] bool holdsOneValue() const { return walk_ == 1; }
   [[nodiscard]] std::size_t scalarCount() const { return scalars_.size(); }
   [[nodiscard]] std::size_t containerCount() const { return containers_.size(); }
   [[nodiscard]] std::size_t objectCount() const { return scalarCount() + containerCount(); }
@@ -135,25 +141,45 @@ class Catalogue {
     std::uint32_t height = 1;
   };
 
+  /// Where a container's part of what is pending begins.
+  struct Pending {
+    std::size_t firstChild;
+    /// How many scalars there were before its children.
+    std::size_t firstNewScalar;
+  };
+  /// A number as it is written.
+  struct Number {
+    ScalarKind kind;
+    std::uint64_t bits;
+  };
+  /// What is known of a value before it is visited.
+  struct Announced {
+    /// The number of a scalar that the walk before met in the same memory; `kNone` for others.
+    Reference number = ContentTable::kNone;
+    /// Of other scalars, the hash of their content.
+    std::uint32_t hash = 0;
+  };
+
   bool fail(std::string_view what) const;
-  bool visit(const PropertyValue& value, std::size_t depth, Size& parent);
-  bool visitText(const Text& text, Size& parent);
-  bool visitNumber(ScalarKind kind, std::uint64_t bits, Size& parent);
-  bool visitData(const SharedBytes& bytes, Size& parent);
-  template <class Container>
-  bool visitContainer(const Container& container, std::span<const PropertyValue> children,
-                      std::size_t depth, Size& parent);
-  bool visitChildren(std::span<const PropertyValue> children, std::size_t depth, Size& size);
-  std::optional<std::uint32_t> visitKeys(const PropertyArray& array, Size& size);
-  std::optional<std::uint32_t> visitKeys(const PropertyDictionary& dictionary, Size& size);
-  std::optional<std::uint32_t> findOrAddKeys(const PropertyKeys& keys);
-  [[nodiscard]] bool isKnown(const SharedNodeBase* bytes) const;
+  template <class Element>
+  bool visitAll(std::span<const Element> elements, std::size_t depth, Size& parent);
+  bool visit(const PropertyValue& value, Announced announced, std::size_t depth, Size& parent);
+  bool visit(const Text& text, Announced announced, std::size_t depth, Size& parent);
+  bool visitNumber(Number number, Announced announced, Size& parent);
+  bool visitBytes(ScalarKind kind, const SharedBytes& bytes, Announced announced, Size& parent);
+  bool visitContainer(const SharedNodeBase* node, const PropertyKeys* keys,
+                      std::span<const PropertyValue> children, std::size_t depth, Size& parent);
+  bool findOrAddKeys(const PropertyKeys& keys, std::uint32_t& number);
   [[nodiscard]] bool isKnownContainer(const SharedNodeBase* node) const;
-  void announce(const PropertyValue& value) const;
-  bool addBytes(ScalarKind kind, const SharedBytes& bytes);
-  std::optional<Reference> findOrAddContainer(std::uint32_t keys, std::size_t firstPending,
-                                              const Size& size);
-  bool moveToReferences(std::size_t firstPending);
+  [[nodiscard]] Announced announce(const PropertyValue& value) const;
+  [[nodiscard]] Announced announce(const Text& text) const;
+  [[nodiscard]] Announced announceBytes(ScalarKind kind, const SharedBytes& bytes) const;
+  [[nodiscard]] Announced announceHash(std::uint32_t hash) const;
+  static Number numberOf(const PropertyValue& value);
+  bool findOrAddContainer(std::uint32_t keys, Pending pending, const Size& size, Reference& number);
+  Reference findContainer(std::uint32_t keys, std::span<const Reference> content,
+                          std::size_t firstNewScalar, Reference newNumber);
+  bool keepReferences(std::span<const Reference> references);
   bool addToParent(Reference number, std::size_t depth, Size& parent);
   [[nodiscard]] bool checkObjectCount() const;
 
@@ -163,8 +189,9 @@ class Catalogue {
   PropertyListError* error_ = nullptr;
   KeyedHash hash_;
   std::vector<CatalogueScalar> scalars_;
-  ContentTable numberTable_;
-  ContentTable bytesTable_;
+  ContentTable scalarTable_;
+  /// By scalar: the container that it was first met in, where it was the newest scalar.
+  std::vector<Reference> firstHolders_;
   std::vector<CatalogueContainer> containers_;
   ContentTable containerTable_;
   std::vector<CatalogueKeys> keys_;

@@ -1,5 +1,6 @@
 #include <algorithm>
 #include <bit>
+#include <numeric>
 #include <span>
 #include <string>
 #include <type_traits>
@@ -170,7 +171,11 @@ class FileOrder {
         scalarNumbers_(catalogue.scalarCount(), kNone),
         containerNumbers_(catalogue.containerCount(), kNone),
         hasKeys_(catalogue.keysCount(), false) {
-    visit(top);
+    if (catalogue.holdsOneValue()) {
+      takeOrderOfCatalogue();
+    } else {
+      visit(top);
+    }
   }
 
   /// The catalogue's numbers of what the file holds; the outermost container comes last.
@@ -188,6 +193,14 @@ class FileOrder {
 
  private:
   static constexpr Catalogue::Reference kNone = UINT32_MAX;
+
+  /// One walk alone left everything in this order already.
+  void takeOrderOfCatalogue() {
+    std::iota(scalarNumbers_.begin(), scalarNumbers_.end(), Catalogue::Reference{0});
+    std::iota(containerNumbers_.begin(), containerNumbers_.end(), Catalogue::Reference{0});
+    scalars_ = scalarNumbers_;
+    containers_ = containerNumbers_;
+  }
 
   /// The recursion is as deep as the value, which the catalogue has bounded.
   void visit(Catalogue::Reference reference) {

@@ -7,9 +7,11 @@ namespace accounts {
 
 namespace {
 
-/// The largest tables are tens of megabytes: with a larger step the last one could be four times
-/// what is needed.
-constexpr std::size_t kGrowth = 2;
+// A table that grows in small steps moves everything often; the largest tables are tens of
+// megabytes, and with a larger step the last one could be four times what is needed.
+constexpr std::size_t kLargeSlotCount = std::size_t{1} << 18;
+constexpr std::size_t kGrowthOfSmall = 4;
+constexpr std::size_t kGrowthOfLarge = 2;
 
 }  // namespace
 
@@ -25,11 +27,13 @@ KeyedHash::KeyedHash() {
 }
 
 void ContentTable::grow() {
-  const std::vector<Slot> old = std::exchange(slots_, std::vector<Slot>(kGrowth * slots_.size()));
+  const std::size_t growth = slots_.size() < kLargeSlotCount ? kGrowthOfSmall : kGrowthOfLarge;
+  const std::vector<Slot> old = std::exchange(slots_, std::vector<Slot>(growth * slots_.size()));
+  shift_ -= std::countr_zero(growth);
   const std::size_t mask = slots_.size() - 1;
   for (const Slot& slot : old) {
     if (slot.numberPlusOne != 0) {
-      std::size_t place = slot.hash & mask;
+      std::size_t place = firstPlace(slot.hash);
       while (slots_[place].numberPlusOne != 0) {
         place = (place + 1) & mask;
       }

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <bit>
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
@@ -79,7 +80,7 @@ class ContentTable {
   template <class HasContent>
   [[nodiscard]] std::uint32_t find(std::uint32_t hash, const HasContent& hasContent) const {
     const std::size_t mask = slots_.size() - 1;
-    for (std::size_t place = hash & mask; slots_[place].numberPlusOne != 0;
+    for (std::size_t place = firstPlace(hash); slots_[place].numberPlusOne != 0;
          place = (place + 1) & mask) {
       if (slots_[place].hash == hash && hasContent(slots_[place].numberPlusOne - 1)) {
         return slots_[place].numberPlusOne - 1;
@@ -90,9 +91,7 @@ class ContentTable {
 
   /// Says that a hash will be looked for soon: memory then has its answer ready. Worth it for
   /// several hashes in a row, since a table of many entries is not in the nearest cache.
-  void announce(std::uint32_t hash) const {
-    __builtin_prefetch(slots_.data() + (hash & (slots_.size() - 1)));
-  }
+  void announce(std::uint32_t hash) const { __builtin_prefetch(slots_.data() + firstPlace(hash)); }
 
   /// The number under this hash of which `hasContent(number)` is true. If there is none, adds
   /// `newNumber` and returns it.
@@ -103,7 +102,7 @@ class ContentTable {
       grow();
     }
     const std::size_t mask = slots_.size() - 1;
-    std::size_t place = hash & mask;
+    std::size_t place = firstPlace(hash);
     for (; slots_[place].numberPlusOne != 0; place = (place + 1) & mask) {
       if (slots_[place].hash == hash && hasContent(slots_[place].numberPlusOne - 1)) {
         return slots_[place].numberPlusOne - 1;
@@ -120,10 +119,14 @@ class ContentTable {
     /// 0 marks a free slot.
     std::uint32_t numberPlusOne = 0;
   };
+  /// Where the search for a hash begins. The hash's high bits tell, so that a table that grows is
+  /// gone through, old and new, from one end to the other: neither has to fit into a cache.
+  [[nodiscard]] std::size_t firstPlace(std::uint32_t hash) const { return hash >> shift_; }
   void grow();
 
-  /// Their number is a power of two.
+  /// Their number is a power of two: 2^(32 - shift_).
   std::vector<Slot> slots_ = std::vector<Slot>(kInitialSlotCount);
+  int shift_ = 32 - std::countr_zero(kInitialSlotCount);
   std::size_t count_ = 0;
 };
 

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
@@ -25,20 +26,26 @@ constexpr bool isLowSurrogate(char32_t codePoint) {
   return codePoint >= 0xDC00 && codePoint <= 0xDFFF;
 }
 
-/// Whether every byte is below 0x80. Looks at eight at a time.
+/// Whether every byte is below 0x80. Looks at eight or four at a time, the last of which may be
+/// ones that it has seen.
 inline bool isASCII(std::string_view text) {
-  constexpr std::uint64_t kHighBits = 0x8080808080808080;
-  std::uint64_t united = 0;
-  while (text.size() >= sizeof united) {
-    std::uint64_t word;
-    std::memcpy(&word, text.data(), sizeof word);
-    united |= word;
-    text.remove_prefix(sizeof word);
+  const auto highBits = [&]<class Word>(Word word, std::size_t place) {
+    std::memcpy(&word, text.data() + place, sizeof word);
+    return word & static_cast<Word>(0x8080808080808080);
+  };
+  const std::size_t size = text.size();
+  if (size >= 8) {
+    std::uint64_t united = highBits(std::uint64_t{}, size - 8);
+    for (std::size_t place = 0; place + 8 < size; place += 8) {
+      united |= highBits(std::uint64_t{}, place);
+    }
+    return united == 0;
   }
-  for (const char character : text) {
-    united |= static_cast<unsigned char>(character);
+  if (size >= 4) {
+    return (highBits(std::uint32_t{}, 0) | highBits(std::uint32_t{}, size - 4)) == 0;
   }
-  return (united & kHighBits) == 0;
+  return std::all_of(text.begin(), text.end(),
+                     [](char character) { return static_cast<signed char>(character) >= 0; });
 }
 
 /// Decodes the first code point of a text that is not empty. Generalised UTF-8 is UTF-8 that also

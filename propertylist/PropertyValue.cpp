@@ -90,14 +90,6 @@ void PropertyContent::destroyNode() {
   }
 }
 
-PropertyKind PropertyValue::kind() const {
-  constexpr PropertyKind kinds[] = {
-      PropertyKind::Dictionary, PropertyKind::Array,   PropertyKind::String,
-      PropertyKind::Data,       PropertyKind::Integer, PropertyKind::Integer,
-      PropertyKind::Real,       PropertyKind::Boolean, PropertyKind::Date};
-  return kinds[static_cast<std::size_t>(content_.form())];
-}
-
 std::optional<std::int64_t> PropertyValue::integerValue() const {
   if (const std::int64_t* integer = asSigned()) {
     return *integer;

@@ -246,7 +246,13 @@ class PropertyValue {
   template <std::floating_point Real>
   PropertyValue(Real real) : content_(static_cast<double>(real)) {}
 
-  [[nodiscard]] PropertyKind kind() const;
+  [[nodiscard]] PropertyKind kind() const {
+    constexpr PropertyKind kinds[] = {
+        PropertyKind::Dictionary, PropertyKind::Array,   PropertyKind::String,
+        PropertyKind::Data,       PropertyKind::Integer, PropertyKind::Integer,
+        PropertyKind::Real,       PropertyKind::Boolean, PropertyKind::Date};
+    return kinds[static_cast<std::size_t>(content_.form())];
+  }
 
   /// The content as one kind; null or none when the value is of another.
   [[nodiscard]] const PropertyDictionary* asDictionary() const {
