@@ -1,6 +1,7 @@
 #include "propertylist/Text.h"
 
 #include <cstring>
+#include <limits>
 #include <new>
 
 namespace accounts {
@@ -14,14 +15,26 @@ constexpr std::size_t kLongestInBlock = 1024;
 
 }  // namespace
 
-SharedBytes::Node::Node(std::string_view content, Block* blockOfNode)
-    : size(content.size()), block(blockOfNode) {
+SharedBytes::Node::Node(std::string_view content, const Block* block)
+    : size(static_cast<std::uint32_t>(content.size())),
+      placeInBlock(block != nullptr
+                       ? static_cast<std::uint32_t>(reinterpret_cast<char*>(this) -
+                                                    reinterpret_cast<const char*>(block))
+                       : 0) {
   std::memcpy(bytes(), content.data(), content.size());
+}
+
+SharedBytes::Block* SharedBytes::Node::block() {
+  return placeInBlock != 0 ? reinterpret_cast<Block*>(reinterpret_cast<char*>(this) - placeInBlock)
+                           : nullptr;
 }
 
 SharedBytes::SharedBytes(std::string_view bytes) {
   if (bytes.empty()) {
     return;
+  }
+  if (bytes.size() > std::numeric_limits<std::uint32_t>::max()) {
+    throw std::bad_alloc();
   }
   // Header and bytes share one allocation: most values of an account are short texts.
   void* memory = ::operator new(sizeof(Node) + bytes.size());
@@ -30,7 +43,7 @@ SharedBytes::SharedBytes(std::string_view bytes) {
 
 void SharedBytes::destroyNode(SharedNodeBase* base) {
   Node* node = static_cast<Node*>(base);
-  Block* const block = node->block;
+  Block* const block = node->block();
   node->~Node();
   if (block != nullptr) {
     SharedBytesArena::releaseBlock(block);

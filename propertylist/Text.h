@@ -1,5 +1,7 @@
 #pragma once
 
+#include <cstddef>
+#include <cstdint>
 #include <functional>
 #include <string>
 #include <string_view>
@@ -34,13 +36,16 @@ class SharedBytes {
   friend class PropertyContent;
   /// Memory that many nodes share; it goes with the last of them.
   struct Block : SharedNodeBase {};
+  /// There may be millions: 32 bits for the size leave room for four gibibytes.
   struct Node : SharedNodeBase {
-    Node(std::string_view content, Block* blockOfNode);
+    Node(std::string_view content, const Block* block);
     [[nodiscard]] char* bytes() { return reinterpret_cast<char*>(this + 1); }
     [[nodiscard]] std::string_view view() { return {bytes(), size}; }
-    const std::size_t size;
-    /// Null for a node with memory of its own.
-    Block* const block;
+    /// The block that the node stands in; null for a node with memory of its own.
+    [[nodiscard]] Block* block();
+    const std::uint32_t size;
+    /// How far behind the beginning of its block the node stands; 0 for one with its own memory.
+    const std::uint32_t placeInBlock;
   };
   explicit SharedBytes(Node* node) : node_(node) {}
   static void destroyNode(SharedNodeBase* node);
