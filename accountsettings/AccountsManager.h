@@ -6,7 +6,6 @@
 #include <optional>
 #include <string>
 #include <string_view>
-#include <unordered_map>
 #include <vector>
 
 #include "accountsettings/BasicAccount.h"
@@ -232,8 +231,7 @@ class AccountsManager {
 
   // The children that were indexed under each parent since its children were last removed; some may
   // have gone to another parent since. Spares a walk through all children for each parent.
-  std::unordered_map<Text, std::vector<Text>, TextHash, std::equal_to<>>
-      _childIdentifiersByParentID;
+  IdentifierIndex<std::vector<Text>> _childIdentifiersByParentID;
 
   // The first account of each sync identifier, made anew when the accounts or their sync
   // identifiers are no longer those of the stamp.

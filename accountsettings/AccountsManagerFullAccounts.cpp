@@ -62,12 +62,12 @@ std::vector<FullAccountReference> AccountsManager::accountsWithTypes_withLoader(
       }
       fullAccounts.push_back(std::move(fullAccount));
     }
-    const auto children = identifier ? _childIdentifiersByParentID.find(*identifier)
-                                     : _childIdentifiersByParentID.end();
-    if (children == _childIdentifiersByParentID.end()) {
+    const std::vector<Text>* children =
+        identifier ? _childIdentifiersByParentID.find(*identifier) : nullptr;
+    if (children == nullptr) {
       continue;
     }
-    for (const Text& childIdentifier : children->second) {
+    for (const Text& childIdentifier : *children) {
       const BasicAccountReference* child = _childAccountsByID.find(childIdentifier);
       if (child != nullptr && (*child)->parentAccount() == account &&
           isOneOf(types, (*child)->type())) {

@@ -101,19 +101,19 @@ void AccountsManager::addChild_toAccount(const BasicAccountReference& child,
 
 void AccountsManager::_removeChildrenForAccountWithIdentifier(
     const std::optional<Text>& parentIdentifier) {
-  const auto entry = parentIdentifier ? _childIdentifiersByParentID.find(*parentIdentifier)
-                                      : _childIdentifiersByParentID.end();
-  if (entry == _childIdentifiersByParentID.end()) {
+  const std::vector<Text>* children =
+      parentIdentifier ? _childIdentifiersByParentID.find(*parentIdentifier) : nullptr;
+  if (children == nullptr) {
     return;
   }
-  for (const Text& child : entry->second) {
+  for (const Text& child : *children) {
     const Text* parent = _childAccountIDToParentAccountID.find(child);
     if (parent != nullptr && *parent == *parentIdentifier) {
       _childAccountIDToParentAccountID.remove(child);
       _childAccountsByID.remove(child);
     }
   }
-  _childIdentifiersByParentID.erase(entry);
+  _childIdentifiersByParentID.remove(*parentIdentifier);
 }
 
 }  // namespace accounts

@@ -96,7 +96,7 @@ void AccountsManager::saveAllAccounts() {
   const bool isSaved = writeSettingsFile(_mergedRoot(fixing));
   if (isSaved) {
     for (const BasicAccountReference& account : _orderedTopLevelAccounts.accounts()) {
-      account->setOriginalProperties(account->propertiesToSave());
+      account->noteSaved(fixing != FixResult::CannotBeKept);
     }
   }
   if (fixing != FixResult::Unchanged) {
@@ -140,6 +140,10 @@ PropertyDictionary AccountsManager::_mergedRoot(FixResult fixing) const {
   mergedAccounts.reserve(accounts.size());
   for (std::size_t index = 0; index < accounts.size(); ++index) {
     const BasicAccount& account = *accounts[index];
+    if (onDisk.isAsMemoryKnowsIt(index)) {
+      mergedAccounts.emplace_back(account.propertiesToSave());
+      continue;
+    }
     PropertyDictionary merged = mergeInMemoryProperties_originalProperties_onDiskProperties(
         account.propertiesToSave(), account.originalProperties(),
         onDisk.propertiesForAccountAt(index));

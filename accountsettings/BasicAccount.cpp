@@ -22,10 +22,6 @@ BasicAccountReference BasicAccount::initWithProperties(const PropertyDictionary&
   return account->acceptProperties(properties) ? account : nullptr;
 }
 
-bool BasicAccount::hasAcceptableProperties() const {
-  return _ownClass && !_ownClass->empty() && _isValidAccountType(_ownType);
-}
-
 bool BasicAccount::acceptProperties(const PropertyDictionary& properties) {
   static constexpr std::string_view operation = "-[BasicAccount initWithProperties:]";
   const std::optional<Text> type = properties.textForKey(kAccountType);
@@ -44,6 +40,7 @@ bool BasicAccount::acceptProperties(const PropertyDictionary& properties) {
   _originalProperties = properties;
   _properties = properties;
   _ownType = type;
+  _hasValidOwnType = true;
   _ownClass = accountClass;
   _ownIdentifier = _properties.textForKey(kAccountIdentifier);
   if (!_ownIdentifier) {

@@ -103,15 +103,23 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
 
   /// The live own dictionary; the reference stays valid, and changes, as long as the record lives.
   [[nodiscard]] const PropertyDictionary& properties() const override { return _properties; }
-  /// The dictionary that the store writes.
-  [[nodiscard]] virtual PropertyDictionary propertiesToSave() const { return _properties; }
+  /// The dictionary that the store writes; valid as long as properties().
+  [[nodiscard]] virtual const PropertyDictionary& propertiesToSave() const { return _properties; }
   [[nodiscard]] const std::optional<PropertyDictionary>& originalProperties() const {
     return _originalProperties;
   }
   /// Whether initWithProperties() would make a record of properties().
-  [[nodiscard]] bool hasAcceptableProperties() const;
+  [[nodiscard]] bool hasAcceptableProperties() const {
+    return _hasValidOwnType && _ownClass && !_ownClass->empty();
+  }
   /// Takes a new snapshot.
   void setOriginalProperties(std::optional<PropertyDictionary> properties);
+  /// Takes what the store has just written as the new snapshot. `canBeKept` says whether a store
+  /// that is made of it would keep the account.
+  void noteSaved(bool canBeKept);
+  /// Whether the snapshot is the one that noteSaved() took, of properties that initWithProperties()
+  /// makes a record of without adding to them, which a store would keep.
+  [[nodiscard]] bool wouldBeLoadedAsSaved() const { return _wouldBeLoadedAsSaved; }
 
   /// The texts under "Type", "Identifier", "Sync Identifier", "Class", "DisplayName", "Type String"
   /// and "Short Type String", own or inherited; none when there is no text.
@@ -219,6 +227,8 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   std::optional<Text> _ownType;
   std::optional<Text> _ownClass;
   std::optional<Text> _ownIdentifier;
+  bool _hasValidOwnType = false;
+  bool _wouldBeLoadedAsSaved = false;
   FullAccountReference _fullAccount;
   SyncAccountReference _syncAccount;
   BasicAccountReference _parentAccount;

@@ -82,6 +82,7 @@ void BasicAccount::noteChangeOfKey(std::string_view key) {
     ++Process::current().syncIdentifierChanges;
   } else if (key == kAccountType) {
     _ownType = _properties.textForKey(key);
+    _hasValidOwnType = _isValidAccountType(_ownType);
   } else if (key == kAccountClass) {
     _ownClass = _properties.textForKey(key);
   }
@@ -89,6 +90,16 @@ void BasicAccount::noteChangeOfKey(std::string_view key) {
 
 void BasicAccount::setOriginalProperties(std::optional<PropertyDictionary> properties) {
   _originalProperties = std::move(properties);
+  _wouldBeLoadedAsSaved = false;
+}
+
+void BasicAccount::noteSaved(bool canBeKept) {
+  const PropertyDictionary& saved = propertiesToSave();
+  _wouldBeLoadedAsSaved =
+      canBeKept && hasAcceptableProperties() && hasOwnIdentifier() && saved.isSameAs(_properties);
+  if (!_originalProperties || !_originalProperties->isSameAs(saved)) {
+    _originalProperties = saved;
+  }
 }
 
 std::optional<Text> BasicAccount::type() const {

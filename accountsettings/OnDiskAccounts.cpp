@@ -71,10 +71,23 @@ void OnDiskAccounts::indexIdentifiers() {
   }
 }
 
+bool OnDiskAccounts::isAsMemoryKnowsIt(std::size_t index) const {
+  if (!isAligned_) {
+    return false;
+  }
+  const PropertyDictionary& properties = *onDisk_.at(index).asDictionary();
+  const BasicAccount& account = *inMemory_.accounts()[index];
+  if (properties.isSameAs(account.properties())) {
+    return state_ == InMemory::AllCanBeKept && account.hasAcceptableProperties();
+  }
+  return account.wouldBeLoadedAsSaved() && account.originalProperties() &&
+         properties.isSameAs(*account.originalProperties());
+}
+
 std::optional<PropertyDictionary> OnDiskAccounts::propertiesForAccountAt(std::size_t index) {
   const BasicAccount& account = *inMemory_.accounts()[index];
   if (isAligned_) {
-    if (std::optional<PropertyDictionary> properties = propertiesAt(index, account)) {
+    if (std::optional<PropertyDictionary> properties = propertiesAt(index)) {
       return properties;
     }
   }
@@ -87,7 +100,7 @@ std::optional<PropertyDictionary> OnDiskAccounts::propertiesForAccountAt(std::si
   }
   const Position* last = lastPositions_.find(*identifier);
   for (Position position = last != nullptr ? *last : std::nullopt; position;) {
-    if (std::optional<PropertyDictionary> properties = propertiesAt(*position, account)) {
+    if (std::optional<PropertyDictionary> properties = propertiesAt(*position)) {
       return properties;
     }
     // What makes no account is not tried again for the next account with the identifier.
@@ -99,13 +112,8 @@ std::optional<PropertyDictionary> OnDiskAccounts::propertiesForAccountAt(std::si
 
 /// What a record made of the dictionary at a position would save; none when there would be no
 /// record.
-std::optional<PropertyDictionary> OnDiskAccounts::propertiesAt(std::size_t position,
-                                                               const BasicAccount& inMemory) const {
+std::optional<PropertyDictionary> OnDiskAccounts::propertiesAt(std::size_t position) const {
   const PropertyDictionary& properties = *onDisk_.at(position).asDictionary();
-  if (state_ == InMemory::AllCanBeKept && properties.isSameAs(inMemory.properties()) &&
-      inMemory.hasAcceptableProperties()) {
-    return properties;
-  }
   const BasicAccountReference account = BasicAccount::initWithProperties(properties);
   if (account == nullptr) {
     return std::nullopt;

@@ -32,6 +32,11 @@ class OnDiskAccounts {
   OnDiskAccounts& operator=(const OnDiskAccounts&) = delete;
   ~OnDiskAccounts();
 
+  /// Whether the properties on disk of the account in memory at an index share the memory of those
+  /// that it has or had when it was saved last, so that the merge gives what it has. Never true
+  /// while the log channel is enabled: merging writes lines. O(1).
+  [[nodiscard]] bool isAsMemoryKnowsIt(std::size_t index) const;
+
   /// The properties on disk of the account with the identifier of the account in memory at an
   /// index, or of the parent of the child with it; none when the disk has no such account.
   [[nodiscard]] std::optional<PropertyDictionary> propertiesForAccountAt(std::size_t index);
@@ -42,8 +47,7 @@ class OnDiskAccounts {
 
   [[nodiscard]] bool hasIdentifiersOfMemory() const;
   void indexIdentifiers();
-  [[nodiscard]] std::optional<PropertyDictionary> propertiesAt(std::size_t position,
-                                                               const BasicAccount& inMemory) const;
+  [[nodiscard]] std::optional<PropertyDictionary> propertiesAt(std::size_t position) const;
   [[nodiscard]] std::optional<PropertyDictionary> propertiesInStore(const Text& identifier);
   [[nodiscard]] bool isIdentifierOfChild(const Text& identifier);
 

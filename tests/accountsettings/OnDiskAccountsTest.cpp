@@ -99,8 +99,37 @@ TEST_F(OnDiskAccountsTest, AnIdentifierInheritedInMemoryFindsNoDictionaryWithout
   EXPECT_EQ(onDisk.propertiesForAccountAt(0), std::nullopt);
 }
 
+TEST_F(OnDiskAccountsTest, ADictionaryThatWasSavedAndIsStillThereNeedsNoMergeWhateverMemoryHasNow) {
+  const OrderedAccounts memory = memoryOf({mail("A")});
+  BasicAccount& account = *memory.accounts().front();
+  account.noteSaved(/*canBeKept=*/true);
+  const PropertyArray file = {PropertyValue(account.properties())};
+  account.setAccountProperty_forKey("changed", "Username");
+  EXPECT_TRUE(OnDiskAccounts(file, memory, InMemory::AllCanBeKept).isAsMemoryKnowsIt(0));
+}
+
+TEST_F(OnDiskAccountsTest, ADictionaryThatWasLoadedAndNeverSavedIsMerged) {
+  // The fixers see it as it was loaded, and may change it: memory has changed it already.
+  const PropertyDictionary loaded = mailThatCanBeFixed("A");
+  const OrderedAccounts memory = memoryOf({loaded});
+  const InMemory state = fix(memory);
+  EXPECT_FALSE(OnDiskAccounts({loaded}, memory, state).isAsMemoryKnowsIt(0));
+}
+
+TEST_F(OnDiskAccountsTest, ADictionaryWithTheSameContentThatSomebodyElseWroteIsMerged) {
+  const OrderedAccounts memory = memoryOf({mail("A")});
+  EXPECT_FALSE(OnDiskAccounts({mail("A")}, memory, InMemory::AllCanBeKept).isAsMemoryKnowsIt(0));
+}
+
+TEST_F(OnDiskAccountsTest, WithTheChannelOnEveryAccountIsMerged) {
+  device.logSystem.channel.enabled = true;
+  const PropertyDictionary shared = mail("A");
+  const OrderedAccounts memory = memoryOf({shared});
+  EXPECT_FALSE(OnDiskAccounts({shared}, memory, InMemory::AllCanBeKept).isAsMemoryKnowsIt(0));
+}
+
 // A file and a store of the same few identifiers, in every kind of state: the store shares most of
-// its dictionaries with the file, as it does after a save.
+// its dictionaries with the file, as it does after a save, and has saved some of them.
 TEST_F(OnDiskAccountsTest, WhateverTheFileHoldsTheAnswersAreThoseOfAStoreMadeFromIt) {
   std::mt19937 random(20260101);
   const auto below = [&](std::uint_fast32_t limit) { return random() % limit; };
@@ -119,6 +148,7 @@ TEST_F(OnDiskAccountsTest, WhateverTheFileHoldsTheAnswersAreThoseOfAStoreMadeFro
         return mail(identifier()).with("Username", identifier());
     }
   };
+  int unmergedCount = 0;
   for (int round = 0; round < 3000; ++round) {
     std::vector<PropertyValue> elements;
     OrderedAccounts memory;
@@ -129,6 +159,12 @@ TEST_F(OnDiskAccountsTest, WhateverTheFileHoldsTheAnswersAreThoseOfAStoreMadeFro
           BasicAccount::initWithProperties(below(4) > 0 ? element : dictionary());
       if (account == nullptr) {
         continue;
+      }
+      if (below(3) == 0) {
+        ASRuntimeFixMailAccount fixer;
+        account->noteSaved(fixer.fixBasicAccountIfNeeded_loggingMessage(
+                               *account, "saving accounts") != FixResult::CannotBeKept);
+        elements.back() = account->properties();
       }
       if (below(4) == 0) {
         account->setAccountProperty_forKey(identifier(), "Username");
@@ -146,13 +182,22 @@ TEST_F(OnDiskAccountsTest, WhateverTheFileHoldsTheAnswersAreThoseOfAStoreMadeFro
     const Store store = AccountsManager::initWithAccounsInfoArray(file);
     OnDiskAccounts onDisk(file, memory, state);
     for (std::size_t index = 0; index < memory.size(); ++index) {
-      const BasicAccountReference expected =
-          store->accountWithIdentifier(*memory.accounts()[index]->identifier());
-      ASSERT_EQ(onDisk.propertiesForAccountAt(index),
-                expected != nullptr ? std::optional(expected->propertiesToSave()) : std::nullopt)
+      const BasicAccount& account = *memory.accounts()[index];
+      const BasicAccountReference found = store->accountWithIdentifier(*account.identifier());
+      const std::optional<PropertyDictionary> expected =
+          found != nullptr ? std::optional(found->propertiesToSave()) : std::nullopt;
+      ASSERT_EQ(onDisk.propertiesForAccountAt(index), expected)
           << "round " << round << ", account " << index;
+      if (onDisk.isAsMemoryKnowsIt(index)) {
+        ++unmergedCount;
+        ASSERT_EQ(AccountsManager::mergeInMemoryProperties_originalProperties_onDiskProperties(
+                      account.properties(), account.originalProperties(), expected),
+                  account.properties())
+            << "round " << round << ", account " << index;
+      }
     }
   }
+  EXPECT_GT(unmergedCount, 100);
 }
 
 }  // namespace
