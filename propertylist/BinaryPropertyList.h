@@ -46,6 +46,7 @@ class BinaryPropertyListWriter {
                                    std::string memory = {});
 
  private:
+  /// Null when nothing is remembered.
   std::unique_ptr<binaryplist::Catalogue> catalogue_;
   std::optional<PropertyValue> lastValue_;
 };

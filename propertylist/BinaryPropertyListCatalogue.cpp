@@ -2,11 +2,9 @@
 
 #include <algorithm>
 #include <array>
-#include <bit>
 #include <numeric>
 #include <optional>
 
-#include "propertylist/GeneralisedUTF8.h"
 #include "propertylist/PropertyListLimits.h"
 
 namespace accounts::binaryplist {
@@ -14,17 +12,6 @@ namespace accounts::binaryplist {
 static_assert(kMaximumObjectCount < Catalogue::kContainerBit);
 
 namespace {
-
-bool isGeneralisedUTF8(std::string_view text) {
-  while (!text.empty()) {
-    const std::size_t length = decodeCodePoint(text).length;
-    if (length == 0) {
-      return false;
-    }
-    text.remove_prefix(length);
-  }
-  return true;
-}
 
 std::string_view asBytes(std::span<const Catalogue::Reference> references) {
   return {reinterpret_cast<const char*>(references.data()), references.size_bytes()};
@@ -53,7 +40,7 @@ template <class Element>
 bool Catalogue::visitAll(std::span<const Element> elements, std::size_t depth, Size& parent) {
   // Memory is asked for a handful of elements at once, which saves a seventh of the time for a
   // large file: its answers come while others are waited for.
-  std::array<Announced, 16> announced;
+  std::array<ScalarCatalogue::Announced, 16> announced;
   while (!elements.empty()) {
     const std::size_t count = std::min(announced.size(), elements.size());
     for (std::size_t index = 0; index < count; ++index) {
@@ -69,137 +56,51 @@ bool Catalogue::visitAll(std::span<const Element> elements, std::size_t depth, S
   return true;
 }
 
-Catalogue::Announced Catalogue::announce(const PropertyValue& value) const {
-  switch (value.kind()) {
-    case PropertyKind::String:
-      return announce(*value.asText());
-    case PropertyKind::Data:
-      return announceBytes(ScalarKind::Data, value.asData()->bytes);
-    case PropertyKind::Dictionary:
-      __builtin_prefetch(value.asDictionary()->sharedNode());
-      return {};
-    case PropertyKind::Array:
-      __builtin_prefetch(value.asArray()->sharedNode());
-      return {};
-    default:
-      return announceHash(hash_(numberOf(value).bits));
+ScalarCatalogue::Announced Catalogue::announce(const PropertyValue& value) const {
+  if (const PropertyDictionary* dictionary = value.asDictionary()) {
+    __builtin_prefetch(dictionary->sharedNode());
+    return {};
   }
-}
-
-Catalogue::Announced Catalogue::announce(const Text& text) const {
-  return announceBytes(ScalarKind::ASCIIText, text.bytes());
-}
-
-Catalogue::Announced Catalogue::announceBytes(ScalarKind kind, const SharedBytes& bytes) const {
-  const SharedNodeBase* const node = bytes.sharedNode();
-  if (node != nullptr && node->note() < scalars_.size()) {
-    const CatalogueScalar& scalar = scalars_[node->note()];
-    if (scalar.isNode(node) && scalar.isAlike(kind)) {
-      return {.number = node->note()};
-    }
+  if (const PropertyArray* array = value.asArray()) {
+    __builtin_prefetch(array->sharedNode());
+    return {};
   }
-  return announceHash(hash_(bytes.view()));
+  return scalars_.announce(value);
 }
 
-Catalogue::Announced Catalogue::announceHash(std::uint32_t hash) const {
-  scalarTable_.announce(hash);
-  return {.hash = hash};
+ScalarCatalogue::Announced Catalogue::announce(const Text& key) const {
+  return scalars_.announce(key);
 }
 
 /// `depth` is the number of containers around the value; it bounds the recursion.
-bool Catalogue::visit(const PropertyValue& value, Announced announced, std::size_t depth,
-                      Size& parent) {
-  switch (value.kind()) {
-    case PropertyKind::String:
-      ++parent.expandedCount;
-      return visit(*value.asText(), announced, depth, parent);
-    case PropertyKind::Data:
-      ++parent.expandedCount;
-      return visitBytes(ScalarKind::Data, value.asData()->bytes, announced, parent);
-    case PropertyKind::Dictionary: {
-      const PropertyDictionary& dictionary = *value.asDictionary();
-      return visitContainer(dictionary.sharedNode(), &dictionary.keys(), dictionary.values(), depth,
-                            parent);
-    }
-    case PropertyKind::Array: {
-      const PropertyArray& array = *value.asArray();
-      return visitContainer(array.sharedNode(), nullptr, {array.begin(), array.end()}, depth,
-                            parent);
-    }
-    default:
-      return visitNumber(numberOf(value), announced, parent);
+bool Catalogue::visit(const PropertyValue& value, ScalarCatalogue::Announced announced,
+                      std::size_t depth, Size& parent) {
+  if (const PropertyDictionary* dictionary = value.asDictionary()) {
+    return visitContainer(dictionary->sharedNode(), &dictionary->keys(), dictionary->values(),
+                          depth, parent);
   }
-}
-/// A key counts its bytes alone.
-bool Catalogue::visit(const Text& text, Announced announced, std::size_t /*depth*/, Size& parent) {
-  return visitBytes(ScalarKind::ASCIIText, text.bytes(), announced, parent);
-}
-
-Catalogue::Number Catalogue::numberOf(const PropertyValue& value) {
-  if (const std::int64_t* integer = value.asSigned()) {
-    return {ScalarKind::SignedInteger, static_cast<std::uint64_t>(*integer)};
+  if (const PropertyArray* array = value.asArray()) {
+    return visitContainer(array->sharedNode(), nullptr, {array->begin(), array->end()}, depth,
+                          parent);
   }
-  if (const bool* boolean = value.asBoolean()) {
-    return {ScalarKind::Boolean, *boolean ? std::uint64_t{1} : 0};
-  }
-  if (const double* real = value.asReal()) {
-    return {ScalarKind::Real, std::bit_cast<std::uint64_t>(*real)};
-  }
-  if (const PropertyDate* date = value.asDate()) {
-    return {ScalarKind::Date, std::bit_cast<std::uint64_t>(date->secondsSinceReferenceDate)};
-  }
-  return {ScalarKind::LargeInteger, *value.asLargeUnsigned()};
-}
-
-bool Catalogue::visitNumber(Number number, Announced announced, Size& parent) {
   ++parent.expandedCount;
-  const auto newNumber = static_cast<Reference>(scalars_.size());
-  const Reference found =
-      scalarTable_.findOrAdd(announced.hash, newNumber, [&](Reference candidate) {
-        return scalars_[candidate].kind() == number.kind &&
-               scalars_[candidate].bits() == number.bits;
-      });
-  pending_.push_back(found);
-  if (found != newNumber) {
-    return true;
-  }
-  scalars_.emplace_back(number.kind, number.bits);
-  firstHolders_.push_back(ContentTable::kNone);
-  return checkObjectCount();
+  std::string_view problem;
+  return addScalarToParent(scalars_.findOrAdd(value, announced, problem), problem, parent);
 }
 
-/// Finds or adds a data or a text. Of a text the kind given is ASCII, and may become the other one.
-bool Catalogue::visitBytes(ScalarKind kind, const SharedBytes& bytes, Announced announced,
-                           Size& parent) {
-  const std::string_view content = bytes.view();
-  parent.expandedCount += expandedCountOfBytes(content.size());
-  if (announced.number != ContentTable::kNone) {
-    pending_.push_back(announced.number);
-    return true;
+/// A key counts its bytes alone.
+bool Catalogue::visit(const Text& key, ScalarCatalogue::Announced announced, std::size_t /*depth*/,
+                      Size& parent) {
+  std::string_view problem;
+  return addScalarToParent(scalars_.findOrAdd(key, announced, problem), problem, parent);
+}
+
+bool Catalogue::addScalarToParent(Reference number, std::string_view problem, Size& parent) {
+  if (number == ContentTable::kNone) {
+    return fail(problem);
   }
-  if (expandedCountOfBytes(content.size()) > kMaximumExpandedValueCount) {
-    return fail("a text or data longer than the limit");
-  }
-  const auto newNumber = static_cast<Reference>(scalars_.size());
-  const Reference number =
-      scalarTable_.findOrAdd(announced.hash, newNumber, [&](Reference candidate) {
-        return scalars_[candidate].isAlike(kind) && scalars_[candidate].view() == content;
-      });
   pending_.push_back(number);
-  if (number != newNumber) {
-    return true;
-  }
-  if (kind != ScalarKind::Data && !isASCII(content)) {
-    if (!isGeneralisedUTF8(content)) {
-      return fail("a text that is not well-formed UTF-8");
-    }
-    kind = ScalarKind::UTF16Text;
-  }
-  scalars_.emplace_back(kind, bytes);
-  firstHolders_.push_back(ContentTable::kNone);
-  if (const SharedNodeBase* const node = bytes.sharedNode()) {
-    node->setNote(number);
-  }
+  parent.expandedCount += expandedCountOfBytes(scalars_[number].byteCount());
   return checkObjectCount();
 }
 
@@ -321,6 +222,9 @@ Catalogue::Reference Catalogue::findContainer(std::uint32_t keys,
                                          return std::max(known, static_cast<std::int32_t>(child));
                                        });
   if (largest >= 0) {
+    if (static_cast<std::size_t>(largest) >= firstHolders_.size()) {
+      firstHolders_.resize(scalars_.size(), ContentTable::kNone);
+    }
     Reference& holder = firstHolders_[static_cast<std::size_t>(largest)];
     if (holder != ContentTable::kNone && isSought(holder)) {
       return holder;

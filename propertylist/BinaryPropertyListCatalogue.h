@@ -8,69 +8,12 @@
 #include <utility>
 #include <vector>
 
-#include "propertylist/BinaryPropertyListFormat.h"
+#include "propertylist/BinaryPropertyListScalarCatalogue.h"
 #include "propertylist/ContentTable.h"
 #include "propertylist/PropertyListError.h"
 #include "propertylist/PropertyValue.h"
 
 namespace accounts::binaryplist {
-
-/// The kinds of scalar that are written differently. Those that hold bytes come last.
-enum class ScalarKind : std::uint8_t {
-  Boolean,
-  SignedInteger,
-  /// From 2^63 to 2^64-1.
-  LargeInteger,
-  Real,
-  Date,
-  Data,
-  ASCIIText,
-  UTF16Text
-};
-
-/// A scalar that a file may hold. There may be millions: it is kept small.
-class CatalogueScalar {
- public:
-  /// A number: its bits, 0 or 1 of a boolean.
-  CatalogueScalar(ScalarKind kind, std::uint64_t bits) : bits_(bits), kind_(kind) {}
-  /// A text or data, which it keeps alive.
-  CatalogueScalar(ScalarKind kind, SharedBytes bytes)
-      : bytes_(std::move(bytes)),
-        byteCount_(static_cast<std::uint32_t>(bytes_.view().size())),
-        kind_(kind) {}
-  CatalogueScalar(CatalogueScalar&& other) noexcept
-      : bits_(std::exchange(other.bits_, 0)), byteCount_(other.byteCount_), kind_(other.kind_) {}
-  CatalogueScalar& operator=(CatalogueScalar&&) = delete;
-  ~CatalogueScalar() {
-    if (holdsBytes()) {
-      bytes_.~SharedBytes();
-    }
-  }
-
-  [[nodiscard]] ScalarKind kind() const { return kind_; }
-  [[nodiscard]] bool holdsBytes() const { return kind_ >= ScalarKind::Data; }
-  /// Of numbers alone.
-  [[nodiscard]] std::uint64_t bits() const { return bits_; }
-  /// Of texts and data alone.
-  [[nodiscard]] std::string_view view() const { return bytes_.view(); }
-  [[nodiscard]] std::size_t byteCount() const { return byteCount_; }
-  [[nodiscard]] bool isNode(const SharedNodeBase* node) const {
-    return holdsBytes() && bytes_.sharedNode() == node;
-  }
-  /// Whether both are texts, both data, or both numbers of the same kind.
-  [[nodiscard]] bool isAlike(ScalarKind kind) const {
-    return kind_ == kind || (kind_ > ScalarKind::Data && kind > ScalarKind::Data);
-  }
-
- private:
-  union {
-    std::uint64_t bits_;
-    SharedBytes bytes_;
-  };
-  std::uint32_t byteCount_ = 0;
-  ScalarKind kind_;
-};
-static_assert(sizeof(CatalogueScalar) == 16);
 
 /// The keys of dictionaries that a file may hold: their references are a run of the catalogue's.
 struct CatalogueKeys {
@@ -147,35 +90,20 @@ class Catalogue {
     /// How many scalars there were before its children.
     std::size_t firstNewScalar;
   };
-  /// A number as it is written.
-  struct Number {
-    ScalarKind kind;
-    std::uint64_t bits;
-  };
-  /// What is known of a value before it is visited.
-  struct Announced {
-    /// The number of a scalar that the walk before met in the same memory; `kNone` for others.
-    Reference number = ContentTable::kNone;
-    /// Of other scalars, the hash of their content.
-    std::uint32_t hash = 0;
-  };
-
   bool fail(std::string_view what) const;
   template <class Element>
   bool visitAll(std::span<const Element> elements, std::size_t depth, Size& parent);
-  bool visit(const PropertyValue& value, Announced announced, std::size_t depth, Size& parent);
-  bool visit(const Text& text, Announced announced, std::size_t depth, Size& parent);
-  bool visitNumber(Number number, Announced announced, Size& parent);
-  bool visitBytes(ScalarKind kind, const SharedBytes& bytes, Announced announced, Size& parent);
+  bool visit(const PropertyValue& value, ScalarCatalogue::Announced announced, std::size_t depth,
+             Size& parent);
+  bool visit(const Text& key, ScalarCatalogue::Announced announced, std::size_t depth,
+             Size& parent);
   bool visitContainer(const SharedNodeBase* node, const PropertyKeys* keys,
                       std::span<const PropertyValue> children, std::size_t depth, Size& parent);
   bool findOrAddKeys(const PropertyKeys& keys, std::uint32_t& number);
   [[nodiscard]] bool isKnownContainer(const SharedNodeBase* node) const;
-  [[nodiscard]] Announced announce(const PropertyValue& value) const;
-  [[nodiscard]] Announced announce(const Text& text) const;
-  [[nodiscard]] Announced announceBytes(ScalarKind kind, const SharedBytes& bytes) const;
-  [[nodiscard]] Announced announceHash(std::uint32_t hash) const;
-  static Number numberOf(const PropertyValue& value);
+  [[nodiscard]] ScalarCatalogue::Announced announce(const PropertyValue& value) const;
+  [[nodiscard]] ScalarCatalogue::Announced announce(const Text& key) const;
+  bool addScalarToParent(Reference number, std::string_view problem, Size& parent);
   bool findOrAddContainer(std::uint32_t keys, Pending pending, const Size& size, Reference& number);
   Reference findContainer(std::uint32_t keys, std::span<const Reference> content,
                           std::size_t firstNewScalar, Reference newNumber);
@@ -187,10 +115,10 @@ class Catalogue {
   std::uint32_t walk_ = 0;
   /// Where its error goes.
   PropertyListError* error_ = nullptr;
+  ScalarCatalogue scalars_;
   KeyedHash hash_;
-  std::vector<CatalogueScalar> scalars_;
-  ContentTable scalarTable_;
-  /// By scalar: the container that it was first met in, where it was the newest scalar.
+  /// By scalar: the container that it was first met in, where it was the newest scalar. There may
+  /// be none for the newest scalars.
   std::vector<Reference> firstHolders_;
   std::vector<CatalogueContainer> containers_;
   ContentTable containerTable_;

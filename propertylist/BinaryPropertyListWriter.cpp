@@ -1,6 +1,5 @@
 #include <algorithm>
 #include <bit>
-#include <numeric>
 #include <span>
 #include <string>
 #include <type_traits>
@@ -8,6 +7,7 @@
 
 #include "propertylist/BinaryPropertyList.h"
 #include "propertylist/BinaryPropertyListCatalogue.h"
+#include "propertylist/BinaryPropertyListFileOrder.h"
 #include "propertylist/BinaryPropertyListFormat.h"
 #include "propertylist/GeneralisedUTF8.h"
 
@@ -162,87 +162,6 @@ class Output {
   char* place_;
 };
 
-/// The order in which the parts of one value stand in a file: that in which a walk over the value
-/// leaves them, whatever else the catalogue holds.
-class FileOrder {
- public:
-  FileOrder(const Catalogue& catalogue, Catalogue::Reference top)
-      : catalogue_(catalogue),
-        scalarNumbers_(catalogue.scalarCount(), kNone),
-        containerNumbers_(catalogue.containerCount(), kNone),
-        hasKeys_(catalogue.keysCount(), false) {
-    if (catalogue.holdsOneValue()) {
-      takeOrderOfCatalogue();
-    } else {
-      visit(top);
-    }
-  }
-
-  /// The catalogue's numbers of what the file holds; the outermost container comes last.
-  [[nodiscard]] const std::vector<Catalogue::Reference>& scalars() const { return scalars_; }
-  [[nodiscard]] const std::vector<Catalogue::Reference>& containers() const { return containers_; }
-  [[nodiscard]] std::size_t objectCount() const { return scalars_.size() + containers_.size(); }
-
-  /// The object number in the file: containers come first, the outermost as 0.
-  [[nodiscard]] std::uint32_t numberInFile(Catalogue::Reference reference) const {
-    const auto containerCount = static_cast<std::uint32_t>(containers_.size());
-    return (reference & Catalogue::kContainerBit) != 0
-               ? containerCount - 1 - containerNumbers_[reference & ~Catalogue::kContainerBit]
-               : containerCount + scalarNumbers_[reference];
-  }
-
- private:
-  static constexpr Catalogue::Reference kNone = UINT32_MAX;
-
-  /// One walk alone left everything in this order already.
-  void takeOrderOfCatalogue() {
-    std::iota(scalarNumbers_.begin(), scalarNumbers_.end(), Catalogue::Reference{0});
-    std::iota(containerNumbers_.begin(), containerNumbers_.end(), Catalogue::Reference{0});
-    scalars_ = scalarNumbers_;
-    containers_ = containerNumbers_;
-  }
-
-  /// The recursion is as deep as the value, which the catalogue has bounded.
-  void visit(Catalogue::Reference reference) {
-    if ((reference & Catalogue::kContainerBit) == 0) {
-      leave(reference, scalarNumbers_, scalars_);
-      return;
-    }
-    const Catalogue::Reference container = reference & ~Catalogue::kContainerBit;
-    if (containerNumbers_[container] != kNone) {
-      return;
-    }
-    const CatalogueContainer& visited = catalogue_.container(container);
-    if (visited.isDictionary() && !hasKeys_[visited.keys]) {
-      hasKeys_[visited.keys] = true;
-      for (const Catalogue::Reference key :
-           catalogue_.referencesOf(catalogue_.keys(visited.keys))) {
-        visit(key);
-      }
-    }
-    for (const Catalogue::Reference child : catalogue_.childrenOf(visited)) {
-      visit(child);
-    }
-    leave(container, containerNumbers_, containers_);
-  }
-
-  static void leave(Catalogue::Reference object, std::vector<Catalogue::Reference>& numbers,
-                    std::vector<Catalogue::Reference>& order) {
-    if (numbers[object] == kNone) {
-      numbers[object] = static_cast<Catalogue::Reference>(order.size());
-      order.push_back(object);
-    }
-  }
-
-  const Catalogue& catalogue_;
-  std::vector<Catalogue::Reference> scalarNumbers_;
-  std::vector<Catalogue::Reference> containerNumbers_;
-  /// Whether the keys with a number have their places.
-  std::vector<bool> hasKeys_;
-  std::vector<Catalogue::Reference> scalars_;
-  std::vector<Catalogue::Reference> containers_;
-};
-
 /// A file to be: containers come first in the count of objects, the outermost as 0, and scalars
 /// first in the file.
 class File {
@@ -342,8 +261,7 @@ std::optional<std::string> writeBinaryPropertyList(const PropertyValue& value,
   return BinaryPropertyListWriter().write(value, error);
 }
 
-BinaryPropertyListWriter::BinaryPropertyListWriter()
-    : catalogue_(std::make_unique<binaryplist::Catalogue>()) {}
+BinaryPropertyListWriter::BinaryPropertyListWriter() = default;
 
 BinaryPropertyListWriter::~BinaryPropertyListWriter() = default;
 
@@ -351,19 +269,23 @@ std::optional<std::string> BinaryPropertyListWriter::write(const PropertyValue& 
                                                            PropertyListError& error,
                                                            std::string memory) {
   using binaryplist::Catalogue;
-  const bool isFirst = catalogue_->objectCount() == 0;
-  const std::optional<Catalogue::Reference> top = catalogue_->add(value, error);
+  // Kept again only once the value is written: nothing that ends halfway leaves half of it here.
+  std::unique_ptr<Catalogue> catalogue = std::move(catalogue_);
+  const bool isFirst = catalogue == nullptr;
+  if (isFirst) {
+    catalogue = std::make_unique<Catalogue>();
+  }
+  const std::optional<Catalogue::Reference> top = catalogue->add(value, error);
   if (!top) {
-    catalogue_ = std::make_unique<Catalogue>();
     // What was written before may have used up the room for objects.
     return isFirst ? std::nullopt : write(value, error, std::move(memory));
   }
-  const binaryplist::FileOrder order(*catalogue_, *top);
-  std::string bytes = binaryplist::File(*catalogue_, order).write(std::move(memory));
+  const binaryplist::FileOrder order(*catalogue, *top);
+  std::string bytes = binaryplist::File(*catalogue, order).write(std::move(memory));
   lastValue_ = value;
   // More than as much again that only earlier values had is not worth its memory.
-  if (catalogue_->objectCount() > 2 * order.objectCount()) {
-    catalogue_ = std::make_unique<Catalogue>();
+  if (catalogue->objectCount() <= 2 * order.objectCount()) {
+    catalogue_ = std::move(catalogue);
   }
   return bytes;
 }
