@@ -42,7 +42,7 @@ bool writeAll(int file, std::string_view text) {
 
 std::string readFromStart(int file) {
   std::string text;
-  std::array<char, 65536> part{};
+  std::array<char, 65536> part;
   while (true) {
     const ssize_t count = pread(file, part.data(), part.size(), static_cast<off_t>(text.size()));
     if (count < 0 && errno == EINTR) {

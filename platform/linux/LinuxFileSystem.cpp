@@ -11,7 +11,6 @@
 #include "platform/linux/DevicePath.h"
 #include "platform/linux/FileContents.h"
 #include "platform/linux/PathResult.h"
-#include "platform/linux/TemporaryFile.h"
 
 namespace accounts {
 namespace {
@@ -72,7 +71,7 @@ Result LinuxFileSystem::copyFile(std::string_view source, std::string_view desti
 
 Result LinuxFileSystem::removeFile(std::string_view path) {
   PathError error;
-  const auto entry = root_.locate(path, error);
+  const auto entry = entryOf(path, error);
   const Result result = entry ? asResult("remove", path, entry->remove()) : asResult(error);
   temporaryFiles_.erase(std::string(path));
   return result;
@@ -111,7 +110,7 @@ Result LinuxFileSystem::createDirectoryWithIntermediates(std::string_view path,
 
 Result LinuxFileSystem::writeFile(std::string_view path, std::string_view contents) {
   PathError error;
-  const auto entry = root_.locate(path, error);
+  const auto entry = entryOf(path, error);
   if (!entry) {
     return asResult(error);
   }
@@ -158,7 +157,7 @@ Result LinuxFileSystem::setOwnerAndGroup(std::string_view path, std::string_view
   const auto user = ownerNames_.userIdentifier(std::string(ownerName), error);
   const auto group =
       user ? ownerNames_.groupIdentifier(std::string(groupName), error) : std::nullopt;
-  const auto entry = group ? root_.locate(path, error) : std::nullopt;
+  const auto entry = group ? entryOf(path, error) : nullptr;
   const auto file = entry ? entry->openRegularFile(O_RDONLY, error) : std::nullopt;
   if (!file) {
     return asResult(error);
@@ -171,7 +170,7 @@ Result LinuxFileSystem::setOwnerAndGroup(std::string_view path, std::string_view
 
 Result LinuxFileSystem::renameFile(std::string_view source, std::string_view destination) {
   PathError error;
-  const auto from = root_.locate(source, error);
+  const auto from = entryOf(source, error);
   const auto to = from ? root_.locate(destination, error) : std::nullopt;
   const auto file = to ? from->openRegularFile(O_RDONLY, error) : std::nullopt;
   if (!file) {

@@ -1,6 +1,8 @@
 #pragma once
 
+#include <functional>
 #include <map>
+#include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -8,8 +10,8 @@
 
 #include "platform/FileSystem.h"
 #include "platform/linux/DeviceRoot.h"
-#include "platform/linux/FileDescriptor.h"
 #include "platform/linux/OwnerNames.h"
+#include "platform/linux/TemporaryFile.h"
 
 namespace accounts {
 
@@ -59,12 +61,16 @@ class LinuxFileSystem final : public FileSystem {
 
  private:
   void removeAbandonedTemporaryFilesIn(const std::string& directory);
+  /// As `DeviceRoot::locate`, but a temporary file is found in the directory in which it was made,
+  /// without looking the directory up again. Null, with `error` set, for none.
+  [[nodiscard]] std::shared_ptr<const DirectoryEntry> entryOf(std::string_view path,
+                                                              PathError& error) const;
 
   const DeviceRoot& root_;
   OwnerNames ownerNames_;
   std::string temporaryDirectory_;
   /// By their paths, the temporary files that are neither renamed nor removed yet.
-  std::map<std::string, FileDescriptor> temporaryFiles_;
+  std::map<std::string, std::shared_ptr<const TemporaryFile>, std::less<>> temporaryFiles_;
 };
 
 }  // namespace accounts

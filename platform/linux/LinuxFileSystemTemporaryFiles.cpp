@@ -2,6 +2,7 @@
 #include <sys/file.h>
 
 #include <cerrno>
+#include <memory>
 #include <string>
 #include <utility>
 
@@ -18,21 +19,31 @@ constexpr mode_t kOwnerOnlyDirectory = 0700;
 
 std::optional<std::string> LinuxFileSystem::makeTemporaryFile() {
   PathError error;
-  if (!isDirectory(temporaryDirectory_)) {
+  auto temporary = makeTemporaryFileIn(root_, temporaryDirectory_, error);
+  if (!temporary && error.isMissing()) {
     const auto entry = root_.locate(temporaryDirectory_, error);
     const bool made = entry && entry->createDirectory(kOwnerOnlyDirectory, error);
-    if (!made && error.number != EEXIST) {
-      return std::nullopt;
+    if (made || error.number == EEXIST) {
+      temporary = makeTemporaryFileIn(root_, temporaryDirectory_, error);
     }
   }
-  auto temporary = makeTemporaryFileIn(root_, temporaryDirectory_, error);
   if (!temporary) {
     return std::nullopt;
   }
   std::string path = temporary->entry.path();
   // Open, and so locked, until it is renamed or removed: as long as it is, it is not abandoned.
-  temporaryFiles_.insert_or_assign(path, std::move(temporary->file));
+  temporaryFiles_.insert_or_assign(path,
+                                   std::make_shared<const TemporaryFile>(*std::move(temporary)));
   return path;
+}
+
+std::shared_ptr<const DirectoryEntry> LinuxFileSystem::entryOf(std::string_view path,
+                                                               PathError& error) const {
+  if (const auto temporary = temporaryFiles_.find(path); temporary != temporaryFiles_.end()) {
+    return {temporary->second, &temporary->second->entry};
+  }
+  auto entry = root_.locate(path, error);
+  return entry ? std::make_shared<const DirectoryEntry>(*std::move(entry)) : nullptr;
 }
 
 void LinuxFileSystem::removeAbandonedTemporaryFiles(

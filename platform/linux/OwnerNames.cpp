@@ -97,18 +97,36 @@ std::optional<std::uint32_t> OwnerNames::lookUp(std::string_view databasePath,
   return identifier;
 }
 
-std::optional<std::uint32_t> OwnerNames::userIdentifier(const std::string& name,
-                                                        PathError& error) const {
-  return root_.isSystemRoot()
-             ? askNameService<passwd>(::getpwnam_r, &passwd::pw_uid, kUserDatabase, name, error)
-             : lookUp(kUserDatabase, name, error);
+template <class LookUp>
+std::optional<std::uint32_t> OwnerNames::rememberedOr(const LookUp& lookUp, const std::string& name,
+                                                      Found& found) {
+  if (const auto known = found.find(name); known != found.end()) {
+    return known->second;
+  }
+  const std::optional<std::uint32_t> identifier = lookUp();
+  if (identifier) {
+    found.emplace(name, *identifier);
+  }
+  return identifier;
+}
+
+std::optional<std::uint32_t> OwnerNames::userIdentifier(const std::string& name, PathError& error) {
+  const auto lookUpUser = [&] {
+    return root_.isSystemRoot()
+               ? askNameService<passwd>(::getpwnam_r, &passwd::pw_uid, kUserDatabase, name, error)
+               : lookUp(kUserDatabase, name, error);
+  };
+  return rememberedOr(lookUpUser, name, users_);
 }
 
 std::optional<std::uint32_t> OwnerNames::groupIdentifier(const std::string& name,
-                                                         PathError& error) const {
-  return root_.isSystemRoot()
-             ? askNameService<group>(::getgrnam_r, &group::gr_gid, kGroupDatabase, name, error)
-             : lookUp(kGroupDatabase, name, error);
+                                                         PathError& error) {
+  const auto lookUpGroup = [&] {
+    return root_.isSystemRoot()
+               ? askNameService<group>(::getgrnam_r, &group::gr_gid, kGroupDatabase, name, error)
+               : lookUp(kGroupDatabase, name, error);
+  };
+  return rememberedOr(lookUpGroup, name, groups_);
 }
 
 }  // namespace accounts

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <map>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -16,22 +17,30 @@ std::optional<std::uint32_t> identifierInDatabase(std::string_view database, std
 
 /// Turns the account names of users and groups into the numbers that files carry: by the running
 /// system's name service when the device root is "/", otherwise by the root's own /etc/passwd and
-/// /etc/group. `root` must outlive this.
+/// /etc/group. A number that was found is kept: the databases are asked for each name once, however
+/// many files are given away. `root` must outlive this.
 class OwnerNames {
  public:
   explicit OwnerNames(const DeviceRoot& root) : root_(root) {}
 
   /// The number of a user or group; none, with `error` set, when the device does not know the name.
   [[nodiscard]] std::optional<std::uint32_t> userIdentifier(const std::string& name,
-                                                            PathError& error) const;
+                                                            PathError& error);
   [[nodiscard]] std::optional<std::uint32_t> groupIdentifier(const std::string& name,
-                                                             PathError& error) const;
+                                                             PathError& error);
 
  private:
+  using Found = std::map<std::string, std::uint32_t>;
+  template <class LookUp>
+  static std::optional<std::uint32_t> rememberedOr(const LookUp& lookUp, const std::string& name,
+                                                   Found& found);
   [[nodiscard]] std::optional<std::uint32_t> lookUp(std::string_view databasePath,
                                                     const std::string& name,
                                                     PathError& error) const;
+
   const DeviceRoot& root_;
+  Found users_;
+  Found groups_;
 };
 
 }  // namespace accounts

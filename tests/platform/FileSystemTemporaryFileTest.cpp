@@ -1,4 +1,7 @@
 #include <gtest/gtest.h>
+#include <unistd.h>
+
+#include <string>
 
 #include "platform/linux/LinuxFileSystem.h"
 #include "platform/linux/TemporaryFile.h"
@@ -67,6 +70,50 @@ TEST_F(FileSystemTemporaryFileTest, ATemporaryDirectoryLinkedOutOfTheRootIsNotUs
   makeLink("/home/tmp", outside());
   EXPECT_FALSE(files.makeTemporaryFile());
   EXPECT_TRUE(fs::is_empty(outside()));
+}
+
+TEST_F(FileSystemTemporaryFileTest,
+       ATemporaryFileIsFoundWhereItWasMadeThoughALinkTookTheDirectorysPlace) {
+  const auto path = files.makeTemporaryFile();
+  ASSERT_TRUE(path);
+  fs::rename(onHost("/home/tmp"), onHost("/home/moved"));
+  makeLink("/home/tmp", outside());
+
+  EXPECT_TRUE(files.writeFile(*path, "contents"));
+  EXPECT_TRUE(files.renameFile(*path, "/home/file"));
+
+  EXPECT_EQ(contentsOf("/home/file"), "contents");
+  EXPECT_TRUE(namesIn("/home/moved").empty());
+  EXPECT_TRUE(fs::is_empty(outside()));
+}
+
+TEST_F(FileSystemTemporaryFileTest, ARenamedTemporaryFilesPathIsOneLikeAnyOther) {
+  const auto path = files.makeTemporaryFile();
+  ASSERT_TRUE(path && files.renameFile(*path, "/home/file"));
+  fs::rename(onHost("/home/tmp"), onHost("/home/moved"));
+  makeDirectory("/home/tmp");
+
+  EXPECT_TRUE(files.writeFile(*path, "contents"));
+
+  EXPECT_EQ(namesIn("/home/tmp").size(), 1u);
+  EXPECT_TRUE(namesIn("/home/moved").empty());
+}
+
+TEST_F(FileSystemTemporaryFileTest, ALinkInTheTemporaryFilesPlaceIsNeitherWrittenThroughNorMoved) {
+  makeFile("/etc/passwd", "mobile:*:" + std::to_string(::getuid()) + ":1:::\n");
+  makeFile("/etc/group", "mobile:*:" + std::to_string(::getgid()) + ":\n");
+  makeFile("/home/other", "contents");
+  const auto path = files.makeTemporaryFile();
+  ASSERT_TRUE(path && files.setOwnerAndGroup(*path, "mobile", "mobile"));
+  fs::remove(onHost(*path));
+  makeLink(*path, "../other");
+
+  EXPECT_FALSE(files.writeFile(*path, "new"));
+  EXPECT_FALSE(files.setOwnerAndGroup(*path, "mobile", "mobile"));
+  EXPECT_FALSE(files.renameFile(*path, "/home/file"));
+
+  EXPECT_EQ(contentsOf("/home/other"), "contents");
+  EXPECT_FALSE(files.fileExists("/home/file"));
 }
 
 }  // namespace

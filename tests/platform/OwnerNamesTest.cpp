@@ -3,6 +3,8 @@
 #include <gtest/gtest.h>
 #include <unistd.h>
 
+#include <filesystem>
+
 #include "platform/linux/LinuxFileSystem.h"
 #include "tests/platform/DeviceFixture.h"
 
@@ -68,10 +70,30 @@ TEST_F(OwnerNamesTest, AMissingDatabaseIsAnError) {
   EXPECT_EQ(error.text, "Cannot open /etc/group: No such file or directory");
 }
 
+TEST_F(OwnerNamesTest, ANumberThatWasFoundIsKept) {
+  makeFile("/etc/passwd", "mobile:*:4711:1:::\n");
+  makeFile("/etc/group", "mobile:*:4712:\n");
+  ASSERT_TRUE(names.userIdentifier("mobile", error) && names.groupIdentifier("mobile", error));
+
+  std::filesystem::remove(onHost("/etc/passwd"));
+  std::filesystem::remove(onHost("/etc/group"));
+
+  EXPECT_EQ(names.userIdentifier("mobile", error), 4711u);
+  EXPECT_EQ(names.groupIdentifier("mobile", error), 4712u);
+}
+
+TEST_F(OwnerNamesTest, ANameThatWasNotFoundIsLookedForAgain) {
+  ASSERT_EQ(names.userIdentifier("mobile", error), std::nullopt);
+
+  makeFile("/etc/passwd", "mobile:*:4711:1:::\n");
+
+  EXPECT_EQ(names.userIdentifier("mobile", error), 4711u);
+}
+
 TEST_F(OwnerNamesTest, TheRunningSystemAsksItsNameService) {
   const auto systemRoot = DeviceRoot::openRoot("/", error);
   ASSERT_TRUE(systemRoot);
-  const OwnerNames systemNames(*systemRoot);
+  OwnerNames systemNames(*systemRoot);
   EXPECT_EQ(systemNames.userIdentifier("root", error), 0u);
   EXPECT_EQ(systemNames.groupIdentifier("root", error), 0u);
   EXPECT_EQ(systemNames.userIdentifier("no such user here", error), std::nullopt);
