@@ -29,12 +29,6 @@ const std::vector<KeyKind>& keyKinds() {
   return kinds;
 }
 
-std::string described(const PropertyValue& value) {
-  std::string description;
-  appendDescription(description, value);
-  return description;
-}
-
 /// Adds why no record can be made of a dictionary. `effect` is what a store does with it.
 void addReasonsForRejection(const PropertyDictionary& properties, Effect effect,
                             const Finding& about, std::vector<Finding>& findings) {
@@ -107,7 +101,7 @@ ExaminedAccount examineAccount(const ListedAccount& account, const StoreLayout& 
   const Finding about = findingAbout(account, layout);
   if (!account.properties) {
     addFinding(examined.findings, about, rejection, "noDictionary",
-               "It is no dictionary: " + described(account.element));
+               "It is no dictionary: " + describe(account.element));
     return examined;
   }
   if (BasicAccount::initWithProperties(*account.properties) == nullptr) {
@@ -144,7 +138,7 @@ ExaminedAccount examineChild(const ListedAccount& child, const BasicAccountRefer
   }
   if (!child.properties) {
     addFinding(examined.findings, about, Effect::Ignored, "noDictionary",
-               "It is no dictionary: " + described(child.element));
+               "It is no dictionary: " + describe(child.element));
     return examined;
   }
   examined.record = BasicAccount::initWithProperties(*child.properties);

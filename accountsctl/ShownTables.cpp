@@ -12,12 +12,6 @@ namespace {
 
 constexpr std::string_view kDataclassPrefix = "com.quarx.Dataclass.";
 
-std::string described(const PropertyValue& value) {
-  std::string description;
-  appendDescription(description, value);
-  return description;
-}
-
 std::string counted(std::size_t count, std::string_view singular, std::string_view plural) {
   return fmt::format("{} {}", count, count == 1 ? singular : plural);
 }
@@ -27,7 +21,7 @@ std::string enabledDataclasses(const PropertyDictionary& properties) {
   const std::optional<PropertyArray> list = properties.arrayForKey(kAccountEnabledDataclasses);
   std::string words = list && list->empty() ? "none" : "";
   for (const PropertyValue& member : list.value_or(PropertyArray())) {
-    const std::string word = described(member);
+    const std::string word = describe(member);
     words += words.empty() ? "" : " ";
     words += word.starts_with(kDataclassPrefix) ? word.substr(kDataclassPrefix.size()) : word;
   }
@@ -42,7 +36,7 @@ void addEntries(TextTable& table, const PropertyDictionary& dictionary, const st
     if (inner != nullptr && !inner->empty()) {
       addEntries(table, *inner, name + "/");
     } else {
-      table.addRow({name, described(entry.value)});
+      table.addRow({name, describe(entry.value)});
     }
   }
 }
@@ -59,7 +53,7 @@ class Tables {
     const PropertyDictionary* root = content.asDictionary();
     if (root == nullptr) {
       TextTable table({""});
-      table.addRow({described(content)});
+      table.addRow({describe(content)});
       text_ += table.text(terminal_);
     } else if (kind == FileKind::MigrationInformation) {
       addInformation(*root);
@@ -134,7 +128,7 @@ class Tables {
     std::vector<std::string> row = {
         (account.isChild ? "  " : "") + account.place,
         wordFor(properties, hasTypes ? layout.typeKey : layout.classKey),
-        account.properties ? wordFor(properties, layout.nameKey) : described(account.element),
+        account.properties ? wordFor(properties, layout.nameKey) : describe(account.element),
         wordFor(properties, layout.userKey)};
     if (hasTypes) {
       row.push_back(enabledDataclasses(properties));

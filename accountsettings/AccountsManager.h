@@ -187,9 +187,6 @@ class AccountsManager {
   }
 
  private:
-  /// The source file that assertions name.
-  static constexpr std::string_view sourceFile = "AccountsManager";
-
   AccountsManager() = default;
 
   // Loading

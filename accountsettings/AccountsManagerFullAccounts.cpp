@@ -8,7 +8,6 @@ namespace accounts {
 
 namespace {
 
-constexpr std::string_view kSourceFile = "AccountsManager";
 constexpr std::string_view kFullDeviceLocalAccountOperation =
     "-[AccountsManager fullDeviceLocalAccount]";
 constexpr std::string_view kAccountsWithTypesOperation =
@@ -57,7 +56,7 @@ std::vector<FullAccountReference> AccountsManager::accountsWithTypes_withLoader(
     if (isOneOf(types, account->type())) {
       FullAccountReference fullAccount = fullAccountWithIdentifier_loader(identifier, loader);
       if (fullAccount == nullptr) {
-        failAssertion(kAccountsWithTypesOperation, kSourceFile,
+        failAssertion(kAccountsWithTypesOperation, kManagerSourceFile,
                       "The account with id %@ has no full account", {identifier});
       }
       fullAccounts.push_back(std::move(fullAccount));

@@ -75,7 +75,7 @@ void AccountsManager::shouldMigrateOldMailAccounts_oldDAAccounts_newAccountSetti
        {migrateNewAccounts, "migrateNewAccounts cannot be nil"}}};
   for (const auto& [reference, message] : required) {
     if (reference == nullptr) {
-      failAssertion(operation, sourceFile, message);
+      failAssertion(operation, kManagerSourceFile, message);
     }
   }
   *migrateOldMailAccounts = _oldMailAccountsInformationFound();

@@ -66,7 +66,7 @@ void AccountsManager::replaceAccount_withAccount(const BasicAccountReference& ol
     _topLevelAccountsByID.remove(*oldIdentifier);
   }
   if (!_orderedTopLevelAccounts.replaceFirst(oldAccount, replacement)) {
-    failAssertion("-[AccountsManager replaceAccount:withAccount:]", sourceFile,
+    failAssertion("-[AccountsManager replaceAccount:withAccount:]", kManagerSourceFile,
                   "The account to replace is not in the store");
   }
   // Kept on purpose: the new account is not indexed by its identifier. Lookups and insertions do

@@ -9,7 +9,6 @@ namespace accounts {
 
 namespace {
 
-constexpr std::string_view kSourceFile = "AccountsManager";
 constexpr std::string_view kNotifierCreator = "NotifierAccount";
 constexpr std::string_view kIsActiveKey = "IsActive";
 
@@ -25,7 +24,8 @@ constexpr std::string_view kSendOperation =
 const AccountClass& notifierClassNamed(std::string_view name, std::string_view operation) {
   const AccountClass* notifier = creatorClassNamed(name);
   if (notifier == nullptr) {
-    failAssertion(operation, kSourceFile, "Could not find a class for class name %@", {name});
+    failAssertion(operation, kManagerSourceFile, "Could not find a class for class name %@",
+                  {name});
   }
   return *notifier;
 }
@@ -115,7 +115,7 @@ std::vector<Text> AccountsManager::_notifierClassNamesForAccountType_dataclass(
     std::string_view type, std::string_view dataclass) {
   std::vector<Text> classNames;
   for (const PropertyValue& element :
-       creatorEntriesForType(type, kNotifierClassNamesOperation, kSourceFile)) {
+       creatorEntriesForType(type, kNotifierClassNamesOperation, kManagerSourceFile)) {
     const PropertyDictionary* creator = element.asDictionary();
     if (creator == nullptr || creator->textForKey(kCreatorTypeKey) != kNotifierCreator) {
       continue;
@@ -129,16 +129,16 @@ std::vector<Text> AccountsManager::_notifierClassNamesForAccountType_dataclass(
     }
     const std::optional<Text> framework = description.textForKey(kCreatorFrameworkKey);
     if (!framework) {
-      failAssertion(kNotifierClassNamesOperation, kSourceFile,
+      failAssertion(kNotifierClassNamesOperation, kManagerSourceFile,
                     "Malformed AccountCreators information. Could not find the path to the "
                     "framework for the notifier with type %@",
                     {type});
     }
-    loadCreatorFramework(*framework, kNotifierClassNamesOperation, kSourceFile);
+    loadCreatorFramework(*framework, kNotifierClassNamesOperation, kManagerSourceFile);
     const std::optional<Text> className = description.textForKey(kCreatorClassKey);
     if (!className || className->empty()) {
       // Kept on purpose: "notificatinos" is the text that engineers search for.
-      failAssertion(kNotifierClassNamesOperation, kSourceFile,
+      failAssertion(kNotifierClassNamesOperation, kManagerSourceFile,
                     "Malformed AccountCreators information. Could not find the name of the class "
                     "for notificatinos with the type %@",
                     {type});
@@ -223,7 +223,7 @@ void AccountsManager::_sendNotificationsForChangedAccounts() const {
   for (auto& [name, changes] : batch) {
     const AccountClass& notifier = notifierClassNamed(name, kSendOperation);
     if (!notifier.noteAccountChanges) {
-      failAssertion(kSendOperation, kSourceFile,
+      failAssertion(kSendOperation, kManagerSourceFile,
                     "The class %@ does not answer noteAccountChanges:", {name});
     }
     notifier.noteAccountChanges(PropertyArray(std::move(changes)));

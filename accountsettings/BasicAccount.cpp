@@ -7,8 +7,6 @@ namespace accounts {
 
 namespace {
 
-constexpr std::string_view sourceFileName = "BasicAccount";
-
 std::optional<Text> textOrNone(std::optional<std::string_view> text) {
   return text ? std::optional<Text>(*text) : std::nullopt;
 }
@@ -59,10 +57,10 @@ BasicAccountReference BasicAccount::_initWithType_class(
     std::optional<std::string_view> type, std::optional<std::string_view> accountClass) {
   static constexpr std::string_view operation = "-[BasicAccount _initWithType:class:]";
   if (!accountClass || accountClass->empty()) {
-    failAssertion(operation, sourceFileName, "The account class is required.");
+    failAssertion(operation, kAccountSourceFile, "The account class is required.");
   }
   if (!_isValidAccountType(type)) {
-    failAssertion(operation, sourceFileName, "The account type (%@) is not supported",
+    failAssertion(operation, kAccountSourceFile, "The account type (%@) is not supported",
                   {textOrNone(type)});
   }
   PropertyDictionary properties = {{kAccountType, *type}, {kAccountClass, *accountClass}};
@@ -74,7 +72,7 @@ BasicAccountReference BasicAccount::_initWithType_class(
 }
 
 BasicAccountReference BasicAccount::init() {
-  failAssertion("-[BasicAccount init]", sourceFileName, "Don't use this method");
+  failAssertion("-[BasicAccount init]", kAccountSourceFile, "Don't use this method");
 }
 
 BasicAccountReference BasicAccount::accountWithType_class(

@@ -31,16 +31,16 @@ PropertyArray normalisedDataclasses(const PropertyArray& configured, bool isMult
 
 PropertyDictionary loadAccountTypesTable() {
   static constexpr std::string_view operation = "+[BasicAccount initialize]";
-  static constexpr std::string_view sourceFile = "BasicAccount";
   BundleResources& resources = Process::current().platform.bundleResources;
   if (!resources.hasPropertyList(accountTypesResource)) {
-    failAssertion(operation, sourceFile, "Could not find AccountTypesProperties.plist");
+    failAssertion(operation, kAccountSourceFile, "Could not find AccountTypesProperties.plist");
   }
   const std::optional<PropertyDictionary> file = resources.readPropertyList(accountTypesResource);
   if (!file) {
     // Kept on purpose: the message names the dataclasses although the account types failed; log
     // searches know it so.
-    failAssertion(operation, sourceFile, "Could not load the dataclasses configuration file");
+    failAssertion(operation, kAccountSourceFile,
+                  "Could not load the dataclasses configuration file");
   }
   const bool isMultitaskingEnabled = BasicAccount::isMultitaskingEnabled();
   std::vector<KeyedValue> table;

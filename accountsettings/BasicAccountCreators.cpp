@@ -7,7 +7,6 @@ namespace accounts {
 
 namespace {
 
-constexpr std::string_view kSourceFile = "BasicAccount";
 constexpr std::string_view kFullAccountCreator = "FullAccount";
 constexpr std::string_view kSyncAccountCreator = "SyncAccount";
 
@@ -35,7 +34,7 @@ std::optional<Text> BasicAccount::_creatorClassNameForAccountType_creatorType_lo
   // Kept on purpose: the walk goes on after a match, so that every framework of the kind is loaded
   // and the last class named is the one used.
   for (const PropertyValue& element :
-       creatorEntriesForType(type, kCreatorClassNameOperation, kSourceFile)) {
+       creatorEntriesForType(type, kCreatorClassNameOperation, kAccountSourceFile)) {
     const PropertyDictionary* creator = element.asDictionary();
     if (creator == nullptr || creator->textForKey(kCreatorTypeKey) != creatorType) {
       continue;
@@ -43,7 +42,7 @@ std::optional<Text> BasicAccount::_creatorClassNameForAccountType_creatorType_lo
     const std::optional<PropertyDictionary> description =
         creator->dictionaryForKey(kCreatorDescriptionKey);
     if (!description) {
-      failAssertion(kCreatorClassNameOperation, kSourceFile,
+      failAssertion(kCreatorClassNameOperation, kAccountSourceFile,
                     "Malformed AccountCreators information. Could not find the description for the "
                     "%@ with type %@",
                     {creatorType, type});
@@ -53,16 +52,16 @@ std::optional<Text> BasicAccount::_creatorClassNameForAccountType_creatorType_lo
     if (!loaderHasLoaded) {
       const std::optional<Text> framework = description->textForKey(kCreatorFrameworkKey);
       if (!framework) {
-        failAssertion(kCreatorClassNameOperation, kSourceFile,
+        failAssertion(kCreatorClassNameOperation, kAccountSourceFile,
                       "Malformed AccountCreators information. Could not find the path to the "
                       "framework for the %@ with type %@",
                       {creatorType, type});
       }
-      loadCreatorFramework(*framework, kCreatorClassNameOperation, kSourceFile);
+      loadCreatorFramework(*framework, kCreatorClassNameOperation, kAccountSourceFile);
     }
     className = description->textForKey(kCreatorClassKey);
     if (!className || className->empty()) {
-      failAssertion(kCreatorClassNameOperation, kSourceFile,
+      failAssertion(kCreatorClassNameOperation, kAccountSourceFile,
                     "Malformed AccountCreators information. Could not find the name of the class "
                     "that creates %@ with the type %@",
                     {creatorType, type});
@@ -90,7 +89,7 @@ FullAccountReference BasicAccount::fullAccountUsingLoader(FullAccountLoader* loa
       fullAccountCreatorClassNameForAccountType_loader(accountType, loader);
   const AccountClass* creator = className ? creatorClassNamed(*className) : nullptr;
   if (creator == nullptr) {
-    failAssertion(kFullAccountOperation, kSourceFile,
+    failAssertion(kFullAccountOperation, kAccountSourceFile,
                   "The framework/bundle where %@ is defined has not been loaded", {className});
   }
   FullAccountReference account;
@@ -103,7 +102,7 @@ FullAccountReference BasicAccount::fullAccountUsingLoader(FullAccountLoader* loa
     account = creator->accountWithBasicAccount(shared_from_this());
   }
   if (account == nullptr) {
-    failAssertion(kFullAccountOperation, kSourceFile,
+    failAssertion(kFullAccountOperation, kAccountSourceFile,
                   "Could not create the account with class %@ and id %@",
                   {className, identifier()});
   }

@@ -82,6 +82,11 @@ void logToChannel(std::string_view operation, std::string_view message,
 /// Writes one formatted line to the console log.
 void logToConsole(std::string_view format, std::initializer_list<LogArgument> arguments = {});
 
+/// The source files that assertions name.
+inline constexpr std::string_view kManagerSourceFile = "AccountsManager";
+inline constexpr std::string_view kAccountSourceFile = "BasicAccount";
+inline constexpr std::string_view kMailServicesSourceFile = "MailServices";
+
 /// Ends the process because of a programming error: writes the message, with the operation and the
 /// source file (the class's name), to the console log and aborts.
 [[noreturn]] void failAssertion(std::string_view operation, std::string_view sourceFile,

@@ -11,7 +11,6 @@ namespace {
 
 constexpr std::string_view resourceName = "MailServices";
 constexpr std::string_view operationName = "MailServices::current";
-constexpr std::string_view sourceFileName = "MailServices";
 
 struct ServiceKey {
   std::string_view key;
@@ -31,18 +30,18 @@ constexpr std::array<ServiceKey, 7> serviceKeys = {{
 MailServices readMailServices() {
   BundleResources& resources = Process::current().platform.bundleResources;
   if (!resources.hasPropertyList(resourceName)) {
-    failAssertion(operationName, sourceFileName, "Could not find MailServices.plist");
+    failAssertion(operationName, kMailServicesSourceFile, "Could not find MailServices.plist");
   }
   const std::optional<PropertyDictionary> table = resources.readPropertyList(resourceName);
   if (!table) {
-    failAssertion(operationName, sourceFileName, "Could not load MailServices.plist");
+    failAssertion(operationName, kMailServicesSourceFile, "Could not load MailServices.plist");
   }
   MailServices services;
   for (const ServiceKey& service : serviceKeys) {
     const std::optional<Text> name = table->textForKey(service.key);
     // An empty name would match every mail directory and every account without a server.
     if (!name || name->empty()) {
-      failAssertion(operationName, sourceFileName,
+      failAssertion(operationName, kMailServicesSourceFile,
                     "Malformed MailServices information. Could not find the %@", {service.key});
     }
     services.*service.name = name->string();

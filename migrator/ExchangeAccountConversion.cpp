@@ -10,7 +10,7 @@ namespace accounts {
 
 namespace {
 
-constexpr std::string_view conversionOperation =
+constexpr std::string_view exchangeConversionOperation =
     "-[AccountsDataMigrator(Internal) _migrateDAAccounts:]";
 constexpr std::string_view exchangeTypeString = "Exchange";
 
@@ -69,7 +69,8 @@ bool AccountsDataMigrator::_migrateDAAccounts(AccountsManager& store) {
 
   const std::optional<AccountsManager::Accounts> converted = convertDescriptions(
       legacyAccounts.arrayForKey(kLegacyExchangeAccounts).value_or(PropertyArray()),
-      conversionOperation, "%s. Could not convert the description for the Exchange account %@",
+      exchangeConversionOperation,
+      "%s. Could not convert the description for the Exchange account %@",
       [this](const PropertyDictionary& description) {
         return _convertExchangeAccountDescription(description);
       });

@@ -22,7 +22,7 @@ namespace accounts {
 
 namespace {
 
-constexpr std::string_view conversionOperation =
+constexpr std::string_view mailConversionOperation =
     "-[AccountsDataMigrator(Internal) _migrateMailAccounts:]";
 
 const std::array<LegacyKey, 3> mailKeys = {{
@@ -113,7 +113,7 @@ bool AccountsDataMigrator::replaceMailAccounts(AccountsManager& store,
   const auto converted = [&](std::string_view key, std::string_view type,
                              std::string_view failureLine) {
     return convertDescriptions(legacyAccounts.arrayForKey(key).value_or(PropertyArray()),
-                               conversionOperation, failureLine,
+                               mailConversionOperation, failureLine,
                                [&](const PropertyDictionary& description) {
                                  return _convertMailAccountDescription_type(description, type);
                                });

@@ -23,6 +23,9 @@ inline constexpr std::size_t kObjectCountPosition = 8;
 inline constexpr std::size_t kTopObjectPosition = 16;
 inline constexpr std::size_t kTablePosition = 24;
 
+/// The size of a unit of a UTF-16 text.
+inline constexpr std::size_t kUTF16UnitSize = 2;
+
 /// Kinds, as the marker's high four bits.
 enum class Kind : std::uint8_t {
   Simple = 0x0,

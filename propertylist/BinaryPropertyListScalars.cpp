@@ -8,8 +8,6 @@ namespace accounts::binaryplist {
 
 namespace {
 
-constexpr std::size_t kUnitSize = 2;
-
 /// True for kinds of which the marker states a length.
 bool hasLength(Kind kind) {
   switch (kind) {
@@ -30,11 +28,11 @@ bool hasLength(Kind kind) {
 std::string textOfUTF16(std::string_view bytes) {
   std::string text;
   text.reserve(bytes.size());
-  for (std::size_t index = 0; index < bytes.size(); index += kUnitSize) {
-    auto codePoint = static_cast<char32_t>(load(bytes.data() + index, kUnitSize));
-    const std::size_t next = index + kUnitSize;
+  for (std::size_t index = 0; index < bytes.size(); index += kUTF16UnitSize) {
+    auto codePoint = static_cast<char32_t>(load(bytes.data() + index, kUTF16UnitSize));
+    const std::size_t next = index + kUTF16UnitSize;
     if (isHighSurrogate(codePoint) && next < bytes.size()) {
-      const auto second = static_cast<char32_t>(load(bytes.data() + next, kUnitSize));
+      const auto second = static_cast<char32_t>(load(bytes.data() + next, kUTF16UnitSize));
       if (isLowSurrogate(second)) {
         codePoint = 0x10000 + ((codePoint - 0xD800) << 10) + (second - 0xDC00);
         index = next;
@@ -199,7 +197,7 @@ ScalarReader::Value ScalarReader::readDate(std::size_t offset, const ObjectHead&
 
 ScalarReader::Value ScalarReader::readBytes(std::size_t offset, const ObjectHead& head,
                                             std::size_t& end) {
-  const std::size_t unitSize = head.kind == Kind::UTF16Text ? kUnitSize : 1;
+  const std::size_t unitSize = head.kind == Kind::UTF16Text ? kUTF16UnitSize : 1;
   // Divided, not multiplied: a length of 2^63 units must not wrap round.
   if (head.length > bytesLeft(head) / unitSize) {
     return fail("a text or data that ends beyond the objects", offset);

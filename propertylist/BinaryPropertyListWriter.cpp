@@ -16,8 +16,6 @@ namespace accounts {
 namespace binaryplist {
 namespace {
 
-constexpr std::size_t kUnitSize = 2;
-
 /// Calls a function with a size of 1, 2, 4 or 8 as a constant: a loop that stores numbers of one
 /// size then does so without a look at it.
 template <class Function>
@@ -72,7 +70,7 @@ std::size_t sizeOf(const CatalogueScalar& scalar) {
       return 9;
     case ScalarKind::UTF16Text: {
       const std::size_t unitCount = unitCountOf(scalar.view());
-      return sizeOfHead(unitCount) + kUnitSize * unitCount;
+      return sizeOfHead(unitCount) + kUTF16UnitSize * unitCount;
     }
     case ScalarKind::Data:
     case ScalarKind::ASCIIText:
@@ -117,10 +115,10 @@ class Output {
     while (!text.empty()) {
       const DecodedCodePoint decoded = decodeCodePoint(text);
       if (decoded.value >= 0x10000) {
-        putNumber<kUnitSize>(0xD800 + ((decoded.value - 0x10000) >> 10));
-        putNumber<kUnitSize>(0xDC00 + ((decoded.value - 0x10000) & 0x3FF));
+        putNumber<kUTF16UnitSize>(0xD800 + ((decoded.value - 0x10000) >> 10));
+        putNumber<kUTF16UnitSize>(0xDC00 + ((decoded.value - 0x10000) & 0x3FF));
       } else {
-        putNumber<kUnitSize>(decoded.value);
+        putNumber<kUTF16UnitSize>(decoded.value);
       }
       text.remove_prefix(decoded.length);
     }

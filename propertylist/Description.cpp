@@ -253,6 +253,12 @@ void appendDescription(std::string& line, const PropertyValue& value) {
   }
 }
 
+std::string describe(const PropertyValue& value) {
+  std::string line;
+  appendDescription(line, value);
+  return line;
+}
+
 void appendEscapedText(std::string& line, std::string_view text) {
   appendText(line, text, Quoting::None);
 }

@@ -12,6 +12,9 @@ namespace accounts {
 /// "<hex>".
 void appendDescription(std::string& line, const PropertyValue& value);
 
+/// The same as a text of its own.
+std::string describe(const PropertyValue& value);
+
 /// Appends a text with line breaks, control characters, marks that reorder text and
 /// ill-formed sequences escaped.
 void appendEscapedText(std::string& line, std::string_view text);

@@ -17,14 +17,14 @@ namespace accounts {
 namespace {
 
 // The kernel gives EAGAIN when something was renamed while it resolved a "..", which passes.
-constexpr int kMostAttempts = 1000;
+constexpr int kMostRestarts = 1000;
 
 int openBeneath(int directory, const std::string& path, int flags) {
   open_how how = {};
   how.flags = static_cast<std::uint64_t>(flags | O_CLOEXEC);
   how.resolve = RESOLVE_IN_ROOT | RESOLVE_NO_MAGICLINKS;
   long number = -1;
-  for (int attempt = 0; attempt < kMostAttempts; ++attempt) {
+  for (int attempt = 0; attempt < kMostRestarts; ++attempt) {
     number = ::syscall(SYS_openat2, directory, path.c_str(), &how, sizeof how);
     if (number >= 0 || (errno != EAGAIN && errno != EINTR)) {
       break;

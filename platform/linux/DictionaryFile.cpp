@@ -6,7 +6,7 @@
 namespace accounts {
 namespace {
 
-constexpr std::string_view kOperation = "read the property list";
+constexpr std::string_view kReadOperation = "read the property list";
 
 }  // namespace
 
@@ -15,12 +15,12 @@ std::optional<PropertyDictionary> dictionaryFromBytes(std::string_view bytes, st
   PropertyListError malformed;
   const auto value = readPropertyList(bytes, malformed);
   if (!value) {
-    error = pathError(kOperation, path, malformed.text);
+    error = pathError(kReadOperation, path, malformed.text);
     return std::nullopt;
   }
   const PropertyDictionary* dictionary = value->asDictionary();
   if (dictionary == nullptr) {
-    error = pathError(kOperation, path, "Its root is not a dictionary");
+    error = pathError(kReadOperation, path, "Its root is not a dictionary");
     return std::nullopt;
   }
   return *dictionary;

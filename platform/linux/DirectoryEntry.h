@@ -10,6 +10,10 @@
 
 namespace accounts {
 
+/// The bits of a mode that are permissions, and the permissions that new files have at first.
+inline constexpr mode_t kPermissionBits = 0777;
+inline constexpr mode_t kOwnerOnlyFile = 0600;
+
 /// A name in an open directory: where operations on names (creating, removing, renaming) act. No
 /// operation here follows a symbolic link at the name itself, so none leaves the directory.
 class DirectoryEntry {

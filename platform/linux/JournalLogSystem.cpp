@@ -13,7 +13,7 @@
 namespace accounts {
 namespace {
 
-constexpr std::string_view kOperation = "open the log channel";
+constexpr std::string_view kOpenOperation = "open the log channel";
 constexpr std::string_view kInformational = "6";
 constexpr timeval kLongestWait = {.tv_sec = 1, .tv_usec = 0};
 
@@ -48,7 +48,7 @@ std::unique_ptr<JournalLogSystem> JournalLogSystem::connect(const std::string& s
   sockaddr_un address = {};
   address.sun_family = AF_UNIX;
   if (socketPath.size() >= sizeof(address.sun_path)) {
-    error = pathError(kOperation, socketPath, ENAMETOOLONG);
+    error = pathError(kOpenOperation, socketPath, ENAMETOOLONG);
     return nullptr;
   }
   std::memcpy(address.sun_path, socketPath.data(), socketPath.size());
@@ -58,7 +58,7 @@ std::unique_ptr<JournalLogSystem> JournalLogSystem::connect(const std::string& s
           0 ||
       ::connect(socket.number(), reinterpret_cast<const sockaddr*>(&address), sizeof(address)) !=
           0) {
-    error = pathError(kOperation, socketPath, errno);
+    error = pathError(kOpenOperation, socketPath, errno);
     return nullptr;
   }
   return std::unique_ptr<JournalLogSystem>(new JournalLogSystem(std::move(socket)));

@@ -15,9 +15,6 @@
 namespace accounts {
 namespace {
 
-constexpr mode_t kPermissionBits = 0777;
-constexpr mode_t kOwnerOnlyFile = 0600;
-
 // Moves an entry, whose contents are flushed already, over another and waits until that is on the
 // medium. The directory is opened before the move so that little can fail after it.
 Result moveOver(const DirectoryEntry& source, const DirectoryEntry& destination) {

@@ -13,9 +13,6 @@
 namespace accounts {
 namespace {
 
-constexpr mode_t kPermissionBits = 0777;
-constexpr mode_t kOwnerOnlyFile = 0600;
-
 // What the kernel answers where a file can have no further name: two file systems, one without
 // links, a file with too many, a file that is another user's.
 constexpr std::array kNoLinkHere = {EXDEV, EPERM, EMLINK, EOPNOTSUPP};

@@ -14,10 +14,8 @@
 namespace accounts {
 namespace {
 
-constexpr mode_t kOwnerReadsAndWrites = 0600;
-
 // With 64 random bits a name is never taken by chance; a few attempts are more than enough.
-constexpr int kMostAttempts = 16;
+constexpr int kMostNames = 16;
 
 std::optional<std::string> uniqueName() {
   std::array<std::uint8_t, 8> bytes;
@@ -46,7 +44,7 @@ bool isOurs(const FileDescriptor& file) {
 
 std::optional<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::string_view directory,
                                                  PathError& error) {
-  for (int attempt = 0; attempt < kMostAttempts; ++attempt) {
+  for (int attempt = 0; attempt < kMostNames; ++attempt) {
     const auto name = uniqueName();
     if (!name) {
       error = pathError("make a temporary name in", directory, errno);
@@ -56,7 +54,7 @@ std::optional<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::st
     if (!entry) {
       return std::nullopt;
     }
-    auto file = entry->createFile(kOwnerReadsAndWrites, error);
+    auto file = entry->createFile(kOwnerOnlyFile, error);
     if (file && isOurs(*file)) {
       return TemporaryFile{std::move(*entry), std::move(*file)};
     }

@@ -9,6 +9,7 @@
 #include "accountsctl/Finding.h"
 #include "accountsctl/LegacyFindings.h"
 #include "accountsctl/SettingsFindings.h"
+#include "tests/accountsctl/SettingsFiles.h"
 #include "tests/fakes/FakePlatform.h"
 
 namespace accounts {
@@ -25,17 +26,9 @@ class FindingsFixture : public testing::Test {
   static PropertyDictionary mail(std::string_view identifier) {
     return account("Mail", "IMAPAccount", identifier);
   }
-  static PropertyDictionary with(PropertyDictionary properties, std::string_view key,
-                                 PropertyValue value) {
-    properties.set(key, std::move(value));
-    return properties;
-  }
   static PropertyDictionary without(PropertyDictionary properties, std::string_view key) {
     properties.remove(key);
     return properties;
-  }
-  static PropertyDictionary settings(std::vector<PropertyValue> accountDictionaries) {
-    return {{"Version", 12}, {"Accounts", PropertyArray(std::move(accountDictionaries))}};
   }
 
   /// Findings as "PLACE EFFECT CODE".

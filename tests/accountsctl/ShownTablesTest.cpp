@@ -2,6 +2,7 @@
 
 #include "accountsctl/ShowCommand.h"
 #include "inspection/StoreLayout.h"
+#include "tests/accountsctl/SettingsFiles.h"
 
 namespace accounts {
 namespace {
@@ -9,10 +10,6 @@ namespace {
 PropertyDictionary account(std::string_view type, std::string_view name,
                            std::string_view identifier) {
   return {{"Type", type}, {"Class", "C"}, {"DisplayName", name}, {"Identifier", identifier}};
-}
-
-PropertyDictionary settings(PropertyArray accountDictionaries) {
-  return {{"Version", 12}, {"Accounts", std::move(accountDictionaries)}};
 }
 
 std::string shown(const PropertyValue& content, ShowOptions options = {}) {

@@ -4,6 +4,7 @@
 
 #include "inspection/DifferenceJSON.h"
 #include "inspection/DifferenceText.h"
+#include "tests/accountsctl/SettingsFiles.h"
 
 namespace accounts {
 namespace {
@@ -16,15 +17,6 @@ PropertyDictionary parentOf(std::string_view identifier, PropertyArray children)
   PropertyDictionary parent = account(identifier);
   parent.set("ChildAccounts", std::move(children));
   return parent;
-}
-
-PropertyDictionary with(PropertyDictionary properties, std::string_view key, PropertyValue value) {
-  properties.set(key, std::move(value));
-  return properties;
-}
-
-PropertyDictionary settings(std::vector<PropertyValue> accountDictionaries) {
-  return {{"Version", 12}, {"Accounts", PropertyArray(std::move(accountDictionaries))}};
 }
 
 /// The lines in which two settings files differ.

@@ -9,10 +9,10 @@
 namespace accounts {
 namespace {
 
-constexpr const char* resource = "DataclassesProperties";
+constexpr const char* configurationResource = "DataclassesProperties";
 
 void configureContacts(FakePlatform& device, const PropertyDictionary& properties) {
-  device.bundleResources.replaced[resource] =
+  device.bundleResources.replaced[configurationResource] =
       PropertyDictionary{{kAccountDataclassContacts, properties}};
 }
 
@@ -52,7 +52,7 @@ TEST(DataclassConfiguration, MissingEntriesAnswerFalse) {
 
 TEST(DataclassConfiguration, AMissingResourceAnswersFalseWithoutAMessage) {
   FakeProcess device;
-  device.bundleResources.replaced[resource] = std::nullopt;
+  device.bundleResources.replaced[configurationResource] = std::nullopt;
 
   EXPECT_FALSE(BasicAccount::displayToggleForDataclass(kAccountDataclassContacts));
 
@@ -62,7 +62,7 @@ TEST(DataclassConfiguration, AMissingResourceAnswersFalseWithoutAMessage) {
 
 TEST(DataclassConfiguration, ItIsReadOnceEvenWhenItIsMissing) {
   FakeProcess device;
-  device.bundleResources.replaced[resource] = std::nullopt;
+  device.bundleResources.replaced[configurationResource] = std::nullopt;
   BasicAccount::displayToggleForDataclass(kAccountDataclassContacts);
   device.bundleResources.replaced.clear();
 
@@ -71,7 +71,7 @@ TEST(DataclassConfiguration, ItIsReadOnceEvenWhenItIsMissing) {
 
 TEST(DataclassConfiguration, ThePlainReadIsNotKept) {
   FakeProcess device;
-  device.bundleResources.replaced[resource] = std::nullopt;
+  device.bundleResources.replaced[configurationResource] = std::nullopt;
   EXPECT_EQ(BasicAccount::_dataclassesProperties(), std::nullopt);
 
   device.bundleResources.replaced.clear();
@@ -97,7 +97,7 @@ TEST(ToggleActions, ASingleStoreLosesTheLastKeepingOfLocalDataOnly) {
 
 TEST(ToggleActions, ADataclassThatIsNotConfiguredHasASingleStore) {
   FakeProcess device;
-  device.bundleResources.replaced[resource] = PropertyDictionary();
+  device.bundleResources.replaced[configurationResource] = PropertyDictionary();
   configureActions(device, kPropertiesEnableDataclassActions,
                    {"Keep Local Data", "Merge Local Data"});
   EXPECT_EQ(actionsToEnableContacts(), R"(["Merge Local Data"])");

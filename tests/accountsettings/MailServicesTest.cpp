@@ -9,7 +9,7 @@
 namespace accounts {
 namespace {
 
-constexpr const char* resource = "MailServices";
+constexpr const char* servicesResource = "MailServices";
 
 TEST(MailServices, TheBundleNamesEveryService) {
   FakeProcess device;
@@ -33,35 +33,35 @@ TEST(MailServices, TheyAreReadOnceAProcess) {
 
   EXPECT_EQ(&first, &second);
   const std::vector<std::string>& reads = device.bundleResources.reads;
-  EXPECT_EQ(std::count(reads.begin(), reads.end(), resource), 1);
+  EXPECT_EQ(std::count(reads.begin(), reads.end(), servicesResource), 1);
 }
 
 TEST(MailServicesDeathTest, AMissingResourceEndsTheProcess) {
   FakeProcess device;
-  device.bundleResources.replaced[resource] = std::nullopt;
+  device.bundleResources.replaced[servicesResource] = std::nullopt;
   EXPECT_DEATH(MailServices::current(), "Could not find MailServices.plist");
 }
 
 TEST(MailServicesDeathTest, AnUnreadableResourceEndsTheProcess) {
   FakeProcess device;
-  device.bundleResources.unreadable.insert(resource);
+  device.bundleResources.unreadable.insert(servicesResource);
   EXPECT_DEATH(MailServices::current(), "Could not load MailServices.plist");
 }
 
 TEST(MailServicesDeathTest, AMissingNameEndsTheProcessAndIsNamed) {
   FakeProcess device;
-  PropertyDictionary incomplete = *device.bundleResources.readPropertyList(resource);
+  PropertyDictionary incomplete = *device.bundleResources.readPropertyList(servicesResource);
   incomplete.remove("Yahoo IMAP Host");
-  device.bundleResources.replaced[resource] = incomplete;
+  device.bundleResources.replaced[servicesResource] = incomplete;
   EXPECT_DEATH(MailServices::current(),
                "Malformed MailServices information. Could not find the Yahoo IMAP Host");
 }
 
 TEST(MailServicesDeathTest, AnEmptyNameCountsAsMissing) {
   FakeProcess device;
-  PropertyDictionary services = *device.bundleResources.readPropertyList(resource);
+  PropertyDictionary services = *device.bundleResources.readPropertyList(servicesResource);
   services.set("Gmail IMAP Host", "");
-  device.bundleResources.replaced[resource] = services;
+  device.bundleResources.replaced[servicesResource] = services;
   EXPECT_DEATH(MailServices::current(), "Could not find the Gmail IMAP Host");
 }
 

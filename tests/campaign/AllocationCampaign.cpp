@@ -10,11 +10,11 @@ namespace accounts {
 
 namespace {
 
-constexpr std::size_t kFewestCases = 20'000;
+constexpr std::size_t kFewestAllocations = 20'000;
 constexpr std::string_view kFault = "bad-alloc";
 
 /// A process that runs out of memory ends. What it leaves is what a kill there would leave.
-void tryScenario(const Scenario& scenario, Report& report) {
+void tryAllocationsIn(const Scenario& scenario, Report& report) {
   Invariants invariants(scenario);
   const std::size_t count = invariants.undisturbed().allocations;
   for (std::size_t allocation = 0; allocation < count; ++allocation) {
@@ -115,10 +115,10 @@ bool runAllocationCampaign(const std::vector<Scenario>& scenarios, const Selecti
   tryCodecs(report);
   for (const Scenario& scenario : scenarios) {
     if (report.takes(scenario.name)) {
-      tryScenario(scenario, report);
+      tryAllocationsIn(scenario, report);
     }
   }
-  return report.finish("allocations", kFewestCases);
+  return report.finish("allocations", kFewestAllocations);
 }
 
 }  // namespace accounts

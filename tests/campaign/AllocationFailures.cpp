@@ -16,10 +16,10 @@ struct {
   int pauses = 0;
   std::size_t count = 0;
   std::size_t failing = kNever;
-} state;
+} failures;
 
 void* allocate(std::size_t size) {
-  if (state.isCounting && state.pauses == 0 && state.count++ == state.failing) {
+  if (failures.isCounting && failures.pauses == 0 && failures.count++ == failures.failing) {
     throw std::bad_alloc();
   }
   void* memory = std::malloc(size != 0 ? size : 1);
@@ -32,25 +32,25 @@ void* allocate(std::size_t size) {
 }  // namespace
 
 AllocationFailure::AllocationFailure(std::optional<std::size_t> number) {
-  state.count = 0;
-  state.failing = number.value_or(kNever);
-  state.isCounting = true;
+  failures.count = 0;
+  failures.failing = number.value_or(kNever);
+  failures.isCounting = true;
 }
 
 AllocationFailure::~AllocationFailure() {
-  state.isCounting = false;
+  failures.isCounting = false;
 }
 
 std::size_t AllocationFailure::count() {
-  return state.count;
+  return failures.count;
 }
 
 AllocationsSucceed::AllocationsSucceed() {
-  ++state.pauses;
+  ++failures.pauses;
 }
 
 AllocationsSucceed::~AllocationsSucceed() {
-  --state.pauses;
+  --failures.pauses;
 }
 
 }  // namespace accounts

@@ -8,7 +8,7 @@ namespace accounts {
 
 namespace {
 
-constexpr std::size_t kFewestCases = 50'000;
+constexpr std::size_t kFewestFaults = 50'000;
 
 struct NamedFault {
   std::string_view name;
@@ -38,7 +38,7 @@ constexpr NamedFault kFaults[] = {
     {"plugin-killed", EIO, kUntilThePluginEnds},
 };
 
-void tryScenario(const Scenario& scenario, Report& report) {
+void tryFaultsIn(const Scenario& scenario, Report& report) {
   Invariants invariants(scenario);
   // A plug-in that is killed alone leaves a host that goes on.
   const bool hasPlugin =
@@ -71,10 +71,10 @@ bool runFaultCampaign(const std::vector<Scenario>& scenarios, const Selection& s
   Report report(selection);
   for (const Scenario& scenario : scenarios) {
     if (report.takes(scenario.name)) {
-      tryScenario(scenario, report);
+      tryFaultsIn(scenario, report);
     }
   }
-  return report.finish("faults", kFewestCases);
+  return report.finish("faults", kFewestFaults);
 }
 
 }  // namespace accounts

@@ -6,7 +6,7 @@ namespace accounts {
 
 namespace {
 
-constexpr std::size_t kFewestCases = 10'000;
+constexpr std::size_t kFewestKills = 10'000;
 
 /// The disks before each call of a recorded run and after the last one. What a killed process did
 /// before stays done, so each is what it leaves when it is killed there.
@@ -92,7 +92,7 @@ bool runKillCampaign(const std::vector<Scenario>& scenarios, const Selection& se
       KilledScenario(scenario, report).tryAll();
     }
   }
-  return report.finish("kills", kFewestCases);
+  return report.finish("kills", kFewestKills);
 }
 
 }  // namespace accounts

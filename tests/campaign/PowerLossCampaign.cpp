@@ -8,7 +8,7 @@ namespace accounts {
 
 namespace {
 
-constexpr std::size_t kFewestCases = 100'000;
+constexpr std::size_t kFewestLosses = 100'000;
 
 /// So many times, at even distances, the first run is killed before the power fails in the second.
 constexpr std::size_t kKills = 3;
@@ -83,7 +83,7 @@ bool runPowerLossCampaign(const std::vector<Scenario>& scenarios, const Selectio
       PowerlessScenario(scenario, report).tryAll();
     }
   }
-  return report.finish("power-loss", kFewestCases);
+  return report.finish("power-loss", kFewestLosses);
 }
 
 }  // namespace accounts

@@ -8,6 +8,8 @@ namespace accounts {
 
 namespace {
 
+using Kind = DiskChange::Kind;
+
 struct SplitPath {
   std::string_view directory;
   std::string_view name;
@@ -118,7 +120,6 @@ std::vector<std::string> SimulatedDisk::filesBeneath(std::string_view directory)
 }
 
 void SimulatedDisk::apply(const DiskChange& change) {
-  using Kind = DiskChange::Kind;
   switch (change.kind) {
     case Kind::Allocate:
       inodes_.push_back(

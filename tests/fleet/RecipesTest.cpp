@@ -8,6 +8,7 @@
 
 #include "tests/fleet/FleetFixture.h"
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/ExitStatuses.h"
 
 // The recipes for engines that are not here: what they run is run, with what the engine would give
 // it.
@@ -16,8 +17,6 @@ namespace accounts {
 namespace {
 
 namespace fs = std::filesystem;
-
-constexpr int kMayPass = 75;
 
 class Recipes : public FleetFixture {
  protected:

@@ -3,8 +3,6 @@
 namespace accounts {
 namespace {
 
-using Migrator = AccountsDataMigrator;
-
 const std::string googleHost = "www.google.com";
 const std::string yahooHost = "caldav.calendar.yahoo.com";
 

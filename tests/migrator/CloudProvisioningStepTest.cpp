@@ -26,9 +26,6 @@ const std::string provisioningLine = "AccountsDataMigrator: Enabling provisionin
 AccountBuilder hostedChild() {
   return anAccount("V", kVelmoraAccountType, "VelmoraAccount");
 }
-AccountBuilder calendarChild() {
-  return anAccount("K", kCalDAVAccountType, "MobileCalDAVAccount");
-}
 
 TEST_F(CloudProvisioningStepTest, ASecondaryAccountLosesCloudDocumentsAndKeyValueStorage) {
   runStepOn({anAccount("V", kVelmoraAccountType, "VelmoraAccount")
@@ -158,7 +155,6 @@ TEST_F(CloudProvisioningStepTest, ChildrenAreKnownByTheExactTextOfTheirTypes) {
       kAccountChildAccounts,
       PropertyArray{"no dictionary", PropertyDictionary{{kAccountType, "CalDAV"}},
                     PropertyDictionary{{kAccountType, 5}}}));
-  using Migrator = AccountsDataMigrator;
 
   EXPECT_TRUE(Migrator::_account_hasChildAccountOfType(*parent, "CalDAV"));
   EXPECT_FALSE(Migrator::_account_hasChildAccountOfType(*parent, "caldav"));

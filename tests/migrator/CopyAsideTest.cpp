@@ -5,9 +5,6 @@ namespace {
 
 using CopyAsideTest = MigratorTest;
 
-const std::string copyAside =
-    "/var/mobile/Library/Logs/CrashReporter/com.quarx.accountsettings.plist";
-
 TEST_F(CopyAsideTest, TheSettingsFileIsCopiedByteForByte) {
   device.fileSystem.addFile(kSettingsPath, "no property list at all");
 

@@ -22,9 +22,6 @@ class HostedChildrenStepTest : public MigratorTest {
 AccountBuilder hostedChild(std::string_view identifier) {
   return anAccount(identifier, kVelmoraAccountType, "VelmoraAccount");
 }
-AccountBuilder calendarChild() {
-  return anAccount("K", kCalDAVAccountType, "MobileCalDAVAccount");
-}
 
 TEST_F(HostedChildrenStepTest, OnlyHostedServiceChildrenLoseTheirDisplayNames) {
   const AccountBuilder calendar = calendarChild().with(kAccountDisplayName, "Calendar");

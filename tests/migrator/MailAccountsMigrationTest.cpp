@@ -25,8 +25,8 @@ class MailAccountsMigrationTest : public MigratorTest {
   const TextList unchanged = {"oldMail", "oldGmail", "oldSMTP"};
 };
 
-const std::string original = std::string(kLegacyMailPath) + ".original";
-const std::string failure =
+const std::string originalMail = std::string(kLegacyMailPath) + ".original";
+const std::string mailFailure =
     "-[AccountsDataMigrator(Internal) _migrateMailAccounts:]. Could not convert the description "
     "for the ";
 
@@ -77,7 +77,7 @@ TEST_F(MailAccountsMigrationTest, AFailingOutgoingAccountLeavesTheStoreAndTheInc
   EXPECT_FALSE(migrator._migrateMailAccounts(*store));
 
   EXPECT_EQ(identifiers(), unchanged);
-  EXPECT_EQ(console(), Lines{failure + R"(delivery account {"AccountType":""})"});
+  EXPECT_EQ(console(), Lines{mailFailure + R"(delivery account {"AccountType":""})"});
 }
 
 TEST_F(MailAccountsMigrationTest, AFailingIncomingAccountLeavesTheStore) {
@@ -88,7 +88,7 @@ TEST_F(MailAccountsMigrationTest, AFailingIncomingAccountLeavesTheStore) {
   EXPECT_FALSE(migrator._migrateMailAccounts(*store));
 
   EXPECT_EQ(identifiers(), unchanged);
-  EXPECT_EQ(console(), Lines{failure + R"(incoming account {"Port":993})"});
+  EXPECT_EQ(console(), Lines{mailFailure + R"(incoming account {"Port":993})"});
 }
 
 TEST_F(MailAccountsMigrationTest, ADescriptionThatIsNoDictionaryCannotBeConverted) {
@@ -97,23 +97,23 @@ TEST_F(MailAccountsMigrationTest, ADescriptionThatIsNoDictionaryCannotBeConverte
 
   EXPECT_FALSE(migrator._migrateMailAccounts(*store));
 
-  EXPECT_EQ(console(), Lines{failure + "delivery account no dictionary"});
+  EXPECT_EQ(console(), Lines{mailFailure + "delivery account no dictionary"});
 }
 
 TEST_F(MailAccountsMigrationTest, TheOriginalFileIsRemovedAfterSuccessAndAfterFailure) {
-  device.fileSystem.addFile(original, "");
+  device.fileSystem.addFile(originalMail, "");
   addLegacyFile(PropertyArray(), PropertyArray());
   EXPECT_TRUE(migrator._migrateMailAccounts(*store));
-  EXPECT_FALSE(exists(original));
+  EXPECT_FALSE(exists(originalMail));
 
-  device.fileSystem.addFile(original, "");
+  device.fileSystem.addFile(originalMail, "");
   addLegacyFile(PropertyArray{"no dictionary"}, PropertyArray());
   EXPECT_FALSE(migrator._migrateMailAccounts(*store));
-  EXPECT_FALSE(exists(original));
+  EXPECT_FALSE(exists(originalMail));
 }
 
 TEST_F(MailAccountsMigrationTest, AnOriginalFileThatStaysIsNotReported) {
-  device.fileSystem.addFile(original, "");
+  device.fileSystem.addFile(originalMail, "");
   device.fileSystem.failWhenLineBegins("remove");
   addLegacyFile(PropertyArray(), PropertyArray());
 

@@ -40,7 +40,6 @@ TEST_F(MailDescriptionTest, EachClassHasItsTypeAndTypeStrings) {
   }};
   for (const ClassRow& row : rows) {
     SCOPED_TRACE(row.accountClass);
-    using Migrator = AccountsDataMigrator;
     EXPECT_EQ(Migrator::_accountTypeForMailAccountClass(row.accountClass), row.type);
     EXPECT_EQ(Migrator::_accountTypeStringForMailAccountClass(row.accountClass), row.typeString);
     EXPECT_EQ(Migrator::_accountShortTypeStringForMailAccountClass(row.accountClass),

@@ -46,8 +46,6 @@ class MigrationStagesTest : public MigratorTest {
 };
 
 const std::string settings(kSettingsPath);
-const std::string copyAside =
-    "/var/mobile/Library/Logs/CrashReporter/com.quarx.accountsettings.plist";
 const std::string autoFetchFile = "/var/mobile/Library/Mail/AutoFetchEnabled";
 
 TEST_F(MigrationStagesTest, TheStagesComeInTheirOrder) {

@@ -27,6 +27,11 @@ inline void PrintTo(const PropertyDictionary& dictionary, std::ostream* output) 
   PrintTo(PropertyValue(dictionary), output);
 }
 
+/// Where a migration leaves a copy of the settings file as it found it.
+inline const std::string copyAside =
+    "/var/mobile/Library/Logs/CrashReporter/com.quarx.accountsettings.plist";
+
+using Migrator = AccountsDataMigrator;
 using Lines = std::vector<std::string>;
 using TextList = std::vector<std::string>;
 
@@ -85,6 +90,10 @@ inline AccountBuilder anAccount(std::string_view identifier, std::string_view ty
                                 std::string_view accountClass) {
   return AccountBuilder(
       {{kAccountIdentifier, identifier}, {kAccountType, type}, {kAccountClass, accountClass}});
+}
+
+inline AccountBuilder calendarChild() {
+  return anAccount("K", kCalDAVAccountType, "MobileCalDAVAccount");
 }
 
 /// A device, a migrator and a store that a test fills.

@@ -19,7 +19,7 @@ class WalletStepTest : public MigratorTest {
   }
 };
 
-const std::string provisioningLine =
+const std::string shoeboxLine =
     "AccountsDataMigrator: Provisioning Shoebox data class in primary account";
 const std::string enablingLine =
     "AccountsDataMigrator: Enabling Shoebox data class in primary account";
@@ -32,7 +32,7 @@ TEST_F(WalletStepTest, TheWalletFollowsCloudDocuments) {
   EXPECT_EQ(storedProvisioned(),
             dataclasses({kAccountDataclassUbiquity, kAccountDataclassShoebox}));
   EXPECT_EQ(storedEnabled(0), dataclasses({kAccountDataclassUbiquity, kAccountDataclassShoebox}));
-  EXPECT_EQ(console(), (Lines{provisioningLine, enablingLine}));
+  EXPECT_EQ(console(), (Lines{shoeboxLine, enablingLine}));
 }
 
 TEST_F(WalletStepTest, CloudDocumentsThatAreOffLeaveTheWalletOff) {
@@ -41,7 +41,7 @@ TEST_F(WalletStepTest, CloudDocumentsThatAreOffLeaveTheWalletOff) {
   EXPECT_EQ(storedProvisioned(),
             dataclasses({kAccountDataclassUbiquity, kAccountDataclassShoebox}));
   EXPECT_EQ(storedEnabled(0), std::nullopt);
-  EXPECT_EQ(console(), Lines{provisioningLine});
+  EXPECT_EQ(console(), Lines{shoeboxLine});
 }
 
 TEST_F(WalletStepTest, AWalletThatIsProvisionedIsOnlyEnabled) {
@@ -83,7 +83,7 @@ TEST_F(WalletStepTest, TheEnablingLineIsWrittenAlsoWhenTheTypeDoesNotSupportTheW
   runStepOn({primaryAccount().enabledFor({kAccountDataclassUbiquity})});
 
   EXPECT_EQ(storedEnabled(0), dataclasses({kAccountDataclassUbiquity}));
-  EXPECT_EQ(console(), (Lines{provisioningLine, enablingLine}));
+  EXPECT_EQ(console(), (Lines{shoeboxLine, enablingLine}));
 }
 
 TEST_F(WalletStepTest, EachAccountWithBookmarksAnnouncesCloudTabs) {

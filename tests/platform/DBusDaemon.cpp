@@ -62,7 +62,7 @@ DBusDaemon::DBusDaemon() {
   close(pipe[1]);
   // It prints its address once it listens.
   char first = '\0';
-  EXPECT_EQ(read(pipe[0], &first, 1), 1) << "no dbus-daemon";
+  EXPECT_EQ(::read(pipe[0], &first, 1), 1) << "no dbus-daemon";
   close(pipe[0]);
 }
 

@@ -9,18 +9,12 @@
 
 #include "propertylist/PropertyValue.h"
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/ExitStatuses.h"
 #include "tests/program/RunProgram.h"
 
 namespace accounts {
 
 // Exit statuses of the program.
-inline constexpr int kAttention = 1;
-inline constexpr int kUnusableArguments = 64;
-inline constexpr int kMalformedInput = 65;
-inline constexpr int kMissingInput = 66;
-inline constexpr int kCannotCreate = 73;
-inline constexpr int kInputOutputError = 74;
-
 /// An empty directory in which the real accountsctl is run.
 class AccountsctlFixture : public testing::Test {
  public:

@@ -1,12 +1,11 @@
 #include <gtest/gtest.h>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/ExitStatuses.h"
 #include "tests/program/Programs.h"
 
 namespace accounts {
 namespace {
-
-constexpr int kUnusableArguments = 64;
 
 ProgramResult runHost(const std::vector<std::string>& arguments) {
   return runProgram({.program = migrationHost(), .arguments = arguments});

@@ -13,6 +13,7 @@
 #include <thread>
 
 #include "tests/program/AttributedLog.h"
+#include "tests/program/ExitStatuses.h"
 #include "tests/program/InterruptedDevice.h"
 #include "tests/program/ListedLocks.h"
 #include "tests/program/Programs.h"
@@ -31,8 +32,6 @@ constexpr int kKillsInARound = kProcesses / 4;
 constexpr std::size_t kLinesOfAProcess = 8;
 constexpr unsigned kSeed = 2011;
 constexpr std::chrono::seconds kTimeLimit(60);
-constexpr int kPluginEnded = 70;
-
 /// Who is killed when a certain line was written.
 enum class Victim : std::uint8_t {
   /// The process that wrote it and holds the lock.
@@ -44,14 +43,14 @@ enum class Victim : std::uint8_t {
 };
 
 /// Victims by the number of a line.
-using Plan = std::map<std::size_t, Victim>;
+using Victims = std::map<std::size_t, Victim>;
 
-Plan randomPlan(std::mt19937& random) {
-  Plan plan;
-  while (plan.size() < kKillsInARound) {
-    plan[random() % (kProcesses * kLinesOfAProcess)] = static_cast<Victim>(random() % 3);
+Victims randomVictims(std::mt19937& random) {
+  Victims victims;
+  while (victims.size() < kKillsInARound) {
+    victims[random() % (kProcesses * kLinesOfAProcess)] = static_cast<Victim>(random() % 3);
   }
-  return plan;
+  return victims;
 }
 
 pid_t parentOf(pid_t process) {
@@ -85,7 +84,7 @@ class Concurrency : public InterruptedDevice {
 
   /// Runs one host for each process of a round to their ends, killing as planned, and gives their
   /// exit statuses (negative for a signal).
-  std::vector<int> runRound(const Plan& plan, std::mt19937& random) {
+  std::vector<int> runRound(const Victims& victims, std::mt19937& random) {
     AttributedLog log;
     const ProgramCall call = migrationCall({"--bare", "--channel", "-"});
     const int nowhere = open("/dev/null", O_WRONLY | O_CLOEXEC);
@@ -98,8 +97,8 @@ class Concurrency : public InterruptedDevice {
 
     std::vector<AttributedLog::Line> lines;
     while (std::optional<AttributedLog::Line> line = log.next(kTimeLimit)) {
-      const auto planned = plan.find(lines.size());
-      if (planned != plan.end()) {
+      const auto planned = victims.find(lines.size());
+      if (planned != victims.end()) {
         killOne(planned->second, line->writer, hosts, random);
       }
       lines.push_back(*std::move(line));
@@ -172,7 +171,7 @@ TEST_F(Concurrency, ProcessesOfWhichSomeAreKilledLoseNothingAndStayOneAfterTheOt
     makeDevice();
 
     runObserved([&] {
-      const std::vector<int> statuses = runRound(randomPlan(random), random);
+      const std::vector<int> statuses = runRound(randomVictims(random), random);
       EXPECT_THAT(statuses, testing::Each(testing::AnyOf(0, kPluginEnded, -SIGKILL)));
       killed += std::ssize(statuses) - std::count(statuses.begin(), statuses.end(), 0);
     });

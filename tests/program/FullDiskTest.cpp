@@ -5,6 +5,7 @@
 #include <memory>
 #include <tuple>
 
+#include "tests/program/ExitStatuses.h"
 #include "tests/program/InterruptedDevice.h"
 #include "tests/program/SmallDisk.h"
 
@@ -15,9 +16,6 @@ namespace accounts {
 namespace {
 
 constexpr const char* kHome = "/var/mobile";
-constexpr int kVerificationFailed = 2;
-constexpr int kMayPass = 75;
-constexpr int kInputOutputError = 74;
 constexpr const char* kSaveFailed = "\"Failed to save accounts to filesystem.\"";
 
 /// What the disk runs out of.
@@ -124,7 +122,7 @@ TEST_P(FullDisk, WithEnoughRoomIsMigrated) {
   expectMigrated();
 }
 
-std::string nameOf(
+std::string nameOfDisk(
     const testing::TestParamInfo<std::tuple<SmallDisk::Kind, Shortage>>& information) {
   const auto& [kind, shortage] = information.param;
   return testing::PrintToString(kind) + shortage.name;
@@ -134,7 +132,7 @@ INSTANTIATE_TEST_SUITE_P(Kinds, FullDisk,
                          testing::Combine(testing::Values(SmallDisk::Kind::Memory,
                                                           SmallDisk::Kind::Ext4),
                                           testing::ValuesIn(kShortages)),
-                         nameOf);
+                         nameOfDisk);
 
 }  // namespace
 }  // namespace accounts

@@ -1,12 +1,9 @@
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/ExitStatuses.h"
 #include "tests/program/Programs.h"
 
 namespace accounts {
 namespace {
-
-constexpr int kMissingInput = 66;
-constexpr int kCannotCreate = 73;
-constexpr int kInputOutputError = 74;
 
 /// Errors of the host's own, with a device that a migration would change.
 class HostError : public DeviceRootFixture {

@@ -68,13 +68,13 @@ TEST_P(HostileFrameworkDirectory, HoldsNothingToLoadUnlessItIsTheDevicesOwn) {
   expectNothingCrossedTheBorder();
 }
 
-std::string nameOf(const testing::TestParamInfo<HostileKind>& information) {
+std::string nameOfKind(const testing::TestParamInfo<HostileKind>& information) {
   return information.param.name;
 }
 
-INSTANTIATE_TEST_SUITE_P(Kinds, HostileLibrary, testing::ValuesIn(hostileFileKinds()), nameOf);
+INSTANTIATE_TEST_SUITE_P(Kinds, HostileLibrary, testing::ValuesIn(hostileFileKinds()), nameOfKind);
 INSTANTIATE_TEST_SUITE_P(Kinds, HostileFrameworkDirectory,
-                         testing::ValuesIn(hostileDirectoryKinds()), nameOf);
+                         testing::ValuesIn(hostileDirectoryKinds()), nameOfKind);
 
 }  // namespace
 }  // namespace accounts

@@ -5,17 +5,11 @@
 #include <vector>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/ExitStatuses.h"
 #include "tests/program/HostileKind.h"
 #include "tests/program/OutsideTree.h"
 
 namespace accounts {
-
-// What the host's exit statuses mean, as its help tells.
-inline constexpr int kMigrationFailed = 1;
-inline constexpr int kVerificationFailed = 2;
-inline constexpr int kMissingInput = 66;
-inline constexpr int kCannotCreate = 73;
-inline constexpr int kInputOutputError = 74;
 
 /// A user of this machine without privileges.
 inline constexpr uid_t kSomebody = 54321;

@@ -106,14 +106,15 @@ TEST_P(RefusedDirectory, IsNamedOnOneLineWithTheReason) {
   EXPECT_THAT(migrateWith(kind, {"--bare"}).errors, HasSubstr(GetParam().line));
 }
 
-std::string nameOf(const testing::TestParamInfo<Refusal>& information) {
+std::string nameOfRefusal(const testing::TestParamInfo<Refusal>& information) {
   std::string name = std::string(information.param.kind) + "At" + information.param.path;
   std::erase_if(name, [](unsigned char character) { return std::isalnum(character) == 0; });
   return name;
 }
 
-INSTANTIATE_TEST_SUITE_P(Hostile, RefusedFile, testing::ValuesIn(kFileRefusals), nameOf);
-INSTANTIATE_TEST_SUITE_P(Hostile, RefusedDirectory, testing::ValuesIn(kDirectoryRefusals), nameOf);
+INSTANTIATE_TEST_SUITE_P(Hostile, RefusedFile, testing::ValuesIn(kFileRefusals), nameOfRefusal);
+INSTANTIATE_TEST_SUITE_P(Hostile, RefusedDirectory, testing::ValuesIn(kDirectoryRefusals),
+                         nameOfRefusal);
 
 /// The device of these tests without anything hostile: what the refusals above are measured by.
 class NothingHostile : public HostileRootFixture {

@@ -97,7 +97,7 @@ TEST_P(HostileRoot, IsSafeWithTheSafetyNetToo) {
   expectNothingCrossedTheBorder();
 }
 
-std::string nameOf(const testing::TestParamInfo<std::tuple<Place, HostileKind>>& information) {
+std::string nameOfPlace(const testing::TestParamInfo<std::tuple<Place, HostileKind>>& information) {
   const auto& [place, kind] = information.param;
   return std::string(kind.name) + "InPlaceOf" + place.name;
 }
@@ -105,11 +105,11 @@ std::string nameOf(const testing::TestParamInfo<std::tuple<Place, HostileKind>>&
 INSTANTIATE_TEST_SUITE_P(Files, HostileRoot,
                          testing::Combine(testing::ValuesIn(kFiles),
                                           testing::ValuesIn(hostileFileKinds())),
-                         nameOf);
+                         nameOfPlace);
 INSTANTIATE_TEST_SUITE_P(Directories, HostileRoot,
                          testing::Combine(testing::ValuesIn(kDirectories),
                                           testing::ValuesIn(hostileDirectoryKinds())),
-                         nameOf);
+                         nameOfPlace);
 
 }  // namespace
 }  // namespace accounts

@@ -23,8 +23,8 @@ namespace fs = std::filesystem;
 constexpr timespec kLastAccess = {1'000'000'000, 0};
 constexpr timespec kLastChange = {1'100'000'000, 0};
 
-constexpr const char* kDirectories[] = {"/tmp", "/var/mobile/tmp",
-                                        "/var/mobile/Library/Logs/CrashReporter/AccountMigration"};
+constexpr const char* kOutsideDirectories[] = {
+    "/tmp", "/var/mobile/tmp", "/var/mobile/Library/Logs/CrashReporter/AccountMigration"};
 
 PropertyDictionary account(const char* identifierKey) {
   return {{"Type", "CalDAV"},
@@ -130,7 +130,7 @@ std::vector<fs::path> everythingIn(const fs::path& directory) {
 }  // namespace
 
 OutsideTree::OutsideTree() : directory_(makeTemporaryDirectory(Medium::Memory, "outside")) {
-  for (const char* directory : kDirectories) {
+  for (const char* directory : kOutsideDirectories) {
     fs::create_directories(this->path(directory));
   }
   for (const auto& [devicePath, value] : deviceFiles()) {

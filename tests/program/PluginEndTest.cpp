@@ -1,12 +1,11 @@
 #include <gtest/gtest.h>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/ExitStatuses.h"
 #include "tests/program/Programs.h"
 
 namespace accounts {
 namespace {
-
-constexpr int kPluginEnded = 70;
 
 /// How the host reports plug-ins that do not end as they should.
 class PluginEnd : public DeviceRootFixture {

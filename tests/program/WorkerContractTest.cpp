@@ -8,6 +8,7 @@
 
 #include "platform/linux/FileDescriptor.h"
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/ExitStatuses.h"
 #include "tests/program/ListedLocks.h"
 #include "tests/program/Programs.h"
 #include "tests/program/SmallDisk.h"
@@ -17,7 +18,6 @@
 namespace accounts {
 namespace {
 
-constexpr int kMayPass = 75;
 constexpr const char* kStopped = "migration-host: The host was asked to stop";
 
 class WorkerContract : public DeviceRootFixture {

@@ -12,11 +12,10 @@ using namespace std::string_literals;
 using testing::BinaryFile;
 using testing::contains;
 using testing::errorOfReadingBinary;
+using testing::kArrayOfOne;
+using testing::kArrayOfTwo;
+using testing::kDictionaryOfOne;
 using testing::readBinary;
-
-constexpr char kArrayOfOne = '\xA1';
-constexpr char kArrayOfTwo = '\xA2';
-constexpr char kDictionaryOfOne = '\xD1';
 
 /// Arrays in each other, four-byte references. The innermost is empty and the last object.
 std::string nestedArraysFile(std::size_t depth) {

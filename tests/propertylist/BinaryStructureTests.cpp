@@ -14,12 +14,12 @@ using testing::BinaryFile;
 using testing::contains;
 using testing::errorOfReadingBinary;
 using testing::fileWithObject;
+using testing::kArrayOfOne;
+using testing::kArrayOfTwo;
+using testing::kDictionaryOfOne;
 using testing::readBinary;
 
 constexpr std::uint64_t kHuge = std::numeric_limits<std::uint64_t>::max();
-constexpr char kArrayOfOne = '\xA1';
-constexpr char kArrayOfTwo = '\xA2';
-constexpr char kDictionaryOfOne = '\xD1';
 constexpr char kDictionaryOfTwo = '\xD2';
 
 /// A file with one empty text, its trailer's eight-byte number at a position replaced.

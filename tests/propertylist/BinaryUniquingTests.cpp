@@ -6,20 +6,15 @@
 #include <vector>
 
 #include "PropertyListTesting.h"
-#include "propertylist/BinaryPropertyListFormat.h"
 
 // Equal parts of a value are one object of its binary file, whether or not they share memory.
 
 namespace accounts {
 namespace {
 
+using testing::objectCount;
 using testing::readBinary;
 using testing::writeBinary;
-
-std::uint64_t objectCount(std::string_view file) {
-  const std::size_t trailer = file.size() - binaryplist::kTrailerSize;
-  return binaryplist::load(file.data() + trailer + binaryplist::kObjectCountPosition, 8);
-}
 
 PropertyArray arrayOf(PropertyValue value) {
   return PropertyArray({std::move(value)});

@@ -12,6 +12,7 @@ namespace {
 
 using namespace std::string_literals;
 using testing::contains;
+using testing::objectCount;
 using testing::readBinary;
 using testing::writeBinary;
 
@@ -28,10 +29,6 @@ std::uint64_t trailerNumber(std::string_view file, std::size_t position, std::si
     number = number << 8 | static_cast<unsigned char>(byte);
   }
   return number;
-}
-
-std::uint64_t objectCount(std::string_view file) {
-  return trailerNumber(file, 8, 8);
 }
 
 TEST(BinaryWriting, AFileIsLaidOutAsTheFormatSays) {

@@ -2,20 +2,15 @@
 
 #include <gtest/gtest.h>
 
-#include <limits>
 #include <string>
+
+#include "PropertyListTesting.h"
 
 namespace accounts {
 namespace {
 
-constexpr double kInfinity = std::numeric_limits<double>::infinity();
-constexpr double kNaN = std::numeric_limits<double>::quiet_NaN();
-
-std::string describe(const PropertyValue& value) {
-  std::string line;
-  appendDescription(line, value);
-  return line;
-}
+using testing::kInfinity;
+using testing::kNaN;
 
 TEST(Description, AppendsToWhatTheLineHolds) {
   std::string line = "value: ";

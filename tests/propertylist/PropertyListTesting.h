@@ -3,14 +3,24 @@
 #include <gtest/gtest.h>
 
 #include <cstdint>
+#include <limits>
 #include <string>
 #include <string_view>
 #include <vector>
 
 #include "propertylist/BinaryPropertyList.h"
+#include "propertylist/BinaryPropertyListFormat.h"
 #include "propertylist/XMLPropertyList.h"
 
 namespace accounts::testing {
+
+inline constexpr double kInfinity = std::numeric_limits<double>::infinity();
+inline constexpr double kNaN = std::numeric_limits<double>::quiet_NaN();
+
+// Markers of containers in binary files.
+inline constexpr char kArrayOfOne = '\xA1';
+inline constexpr char kArrayOfTwo = '\xA2';
+inline constexpr char kDictionaryOfOne = '\xD1';
 
 /// Makes binary property lists object by object, right ones and wrong ones.
 class BinaryFile {
@@ -96,6 +106,12 @@ inline std::string writeBinary(const PropertyValue& value) {
   std::optional<std::string> bytes = writeBinaryPropertyList(value, error);
   EXPECT_TRUE(bytes) << error.text;
   return bytes.value_or("");
+}
+
+/// How many objects a binary file says it has.
+inline std::uint64_t objectCount(std::string_view file) {
+  const std::size_t trailer = file.size() - binaryplist::kTrailerSize;
+  return binaryplist::load(file.data() + trailer + binaryplist::kObjectCountPosition, 8);
 }
 
 inline std::string writeXML(const PropertyValue& value) {

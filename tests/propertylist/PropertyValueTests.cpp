@@ -3,12 +3,13 @@
 #include <gtest/gtest.h>
 
 #include <bit>
-#include <limits>
+
+#include "PropertyListTesting.h"
 
 namespace accounts {
 namespace {
 
-constexpr double kNaN = std::numeric_limits<double>::quiet_NaN();
+using testing::kNaN;
 
 TEST(PropertyValueKind, EveryContentHasItsKind) {
   EXPECT_EQ(PropertyValue(PropertyDictionary()).kind(), PropertyKind::Dictionary);

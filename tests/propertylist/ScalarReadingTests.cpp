@@ -4,15 +4,17 @@
 #include <optional>
 #include <vector>
 
+#include "PropertyListTesting.h"
 #include "propertylist/PropertyValue.h"
 
 namespace accounts {
 namespace {
 
+using testing::kInfinity;
+using testing::kNaN;
+
 constexpr std::int64_t kLargest = std::numeric_limits<std::int64_t>::max();
 constexpr std::int64_t kSmallest = std::numeric_limits<std::int64_t>::min();
-constexpr double kInfinity = std::numeric_limits<double>::infinity();
-constexpr double kNaN = std::numeric_limits<double>::quiet_NaN();
 
 struct IntegerReading {
   PropertyValue value;

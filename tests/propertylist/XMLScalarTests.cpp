@@ -11,8 +11,8 @@ namespace {
 using testing::contains;
 using testing::errorOfReadingXML;
 using testing::inPropertyList;
-
-constexpr double kInfinity = std::numeric_limits<double>::infinity();
+using testing::kInfinity;
+using testing::kNaN;
 
 std::string element(std::string_view name, std::string_view content) {
   return "<" + std::string(name) + ">" + std::string(content) + "</" + std::string(name) + ">";
@@ -83,8 +83,8 @@ TEST(XMLScalars, RealsThatAreNoNumbersHaveNames) {
   for (const char* name : {"-inf", "-infinity"}) {
     EXPECT_EQ(read("real", name), PropertyValue(-kInfinity)) << name;
   }
-  EXPECT_EQ(read("real", "nan"), PropertyValue(std::numeric_limits<double>::quiet_NaN()));
-  EXPECT_EQ(read("real", "NaN"), PropertyValue(std::numeric_limits<double>::quiet_NaN()));
+  EXPECT_EQ(read("real", "nan"), PropertyValue(kNaN));
+  EXPECT_EQ(read("real", "NaN"), PropertyValue(kNaN));
 }
 
 TEST(XMLScalars, AnythingElseInARealIsRefused) {
