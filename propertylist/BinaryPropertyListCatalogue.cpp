@@ -166,12 +166,12 @@ bool Catalogue::findOrAddKeys(const PropertyKeys& keys, std::uint32_t& number) {
     return asBytes(referencesOf(keys_[candidate])) == asBytes(content);
   });
   if (number == newNumber) {
-    keys_.push_back({.firstReference = static_cast<std::uint32_t>(references_.size()),
-                     .count = static_cast<std::uint32_t>(content.size()),
-                     .expandedCount = static_cast<std::uint32_t>(size.expandedCount)});
-    if (!keepReferences(content)) {
+    CatalogueKeys fresh = {.count = static_cast<std::uint32_t>(content.size()),
+                           .expandedCount = static_cast<std::uint32_t>(size.expandedCount)};
+    if (!keepReferences(content, fresh.firstReference)) {
       return false;
     }
+    keys_.push_back(fresh);
   }
   pending_.resize(firstPending);
   // Keys of one dictionary alone are not worth the memory that they would keep.
@@ -192,14 +192,14 @@ bool Catalogue::findOrAddContainer(std::uint32_t keys, Pending pending, const Si
   const auto newNumber = static_cast<Reference>(containers_.size());
   number = findContainer(keys, content, pending.firstNewScalar, newNumber);
   if (number == newNumber) {
-    containers_.push_back({.firstReference = static_cast<std::uint32_t>(references_.size()),
-                           .childCount = static_cast<std::uint32_t>(content.size()),
-                           .keys = keys,
-                           .expandedCount = static_cast<std::uint32_t>(size.expandedCount),
-                           .height = size.height});
-    if (!keepReferences(content)) {
+    CatalogueContainer fresh = {.childCount = static_cast<std::uint32_t>(content.size()),
+                                .keys = keys,
+                                .expandedCount = static_cast<std::uint32_t>(size.expandedCount),
+                                .height = size.height};
+    if (!keepReferences(content, fresh.firstReference)) {
       return false;
     }
+    containers_.emplaceBack(fresh);
   }
   pending_.resize(pending.firstChild);
   return checkObjectCount();
@@ -222,8 +222,8 @@ Catalogue::Reference Catalogue::findContainer(std::uint32_t keys,
                                          return std::max(known, static_cast<std::int32_t>(child));
                                        });
   if (largest >= 0) {
-    if (static_cast<std::size_t>(largest) >= firstHolders_.size()) {
-      firstHolders_.resize(scalars_.size(), ContentTable::kNone);
+    while (firstHolders_.size() <= static_cast<std::size_t>(largest)) {
+      firstHolders_.emplaceBack(ContentTable::kNone);
     }
     Reference& holder = firstHolders_[static_cast<std::size_t>(largest)];
     if (holder != ContentTable::kNone && isSought(holder)) {
@@ -237,10 +237,11 @@ Catalogue::Reference Catalogue::findContainer(std::uint32_t keys,
   return containerTable_.findOrAdd(hash, newNumber, isSought);
 }
 
-/// References are counted in 32 bits, of which a fresh catalogue never comes near the end.
-bool Catalogue::keepReferences(std::span<const Reference> references) {
-  references_.insert(references_.end(), references.begin(), references.end());
-  return references_.size() <= UINT32_MAX || fail("more references than the limit");
+/// Places are counted in 32 bits, of which a fresh catalogue never comes near the end.
+bool Catalogue::keepReferences(std::span<const Reference> references, std::uint32_t& place) {
+  const std::size_t found = references_.add(references);
+  place = static_cast<std::uint32_t>(found);
+  return found <= UINT32_MAX || fail("more references than the limit");
 }
 
 bool Catalogue::addToParent(Reference number, std::size_t depth, Size& parent) {

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "propertylist/BinaryPropertyListScalarCatalogue.h"
+#include "propertylist/BlockList.h"
 #include "propertylist/ContentTable.h"
 #include "propertylist/PropertyListError.h"
 #include "propertylist/PropertyValue.h"
@@ -71,10 +72,10 @@ class Catalogue {
   [[nodiscard]] const CatalogueKeys& keys(std::uint32_t number) const { return keys_[number]; }
   [[nodiscard]] std::size_t keysCount() const { return keys_.size(); }
   [[nodiscard]] std::span<const Reference> childrenOf(const CatalogueContainer& container) const {
-    return {references_.data() + container.firstReference, container.childCount};
+    return references_.run(container.firstReference, container.childCount);
   }
   [[nodiscard]] std::span<const Reference> referencesOf(const CatalogueKeys& keys) const {
-    return {references_.data() + keys.firstReference, keys.count};
+    return references_.run(keys.firstReference, keys.count);
   }
 
  private:
@@ -107,7 +108,7 @@ class Catalogue {
   bool findOrAddContainer(std::uint32_t keys, Pending pending, const Size& size, Reference& number);
   Reference findContainer(std::uint32_t keys, std::span<const Reference> content,
                           std::size_t firstNewScalar, Reference newNumber);
-  bool keepReferences(std::span<const Reference> references);
+  bool keepReferences(std::span<const Reference> references, std::uint32_t& place);
   bool addToParent(Reference number, std::size_t depth, Size& parent);
   [[nodiscard]] bool checkObjectCount() const;
 
@@ -119,14 +120,14 @@ class Catalogue {
   KeyedHash hash_;
   /// By scalar: the container that it was first met in, where it was the newest scalar. There may
   /// be none for the newest scalars.
-  std::vector<Reference> firstHolders_;
-  std::vector<CatalogueContainer> containers_;
+  BlockList<Reference> firstHolders_;
+  BlockList<CatalogueContainer> containers_;
   ContentTable containerTable_;
   std::vector<CatalogueKeys> keys_;
   ContentTable keysTable_;
   /// Keys that several dictionaries share in memory, kept alive, with their numbers.
   std::vector<std::pair<PropertyKeys, std::uint32_t>> sharedKeys_;
-  std::vector<Reference> references_;
+  NumberRuns references_;
   /// References of the containers that are being walked, the innermost one's last.
   std::vector<Reference> pending_;
 };

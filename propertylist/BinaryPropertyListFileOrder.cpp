@@ -27,6 +27,8 @@ FileOrder::FileOrder(const Catalogue& catalogue, Catalogue::Reference top)
   if (catalogue.holdsOneValue()) {
     takeOrderOfCatalogue();
   } else {
+    scalars_.reserve(catalogue.scalarCount());
+    containers_.reserve(catalogue.containerCount());
     visit(top);
   }
 }

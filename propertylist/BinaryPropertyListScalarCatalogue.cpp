@@ -91,7 +91,7 @@ std::uint32_t ScalarCatalogue::findOrAdd(const PropertyValue& scalar, Announced 
                scalars_[candidate].bits() == number.bits;
       });
   if (found == newNumber) {
-    scalars_.emplace_back(number.kind, number.bits);
+    scalars_.emplaceBack(number.kind, number.bits);
   }
   return found;
 }
@@ -127,7 +127,7 @@ std::uint32_t ScalarCatalogue::findOrAddBytes(ScalarKind kind, const SharedBytes
     }
     kind = ScalarKind::UTF16Text;
   }
-  scalars_.emplace_back(kind, bytes);
+  scalars_.emplaceBack(kind, bytes);
   if (const SharedNodeBase* const node = bytes.sharedNode()) {
     node->setNote(found);
   }

@@ -4,8 +4,8 @@
 #include <cstdint>
 #include <string_view>
 #include <utility>
-#include <vector>
 
+#include "propertylist/BlockList.h"
 #include "propertylist/ContentTable.h"
 #include "propertylist/PropertyValue.h"
 
@@ -34,9 +34,8 @@ class CatalogueScalar {
       : bytes_(std::move(bytes)),
         byteCount_(static_cast<std::uint32_t>(bytes_.view().size())),
         kind_(kind) {}
-  CatalogueScalar(CatalogueScalar&& other) noexcept
-      : bits_(std::exchange(other.bits_, 0)), byteCount_(other.byteCount_), kind_(other.kind_) {}
-  CatalogueScalar& operator=(CatalogueScalar&&) = delete;
+  CatalogueScalar(const CatalogueScalar&) = delete;
+  CatalogueScalar& operator=(const CatalogueScalar&) = delete;
   ~CatalogueScalar() {
     if (holdsBytes()) {
       bytes_.~SharedBytes();
@@ -103,7 +102,7 @@ class ScalarCatalogue {
                                std::string_view& problem);
 
   KeyedHash hash_;
-  std::vector<CatalogueScalar> scalars_;
+  BlockList<CatalogueScalar> scalars_;
   ContentTable table_;
 };
 
