@@ -7,11 +7,13 @@ namespace accounts {
 
 namespace {
 
-// A table that grows in small steps moves everything often; the largest tables are tens of
-// megabytes, and with a larger step the last one could be four times what is needed.
-constexpr std::size_t kLargeSlotCount = std::size_t{1} << 18;
-constexpr std::size_t kGrowthOfSmall = 4;
-constexpr std::size_t kGrowthOfLarge = 2;
+// A table that grows in small steps moves everything often; the largest tables are megabytes, and
+// with a larger step they could be several times what is needed.
+constexpr std::size_t kLargeSlotCount = std::size_t{1} << 16;
+
+std::size_t slotCountAfter(std::size_t count) {
+  return count < kLargeSlotCount ? 4 * count : count + count / 2;
+}
 
 }  // namespace
 
@@ -27,15 +29,13 @@ KeyedHash::KeyedHash() {
 }
 
 void ContentTable::grow() {
-  const std::size_t growth = slots_.size() < kLargeSlotCount ? kGrowthOfSmall : kGrowthOfLarge;
-  const std::vector<Slot> old = std::exchange(slots_, std::vector<Slot>(growth * slots_.size()));
-  shift_ -= std::countr_zero(growth);
-  const std::size_t mask = slots_.size() - 1;
+  const std::vector<Slot> old =
+      std::exchange(slots_, std::vector<Slot>(slotCountAfter(slots_.size())));
   for (const Slot& slot : old) {
     if (slot.numberPlusOne != 0) {
       std::size_t place = firstPlace(slot.hash);
       while (slots_[place].numberPlusOne != 0) {
-        place = (place + 1) & mask;
+        place = placeAfter(place);
       }
       slots_[place] = slot;
     }

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <bit>
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
@@ -79,9 +78,8 @@ class ContentTable {
   /// The number under this hash of which `hasContent(number)` is true; `kNone` if there is none.
   template <class HasContent>
   [[nodiscard]] std::uint32_t find(std::uint32_t hash, const HasContent& hasContent) const {
-    const std::size_t mask = slots_.size() - 1;
     for (std::size_t place = firstPlace(hash); slots_[place].numberPlusOne != 0;
-         place = (place + 1) & mask) {
+         place = placeAfter(place)) {
       if (slots_[place].hash == hash && hasContent(slots_[place].numberPlusOne - 1)) {
         return slots_[place].numberPlusOne - 1;
       }
@@ -101,9 +99,8 @@ class ContentTable {
     if (4 * (count_ + 1) > 3 * slots_.size()) {
       grow();
     }
-    const std::size_t mask = slots_.size() - 1;
     std::size_t place = firstPlace(hash);
-    for (; slots_[place].numberPlusOne != 0; place = (place + 1) & mask) {
+    for (; slots_[place].numberPlusOne != 0; place = placeAfter(place)) {
       if (slots_[place].hash == hash && hasContent(slots_[place].numberPlusOne - 1)) {
         return slots_[place].numberPlusOne - 1;
       }
@@ -121,12 +118,15 @@ class ContentTable {
   };
   /// Where the search for a hash begins. The hash's high bits tell, so that a table that grows is
   /// gone through, old and new, from one end to the other: neither has to fit into a cache.
-  [[nodiscard]] std::size_t firstPlace(std::uint32_t hash) const { return hash >> shift_; }
+  [[nodiscard]] std::size_t firstPlace(std::uint32_t hash) const {
+    return static_cast<std::size_t>(std::uint64_t{hash} * slots_.size() >> 32);
+  }
+  [[nodiscard]] std::size_t placeAfter(std::size_t place) const {
+    return place + 1 != slots_.size() ? place + 1 : 0;
+  }
   void grow();
 
-  /// Their number is a power of two: 2^(32 - shift_).
   std::vector<Slot> slots_ = std::vector<Slot>(kInitialSlotCount);
-  int shift_ = 32 - std::countr_zero(kInitialSlotCount);
   std::size_t count_ = 0;
 };
 
