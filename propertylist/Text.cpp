@@ -1,7 +1,6 @@
 #include "propertylist/Text.h"
 
 #include <cstring>
-#include <limits>
 #include <new>
 
 namespace accounts {
@@ -10,30 +9,32 @@ namespace {
 
 // Large enough to make the allocation's price small beside that of the bytes.
 constexpr std::size_t kBlockSize = std::size_t{1} << 15;
-// What is longer keeps no block of others alive and wastes none of its room.
-constexpr std::size_t kLongestInBlock = 1024;
 
 }  // namespace
 
 SharedBytes::Node::Node(std::string_view content, const Block* block)
-    : size(static_cast<std::uint32_t>(content.size())),
-      placeInBlock(block != nullptr
-                       ? static_cast<std::uint32_t>(reinterpret_cast<char*>(this) -
-                                                    reinterpret_cast<const char*>(block))
-                       : 0) {
+    : sizeAndPlace_(static_cast<std::uint32_t>(content.size()) |
+                    (block != nullptr ? kInBlock | placeIn(*block) << kSizeBits : 0)) {
   std::memcpy(bytes(), content.data(), content.size());
 }
 
+std::uint32_t SharedBytes::Node::placeIn(const Block& block) const {
+  static_assert(kBlockSize / kAlignment <= kInBlock >> kSizeBits);
+  const auto distance = reinterpret_cast<const char*>(this) - reinterpret_cast<const char*>(&block);
+  return static_cast<std::uint32_t>(distance) / std::uint32_t{kAlignment};
+}
+
 SharedBytes::Block* SharedBytes::Node::block() {
-  return placeInBlock != 0 ? reinterpret_cast<Block*>(reinterpret_cast<char*>(this) - placeInBlock)
-                           : nullptr;
+  const std::size_t place = (sizeAndPlace_ & ~kInBlock) >> kSizeBits;
+  return isInBlock() ? reinterpret_cast<Block*>(reinterpret_cast<char*>(this) - place * kAlignment)
+                     : nullptr;
 }
 
 SharedBytes::SharedBytes(std::string_view bytes) {
   if (bytes.empty()) {
     return;
   }
-  if (bytes.size() > std::numeric_limits<std::uint32_t>::max()) {
+  if (bytes.size() > Node::kLongest) {
     throw std::bad_alloc();
   }
   // Header and bytes share one allocation: most values of an account are short texts.
@@ -53,10 +54,11 @@ void SharedBytes::destroyNode(SharedNodeBase* base) {
 }
 
 SharedBytes SharedBytesArena::make(std::string_view bytes) {
-  if (bytes.empty() || bytes.size() > kLongestInBlock) {
+  if (bytes.empty() || bytes.size() > SharedBytes::Node::kLongestInBlock) {
     return SharedBytes(bytes);
   }
-  constexpr std::size_t kAlignment = alignof(SharedBytes::Node);
+  constexpr std::size_t kAlignment = SharedBytes::Node::kAlignment;
+  static_assert(alignof(SharedBytes::Node) == kAlignment);
   const std::size_t size =
       (sizeof(SharedBytes::Node) + bytes.size() + kAlignment - 1) / kAlignment * kAlignment;
   if (freeSize_ < size) {

@@ -36,16 +36,34 @@ class SharedBytes {
   friend class PropertyContent;
   /// Memory that many nodes share; it goes with the last of them.
   struct Block : SharedNodeBase {};
-  /// There may be millions: 32 bits for the size leave room for four gibibytes.
-  struct Node : SharedNodeBase {
+  /// Followed by its bytes. There may be millions, so that all it knows of itself is one number.
+  class Node : public SharedNodeBase {
+   public:
+    static constexpr std::size_t kAlignment = 4;
+    static constexpr int kSizeBits = 11;
+    /// What is longer keeps no block of others alive and wastes none of its room.
+    static constexpr std::size_t kLongestInBlock = 1024;
+    static constexpr std::size_t kLongest = 0x7FFF'FFFF;
+    static_assert(kLongestInBlock < 1 << kSizeBits);
+
+    /// In a block, or, where that is null, with memory of its own.
     Node(std::string_view content, const Block* block);
-    [[nodiscard]] char* bytes() { return reinterpret_cast<char*>(this + 1); }
-    [[nodiscard]] std::string_view view() { return {bytes(), size}; }
+    [[nodiscard]] std::string_view view() {
+      return {bytes(), isInBlock() ? sizeAndPlace_ & ((1U << kSizeBits) - 1) : sizeAndPlace_};
+    }
     /// The block that the node stands in; null for a node with memory of its own.
     [[nodiscard]] Block* block();
-    const std::uint32_t size;
-    /// How far behind the beginning of its block the node stands; 0 for one with its own memory.
-    const std::uint32_t placeInBlock;
+
+   private:
+    static constexpr std::uint32_t kInBlock = std::uint32_t{1} << 31;
+
+    [[nodiscard]] char* bytes() { return reinterpret_cast<char*>(this + 1); }
+    [[nodiscard]] std::uint32_t placeIn(const Block& block) const;
+    [[nodiscard]] bool isInBlock() const { return (sizeAndPlace_ & kInBlock) != 0; }
+
+    /// The size. In a block it has the low bits alone; above them is how far behind the beginning
+    /// of the block the node stands, in units of the alignment.
+    const std::uint32_t sizeAndPlace_;
   };
   explicit SharedBytes(Node* node) : node_(node) {}
   static void destroyNode(SharedNodeBase* node);
