@@ -37,17 +37,16 @@ bool BasicAccount::acceptProperties(const PropertyDictionary& properties) {
   }
   _originalProperties = properties;
   _properties = properties;
-  _ownType = type;
+  _ownType = *type;
   _hasValidOwnType = true;
-  _ownClass = accountClass;
-  _ownIdentifier = _properties.textForKey(kAccountIdentifier);
-  if (!_ownIdentifier) {
-    if (const std::optional<Text> identifier = createNewAccountUID()) {
-      _properties.set(kAccountIdentifier, *identifier);
-      _ownIdentifier = identifier;
-      if (!_properties.textForKey(kAccountSyncIdentifier)) {
-        _properties.set(kAccountSyncIdentifier, *identifier);
-      }
+  _ownClass = *accountClass;
+  if (const std::optional<Text> own = properties.textForKey(kAccountIdentifier)) {
+    _ownIdentifier = *own;
+  } else if (const std::optional<Text> identifier = createNewAccountUID()) {
+    _ownIdentifier = *identifier;
+    _properties.set(kAccountIdentifier, *identifier);
+    if (!_properties.textForKey(kAccountSyncIdentifier)) {
+      _properties.set(kAccountSyncIdentifier, *identifier);
     }
   }
   return true;

@@ -110,7 +110,7 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   }
   /// Whether initWithProperties() would make a record of properties().
   [[nodiscard]] bool hasAcceptableProperties() const {
-    return _hasValidOwnType && _ownClass && !_ownClass->empty();
+    return _hasValidOwnType && !_ownClass.empty();
   }
   /// Takes a new snapshot.
   void setOriginalProperties(std::optional<PropertyDictionary> properties);
@@ -128,7 +128,9 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   /// The text under "Identifier", whatever a record of another class answers above.
   [[nodiscard]] std::optional<Text> identifierProperty() const;
   /// Whether properties() has a text under "Identifier".
-  [[nodiscard]] bool hasOwnIdentifier() const { return _ownIdentifier.has_value(); }
+  [[nodiscard]] bool hasOwnIdentifier() const {
+    return !_ownIdentifier.empty() || _properties.textForKey(kAccountIdentifier);
+  }
   [[nodiscard]] virtual std::optional<Text> syncStoreIdentifier() const;
   [[nodiscard]] std::optional<Text> accountClass() const;
   [[nodiscard]] virtual std::optional<Text> displayName() const;
@@ -215,6 +217,7 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   [[nodiscard]] bool acceptProperties(const PropertyDictionary& properties);
 
  private:
+  [[nodiscard]] std::optional<Text> ownTextOrProperty(const Text& own, std::string_view key) const;
   /// The account's own value for a key, else its parent's; null when neither has one.
   [[nodiscard]] const PropertyValue* valueForKey(std::string_view key) const;
   /// Told after every change of an own value.
@@ -224,9 +227,10 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   PropertyDictionary _properties;
   // The own texts under "Type", "Class" and "Identifier", at hand because every walk through a
   // store asks for them: its accounts' dictionaries are more than the processor's caches hold.
-  std::optional<Text> _ownType;
-  std::optional<Text> _ownClass;
-  std::optional<Text> _ownIdentifier;
+  // Empty for none, too: then, and only then, the dictionary is asked.
+  Text _ownType;
+  Text _ownClass;
+  Text _ownIdentifier;
   bool _hasValidOwnType = false;
   bool _wouldBeLoadedAsSaved = false;
   FullAccountReference _fullAccount;

@@ -76,15 +76,16 @@ void BasicAccount::removeAccountPropertyForKey(std::string_view key) {
 
 void BasicAccount::noteChangeOfKey(std::string_view key) {
   if (key == kAccountIdentifier) {
-    _ownIdentifier = _properties.textForKey(key);
+    _ownIdentifier = _properties.textForKey(key).value_or(Text());
     ++Process::current().identifierChanges;
   } else if (key == kAccountSyncIdentifier) {
     ++Process::current().syncIdentifierChanges;
   } else if (key == kAccountType) {
-    _ownType = _properties.textForKey(key);
-    _hasValidOwnType = _isValidAccountType(_ownType);
+    const std::optional<Text> type = _properties.textForKey(key);
+    _hasValidOwnType = _isValidAccountType(type);
+    _ownType = type.value_or(Text());
   } else if (key == kAccountClass) {
-    _ownClass = _properties.textForKey(key);
+    _ownClass = _properties.textForKey(key).value_or(Text());
   }
 }
 
@@ -102,8 +103,12 @@ void BasicAccount::noteSaved(bool canBeKept) {
   }
 }
 
+std::optional<Text> BasicAccount::ownTextOrProperty(const Text& own, std::string_view key) const {
+  return !own.empty() ? own : textPropertyForKey(key);
+}
+
 std::optional<Text> BasicAccount::type() const {
-  return _ownType ? _ownType : textPropertyForKey(kAccountType);
+  return ownTextOrProperty(_ownType, kAccountType);
 }
 
 std::optional<Text> BasicAccount::identifier() const {
@@ -111,7 +116,7 @@ std::optional<Text> BasicAccount::identifier() const {
 }
 
 std::optional<Text> BasicAccount::identifierProperty() const {
-  return _ownIdentifier ? _ownIdentifier : textPropertyForKey(kAccountIdentifier);
+  return ownTextOrProperty(_ownIdentifier, kAccountIdentifier);
 }
 
 std::optional<Text> BasicAccount::syncStoreIdentifier() const {
@@ -119,7 +124,7 @@ std::optional<Text> BasicAccount::syncStoreIdentifier() const {
 }
 
 std::optional<Text> BasicAccount::accountClass() const {
-  return _ownClass ? _ownClass : textPropertyForKey(kAccountClass);
+  return ownTextOrProperty(_ownClass, kAccountClass);
 }
 
 std::optional<Text> BasicAccount::displayName() const {

@@ -35,7 +35,7 @@ class IdentifierIndex {
     const auto newNumber = static_cast<std::uint32_t>(entries_.size());
     const std::string_view text = identifier;
     // Before the table knows its number, which must never be one of no entry.
-    entries_.push_back({identifier, Value(), State::Present});
+    entries_.push_back({identifier, Value()});
     const std::uint32_t number = table_.findOrAdd(hash_(text), newNumber, hasIdentifier(text));
     if (number != newNumber) {
       entries_.pop_back();
@@ -51,7 +51,9 @@ class IdentifierIndex {
       return;
     }
     // The table keeps its number, under which nothing is found any more.
-    entries_[number] = {Text(), Value(), State::Removed};
+    entries_[number] = {Text(), Value()};
+    removed_.resize(entries_.size(), false);
+    removed_[number] = true;
     ++removedCount_;
     ++changeCount_;
     if (2 * removedCount_ > entries_.size()) {
@@ -60,6 +62,7 @@ class IdentifierIndex {
   }
   void clear() {
     entries_.clear();
+    removed_.clear();
     table_ = ContentTable();
     removedCount_ = 0;
     ++changeCount_;
@@ -70,31 +73,39 @@ class IdentifierIndex {
   [[nodiscard]] std::vector<std::pair<Text, Value>> inOrder() const {
     std::vector<std::pair<Text, Value>> result;
     result.reserve(size());
-    for (const Entry& entry : entries_) {
-      if (entry.state == State::Present) {
-        result.emplace_back(entry.identifier, entry.value);
+    for (std::size_t number = 0; number < entries_.size(); ++number) {
+      if (!isRemoved(number)) {
+        result.emplace_back(entries_[number].identifier, entries_[number].value);
       }
     }
     return result;
   }
 
  private:
-  enum class State : std::uint8_t { Present, Removed };
   struct Entry {
     Text identifier;
     Value value;
-    State state;
   };
+
+  [[nodiscard]] bool isRemoved(std::size_t number) const {
+    return number < removed_.size() && removed_[number];
+  }
 
   [[nodiscard]] auto hasIdentifier(std::string_view identifier) const {
     return [this, identifier](std::uint32_t number) {
-      const Entry& entry = entries_[number];
-      return entry.state == State::Present && entry.identifier == identifier;
+      return !isRemoved(number) && entries_[number].identifier == identifier;
     };
   }
 
   void dropRemovedEntries() {
-    std::erase_if(entries_, [](const Entry& entry) { return entry.state == State::Removed; });
+    std::size_t kept = 0;
+    for (std::size_t number = 0; number < entries_.size(); ++number) {
+      if (!isRemoved(number)) {
+        std::swap(entries_[kept++], entries_[number]);
+      }
+    }
+    entries_.resize(kept);
+    removed_.clear();
     removedCount_ = 0;
     table_ = ContentTable();
     for (std::uint32_t number = 0; number < entries_.size(); ++number) {
@@ -104,6 +115,8 @@ class IdentifierIndex {
   }
 
   std::vector<Entry> entries_;
+  /// By number, as far as entries were removed. A flag in each entry would take eight bytes.
+  std::vector<bool> removed_;
   std::size_t removedCount_ = 0;
   std::uint64_t changeCount_ = 0;
   KeyedHash hash_;

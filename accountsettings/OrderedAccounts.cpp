@@ -8,42 +8,42 @@
 namespace accounts {
 
 void OrderedAccounts::PlaceNumbers::insert(PlaceNumber number) {
-  if (!first_) {
+  if (empty()) {
     first_ = number;
     return;
   }
-  if (number == *first_) {
+  if (number == first_) {
     return;
   }
   if (others_ == nullptr) {
     others_ = std::make_unique<std::set<PlaceNumber>>();
   }
-  others_->insert(std::max(*first_, number));
-  first_ = std::min(*first_, number);
+  others_->insert(std::max(first_, number));
+  first_ = std::min(first_, number);
 }
 
 void OrderedAccounts::PlaceNumbers::erase(PlaceNumber number) {
   if (others_ != nullptr) {
-    if (number == *first_) {
+    if (number == first_) {
       first_ = *others_->begin();
     }
-    others_->erase(std::max(*first_, number));
+    others_->erase(std::max(first_, number));
     if (others_->empty()) {
       others_.reset();
     }
   } else if (number == first_) {
-    first_.reset();
+    first_ = kNone;
   }
 }
 
 OrderedAccounts::PlaceNumber OrderedAccounts::PlaceNumbers::last() const {
-  return others_ != nullptr ? *others_->rbegin() : *first_;
+  return others_ != nullptr ? *others_->rbegin() : first_;
 }
 
 std::vector<OrderedAccounts::PlaceNumber> OrderedAccounts::PlaceNumbers::all() const {
   std::vector<PlaceNumber> numbers;
-  if (first_) {
-    numbers.push_back(*first_);
+  if (!empty()) {
+    numbers.push_back(first_);
   }
   if (others_ != nullptr) {
     numbers.insert(numbers.end(), others_->begin(), others_->end());
@@ -83,6 +83,7 @@ void OrderedAccounts::assign(std::vector<BasicAccountReference> accounts) {
   hasIndexes_ = false;
   accounts_ = std::move(accounts);
   places_.clear();
+  nextNumber_ = 0;
   removedCount_ = 0;
   for (std::size_t count = accounts_.size(); count > 0; --count) {
     addPlace();

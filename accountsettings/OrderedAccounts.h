@@ -43,21 +43,23 @@ class OrderedAccounts {
 
  private:
   // A place keeps its number as long as it exists, so that the indexes outlive the removal of other
-  // places. Numbers increase along the list.
-  using PlaceNumber = std::uint64_t;
+  // places. Numbers increase along the list; they begin anew with assign(), and so many appended
+  // accounts as have no number any more would not fit into memory.
+  using PlaceNumber = std::uint32_t;
   /// Numbers in order. Nearly always there is one, which needs no memory of its own.
   class PlaceNumbers {
    public:
     void insert(PlaceNumber number);
     void erase(PlaceNumber number);
-    [[nodiscard]] bool empty() const { return !first_; }
+    [[nodiscard]] bool empty() const { return first_ == kNone; }
     /// The smallest and the largest; there must be one.
-    [[nodiscard]] PlaceNumber first() const { return *first_; }
+    [[nodiscard]] PlaceNumber first() const { return first_; }
     [[nodiscard]] PlaceNumber last() const;
     [[nodiscard]] std::vector<PlaceNumber> all() const;
 
    private:
-    std::optional<PlaceNumber> first_;
+    static constexpr PlaceNumber kNone = UINT32_MAX;
+    PlaceNumber first_ = kNone;
     /// The others; null for none.
     std::unique_ptr<std::set<PlaceNumber>> others_;
   };

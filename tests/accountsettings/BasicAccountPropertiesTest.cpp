@@ -18,6 +18,20 @@ TEST(AccountProperties, AnOwnValueHidesTheParents) {
   EXPECT_EQ(described(child->accountPropertyForKey("Host")), "own");
 }
 
+TEST(AccountProperties, AnOwnEmptyTextHidesTheParents) {
+  FakeProcess device;
+  const auto child = childOf(cloudAccount());
+  child->_forcedSetAccountProperty_forKey("", kAccountIdentifier);
+  child->_forcedSetAccountProperty_forKey("", kAccountType);
+  child->_forcedSetAccountProperty_forKey("", kAccountClass);
+
+  EXPECT_EQ(child->identifier(), "");
+  EXPECT_TRUE(child->hasOwnIdentifier());
+  EXPECT_EQ(child->type(), "");
+  EXPECT_EQ(child->accountClass(), "");
+  EXPECT_FALSE(child->hasAcceptableProperties());
+}
+
 TEST(AccountProperties, AMissingValueIsTheParents) {
   FakeProcess device;
   const auto child = childOf(cloudAccount({{"Host", "parent"}}));
