@@ -33,6 +33,7 @@ class BlockList {
   }
 
   [[nodiscard]] std::size_t size() const { return size_; }
+  /// The element with an index, which must be less than the size; it keeps its place in memory.
   [[nodiscard]] const Element& operator[](std::size_t index) const {
     return *std::launder(reinterpret_cast<const Element*>(placeOf(index)));
   }
@@ -40,6 +41,7 @@ class BlockList {
     return const_cast<Element&>(std::as_const(*this)[index]);
   }
 
+  /// Adds an element made of the arguments at the end.
   template <class... Arguments>
   void emplaceBack(Arguments&&... arguments) {
     if (size_ == blocks_.size() * kBlockLength) {
@@ -94,7 +96,7 @@ class NumberRuns {
     return place;
   }
 
-  /// A run by its place and its length.
+  /// A run by its place and its length; valid as long as the runs.
   [[nodiscard]] std::span<const Number> run(std::size_t place, std::size_t length) const {
     return length != 0 ? std::span<const Number>(placeOf(place), length)
                        : std::span<const Number>();
