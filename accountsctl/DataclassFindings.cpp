@@ -41,9 +41,8 @@ class ListFindings {
     for (const PropertyValue& member : list) {
       const Text* dataclass = member.asText();
       if (dataclass == nullptr) {
-        std::string text = fmt::format("'{}' has a member that is no text: ", key);
-        appendDescription(text, member);
-        addFinding(findings_, about_, Effect::Ignored, "noDataclass", std::move(text));
+        addFinding(findings_, about_, Effect::Ignored, "noDataclass",
+                   fmt::format("'{}' has a member that is no text: {}", key, describe(member)));
       } else if (!effective.containsText(*dataclass)) {
         const DataclassProblem& problem = problemOf(*dataclass, supported);
         addFinding(findings_, about_, Effect::Ignored, problem.code,

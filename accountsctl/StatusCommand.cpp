@@ -27,12 +27,7 @@ LinuxPlatformOptions platformOptions(const StatusOptions& options) {
 }
 
 std::string versionWords(const DeviceStatus& status) {
-  if (!status.storedVersion) {
-    return "without a version";
-  }
-  std::string words = "version ";
-  appendDescription(words, *status.storedVersion);
-  return words;
+  return status.storedVersion ? "version " + describe(*status.storedVersion) : "without a version";
 }
 
 std::string settingsWords(const DeviceStatus& status) {

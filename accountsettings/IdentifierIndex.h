@@ -51,9 +51,9 @@ class IdentifierIndex {
       return;
     }
     // The table keeps its number, under which nothing is found any more.
-    entries_[number] = {Text(), Value()};
     removed_.resize(entries_.size(), false);
     removed_[number] = true;
+    entries_[number] = {Text(), Value()};
     ++removedCount_;
     ++changeCount_;
     if (2 * removedCount_ > entries_.size()) {

@@ -83,7 +83,6 @@ void OrderedAccounts::assign(std::vector<BasicAccountReference> accounts) {
   hasIndexes_ = false;
   accounts_ = std::move(accounts);
   places_.clear();
-  nextNumber_ = 0;
   removedCount_ = 0;
   for (std::size_t count = accounts_.size(); count > 0; --count) {
     addPlace();

@@ -43,9 +43,8 @@ class OrderedAccounts {
 
  private:
   // A place keeps its number as long as it exists, so that the indexes outlive the removal of other
-  // places. Numbers increase along the list; they begin anew with assign(), and so many appended
-  // accounts as have no number any more would not fit into memory.
-  using PlaceNumber = std::uint32_t;
+  // places. Numbers increase along the list.
+  using PlaceNumber = std::uint64_t;
   /// Numbers in order. Nearly always there is one, which needs no memory of its own.
   class PlaceNumbers {
    public:
@@ -58,7 +57,7 @@ class OrderedAccounts {
     [[nodiscard]] std::vector<PlaceNumber> all() const;
 
    private:
-    static constexpr PlaceNumber kNone = UINT32_MAX;
+    static constexpr PlaceNumber kNone = UINT64_MAX;
     PlaceNumber first_ = kNone;
     /// The others; null for none.
     std::unique_ptr<std::set<PlaceNumber>> others_;

@@ -48,12 +48,8 @@ std::vector<ListedAccount> listedAccounts(const PropertyArray& array, const Stor
 }
 
 std::string wordFor(const PropertyDictionary& properties, std::string_view key) {
-  std::string word;
   const PropertyValue* value = key.empty() ? nullptr : properties.find(key);
-  if (value != nullptr) {
-    appendDescription(word, *value);
-  }
-  return word;
+  return value != nullptr ? describe(*value) : std::string();
 }
 
 std::string titleOf(const ListedAccount& account, const StoreLayout& layout) {

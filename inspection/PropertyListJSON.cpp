@@ -28,8 +28,7 @@ JSON jsonOfArray(const PropertyArray& array) {
 
 /// The description of a value that has none of its own in JSON, which is a quoted text.
 JSON jsonOfDescription(const PropertyValue& value) {
-  std::string description;
-  appendDescription(description, value);
+  const std::string description = describe(value);
   return description.substr(1, description.size() - 2);
 }
 

@@ -15,7 +15,7 @@
 namespace accounts {
 
 /// So large that where all blocks begin is always at hand, and yet little for a small file.
-inline constexpr std::size_t kBlockSize = std::size_t{1} << 14;
+inline constexpr std::size_t kListBlockSize = std::size_t{1} << 14;
 
 /// A list that grows at its end.
 template <class Element>
@@ -52,9 +52,9 @@ class BlockList {
   }
 
  private:
-  static constexpr std::size_t kBlockLength = kBlockSize / sizeof(Element);
+  static constexpr std::size_t kBlockLength = kListBlockSize / sizeof(Element);
   struct Block {
-    alignas(Element) std::byte bytes[kBlockSize];
+    alignas(Element) std::byte bytes[kListBlockSize];
   };
 
   [[nodiscard]] const std::byte* placeOf(std::size_t index) const {
@@ -103,7 +103,7 @@ class NumberRuns {
   }
 
  private:
-  static constexpr std::size_t kBlockLength = kBlockSize / sizeof(Number);
+  static constexpr std::size_t kBlockLength = kListBlockSize / sizeof(Number);
 
   [[nodiscard]] Number* placeOf(std::size_t place) const {
     return blocks_[place / kBlockLength] + place % kBlockLength;

@@ -15,6 +15,7 @@ namespace accounts {
 class SharedBytes {
  public:
   SharedBytes() = default;
+  /// A copy of the bytes. More than 2^31 - 1 are too much memory: std::bad_alloc.
   explicit SharedBytes(std::string_view bytes);
 
   /// The bytes; valid as long as any handle to them lives.
@@ -43,6 +44,7 @@ class SharedBytes {
     static constexpr int kSizeBits = 11;
     /// What is longer keeps no block of others alive and wastes none of its room.
     static constexpr std::size_t kLongestInBlock = 1024;
+    /// The bit above tells a node in a block.
     static constexpr std::size_t kLongest = 0x7FFF'FFFF;
     static_assert(kLongestInBlock < 1 << kSizeBits);
 
@@ -81,6 +83,7 @@ class SharedBytesArena {
   SharedBytesArena& operator=(const SharedBytesArena&) = delete;
   ~SharedBytesArena() { releaseBlock(block_); }
 
+  /// A copy of the bytes, as SharedBytes() makes it.
   [[nodiscard]] SharedBytes make(std::string_view bytes);
 
  private:

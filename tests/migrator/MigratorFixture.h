@@ -19,9 +19,7 @@
 namespace accounts {
 
 inline void PrintTo(const PropertyValue& value, std::ostream* output) {
-  std::string description;
-  appendDescription(description, value);
-  *output << description;
+  *output << describe(value);
 }
 inline void PrintTo(const PropertyDictionary& dictionary, std::ostream* output) {
   PrintTo(PropertyValue(dictionary), output);
@@ -92,6 +90,7 @@ inline AccountBuilder anAccount(std::string_view identifier, std::string_view ty
       {{kAccountIdentifier, identifier}, {kAccountType, type}, {kAccountClass, accountClass}});
 }
 
+/// A calendar account as a cloud account has it for a child.
 inline AccountBuilder calendarChild() {
   return anAccount("K", kCalDAVAccountType, "MobileCalDAVAccount");
 }

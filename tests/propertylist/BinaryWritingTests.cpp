@@ -14,21 +14,13 @@ using namespace std::string_literals;
 using testing::contains;
 using testing::objectCount;
 using testing::readBinary;
+using testing::trailerNumber;
 using testing::writeBinary;
 
 std::string errorOfWriting(const PropertyValue& value) {
   PropertyListError error;
   EXPECT_FALSE(writeBinaryPropertyList(value, error));
   return error.text;
-}
-
-/// A number in a file's trailer.
-std::uint64_t trailerNumber(std::string_view file, std::size_t position, std::size_t size) {
-  std::uint64_t number = 0;
-  for (const char byte : file.substr(file.size() - 32 + position, size)) {
-    number = number << 8 | static_cast<unsigned char>(byte);
-  }
-  return number;
 }
 
 TEST(BinaryWriting, AFileIsLaidOutAsTheFormatSays) {

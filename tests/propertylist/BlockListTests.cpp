@@ -12,7 +12,7 @@ namespace {
 
 using Numbers = std::vector<NumberRuns::Number>;
 
-constexpr std::size_t kNumbersInABlock = kBlockSize / sizeof(NumberRuns::Number);
+constexpr std::size_t kNumbersInABlock = kListBlockSize / sizeof(NumberRuns::Number);
 
 Numbers consecutiveNumbers(NumberRuns::Number first, std::size_t count) {
   Numbers numbers(count);
@@ -54,7 +54,7 @@ TEST(BlockList, LetsGoOfWhatIsInIt) {
   const auto shared = std::make_shared<int>(1);
   {
     BlockList<std::shared_ptr<int>> list;
-    for (std::size_t count = 0; count <= kBlockSize / sizeof(shared); ++count) {
+    for (std::size_t count = 0; count <= kListBlockSize / sizeof(shared); ++count) {
       list.emplaceBack(shared);
     }
     EXPECT_GT(shared.use_count(), 2);

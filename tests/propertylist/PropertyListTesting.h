@@ -9,7 +9,6 @@
 #include <vector>
 
 #include "propertylist/BinaryPropertyList.h"
-#include "propertylist/BinaryPropertyListFormat.h"
 #include "propertylist/XMLPropertyList.h"
 
 namespace accounts::testing {
@@ -108,10 +107,18 @@ inline std::string writeBinary(const PropertyValue& value) {
   return bytes.value_or("");
 }
 
+/// A number in a binary file's trailer.
+inline std::uint64_t trailerNumber(std::string_view file, std::size_t position, std::size_t size) {
+  std::uint64_t number = 0;
+  for (const char byte : file.substr(file.size() - 32 + position, size)) {
+    number = number << 8 | static_cast<unsigned char>(byte);
+  }
+  return number;
+}
+
 /// How many objects a binary file says it has.
 inline std::uint64_t objectCount(std::string_view file) {
-  const std::size_t trailer = file.size() - binaryplist::kTrailerSize;
-  return binaryplist::load(file.data() + trailer + binaryplist::kObjectCountPosition, 8);
+  return trailerNumber(file, 8, 8);
 }
 
 inline std::string writeXML(const PropertyValue& value) {
