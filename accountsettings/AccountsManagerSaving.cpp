@@ -27,11 +27,11 @@ PropertyArray accountsOnDisk() {
 
 /// The bytes of the account settings file, valid until the platform's property lists are used
 /// again; none, with a channel line, when they cannot be made.
-std::optional<std::string_view> serialize(const PropertyDictionary& root) {
-  std::string_view bytes;
+std::optional<BytesInPieces> serialize(const PropertyDictionary& root) {
+  BytesInPieces bytes;
   const Result serialization =
       Process::current().platform.propertyLists.serializeBinary(root, bytes);
-  if (!serialization || bytes.empty()) {
+  if (!serialization || bytes.size() == 0) {
     logToChannel(saveOperation, "Failed to serialize account settings data: %@", [&] {
       return logArguments(serialization ? std::optional<Text>() : Text(serialization.error()));
     });
@@ -41,7 +41,7 @@ std::optional<std::string_view> serialize(const PropertyDictionary& root) {
 }
 
 /// Fills the temporary file and moves it over the account settings file. False when a step fails.
-bool writeThroughTemporaryFile(std::optional<std::string_view> bytes,
+bool writeThroughTemporaryFile(const std::optional<BytesInPieces>& bytes,
                                const std::string& temporaryPath, const std::string& path) {
   FileSystem& fileSystem = Process::current().platform.fileSystem;
   if (!bytes || !fileSystem.writeFile(temporaryPath, *bytes)) {
@@ -61,7 +61,7 @@ bool writeThroughTemporaryFile(std::optional<std::string_view> bytes,
 /// that fails.
 bool writeSettingsFile(const PropertyDictionary& root) {
   FileSystem& fileSystem = Process::current().platform.fileSystem;
-  const std::optional<std::string_view> bytes = serialize(root);
+  const std::optional<BytesInPieces> bytes = serialize(root);
   const std::string path = AccountsManager::fullPathToAccountSettingsPlist();
   const std::optional<std::string> temporaryPath = fileSystem.makeTemporaryFile();
   if (temporaryPath && writeThroughTemporaryFile(bytes, *temporaryPath, path)) {

@@ -92,6 +92,23 @@ void writeBinaryAfterReading(benchmark::State& state) {
 }
 BENCHMARK(writeBinaryAfterReading)->Unit(benchmark::kMillisecond);
 
+// As a save takes the bytes: they never stand in memory whole.
+void writeBinaryInPieces(benchmark::State& state) {
+  PropertyListError error;
+  const PropertyValue value = readBinaryPropertyList(binaryFile(), error).value();
+  for (auto _ : state) {
+    BinaryPropertyListWriter writer;
+    const BytesInPieces bytes = writer.write(value, error).value();
+    const bool areTaken = bytes.giveTo([](std::string_view piece) {
+      benchmark::DoNotOptimize(piece.data());
+      return true;
+    });
+    benchmark::DoNotOptimize(areTaken);
+  }
+  countBytes(state, binaryFile().size());
+}
+BENCHMARK(writeBinaryInPieces)->Unit(benchmark::kMillisecond);
+
 // Every text has memory of its own, keys too.
 void writeBinaryBuiltInMemory(benchmark::State& state) {
   writeValue(state, corpus());

@@ -154,7 +154,7 @@ void AccountsDataMigrator::_saveCollatedMigrationInformation() {
   // Kept on purpose: ".txt" for a binary property list; the name is what collectors look for.
   const std::string name = "AccountMigrationInformation-" +
                            platform.dateFormatter.currentDate(informationDatePattern) + ".txt";
-  std::string_view bytes;
+  BytesInPieces bytes;
   if (platform.propertyLists.serializeBinary(*_collatedMigrationData, bytes)) {
     // The file is a help for engineers: a migration never fails for want of it, nor reports it.
     static_cast<void>(

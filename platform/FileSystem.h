@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "platform/Result.h"
+#include "propertylist/BytesInPieces.h"
 
 namespace accounts {
 
@@ -71,10 +72,10 @@ class FileSystem {
   virtual void removeAbandonedTemporaryFiles(
       const std::vector<std::string>& furtherDirectories) = 0;
   /// Writes contents to a path in place: after a failure the file may hold a part of them.
-  virtual Result writeFile(std::string_view path, std::string_view contents) = 0;
+  virtual Result writeFile(std::string_view path, const BytesInPieces& contents) = 0;
   /// Writes contents to a path so that a reader sees the old file or the whole new one, never a
   /// part.
-  virtual Result writeFileAtomically(std::string_view path, std::string_view contents) = 0;
+  virtual Result writeFileAtomically(std::string_view path, const BytesInPieces& contents) = 0;
   /// Gives a file to the user and the group with these account names.
   virtual Result setOwnerAndGroup(std::string_view path, std::string_view ownerName,
                                   std::string_view groupName) = 0;

@@ -46,10 +46,10 @@ class ForwardingFileSystem : public FileSystem {
   void removeAbandonedTemporaryFiles(const std::vector<std::string>& furtherDirectories) override {
     files_.removeAbandonedTemporaryFiles(furtherDirectories);
   }
-  Result writeFile(std::string_view path, std::string_view contents) override {
+  Result writeFile(std::string_view path, const BytesInPieces& contents) override {
     return files_.writeFile(path, contents);
   }
-  Result writeFileAtomically(std::string_view path, std::string_view contents) override {
+  Result writeFileAtomically(std::string_view path, const BytesInPieces& contents) override {
     return files_.writeFileAtomically(path, contents);
   }
   Result setOwnerAndGroup(std::string_view path, std::string_view ownerName,

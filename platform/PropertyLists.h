@@ -4,6 +4,7 @@
 #include <string_view>
 
 #include "platform/Result.h"
+#include "propertylist/BytesInPieces.h"
 #include "propertylist/PropertyValue.h"
 
 namespace accounts {
@@ -18,10 +19,10 @@ class PropertyLists {
   /// dictionary.
   virtual std::optional<PropertyDictionary> readDictionary(std::string_view path) = 0;
 
-  /// Writes a value in the binary format and gives the bytes, which are valid until the next call
-  /// of an operation. Fails, leaving `bytes` empty, for a value that no reader would take back (one
+  /// Gives the bytes of a value in the binary format, which are valid until the next call of an
+  /// operation. Fails, leaving `bytes` empty, for a value that no reader would take back (one
   /// nested too deeply).
-  virtual Result serializeBinary(const PropertyValue& value, std::string_view& bytes) = 0;
+  virtual Result serializeBinary(const PropertyValue& value, BytesInPieces& bytes) = 0;
 };
 
 }  // namespace accounts

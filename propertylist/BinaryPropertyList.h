@@ -5,6 +5,7 @@
 #include <string>
 #include <string_view>
 
+#include "propertylist/BytesInPieces.h"
 #include "propertylist/PropertyListError.h"
 #include "propertylist/PropertyValue.h"
 
@@ -27,12 +28,14 @@ std::optional<std::string> writeBinaryPropertyList(const PropertyValue& value,
 
 namespace binaryplist {
 class Catalogue;
-}
+class File;
+}  // namespace binaryplist
 
 /// Writes values that have most of their parts in common, such as the stages of one file: it
 /// remembers what it has met, so that a part in the same memory as before costs little more than
-/// the copying of its bytes. The bytes are those of `writeBinaryPropertyList`. It keeps the value
-/// that it wrote last alive, and the texts and data of earlier ones.
+/// the copying of its bytes, and a value that is equal to the last one nothing. The bytes are those
+/// of `writeBinaryPropertyList`. It keeps the value that it wrote last alive, and the texts and
+/// data of earlier ones.
 class BinaryPropertyListWriter {
  public:
   BinaryPropertyListWriter();
@@ -40,15 +43,16 @@ class BinaryPropertyListWriter {
   BinaryPropertyListWriter& operator=(const BinaryPropertyListWriter&) = delete;
   ~BinaryPropertyListWriter();
 
-  /// See `writeBinaryPropertyList`. `memory` is a text of which only the room is used, for the
-  /// result: that of bytes no longer needed spares the system the finding of new memory.
-  std::optional<std::string> write(const PropertyValue& value, PropertyListError& error,
-                                   std::string memory = {});
+  /// The bytes of a value, made whenever they are asked for and valid until the next call. None,
+  /// with `error` saying why, for a value that the reader would not take back.
+  std::optional<BytesInPieces> write(const PropertyValue& value, PropertyListError& error);
 
  private:
   /// Null when nothing is remembered.
   std::unique_ptr<binaryplist::Catalogue> catalogue_;
   std::optional<PropertyValue> lastValue_;
+  /// That of the last value; null when it could not be written.
+  std::unique_ptr<binaryplist::File> file_;
 };
 
 }  // namespace accounts

@@ -6,6 +6,7 @@
 
 #include <array>
 #include <cerrno>
+#include <utility>
 
 namespace accounts {
 namespace {
@@ -51,6 +52,23 @@ bool readBlocks(const FileDescriptor& file, std::string_view path, PathError& er
   }
 }
 
+// Writes one piece as writeAll writes all.
+int writePiece(int descriptor, std::string_view bytes) {
+  while (!bytes.empty()) {
+    const ssize_t count = ::write(descriptor, bytes.data(), bytes.size());
+    if (count >= 0) {
+      bytes.remove_prefix(static_cast<std::size_t>(count));
+    } else if (errno == EAGAIN) {
+      // Standard error may be a pipe that another program made non-blocking.
+      pollfd writable = {descriptor, POLLOUT, 0};
+      ::poll(&writable, 1, -1);
+    } else if (errno != EINTR) {
+      return errno;
+    }
+  }
+  return 0;
+}
+
 }  // namespace
 
 std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_view path,
@@ -65,34 +83,21 @@ std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_vi
 
 std::optional<std::string> readContents(const FileDescriptor& file, std::string_view path,
                                         PathError& error) {
-  std::optional<ComparedContents> contents = readAndCompare(file, {}, path, error);
-  return contents ? std::optional(std::move(contents->bytes)) : std::nullopt;
-}
-
-std::optional<ComparedContents> readAndCompare(const FileDescriptor& file, std::string_view known,
-                                               std::string_view path, PathError& error) {
-  ComparedContents contents{.areKnown = true, .bytes = {}};
-  std::size_t equalSize = 0;
-  const bool read = readBlocks(file, path, error, [&](std::string_view block, std::size_t size) {
-    if (contents.areKnown && known.substr(equalSize).starts_with(block)) {
-      equalSize += block.size();
-      return true;
+  std::string bytes;
+  const bool isRead = readBlocks(file, path, error, [&](std::string_view block, std::size_t size) {
+    if (bytes.empty()) {
+      bytes.reserve(size);
     }
-    if (contents.areKnown) {
-      contents.areKnown = false;
-      contents.bytes.reserve(size);
-      contents.bytes = known.substr(0, equalSize);
-    }
-    contents.bytes.append(block);
+    bytes.append(block);
     return true;
   });
-  if (!read) {
-    return std::nullopt;
-  }
-  if (contents.areKnown && equalSize < known.size()) {
-    return ComparedContents{.areKnown = false, .bytes = std::string(known.substr(0, equalSize))};
-  }
-  return contents;
+  return isRead ? std::optional(std::move(bytes)) : std::nullopt;
+}
+
+bool readInPieces(const FileDescriptor& file, std::string_view path, PathError& error,
+                  const BytesInPieces::Taker& take) {
+  return readBlocks(file, path, error,
+                    [&](std::string_view block, std::size_t) { return take(block); });
 }
 
 std::optional<std::string> readHostFile(const std::string& path, PathError& error) {
@@ -113,20 +118,13 @@ std::optional<std::string> readHostFile(const std::string& path, PathError& erro
   return readContents(file, path, error);
 }
 
-int writeAll(int descriptor, std::string_view bytes) {
-  while (!bytes.empty()) {
-    const ssize_t count = ::write(descriptor, bytes.data(), bytes.size());
-    if (count >= 0) {
-      bytes.remove_prefix(static_cast<std::size_t>(count));
-    } else if (errno == EAGAIN) {
-      // Standard error may be a pipe that another program made non-blocking.
-      pollfd writable = {descriptor, POLLOUT, 0};
-      ::poll(&writable, 1, -1);
-    } else if (errno != EINTR) {
-      return errno;
-    }
-  }
-  return 0;
+int writeAll(int descriptor, const BytesInPieces& bytes) {
+  int number = 0;
+  static_cast<void>(bytes.giveTo([&](std::string_view piece) {
+    number = writePiece(descriptor, piece);
+    return number == 0;
+  }));
+  return number;
 }
 
 bool copyContents(const FileDescriptor& source, std::string_view sourcePath,

@@ -7,6 +7,7 @@
 
 #include "platform/linux/FileDescriptor.h"
 #include "platform/linux/PathError.h"
+#include "propertylist/BytesInPieces.h"
 
 namespace accounts {
 
@@ -23,18 +24,10 @@ std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_vi
 std::optional<std::string> readContents(const FileDescriptor& file, std::string_view path,
                                         PathError& error);
 
-/// What a file holds, compared with bytes that the reader knows.
-struct ComparedContents {
-  /// Whether the file holds exactly the known bytes.
-  bool areKnown = false;
-  /// What the file holds otherwise.
-  std::string bytes;
-};
-
-/// Like `readContents`, for a file that probably holds bytes that are in memory already: it needs
-/// no second copy of them then.
-std::optional<ComparedContents> readAndCompare(const FileDescriptor& file, std::string_view known,
-                                               std::string_view path, PathError& error);
+/// The same bytes piece by piece: passes them to `take` until it returns false. Returns whether all
+/// were read and taken.
+bool readInPieces(const FileDescriptor& file, std::string_view path, PathError& error,
+                  const BytesInPieces::Taker& take);
 
 /// The bytes of a regular file of the host, outside any device root. None, with `error` set, when
 /// it is missing, unreadable, too large or no regular file; opening never waits.
@@ -42,7 +35,7 @@ std::optional<std::string> readHostFile(const std::string& path, PathError& erro
 
 /// Writes all bytes to an open file, waiting for it where it must, and returns 0 or the error
 /// number. A part may have been written after a failure.
-int writeAll(int descriptor, std::string_view bytes);
+int writeAll(int descriptor, const BytesInPieces& bytes);
 
 /// Copies the bytes of one open regular file to another; at most kLargestFileSize. Returns whether
 /// it did; `error` says why not.

@@ -105,7 +105,7 @@ Result LinuxFileSystem::createDirectoryWithIntermediates(std::string_view path,
                                                                                : asResult(error);
 }
 
-Result LinuxFileSystem::writeFile(std::string_view path, std::string_view contents) {
+Result LinuxFileSystem::writeFile(std::string_view path, const BytesInPieces& contents) {
   PathError error;
   const auto entry = entryOf(path, error);
   if (!entry) {
@@ -124,7 +124,7 @@ Result LinuxFileSystem::writeFile(std::string_view path, std::string_view conten
   return asResult("write", path, writeAll(file->number(), contents));
 }
 
-Result LinuxFileSystem::writeFileAtomically(std::string_view path, std::string_view contents) {
+Result LinuxFileSystem::writeFileAtomically(std::string_view path, const BytesInPieces& contents) {
   PathError error;
   const auto destination = root_.locate(path, error);
   // In the target's own directory, so that both are on one file system.

@@ -15,47 +15,63 @@ std::optional<PropertyDictionary> LinuxPropertyLists::readDictionary(std::string
 std::optional<PropertyDictionary> LinuxPropertyLists::readDictionary(std::string_view path,
                                                                      PathError& error) {
   const std::optional<FileDescriptor> file = root_.openRegularFile(path, error);
-  if (!file) {
+  const auto status = file ? fileStatus(*file, path, error) : std::nullopt;
+  if (!status) {
     return std::nullopt;
   }
-  const std::string_view known = rememberedValue_ ? rememberedBytes_ : std::string_view();
-  std::optional<ComparedContents> contents = readAndCompare(*file, known, path, error);
-  if (!contents) {
+  if (!remembered_ || static_cast<std::size_t>(status->st_size) != remembered_->size) {
+    return decode(readContents(*file, path, error), path, error);
+  }
+  BytesDigest digest(*secret_);
+  const bool isRead = readInPieces(*file, path, error, [&digest](std::string_view piece) {
+    digest.add(piece);
+    return true;
+  });
+  if (!isRead) {
     return std::nullopt;
   }
-  if (contents->areKnown && rememberedValue_) {
-    return rememberedValue_;
-  }
-  std::optional<PropertyDictionary> dictionary = dictionaryFromBytes(contents->bytes, path, error);
+  return digest.value() == remembered_->digest ? std::optional(remembered_->value)
+                                               : decode(root_.readFile(path, error), path, error);
+}
+
+std::optional<PropertyDictionary> LinuxPropertyLists::decode(
+    const std::optional<std::string>& bytes, std::string_view path, PathError& error) {
+  std::optional<PropertyDictionary> dictionary =
+      bytes ? dictionaryFromBytes(*bytes, path, error) : std::nullopt;
   // A smaller file is not worth forgetting a larger one for.
-  if (dictionary && contents->bytes.size() >= known.size()) {
-    rememberedBytes_ = std::move(contents->bytes);
-    rememberedValue_ = dictionary;
-    areBytesOurs_ = false;
+  if (dictionary && secret_ && (!remembered_ || bytes->size() >= remembered_->size)) {
+    BytesDigest digest(*secret_);
+    digest.add(*bytes);
+    remembered_ = {.value = *dictionary, .size = bytes->size(), .digest = digest.value()};
   }
   return dictionary;
 }
 
-Result LinuxPropertyLists::serializeBinary(const PropertyValue& value, std::string_view& bytes) {
-  const PropertyDictionary* dictionary = value.asDictionary();
-  if (areBytesOurs_ && rememberedValue_ && dictionary != nullptr &&
-      *dictionary == *rememberedValue_) {
-    bytes = rememberedBytes_;
-    return Result::success();
-  }
+Result LinuxPropertyLists::serializeBinary(const PropertyValue& value, BytesInPieces& bytes) {
+  bytes = BytesInPieces();
   PropertyListError error;
-  std::optional<std::string> written = writer_.write(value, error, std::move(rememberedBytes_));
-  rememberedBytes_ = std::move(written).value_or(std::string());
-  rememberedValue_ = std::nullopt;
-  bytes = rememberedBytes_;
+  std::optional<BytesInPieces> written = writer_.write(value, error);
   if (!written) {
     return Result::failure(std::move(error.text));
   }
-  if (dictionary != nullptr) {
-    rememberedValue_ = *dictionary;
-    areBytesOurs_ = true;
-  }
+  const PropertyDictionary* dictionary = value.asDictionary();
+  bytes = dictionary != nullptr && secret_ ? remembering(*dictionary, *written) : *written;
   return Result::success();
+}
+
+BytesInPieces LinuxPropertyLists::remembering(const PropertyDictionary& value,
+                                              const BytesInPieces& bytes) {
+  return {bytes.size(), [this, value, bytes](const BytesInPieces::Taker& take) {
+            BytesDigest digest(*secret_);
+            const bool isTaken = bytes.giveTo([&](std::string_view piece) {
+              digest.add(piece);
+              return take(piece);
+            });
+            if (isTaken) {
+              remembered_ = {.value = value, .size = bytes.size(), .digest = digest.value()};
+            }
+            return isTaken;
+          }};
 }
 
 }  // namespace accounts

@@ -19,7 +19,7 @@ std::optional<PropertyDictionary> OverlayPropertyLists::readDictionary(std::stri
   return dictionary != nullptr ? std::optional(*dictionary) : std::nullopt;
 }
 
-Result OverlayPropertyLists::serializeBinary(const PropertyValue& value, std::string_view& bytes) {
+Result OverlayPropertyLists::serializeBinary(const PropertyValue& value, BytesInPieces& bytes) {
   return beneath_.serializeBinary(value, bytes);
 }
 

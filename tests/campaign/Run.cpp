@@ -53,12 +53,12 @@ class ObservedPropertyLists : public PropertyLists {
   std::optional<PropertyDictionary> readDictionary(std::string_view path) override {
     return real_.readDictionary(path);
   }
-  Result serializeBinary(const PropertyValue& value, std::string_view& bytes) override {
+  Result serializeBinary(const PropertyValue& value, BytesInPieces& bytes) override {
     Result result = real_.serializeBinary(value, bytes);
     const AllocationsSucceed whileObserving;
     const PropertyDictionary* root = value.asDictionary();
     if (result && root != nullptr && root->contains(kPlistAccountsKey)) {
-      settingsWritten.emplace_back(bytes);
+      settingsWritten.push_back(bytes.whole());
     }
     return result;
   }

@@ -91,7 +91,7 @@ std::optional<PropertyDictionary> FakePropertyLists::readDictionary(std::string_
   return bytes ? dictionaryOf(*bytes) : std::nullopt;
 }
 
-Result FakePropertyLists::serializeBinary(const PropertyValue& value, std::string_view& bytes) {
+Result FakePropertyLists::serializeBinary(const PropertyValue& value, BytesInPieces& bytes) {
   bytes = {};
   if (serializationError) {
     return Result::failure(*serializationError);

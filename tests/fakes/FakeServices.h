@@ -210,7 +210,7 @@ class FakePropertyLists : public PropertyLists {
   bool givesNoBytes = false;
 
   std::optional<PropertyDictionary> readDictionary(std::string_view path) override;
-  Result serializeBinary(const PropertyValue& value, std::string_view& bytes) override;
+  Result serializeBinary(const PropertyValue& value, BytesInPieces& bytes) override;
 
  private:
   FakeFileSystem& fileSystem_;

@@ -54,6 +54,27 @@ TEST_F(FileSystemWritingTest, WritingInPlaceKeepsTheFileAndReplacesItsContents) 
   EXPECT_EQ(statusOf("/file").st_ino, before);
 }
 
+TEST_F(FileSystemWritingTest, ContentsInPiecesAreWrittenOneBehindTheOther) {
+  const BytesInPieces contents(10, [](const BytesInPieces::Taker& take) {
+    return take("first") && take("") && take("later");
+  });
+  ASSERT_TRUE(files.writeFile("/in-place", contents));
+  EXPECT_EQ(contentsOf("/in-place"), "firstlater");
+  ASSERT_TRUE(files.writeFileAtomically("/atomically", contents));
+  EXPECT_EQ(contentsOf("/atomically"), "firstlater");
+}
+
+TEST_F(FileSystemWritingTest, NoPieceIsAskedForAfterOneThatCannotBeWritten) {
+  makeFile("/file", "old");
+  bool isAskedForMore = false;
+  const BytesInPieces contents(20, [&](const BytesInPieces::Taker& take) {
+    return take("longer than that") && (isAskedForMore = true) && take("more");
+  });
+  const WithLargestWrittenFile full(4);
+  EXPECT_FALSE(files.writeFile("/file", contents));
+  EXPECT_FALSE(isAskedForMore);
+}
+
 TEST_F(FileSystemWritingTest, WritingInPlaceMakesAMissingFile) {
   ASSERT_TRUE(files.writeFile("/file", "new"));
   EXPECT_EQ(contentsOf("/file"), "new");

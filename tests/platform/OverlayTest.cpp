@@ -156,7 +156,7 @@ TEST_F(Overlay, FilesThatAreTheSameBeneathAreTheSame) {
 TEST_F(Overlay, PropertyListsAreReadAsTheyAreInMemory) {
   OverlayPropertyLists propertyLists(files, device.propertyLists);
   const PropertyDictionary written = {{"key", "value"}};
-  std::string_view bytes;
+  BytesInPieces bytes;
   ASSERT_TRUE(propertyLists.serializeBinary(written, bytes));
   ASSERT_TRUE(files.writeFile("/var/b", bytes));
 

@@ -16,9 +16,9 @@ using testing::writeBinary;
 class BinaryWriterMemory : public ::testing::Test {
  protected:
   std::string write(const PropertyValue& value) {
-    std::optional<std::string> bytes = writer_.write(value, error);
+    const std::optional<BytesInPieces> bytes = writer_.write(value, error);
     EXPECT_TRUE(bytes) << error.text;
-    return bytes.value_or("");
+    return bytes ? bytes->whole() : "";
   }
 
   PropertyListError error;
@@ -38,6 +38,12 @@ TEST_F(BinaryWriterMemory, TheSameValueGivesTheSameBytesAgain) {
 
   EXPECT_EQ(write(value), first);
   EXPECT_EQ(first, writeBinary(value));
+}
+
+TEST_F(BinaryWriterMemory, AnEqualValueInOtherMemoryGivesTheSameBytes) {
+  const std::string first = write(PropertyArray{account("A"), account("B")});
+
+  EXPECT_EQ(write(PropertyArray{account("A"), account("B")}), first);
 }
 
 TEST_F(BinaryWriterMemory, AValueThatSharesPartsGivesTheBytesThatItGivesAlone) {
@@ -94,7 +100,9 @@ TEST_F(BinaryWriterMemory, ARefusedValueLeavesTheWriterUsable) {
   EXPECT_FALSE(writer.write(testing::nestedArrays(kMaximumNestingDepth + 1), error));
 
   EXPECT_NE(error.text.find("nested deeper"), std::string::npos) << error.text;
-  EXPECT_EQ(writer.write(good, error), writeBinary(good));
+  const std::optional<BytesInPieces> bytes = writer.write(good, error);
+  ASSERT_TRUE(bytes);
+  EXPECT_EQ(bytes->whole(), writeBinary(good));
 }
 
 TEST_F(BinaryWriterMemory, AContainerKnownFromALowerPlaceMayBeTooHighForAnother) {
