@@ -21,8 +21,9 @@ class DigestSecret {
   std::array<char, 192> bytes_;
 };
 
-/// What bytes are known again by where they are not kept: 128 bits. Whoever knows neither them nor
-/// the secret finds no other bytes that have the same, and chance finds them once in 2^128 times.
+/// What bytes are known again by where they are not kept: 128 bits. Nobody without the secret can
+/// tell which other bytes have the same; those that somebody else writes by chance have them once
+/// in 2^128 times.
 class BytesDigest {
  public:
   struct Value {
