@@ -1,4 +1,6 @@
+#include <fstream>
 #include <iostream>
+#include <iterator>
 
 #include "tests/packaging/InstalledPackages.h"
 
@@ -27,6 +29,16 @@ TEST_F(InstalledPackages, HoldWhatAnInstallationHolds) {
   std::set<std::string> packaged = tree(machine());
   EXPECT_EQ(packaged, tree(installation));
   EXPECT_TRUE(packaged.contains("usr/bin/migration-host"));
+}
+
+TEST_F(InstalledPackages, HoldTheNoticesOfTheLibrariesThatAreCompiledIn) {
+  install();
+  for (const char* library :
+       {"libcli11-dev", "libfmt-dev", "libxxhash-dev", "nlohmann-json3-dev"}) {
+    std::ifstream notice(prefix() / "share/doc/accounts-migration/licences" / library);
+    const std::string text(std::istreambuf_iterator<char>(notice), {});
+    EXPECT_NE(text.find("Copyright: "), std::string::npos) << library;
+  }
 }
 
 TEST_F(InstalledPackages, PassTheEndToEndTestsOfTheBuild) {
