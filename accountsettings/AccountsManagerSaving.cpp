@@ -27,7 +27,7 @@ PropertyArray accountsOnDisk() {
 
 /// The bytes of the account settings file, valid until the platform's property lists are used
 /// again; none, with a channel line, when they cannot be made.
-std::optional<BytesInPieces> serialize(const PropertyDictionary& root) {
+BytesInPieces serialize(const PropertyDictionary& root) {
   BytesInPieces bytes;
   const Result serialization =
       Process::current().platform.propertyLists.serializeBinary(root, bytes);
@@ -35,16 +35,16 @@ std::optional<BytesInPieces> serialize(const PropertyDictionary& root) {
     logToChannel(saveOperation, "Failed to serialize account settings data: %@", [&] {
       return logArguments(serialization ? std::optional<Text>() : Text(serialization.error()));
     });
-    return std::nullopt;
+    return BytesInPieces();
   }
   return bytes;
 }
 
 /// Fills the temporary file and moves it over the account settings file. False when a step fails.
-bool writeThroughTemporaryFile(const std::optional<BytesInPieces>& bytes,
-                               const std::string& temporaryPath, const std::string& path) {
+bool writeThroughTemporaryFile(const BytesInPieces& bytes, const std::string& temporaryPath,
+                               const std::string& path) {
   FileSystem& fileSystem = Process::current().platform.fileSystem;
-  if (!bytes || !fileSystem.writeFile(temporaryPath, *bytes)) {
+  if (bytes.size() == 0 || !fileSystem.writeFile(temporaryPath, bytes)) {
     return false;
   }
   const Result attributes = fileSystem.setOwnerAndGroup(temporaryPath, fileOwner, fileOwner);
@@ -61,7 +61,7 @@ bool writeThroughTemporaryFile(const std::optional<BytesInPieces>& bytes,
 /// that fails.
 bool writeSettingsFile(const PropertyDictionary& root) {
   FileSystem& fileSystem = Process::current().platform.fileSystem;
-  const std::optional<BytesInPieces> bytes = serialize(root);
+  const BytesInPieces bytes = serialize(root);
   const std::string path = AccountsManager::fullPathToAccountSettingsPlist();
   const std::optional<std::string> temporaryPath = fileSystem.makeTemporaryFile();
   if (temporaryPath && writeThroughTemporaryFile(bytes, *temporaryPath, path)) {

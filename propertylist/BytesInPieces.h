@@ -13,9 +13,9 @@ namespace accounts {
 /// stand in memory whole. Like std::string_view this owns no bytes.
 class BytesInPieces {
  public:
-  /// Takes the next piece and says whether to go on.
+  /// Takes the next piece; false if it wants no more.
   using Taker = std::function<bool(std::string_view)>;
-  /// Gives all pieces in order, until one is not gone on after. Returns whether that was none.
+  /// Gives the pieces to a taker, in order, until it wants no more. Returns whether it took all.
   using Giver = std::function<bool(const Taker&)>;
 
   /// None.
@@ -31,7 +31,7 @@ class BytesInPieces {
 
   /// How many there are.
   [[nodiscard]] std::size_t size() const { return size_; }
-  /// See Giver.
+  /// Gives all of them to a taker, as a giver does.
   [[nodiscard]] bool giveTo(const Taker& take) const { return giver_ == nullptr || giver_(take); }
   /// All of them together.
   [[nodiscard]] std::string whole() const {

@@ -25,7 +25,7 @@ std::optional<std::string> readContents(const FileDescriptor& file, std::string_
                                         PathError& error);
 
 /// The same bytes piece by piece: passes them to `take` until it returns false. Returns whether all
-/// were read and taken.
+/// were read and taken; `error` is set when it was the reading that failed.
 bool readInPieces(const FileDescriptor& file, std::string_view path, PathError& error,
                   const BytesInPieces::Taker& take);
 

@@ -30,8 +30,11 @@ std::optional<PropertyDictionary> LinuxPropertyLists::readDictionary(std::string
   if (!isRead) {
     return std::nullopt;
   }
-  return digest.value() == remembered_->digest ? std::optional(remembered_->value)
-                                               : decode(root_.readFile(path, error), path, error);
+  if (digest.value() == remembered_->digest) {
+    return remembered_->value;
+  }
+  // From its beginning again: what was read was not kept.
+  return decode(root_.readFile(path, error), path, error);
 }
 
 std::optional<PropertyDictionary> LinuxPropertyLists::decode(

@@ -107,6 +107,15 @@ inline std::string writeBinary(const PropertyValue& value) {
   return bytes.value_or("");
 }
 
+inline std::vector<std::string> piecesOf(const BytesInPieces& bytes) {
+  std::vector<std::string> pieces;
+  EXPECT_TRUE(bytes.giveTo([&pieces](std::string_view piece) {
+    pieces.emplace_back(piece);
+    return true;
+  }));
+  return pieces;
+}
+
 /// A number in a binary file's trailer.
 inline std::uint64_t trailerNumber(std::string_view file, std::size_t position, std::size_t size) {
   std::uint64_t number = 0;
