@@ -20,33 +20,29 @@ bool calDAVMatches(const CalDAVEndpoint& endpoint, const ExpectedCalDAV& expecte
 }
 
 CalDAVIndex::CalDAVIndex(std::vector<CalDAVEndpoint> endpoints) : endpoints_(std::move(endpoints)) {
-  for (const CalDAVEndpoint& endpoint : endpoints_) {
-    if (const std::optional<Key> key = keyOf(endpoint)) {
-      timesMatched_.try_emplace(*key, 0);
+  for (std::size_t position = 0; position < endpoints_.size(); ++position) {
+    if (const std::optional<Key> key = keyOf(endpoints_[position])) {
+      positions_[*key].push_back(position);
     }
   }
 }
 
-bool CalDAVIndex::countMatches(const ExpectedCalDAV& expected) {
+std::vector<std::size_t> CalDAVIndex::matches(const ExpectedCalDAV& expected) const {
+  std::vector<std::size_t> found;
   if (!expected.host) {
-    return false;
+    return found;
   }
-  bool found = false;
   for (const std::string& login : expected.logins) {
     for (const std::string& path : expected.principalPaths) {
-      const auto place = timesMatched_.find(Key{*expected.host, login, path});
-      if (place != timesMatched_.end()) {
-        ++place->second;
-        found = true;
+      const auto place = positions_.find(Key{*expected.host, login, path});
+      if (place != positions_.end()) {
+        const auto foundBefore = static_cast<std::ptrdiff_t>(found.size());
+        found.insert(found.end(), place->second.begin(), place->second.end());
+        std::inplace_merge(found.begin(), found.begin() + foundBefore, found.end());
       }
     }
   }
   return found;
-}
-
-std::size_t CalDAVIndex::timesMatched(std::size_t position) const {
-  const std::optional<Key> key = keyOf(endpoints_.at(position));
-  return key ? timesMatched_.at(*key) : 0;
 }
 
 std::optional<CalDAVIndex::Key> CalDAVIndex::keyOf(const CalDAVEndpoint& endpoint) {

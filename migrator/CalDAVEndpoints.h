@@ -37,12 +37,9 @@ class CalDAVIndex {
  public:
   explicit CalDAVIndex(std::vector<CalDAVEndpoint> endpoints);
 
-  /// Matches an expectation against all endpoints and counts the match for each that it matches.
-  /// True when there is one.
-  bool countMatches(const ExpectedCalDAV& expected);
-  /// How many of the expectations so far matched the endpoint at a position of the list that the
-  /// index was made from.
-  [[nodiscard]] std::size_t timesMatched(std::size_t position) const;
+  /// The endpoints that an expectation matches, each once: their positions, ascending, in the list
+  /// that the index was made from. Linear in their number.
+  [[nodiscard]] std::vector<std::size_t> matches(const ExpectedCalDAV& expected) const;
 
  private:
   /// Server, login and path, as views of the endpoints' texts.
@@ -50,8 +47,8 @@ class CalDAVIndex {
   static std::optional<Key> keyOf(const CalDAVEndpoint& endpoint);
 
   std::vector<CalDAVEndpoint> endpoints_;
-  /// For each place that an endpoint names, how many expectations matched it.
-  std::map<Key, std::size_t> timesMatched_;
+  /// For each place that an endpoint names, the endpoints that name it, ascending.
+  std::map<Key, std::vector<std::size_t>> positions_;
 };
 
 }  // namespace accounts

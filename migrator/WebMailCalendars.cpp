@@ -1,4 +1,5 @@
 #include <array>
+#include <utility>
 
 #include "migrator/AccountsDataMigrator.h"
 #include "migrator/CalDAVMatching.h"
@@ -25,23 +26,34 @@ const std::array<UmbrellaService, 2> umbrellaServices = {{
     {yahooAccountClass, kYahooAccountType},
 }};
 
-/// The stand-alone CalDAV accounts of a store, in order, and how many umbrella accounts took each
-/// one in.
+/// The stand-alone CalDAV accounts of a store, in order, and those of them that umbrella accounts
+/// took in.
 class CalDAVAccounts {
  public:
   explicit CalDAVAccounts(const AccountsManager::Accounts& all)
       : accounts_(amongAll(all)), index_(endpointsOf(accounts_)) {}
 
-  /// Counts a match for each account that is the calendar half of an umbrella account. True when
+  /// Notes the accounts that are the calendar half of an umbrella account, as it is now. True when
   /// there is one.
-  bool countMatches(const BasicAccount& umbrellaAccount) {
-    return index_.countMatches(expectedCalDAVOf(umbrellaAccount));
+  bool noteMatches(const BasicAccount& umbrellaAccount) {
+    ExpectedCalDAV expected = expectedCalDAVOf(umbrellaAccount);
+    if (index_.matches(expected).empty()) {
+      return false;
+    }
+    matchedExpectations_.push_back(std::move(expected));
+    return true;
   }
 
-  /// Deletes from the store each account once for each umbrella account that matched it.
+  // Kept on purpose: a repeated deletion counts. Each removes one more account where several share
+  // an identifier, and each writes its line.
+  /// Deletes from the store the accounts that each umbrella account matched, umbrella account by
+  /// umbrella account: each account as often as it was matched.
   void deleteMatchedAccounts(AccountsManager& store) const {
-    for (std::size_t position = 0; position < accounts_.size(); ++position) {
-      deleteRepeatedly(store, accounts_[position], index_.timesMatched(position));
+    for (const ExpectedCalDAV& expected : matchedExpectations_) {
+      // Looked up again: a list of all matches would be as long as there are pairs.
+      for (const std::size_t position : index_.matches(expected)) {
+        store.deleteAccount(accounts_[position]);
+      }
     }
   }
 
@@ -65,24 +77,9 @@ class CalDAVAccounts {
     return endpoints;
   }
 
-  // A repeated deletion counts: each removes one more account where several share an identifier.
-  // Once a deletion finds nothing, neither do the later ones, so they are left out; otherwise a
-  // file in which all umbrella accounts match all CalDAV accounts would cost a deletion for every
-  // pair. Deletions of different identifiers do not affect each other, so going through the
-  // accounts in order instead of through the pairs changes nothing but the order of log lines.
-  static void deleteRepeatedly(AccountsManager& store, const BasicAccountReference& account,
-                               std::size_t times) {
-    for (std::size_t deletion = 0; deletion < times; ++deletion) {
-      const std::uint64_t countBefore = store.count();
-      store.deleteAccount(account);
-      if (store.count() == countBefore) {
-        return;
-      }
-    }
-  }
-
   AccountsManager::Accounts accounts_;
   CalDAVIndex index_;
+  std::vector<ExpectedCalDAV> matchedExpectations_;
 };
 
 void enableMailAndNotes(BasicAccount& account) {
@@ -109,7 +106,7 @@ bool AccountsDataMigrator::_migrateAccountsFrom7A242(AccountsManager& store) {
       // because the type decides whether they can be.
       account->_forcedSetAccountProperty_forKey(service.type, kAccountType);
       // Kept on purpose: an inactive account takes its calendars in as well.
-      if (calDAVAccounts.countMatches(*account)) {
+      if (calDAVAccounts.noteMatches(*account)) {
         account->setEnabled_forDataclass(true, kAccountDataclassCalendars);
       }
     }
