@@ -206,8 +206,11 @@ class AccountsManager {
   struct Replacement;
   void _keepOrReplaceAccounts(const Types& types, const Accounts& accounts,
                               Replacement& replacement);
-  void _loadChildrenOfPlacedAccounts(const Replacement& replacement);
   void _addRemainingAccounts(const Accounts& accounts, Replacement& replacement);
+  /// Takes a child out of the account among `parents` that holds it now, if any, and adds it to the
+  /// one with its parent's identifier, if any.
+  void _moveChild(const BasicAccountReference& child,
+                  const IdentifierIndex<BasicAccountReference>& parents);
 
   // Saving
   /// Runs the fixers on all top-level accounts; the gravest result.

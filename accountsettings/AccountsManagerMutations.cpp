@@ -3,7 +3,6 @@
 #include <utility>
 
 #include "accountsettings/AccountsManager.h"
-#include "accountsettings/ChildPlacement.h"
 #include "accountsettings/Log.h"
 
 // A caller may well pass a reference out of the store's own list. So whatever an operation still
@@ -15,6 +14,16 @@ namespace {
 
 std::optional<PropertyDictionary> propertiesToLog(const BasicAccountReference& account) {
   return account ? std::optional(account->properties()) : std::nullopt;
+}
+
+/// The identifier of the account that an element of a "ChildAccounts" array makes; none when it
+/// makes no account. An element without an identifier of its own makes an account with a fresh one
+/// each time.
+std::optional<Text> identifierOfChildElement(const PropertyValue& element) {
+  const PropertyDictionary* properties = element.asDictionary();
+  const BasicAccountReference child =
+      properties != nullptr ? BasicAccount::initWithProperties(*properties) : nullptr;
+  return child ? child->identifier() : std::nullopt;
 }
 
 }  // namespace

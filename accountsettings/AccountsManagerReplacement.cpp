@@ -3,7 +3,6 @@
 #include <utility>
 
 #include "accountsettings/AccountsManager.h"
-#include "accountsettings/ChildPlacement.h"
 #include "accountsettings/Log.h"
 
 namespace accounts {
@@ -48,6 +47,8 @@ void AccountsManager::_keepOrReplaceAccounts(const Types& types, const Accounts&
     if (newAccount != nullptr) {
       kept.push_back(*newAccount);
       replacement.placed.insert(newAccount->get());
+      // Again in each place that the account takes: the lines about its children say so.
+      _loadChildrenFromAccount(*newAccount);
     } else if (!type || std::find(types.begin(), types.end(), type->view()) == types.end()) {
       kept.push_back(account);
     } else {
@@ -63,46 +64,41 @@ void AccountsManager::_keepOrReplaceAccounts(const Types& types, const Accounts&
       found = found != nullptr ? found : account;
     }
   }
-  _loadChildrenOfPlacedAccounts(replacement);
-}
-
-void AccountsManager::_loadChildrenOfPlacedAccounts(const Replacement& replacement) {
-  // An account that took several places counts where the walk met it last, in the first of them.
-  Accounts placed;
-  std::unordered_set<const BasicAccount*> seen;
-  for (const BasicAccountReference& account : replacement.orderedAccounts) {
-    if (replacement.placed.contains(account.get()) && seen.insert(account.get()).second) {
-      placed.push_back(account);
-    }
-  }
-  for (std::size_t index = placed.size(); index-- > 0;) {
-    _loadChildrenFromAccount(placed[index]);
-  }
 }
 
 void AccountsManager::_addRemainingAccounts(const Accounts& accounts, Replacement& replacement) {
-  ChildPlacement placement(_childAccountIDToParentAccountID, replacement.accountsByID);
   for (const BasicAccountReference& account : accounts) {
     if (replacement.placed.contains(account.get())) {
       continue;
     }
     if (account->parentAccountIdentifier()) {
-      placement.place(*account);
+      _moveChild(account, replacement.accountsByID);
       continue;
     }
     replacement.orderedAccounts.push_back(account);
     if (const std::optional<Text> identifier = account->identifierProperty()) {
       replacement.accountsByID.set(*identifier, account);
     }
-    placement.indexChildrenOf(account);
+    _loadChildrenFromAccount(account);
   }
-  const ChildPlacement::IndexingToDo toDo = placement.finish();
-  for (const BasicAccountReference& parent : toDo.parents) {
-    _loadChildrenFromAccount(parent);
+}
+
+void AccountsManager::_moveChild(const BasicAccountReference& child,
+                                 const IdentifierIndex<BasicAccountReference>& parents) {
+  const BasicAccountReference* parent = parents.find(*child->parentAccountIdentifier());
+  const std::optional<Text> identifier = child->identifier();
+  const Text* presentParentIdentifier =
+      identifier ? _childAccountIDToParentAccountID.find(*identifier) : nullptr;
+  if (presentParentIdentifier != nullptr) {
+    const bool stays = parent != nullptr && (*parent)->identifier() == *presentParentIdentifier;
+    const BasicAccountReference* presentParent =
+        stays ? parent : parents.find(*presentParentIdentifier);
+    if (presentParent != nullptr) {
+      removeChildWithIdentifier_fromAccount(*identifier, *presentParent);
+    }
   }
-  for (const Text& child : toDo.lostChildren) {
-    _childAccountsByID.remove(child);
-    _childAccountIDToParentAccountID.remove(child);
+  if (parent != nullptr) {
+    addChild_toAccount(child, *parent);
   }
 }
 

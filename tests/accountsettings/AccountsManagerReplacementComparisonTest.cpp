@@ -5,9 +5,8 @@
 
 #include "tests/accountsettings/StoreFixture.h"
 
-// The store replaces accounts with each list of children read and written once. Here the same rule
-// is written down step by step, every child being taken out and added on its own, and random stores
-// must come out the same.
+// The rule of replacement written down once more, on plain maps and lists without any index, and
+// random stores that must come out the same.
 
 namespace accounts {
 namespace {

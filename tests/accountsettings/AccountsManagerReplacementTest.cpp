@@ -1,3 +1,4 @@
+#include "accountsettings/DeviceLocalAccount.h"
 #include "tests/accountsettings/StoreFixture.h"
 
 namespace accounts {
@@ -202,6 +203,107 @@ TEST_F(AccountsManagerReplacement, AChildStaysWithAParentWhoseIdentifierIsNoLong
   store->replaceAccountsWithTypes_withAccounts({}, {childOf("B", calDAV("c"))});
   EXPECT_EQ(parent->properties().arrayForKey(kAccountChildAccounts)->size(), 1U);
   EXPECT_EQ(storedChildren(*store, "B"), "c");
+}
+
+// The lines about children: each time that children are loaded, those that are unknown are named.
+
+const std::string replacingLine =
+    R"(-[AccountsManager replaceAccountsWithTypes:withAccounts:] (N) "Replacing accounts")";
+std::string ignoringLine(std::string_view child) {
+  return R"(-[AccountsManager _loadChildrenFromAccount:] (N) "Ignoring unknown child account with )"
+         R"(properties )" +
+         std::string(child) + '"';
+}
+
+TEST_F(AccountsManagerReplacement, AnAccountThatTakesSeveralPlacesHasItsChildrenLoadedInEach) {
+  const Store store = storeOf({mail("A"), mail("B"), mail("A"), mail("A")});
+  store->replaceAccountsWithTypes_withAccounts(
+      {}, {mail("A").withChildren({17}).record(), mail("B").withChildren({18}).record()});
+  EXPECT_EQ(takeLines(), (Lines{replacingLine, ignoringLine("17"), ignoringLine("17"),
+                                ignoringLine("18"), ignoringLine("17")}));
+}
+
+TEST_F(AccountsManagerReplacement, AnAccountThatIsAppendedTwiceHasItsChildrenLoadedTwice) {
+  const Store store = storeOf({mail("A")});
+  const BasicAccountReference twice = mail("B").withChildren({17}).record();
+  store->replaceAccountsWithTypes_withAccounts(
+      {}, {twice, mail("C").withChildren({18}).record(), twice});
+  EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A B C B");
+  EXPECT_EQ(takeLines(),
+            (Lines{replacingLine, ignoringLine("17"), ignoringLine("18"), ignoringLine("17")}));
+}
+
+TEST_F(AccountsManagerReplacement, AChildThatIsReplacedHasItsParentsChildrenLoadedTwice) {
+  const Store store = storeOf({mail("A").withChildren({17, calDAV("c")})});
+  takeLines();
+  store->replaceAccountsWithTypes_withAccounts({}, {childOf("A", calDAV("c"))});
+  EXPECT_EQ(takeLines(), (Lines{replacingLine, ignoringLine("17"), ignoringLine("17")}));
+}
+
+TEST_F(AccountsManagerReplacement, EachNewChildHasItsParentsChildrenLoaded) {
+  const Store store = storeOf({mail("A").withChildren({17}), mail("B").withChildren({18})});
+  takeLines();
+  store->replaceAccountsWithTypes_withAccounts(
+      {}, {childOf("A", calDAV("c")), childOf("B", calDAV("d")), childOf("A", calDAV("e"))});
+  EXPECT_EQ(takeLines(),
+            (Lines{replacingLine, ignoringLine("17"), ignoringLine("18"), ignoringLine("17")}));
+}
+
+TEST_F(AccountsManagerReplacement, AChildThatMovesHasTheChildrenOfBothParentsLoaded) {
+  const Store store =
+      storeOf({mail("A").withChildren({17, calDAV("c")}), mail("B").withChildren({18})});
+  takeLines();
+  store->replaceAccountsWithTypes_withAccounts({}, {childOf("B", calDAV("c"))});
+  EXPECT_EQ(takeLines(), (Lines{replacingLine, ignoringLine("17"), ignoringLine("18")}));
+}
+
+// A record may answer otherwise than its property says: the property is what counts.
+
+TEST_F(AccountsManagerReplacement, AccountsAreFoundUnderTheIdentifierPropertyNotTheRecordsAnswer) {
+  const Store store = storeOf({mail("A")});
+  const BasicAccountReference device = DeviceLocalAccount::initWithProperties(onMyDevice("stored"));
+  ASSERT_NE(device->identifier(), Text("stored"));
+  store->insertAccount(device);
+
+  const BasicAccountReference successor = onMyDevice("stored").record();
+  store->replaceAccountsWithTypes_withAccounts({}, {successor});
+
+  EXPECT_EQ(store->allBasicAccounts().back(), successor);
+  EXPECT_EQ(store->count(), 2u);
+}
+
+TEST_F(AccountsManagerReplacement, ANewAccountTakesThePlaceOfItsIdentifierPropertyNotOfItsAnswer) {
+  const BasicAccountReference device = DeviceLocalAccount::initWithProperties(onMyDevice("stored"));
+  const Store store = storeOf({mail(device->identifier()->view()), mail("stored")});
+
+  store->replaceAccountsWithTypes_withAccounts({}, {device});
+
+  EXPECT_EQ(store->allBasicAccounts().back(), device);
+  EXPECT_EQ(store->count(), 2u);
+}
+
+TEST_F(AccountsManagerReplacement, KeptAndNewAccountsAreFoundByTheirIdentifierPropertyAfterIt) {
+  const BasicAccountReference kept = DeviceLocalAccount::initWithProperties(onMyDevice("kept"));
+  const BasicAccountReference added = DeviceLocalAccount::initWithProperties(onMyDevice("added"));
+  const Store store = storeOf({});
+  store->insertAccount(kept);
+
+  store->replaceAccountsWithTypes_withAccounts({}, {added});
+
+  EXPECT_EQ(store->accountWithIdentifier("kept"), kept);
+  EXPECT_EQ(store->accountWithIdentifier("added"), added);
+  EXPECT_EQ(store->accountWithIdentifier(*kept->identifier()), nullptr);
+}
+
+TEST_F(AccountsManagerReplacement, AChildStaysWithAParentThatAnswersWithTheIndexedIdentifier) {
+  const BasicAccountReference parent =
+      DeviceLocalAccount::initWithProperties(onMyDevice("stored").withChildren({calDAV("c")}));
+  const Store store = storeOf({});
+  store->insertAccount(parent);
+
+  store->replaceAccountsWithTypes_withAccounts({}, {childOf("stored", calDAV("c"))});
+
+  EXPECT_EQ(parent->properties().arrayForKey(kAccountChildAccounts)->size(), 1U);
 }
 
 }  // namespace
