@@ -7,10 +7,10 @@
 
 namespace accounts {
 
-PropertyArray creatorEntriesForType(std::string_view type, std::string_view operation,
+PropertyArray creatorEntriesForType(const std::optional<Text>& type, std::string_view operation,
                                     std::string_view sourceFile) {
   const std::optional<PropertyDictionary>& map = BasicAccount::_accountCreationMap();
-  std::optional<PropertyArray> entries = map ? map->arrayForKey(type) : std::nullopt;
+  std::optional<PropertyArray> entries = map && type ? map->arrayForKey(*type) : std::nullopt;
   if (!entries) {
     failAssertion(
         operation, sourceFile,

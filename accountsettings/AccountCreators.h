@@ -1,5 +1,6 @@
 #pragma once
 
+#include <optional>
 #include <string_view>
 
 #include "platform/AccountFramework.h"
@@ -13,9 +14,9 @@ inline constexpr std::string_view kCreatorDescriptionKey = "Description";
 inline constexpr std::string_view kCreatorFrameworkKey = "Framework";
 inline constexpr std::string_view kCreatorClassKey = "Class";
 
-/// The creator entries of an account type in the account-creation map. A type without an entry is a
-/// fatal assertion in the given operation and source file.
-PropertyArray creatorEntriesForType(std::string_view type, std::string_view operation,
+/// The creator entries of an account type in the account-creation map. No type and a type without
+/// an entry are fatal assertions in the given operation and source file.
+PropertyArray creatorEntriesForType(const std::optional<Text>& type, std::string_view operation,
                                     std::string_view sourceFile);
 
 /// Loads the framework at a path beneath the system root, so that the class of a creator or

@@ -134,9 +134,9 @@ class AccountsManager {
   // a framework that cannot be loaded and a class that cannot be found are fatal assertions.
 
   /// The names of the notifier classes that a change of a dataclass concerns, in the map's order,
-  /// duplicates kept; their frameworks are loaded.
-  static std::vector<Text> _notifierClassNamesForAccountType_dataclass(std::string_view type,
-                                                                       std::string_view dataclass);
+  /// duplicates kept; their frameworks are loaded. No type is an error in the map.
+  static std::vector<Text> _notifierClassNamesForAccountType_dataclass(
+      const std::optional<Text>& type, std::string_view dataclass);
   /// Tells the notifiers concerned that a dataclass of an account is about to change, or did.
   static void accountWillChange_forDataclass(const BasicAccount& account,
                                              std::string_view dataclass);

@@ -98,7 +98,7 @@ using NotifierOperation = std::function<void(std::string_view, std::string_view)
 /// Calls an optional operation of every notifier that is concerned with a dataclass of an account.
 void callNotifiers(const BasicAccount& account, std::string_view dataclass,
                    NotifierOperation AccountClass::*notifierOperation, std::string_view operation) {
-  const Text type = account.type().value_or(Text());
+  const std::optional<Text> type = account.type();
   const Text identifier = account.identifier().value_or(Text());
   for (const Text& name :
        AccountsManager::_notifierClassNamesForAccountType_dataclass(type, dataclass)) {
@@ -112,7 +112,7 @@ void callNotifiers(const BasicAccount& account, std::string_view dataclass,
 }  // namespace
 
 std::vector<Text> AccountsManager::_notifierClassNamesForAccountType_dataclass(
-    std::string_view type, std::string_view dataclass) {
+    const std::optional<Text>& type, std::string_view dataclass) {
   std::vector<Text> classNames;
   for (const PropertyValue& element :
        creatorEntriesForType(type, kNotifierClassNamesOperation, kManagerSourceFile)) {
@@ -175,7 +175,7 @@ void AccountsManager::
     _addNotificationToDictionary_forChangeType_originalProperties_currentProperties(
         NotificationBatch& batch, AccountChangeType changeType, const DictionaryOrNone& original,
         const DictionaryOrNone& current) {
-  const Text type = currentOrOriginalText(current, original, kAccountType).value_or(Text());
+  const std::optional<Text> type = currentOrOriginalText(current, original, kAccountType);
   const Text identifier =
       currentOrOriginalText(current, original, kAccountIdentifier).value_or(Text());
   std::vector<Text> classNames;
@@ -186,10 +186,14 @@ void AccountsManager::
       }
     }
   }
+  if (classNames.empty()) {
+    return;
+  }
+  // No type has no classes.
   const PropertyDictionary record{
       {kASChangeAccountChangeTypeKey, static_cast<std::int32_t>(changeType)},
       {kASChangeAccountIdentifierKey, identifier},
-      {kASChangeAccountTypeKey, type},
+      {kASChangeAccountTypeKey, *type},
       {kASChangeAccountOriginallyEnabledDataclassesKey, enabledDataclassesOf(original)}};
   for (const Text& name : classNames) {
     batch[name].push_back(record);

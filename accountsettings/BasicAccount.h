@@ -180,12 +180,15 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   static std::optional<PropertyDictionary> _creatorsInfo();
   /// The name of the class that makes companions of a kind ("FullAccount", "SyncAccount") for a
   /// type, its framework being loaded; none when the type has no creator of the kind. A loader,
-  /// null for none, may load the framework of a full account itself.
+  /// null for none, may load the framework of a full account itself. No type is an error in the
+  /// map.
   std::optional<Text> _creatorClassNameForAccountType_creatorType_loader(
-      std::string_view type, std::string_view creatorType, FullAccountLoader* loader) const;
+      const std::optional<Text>& type, std::string_view creatorType,
+      FullAccountLoader* loader) const;
   std::optional<Text> fullAccountCreatorClassNameForAccountType_loader(
-      std::string_view type, FullAccountLoader* loader) const;
-  std::optional<Text> syncAccountCreatorClassNameForAccountType(std::string_view type) const;
+      const std::optional<Text>& type, FullAccountLoader* loader) const;
+  std::optional<Text> syncAccountCreatorClassNameForAccountType(
+      const std::optional<Text>& type) const;
 
   /// The full account, made on the first call and then always the same; never null.
   FullAccountReference fullAccountUsingLoader(FullAccountLoader* loader);

@@ -29,7 +29,8 @@ const std::optional<PropertyDictionary>& BasicAccount::_accountCreationMap() {
 }
 
 std::optional<Text> BasicAccount::_creatorClassNameForAccountType_creatorType_loader(
-    std::string_view type, std::string_view creatorType, FullAccountLoader* loader) const {
+    const std::optional<Text>& type, std::string_view creatorType,
+    FullAccountLoader* loader) const {
   std::optional<Text> className;
   // Kept on purpose: the walk goes on after a match, so that every framework of the kind is loaded
   // and the last class named is the one used.
@@ -71,12 +72,12 @@ std::optional<Text> BasicAccount::_creatorClassNameForAccountType_creatorType_lo
 }
 
 std::optional<Text> BasicAccount::fullAccountCreatorClassNameForAccountType_loader(
-    std::string_view type, FullAccountLoader* loader) const {
+    const std::optional<Text>& type, FullAccountLoader* loader) const {
   return _creatorClassNameForAccountType_creatorType_loader(type, kFullAccountCreator, loader);
 }
 
 std::optional<Text> BasicAccount::syncAccountCreatorClassNameForAccountType(
-    std::string_view type) const {
+    const std::optional<Text>& type) const {
   return _creatorClassNameForAccountType_creatorType_loader(type, kSyncAccountCreator, nullptr);
 }
 
@@ -84,7 +85,7 @@ FullAccountReference BasicAccount::fullAccountUsingLoader(FullAccountLoader* loa
   if (_fullAccount != nullptr) {
     return _fullAccount;
   }
-  const Text accountType = type().value_or(Text());
+  const std::optional<Text> accountType = type();
   const std::optional<Text> className =
       fullAccountCreatorClassNameForAccountType_loader(accountType, loader);
   const AccountClass* creator = className ? creatorClassNamed(*className) : nullptr;
@@ -94,7 +95,7 @@ FullAccountReference BasicAccount::fullAccountUsingLoader(FullAccountLoader* loa
   }
   FullAccountReference account;
   if (creator->classForAccountType) {
-    const AccountClass* accountClass = creator->classForAccountType(accountType);
+    const AccountClass* accountClass = creator->classForAccountType(*accountType);
     if (accountClass != nullptr && accountClass->initWithProperties) {
       account = accountClass->initWithProperties(properties());
     }
@@ -119,8 +120,7 @@ SyncAccountReference BasicAccount::_cachedSyncAccount() {
   if (_syncAccount != nullptr) {
     return _syncAccount;
   }
-  const std::optional<Text> className =
-      syncAccountCreatorClassNameForAccountType(type().value_or(Text()));
+  const std::optional<Text> className = syncAccountCreatorClassNameForAccountType(type());
   if (!className) {
     return nullptr;
   }

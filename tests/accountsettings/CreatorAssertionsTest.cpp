@@ -22,6 +22,19 @@ TEST_F(CreatorAssertionsDeathTest, ATypeWithoutEntryInTheMap) {
       "Malformed AccountCreators information. Could not find the information for the type Mail\n");
 }
 
+// Not even when the map has an entry under the empty text.
+TEST_F(CreatorAssertionsDeathTest, ARecordThatLostItsType) {
+  setCreators({{"", PropertyArray{fullAccountCreator("Mail.so", "Creator")}}});
+  const BasicAccountReference record = account("A", kMailAccountType);
+  record->removeAccountPropertyForKey(kAccountType);
+  const std::string text =
+      "Malformed AccountCreators information. Could not find the information for the type (null)\n";
+  EXPECT_EXIT(static_cast<void>(record->fullAccountUsingLoader(nullptr)),
+              testing::KilledBySignal(SIGABRT), testing::HasSubstr(text));
+  EXPECT_EXIT(static_cast<void>(record->_cachedSyncAccount()), testing::KilledBySignal(SIGABRT),
+              testing::HasSubstr(text));
+}
+
 TEST_F(CreatorAssertionsDeathTest, ACreatorWithoutDescription) {
   setCreators({{"Mail", PropertyArray{PropertyDictionary{{"Type", "FullAccount"}}}}});
   expectDeathOfFullAccount(

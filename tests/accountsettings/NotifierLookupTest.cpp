@@ -105,6 +105,35 @@ TEST_F(NotifierAssertionsDeathTest, ATypeWithoutEntryInTheMap) {
       "Malformed AccountCreators information. Could not find the information for the type Mail\n");
 }
 
+// Not even when the map has an entry under the empty text.
+TEST_F(NotifierAssertionsDeathTest, AChangeOfAnAccountWithoutType) {
+  setCreators({{"", PropertyArray{notifierCreator("A.so", "A", {kAccountDataclassMail})}}});
+  const std::string text =
+      "Malformed AccountCreators information. Could not find the information for the type (null)\n";
+  AccountsManager::NotificationBatch batch;
+  EXPECT_EXIT(AccountsManager::
+                  _addNotificationToDictionary_forChangeType_originalProperties_currentProperties(
+                      batch, AccountChangeType::Deleted,
+                      PropertyDictionary{
+                          {kAccountIdentifier, "A"},
+                          {kAccountEnabledDataclasses, PropertyArray{kAccountDataclassMail}}},
+                      std::nullopt),
+              testing::KilledBySignal(SIGABRT), testing::HasSubstr(text));
+
+  const BasicAccountReference record = account("A", kMailAccountType);
+  record->removeAccountPropertyForKey(kAccountType);
+  EXPECT_EXIT(AccountsManager::accountWillChange_forDataclass(*record, kAccountDataclassMail),
+              testing::KilledBySignal(SIGABRT), testing::HasSubstr(text));
+}
+
+TEST_F(NotifierAssertionsDeathTest, AnUnaffectedAccountWithoutTypeIsNoError) {
+  AccountsManager::NotificationBatch batch;
+  AccountsManager::_addNotificationToDictionary_forChangeType_originalProperties_currentProperties(
+      batch, AccountChangeType::Deleted, PropertyDictionary{{kAccountIdentifier, "A"}},
+      std::nullopt);
+  EXPECT_TRUE(batch.empty());
+}
+
 TEST_F(NotifierAssertionsDeathTest, ANotifierWithoutFramework) {
   setCreators({{"Mail", PropertyArray{creatorEntry(
                             "NotifierAccount",
