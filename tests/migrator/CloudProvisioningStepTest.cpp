@@ -5,7 +5,7 @@
 namespace accounts {
 namespace {
 
-class CloudProvisioningStepTest : public MigratorTest {
+class CloudProvisioningStepTest : public StepTest {
  protected:
   static AccountBuilder cloudAccount() { return anAccount("Z", kQuarxAccountType, "ZQAccount"); }
   void runStepOn(std::initializer_list<AccountBuilder> accounts) {

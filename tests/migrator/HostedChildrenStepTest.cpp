@@ -5,7 +5,7 @@
 namespace accounts {
 namespace {
 
-class HostedChildrenStepTest : public MigratorTest {
+class HostedChildrenStepTest : public StepTest {
  protected:
   static AccountBuilder cloudAccount() { return anAccount("Z", kQuarxAccountType, "ZQAccount"); }
   PropertyArray childrenAfterTheStep(const AccountBuilder& builder) {

@@ -5,7 +5,7 @@
 namespace accounts {
 namespace {
 
-class HostedNotesStepTest : public MigratorTest {
+class HostedNotesStepTest : public StepTest {
  protected:
   static AccountBuilder hosted() { return anAccount("V", kVelmoraAccountType, "VelmoraAccount"); }
   std::optional<TextList> storedAfterTheStep(const AccountBuilder& builder) {

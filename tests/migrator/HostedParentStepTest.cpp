@@ -5,7 +5,7 @@
 namespace accounts {
 namespace {
 
-class HostedParentStepTest : public MigratorTest {
+class HostedParentStepTest : public StepTest {
  protected:
   static AccountBuilder hosted() { return anAccount("V", kVelmoraAccountType, "VelmoraAccount"); }
   void runStep() { EXPECT_TRUE(migrator._migrateAccountsFrom8B117(*store)); }

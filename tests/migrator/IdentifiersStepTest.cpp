@@ -5,7 +5,7 @@
 namespace accounts {
 namespace {
 
-class IdentifiersStepTest : public MigratorTest {
+class IdentifiersStepTest : public StepTest {
  protected:
   /// What becomes of an account when it is the only one of the store.
   PropertyDictionary upgraded(const AccountBuilder& builder) {

@@ -72,6 +72,7 @@ TEST_F(MigrationStagesTest, TheStagesComeInTheirOrder) {
 }
 
 TEST_F(MigrationStagesTest, NotificationsAreOffBeforeTheFirstFileIsTouchedAndOnAtTheEnd) {
+  ASSERT_FALSE(device.process.shouldSkipNotifications);
   device.fileSystem.stopBefore(0);
   EXPECT_THROW(migrator.executeMigrationSteps(), WorldStopped);
   EXPECT_TRUE(device.process.shouldSkipNotifications);
@@ -127,6 +128,8 @@ TEST_F(MigrationStagesTest, AnInterruptedRemovalIsFinishedAndNothingElseIsDone) 
 
 TEST_F(MigrationStagesTest, AfterAnInterruptedRemovalNotificationsStayOff) {
   device.fileSystem.addFile(kSentinelPath, "");
+
+  ASSERT_FALSE(device.process.shouldSkipNotifications);
 
   migrator.executeMigrationSteps();
 

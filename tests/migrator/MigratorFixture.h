@@ -95,14 +95,11 @@ inline AccountBuilder calendarChild() {
   return anAccount("K", kCalDAVAccountType, "MobileCalDAVAccount");
 }
 
-/// A device, a migrator and a store that a test fills.
+/// A device, a migrator and a store that a test fills. Notifications are on, as in any process that
+/// starts.
 class MigratorTest : public testing::Test {
  protected:
-  MigratorTest() {
-    device.consoleLog.alsoStandardError = false;
-    // As in a migration: no test of a step may depend on notifiers.
-    AccountsManager::_setShouldSkipNotifications(true);
-  }
+  MigratorTest() { device.consoleLog.alsoStandardError = false; }
 
   /// Puts accounts into the store, in order; no file is involved.
   void openStoreWith(std::initializer_list<AccountBuilder> accounts) {
@@ -163,6 +160,13 @@ class MigratorTest : public testing::Test {
   AccountsDataMigrator migrator;
   std::unique_ptr<AccountsManager> store =
       AccountsManager::initWithAccounsInfoArray(PropertyArray());
+};
+
+/// The same for a step of the upgrade chain, which a migration runs with notifications switched
+/// off.
+class StepTest : public MigratorTest {
+ protected:
+  StepTest() { AccountsManager::_setShouldSkipNotifications(true); }
 };
 
 }  // namespace accounts

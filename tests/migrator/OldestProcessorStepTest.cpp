@@ -5,7 +5,7 @@
 namespace accounts {
 namespace {
 
-class OldestProcessorStepTest : public MigratorTest {
+class OldestProcessorStepTest : public StepTest {
  protected:
   void runOn(PropertyValue architecture) {
     device.deviceInfoService.answers.insert_or_assign("CPUArchitecture", std::move(architecture));

@@ -5,7 +5,7 @@
 namespace accounts {
 namespace {
 
-class OnDeviceAccountStepTest : public MigratorTest {
+class OnDeviceAccountStepTest : public StepTest {
  protected:
   void answer(SyncDataType dataType, std::optional<PropertyArray> sources,
               std::optional<std::string> error = std::nullopt) {

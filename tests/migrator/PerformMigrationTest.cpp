@@ -20,7 +20,6 @@ TEST_F(PerformMigrationTest, TheLockIsHeldForTheWholeMigration) {
 
 TEST_F(PerformMigrationTest, WithoutALockObjectNothingIsDone) {
   device.sharedResources.canMakeLock = false;
-  device.process.shouldSkipNotifications = false;
 
   EXPECT_FALSE(migrator.performMigration());
 

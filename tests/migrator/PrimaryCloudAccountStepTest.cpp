@@ -5,7 +5,7 @@
 namespace accounts {
 namespace {
 
-class PrimaryCloudAccountStepTest : public MigratorTest {
+class PrimaryCloudAccountStepTest : public StepTest {
  protected:
   static AccountBuilder cloudAccount(std::string_view identifier, std::int64_t status) {
     return anAccount(identifier, kQuarxAccountType, "ZQAccount").with("status", status);

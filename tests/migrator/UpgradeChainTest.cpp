@@ -28,7 +28,7 @@ constexpr std::array<UpgradeStep, sizeof...(versions)> recordingChain(
             static_cast<UpgradeStep::Operation>(&RecordingMigrator::step<versions>)}...}};
 }
 
-class UpgradeChainTest : public MigratorTest {
+class UpgradeChainTest : public StepTest {
  protected:
   bool run(std::uint64_t currentVersion = AccountsManager::currentVersion()) {
     constexpr auto chain = recordingChain(std::make_index_sequence<upgradeChain.size()>());
@@ -176,7 +176,7 @@ struct StepRow {
   std::ptrdiff_t saves;
 };
 
-class UpgradeStepTest : public MigratorTest, public testing::WithParamInterface<StepRow> {};
+class UpgradeStepTest : public StepTest, public testing::WithParamInterface<StepRow> {};
 
 TEST_P(UpgradeStepTest, StampsAndSavesAsTheChainSays) {
   constexpr std::uint64_t versionBefore = 99;
@@ -197,7 +197,7 @@ INSTANTIATE_TEST_SUITE_P(AllSteps, UpgradeStepTest,
                            return "Position" + std::to_string(row.param.position + 1);
                          });
 
-class OldAccountSettingsTest : public MigratorTest {};
+class OldAccountSettingsTest : public StepTest {};
 
 TEST_F(OldAccountSettingsTest, AreRecordedAlsoWhenNoStepRuns) {
   switchMigrationInformationOn();

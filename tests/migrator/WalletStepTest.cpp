@@ -5,7 +5,7 @@
 namespace accounts {
 namespace {
 
-class WalletStepTest : public MigratorTest {
+class WalletStepTest : public StepTest {
  protected:
   static AccountBuilder primaryAccount() {
     return anAccount("Z", kQuarxAccountType, "ZQAccount").with("primaryAccount", true);

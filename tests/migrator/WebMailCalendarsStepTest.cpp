@@ -5,7 +5,7 @@
 namespace accounts {
 namespace {
 
-class WebMailCalendarsStepTest : public MigratorTest {
+class WebMailCalendarsStepTest : public StepTest {
  protected:
   void runStep() { EXPECT_TRUE(migrator._migrateAccountsFrom7A242(*store)); }
   /// The identifiers in the channel's lines about deletions, one for each line.
