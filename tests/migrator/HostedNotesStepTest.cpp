@@ -55,5 +55,23 @@ TEST_F(HostedNotesStepTest, EveryAccountKeepsItsPlace) {
   EXPECT_EQ(identifiers(), (TextList{"V", "M", "V2"}));
 }
 
+TEST_F(HostedNotesStepTest, AnEntryThatIsNoListIsRemoved) {
+  storedAfterTheStep(hosted().with(kAccountEnabledDataclasses, "no list"));
+
+  EXPECT_FALSE(account(0).properties().contains(kAccountEnabledDataclasses));
+}
+
+TEST_F(HostedNotesStepTest, OfAccountsWithOneIdentifierTheLastTakesTheirPlacesAndTheOthersFollow) {
+  const auto named = [](std::string_view name) { return hosted().with(kAccountDisplayName, name); };
+  openStoreWith({named("one"), anAccount("M", kMailAccountType, "IMAPAccount"), named("two")});
+
+  migrator._migrateAccountsFrom7A241(*store);
+
+  ASSERT_EQ(identifiers(), (TextList{"V", "M", "V", "V"}));
+  EXPECT_EQ(account(0).displayName(), "two");
+  EXPECT_EQ(account(2).displayName(), "two");
+  EXPECT_EQ(account(3).displayName(), "one");
+}
+
 }  // namespace
 }  // namespace accounts

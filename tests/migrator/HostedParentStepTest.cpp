@@ -66,6 +66,40 @@ TEST_F(HostedParentStepTest, TheOldAccountIsFoundAsAChildOfTheParent) {
   EXPECT_EQ(all[1]->parentAccount(), all[0]);
 }
 
+TEST_F(HostedParentStepTest, TheOldRecordKnowsItsParent) {
+  openStoreWith({hosted()});
+  const BasicAccountReference old = store->allBasicAccounts().front();
+
+  runStep();
+
+  EXPECT_EQ(old->parentAccount(), store->allBasicAccounts().front());
+}
+
+TEST_F(HostedParentStepTest, WhatIsCopiedMayBeInheritedWhileOnlyOwnValuesAreMoved) {
+  const BasicAccountReference old = BasicAccount::initWithProperties(hosted());
+  old->setParentAccount(BasicAccount::initWithProperties(
+      hosted()
+          .with(kAccountUsername, "jdoe@host")
+          .with(kAccountDisplayName, "Home")
+          .with("CalDAVEnabled", true)
+          .enabledFor({kAccountDataclassCalendars})
+          .withChildren({calendarChild})
+          .with(kCalendarsAccountSubscribedCalendars, PropertyArray{1})
+          .with("DAExoSubscribedCalendarInfos", PropertyArray{2})));
+  store->insertAccount(old);
+
+  runStep();
+
+  const PropertyDictionary parent = account(0).properties();
+  EXPECT_EQ(parent.textForKey(kAccountUsername), "jdoe@host");
+  EXPECT_EQ(parent.textForKey(kAccountDisplayName), "Home");
+  EXPECT_EQ(*parent.find("CalDAVEnabled"), PropertyValue(true));
+  EXPECT_FALSE(parent.contains(kAccountEnabledDataclasses));
+  EXPECT_EQ(children(0), PropertyArray{hosted()});
+  EXPECT_FALSE(parent.contains(kCalendarsAccountSubscribedCalendars));
+  EXPECT_FALSE(parent.contains("DAExoSubscribedCalendarInfos"));
+}
+
 TEST_F(HostedParentStepTest, TheTypeStringsAreThoseOfTheService) {
   runStepOn(hosted().with(kAccountTypeString, "Other"));
 

@@ -64,6 +64,19 @@ TEST_F(MailDescriptionTest, LegacyKeysMoveAndEveryOtherKeyIsCarriedOver) {
                                             {"Short Type String", "Account"}}));
 }
 
+TEST_F(MailDescriptionTest, AValueUnderALegacyKeyTakesThePlaceOfOneUnderTheNewKey) {
+  const PropertyDictionary properties = incoming({{"AccountType", "IMAPAccount"},
+                                                  {"Class", "YahooAccount"},
+                                                  {"AccountName", "Work"},
+                                                  {"DisplayName", "Home"},
+                                                  {"uniqueId", "M"},
+                                                  {"Identifier", "N"}});
+
+  EXPECT_EQ(properties.textForKey(kAccountClass), "IMAPAccount");
+  EXPECT_EQ(properties.textForKey(kAccountDisplayName), "Work");
+  EXPECT_EQ(properties.textForKey(kAccountIdentifier), "M");
+}
+
 TEST_F(MailDescriptionTest, GmailIsGmailWhereTheRegionSaysNo) {
   device.deviceInfoService.answers.insert_or_assign("RegionalBehaviorGoogleMail", false);
 
@@ -78,6 +91,13 @@ TEST_F(MailDescriptionTest, GmailIsGoogleMailWhereTheRegionSaysSo) {
   EXPECT_EQ(properties.textForKey(kAccountType), kGmailAccountType);
   EXPECT_EQ(properties.textForKey(kAccountTypeString), "Google Mail");
   EXPECT_EQ(properties.textForKey(kAccountShortTypeString), "Google Mail");
+}
+
+TEST_F(MailDescriptionTest, GmailIsGmailWhereTheRegionsAnswerHasNoBooleanValue) {
+  device.deviceInfoService.answers.insert_or_assign("RegionalBehaviorGoogleMail",
+                                                    PropertyDictionary());
+
+  EXPECT_EQ(AccountsDataMigrator::_accountTypeStringForMailAccountClass("GmailAccount"), "Gmail");
 }
 
 TEST_F(MailDescriptionTest, GmailIsGmailWithoutAnAnswerOfTheRegion) {

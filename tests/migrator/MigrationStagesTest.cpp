@@ -176,6 +176,16 @@ TEST_F(MigrationStagesTest, AFailedConversionIsNotTheMigrationsResult) {
   EXPECT_FALSE(exists(kLegacyExchangePath));
 }
 
+TEST_F(MigrationStagesTest, AFailedExchangeConversionDoesNotKeepTheMailConversionFromRunning) {
+  addBrokenLegacyExchangeAccounts();
+  addLegacyMailAccounts();
+  addSettingsFile(12, {});
+
+  EXPECT_TRUE(migrator.executeMigrationSteps());
+
+  EXPECT_EQ(savedIdentifiers(), TextList{"M"});
+}
+
 class FailingUpgrade : public AccountsDataMigrator {
   bool _migrateNewAccountsInfo(AccountsManager&) override { return false; }
 };

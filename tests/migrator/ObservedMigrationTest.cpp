@@ -12,6 +12,7 @@ class Observer final : public MigrationObserver {
     std::optional<PropertyDictionary> accountSettings;
   };
 
+  [[nodiscard]] bool wantsAccounts() const override { return wants; }
   void stageBegan(std::string_view operation, std::string_view purpose) override {
     EXPECT_TRUE(hasEnded_) << operation << " began within another stage";
     EXPECT_FALSE(purpose.empty());
@@ -39,6 +40,7 @@ class Observer final : public MigrationObserver {
   }
 
   std::vector<Stage> stages;
+  bool wants = true;
 
  private:
   bool hasEnded_ = true;
@@ -116,6 +118,37 @@ TEST_F(ObservedMigration, EachStageShowsTheAccountsAsTheyAreAfterIt) {
 TEST_F(ObservedMigration, AStageWithoutAStoreShowsNoAccounts) {
   migrator.performMigration();
   EXPECT_FALSE(observer.stage("announceChange").accountSettings);
+}
+
+TEST_F(ObservedMigration, EachStageShowsTheVersionThatTheAccountsHaveAfterIt) {
+  addSettings(1);
+  migrator.performMigration();
+  const auto version = [&](std::string_view operation) {
+    return *observer.stage(operation).accountSettings->find("Version");
+  };
+  EXPECT_EQ(version("initInsideOfMigration"), PropertyValue(1));
+  EXPECT_EQ(version("_migrateAccountsFrom7A150:"), PropertyValue(2));
+  EXPECT_EQ(version("saveAllAccounts"), PropertyValue(12));
+}
+
+TEST_F(ObservedMigration, TheStoreThatIsSavedIsStampedAsCurrentAlsoAfterAFailedChain) {
+  class FailingUpgrade : public AccountsDataMigrator {
+    bool _migrateNewAccountsInfo(AccountsManager&) override { return false; }
+  };
+  addSettings(5);
+  FailingUpgrade().performMigration();
+  EXPECT_EQ(*observer.stage("initInsideOfMigration").accountSettings->find("Version"),
+            PropertyValue(5));
+  EXPECT_EQ(*observer.stage("saveAllAccounts").accountSettings->find("Version"), PropertyValue(12));
+}
+
+TEST_F(ObservedMigration, AnObserverThatDoesNotWantTheAccountsGetsNone) {
+  observer.wants = false;
+  addSettings(10);
+  migrator.performMigration();
+  for (const Observer::Stage& stage : observer.stages) {
+    EXPECT_FALSE(stage.accountSettings) << stage.operation;
+  }
 }
 
 }  // namespace

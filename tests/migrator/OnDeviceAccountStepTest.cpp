@@ -33,6 +33,13 @@ TEST_F(OnDeviceAccountStepTest, EmptyListsAndEmptyErrorTextsAreNoSourcesAndNoErr
   EXPECT_TRUE(console().empty());
 }
 
+TEST_F(OnDeviceAccountStepTest, AnEmptyListOfSourcesLeavesAKindWithASingleStoreOn) {
+  ASSERT_FALSE(BasicAccount::multipleStoresSupportedByDataclass(kAccountDataclassBookmarks));
+  answer(SyncDataType::Bookmarks, PropertyArray());
+
+  EXPECT_EQ(enabledAfterTheStep(), all);
+}
+
 TEST_F(OnDeviceAccountStepTest, OnlyKindsThatItsTypeSupportsAreOn) {
   device.deviceInfoService.answers.insert_or_assign("CPUArchitecture", "armv6");
 

@@ -135,12 +135,37 @@ TEST_F(PrimaryCloudAccountStepTest, APrimaryFoundInTheWalkEndsTheSearch) {
 }
 
 TEST_F(PrimaryCloudAccountStepTest, ALaterAccountDoesNotUndoAFoundPrimary) {
-  runStepOn({cloudAccount("Z1", 2).enabledFor({kAccountDataclassDeviceLocator}),
-             cloudAccount("Z2", 2), cloudAccount("Z3", 1)});
+  runStepOn({cloudAccount("Z1", 2),
+             cloudAccount("Z2", 2).enabledFor({kAccountDataclassDeviceLocator}),
+             cloudAccount("Z3", 2)});
+
+  EXPECT_FALSE(isPrimary(0));
+  EXPECT_TRUE(isPrimary(1));
+  EXPECT_FALSE(isPrimary(2));
+}
+
+TEST_F(PrimaryCloudAccountStepTest, AnAccountThatRevertsIsNoPrimaryThatWasFound) {
+  runStepOn({cloudAccount("Z1", 2)
+                 .enabledFor({kAccountDataclassDeviceLocator})
+                 .withChildren({calendarChild()}),
+             cloudAccount("Z2", 2)});
+
+  EXPECT_FALSE(isPrimary(0));
+  EXPECT_TRUE(isPrimary(1));
+}
+
+TEST_F(PrimaryCloudAccountStepTest, AnAccountOfAnotherTypeDoesNotBecomePrimaryByTheSearch) {
+  runStepOn({anAccount("V", kVelmoraAccountType, "VelmoraAccount").with("status", 2),
+             anAccount("E", kExchangeAccountType, "ZQAccount").with("status", 2)});
+
+  EXPECT_FALSE(isPrimary(0));
+  EXPECT_FALSE(isPrimary(1));
+}
+
+TEST_F(PrimaryCloudAccountStepTest, AnAccountOfAnotherClassMayBecomePrimaryByTheSearch) {
+  runStepOn({anAccount("Q", kQuarxAccountType, "VelmoraAccount").with("status", 2)});
 
   EXPECT_TRUE(isPrimary(0));
-  EXPECT_FALSE(isPrimary(1));
-  EXPECT_FALSE(isPrimary(2));
 }
 
 TEST_F(PrimaryCloudAccountStepTest, WithoutADeviceLocatorTheFirstAccountOfStatus2BecomesPrimary) {

@@ -35,6 +35,15 @@ TEST_F(WalletStepTest, TheWalletFollowsCloudDocuments) {
   EXPECT_EQ(console(), (Lines{shoeboxLine, enablingLine}));
 }
 
+TEST_F(WalletStepTest, TheWalletFollowsCloudDocumentsWhateverTheClass) {
+  runStepOn({anAccount("Q", kQuarxAccountType, "VelmoraAccount")
+                 .with("primaryAccount", true)
+                 .provisionedFor({kAccountDataclassUbiquity})});
+
+  EXPECT_EQ(storedProvisioned(),
+            dataclasses({kAccountDataclassUbiquity, kAccountDataclassShoebox}));
+}
+
 TEST_F(WalletStepTest, CloudDocumentsThatAreOffLeaveTheWalletOff) {
   runStepOn({primaryAccount().provisionedFor({kAccountDataclassUbiquity})});
 

@@ -129,6 +129,16 @@ TEST_F(WebMailCalendarsStepTest, AMatchingAccountOfAnotherClassStays) {
   EXPECT_EQ(identifiers(), (TextList{"G", "C"}));
 }
 
+TEST_F(WebMailCalendarsStepTest, AMatchingAccountOfAnotherTypeIsFoldedByItsClass) {
+  openStoreWith(
+      {gmail("G", "jdoe"), googleCalendar("C", "jdoe").with(kAccountType, kCardDAVAccountType)});
+  ASSERT_EQ(identifiers(), (TextList{"G", "C"}));
+
+  runStep();
+
+  EXPECT_EQ(identifiers(), TextList{"G"});
+}
+
 TEST_F(WebMailCalendarsStepTest, AnInactiveAccountTakesItsCalendarsInAsWell) {
   openStoreWith({gmail("G", "jdoe").with("IsActive", false), googleCalendar("C", "jdoe")});
 
