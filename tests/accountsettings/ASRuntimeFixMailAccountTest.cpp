@@ -67,6 +67,27 @@ TEST(MailAccountFix, MarkersAreTestedInTableOrderNotByTheirPlaceInThePath) {
   EXPECT_EQ(account->accountClass(), "AOLAccount");
 }
 
+TEST(MailAccountFix, AServicesMarkerDecidesBeforeTheProtocols) {
+  FakeProcess device;
+  const auto gmail = accountAt("Mail/POP-jdoe@gmail.com@imap.gmail.com");
+  const auto yahoo = accountAt("Mail/POP-jdoe@imap.mail.yahoo.com");
+  fix(*gmail);
+  fix(*yahoo);
+  EXPECT_EQ(gmail->accountClass(), "GmailAccount");
+  EXPECT_EQ(yahoo->accountClass(), "YahooAccount");
+}
+
+TEST(MailAccountFix, AServicesHostAloneIsNotItsMarker) {
+  FakeProcess device;
+  for (const std::string_view path :
+       {"Mail/IMAP-jdoe@host.example@imap.gmail.com", "Mail/IMAP-jdoe@imap.gmail.com",
+        "Mail/IMAP-jdoe@gmail.com", "Mail/IMAP-jdoe.imap.mail.yahoo.com"}) {
+    const auto account = accountAt(path);
+    fix(*account);
+    EXPECT_EQ(account->accountClass(), "IMAPAccount") << path;
+  }
+}
+
 TEST(MailAccountFix, AnAccountOfTheHostedServiceIsFixedToo) {
   FakeProcess device;
   const auto account = accountAt("Mail/Velmora-jdoe");

@@ -147,6 +147,12 @@ TEST(AccountTypes, DeleteActionsAndRemindersComeFromTheConfiguration) {
   EXPECT_TRUE(BasicAccount::showRemindersSeparatelyForAccountType(kMailAccountType));
 }
 
+TEST(AccountTypes, ASwitchOfTheConfigurationWithoutABooleanValueIsOff) {
+  FakeProcess device;
+  configureType(device, kMailAccountType, {{kPropertiesShowRemindersSeparately, PropertyArray()}});
+  EXPECT_FALSE(BasicAccount::showRemindersSeparatelyForAccountType(kMailAccountType));
+}
+
 TEST(Multitasking, OnlyTheOldestProcessorIsWithoutIt) {
   FakeProcess device;
   EXPECT_TRUE(BasicAccount::isMultitaskingEnabled());

@@ -79,5 +79,20 @@ TEST_F(AccountsManagerFixersWhileSaving, RepairsOfTheAccountsOnDiskAreNotAnnounc
   EXPECT_EQ(identifiersOf(settingsAccounts()), "A");
 }
 
+TEST_F(AccountsManagerFixersWhileSaving, FixersRunFromTheLastAccountToTheFirst) {
+  const Store store = storeFromFileOf({mail("A"), mail("B"), mail("C")});
+  for (const BasicAccountReference& account : store->allBasicAccounts()) {
+    account->setAccountClass("BrokenAccount");
+  }
+  takeLines();
+  store->saveAllAccounts();
+  const auto line = [](std::string_view identifier) {
+    return R"(-[ASRuntimeFixMailAccount(Internal) _cleanupAccountClass:] (N) "Could not fix the )"
+           R"(class of the mail account: {"Class":"BrokenAccount","Identifier":")" +
+           std::string(identifier) + R"(","Type":"Mail"}")";
+  };
+  EXPECT_EQ(takeLinesOf("-[ASRuntimeFixMailAccount"), (Lines{line("C"), line("B"), line("A")}));
+}
+
 }  // namespace
 }  // namespace accounts

@@ -60,6 +60,22 @@ TEST_F(FullAccountsOfStoreTest, NoIdentifierAnEmptyOneAndAnUnknownOneFindNothing
   EXPECT_EQ(store_->fullAccountWithIdentifier_loader("X", nullptr), nullptr);
 }
 
+TEST_F(FullAccountsOfStoreTest, AnEmptyIdentifierFindsNotEvenAnAccountThatHasIt) {
+  store_->insertAccount(account("", kMailAccountType));
+
+  EXPECT_EQ(store_->fullAccountWithIdentifier_loader("", nullptr), nullptr);
+}
+
+TEST_F(FullAccountsOfStoreTest, AnIdentifierOfATopLevelAccountAndAChildFindsTheTopLevelAccount) {
+  insertWithChildren(account("P", kQuarxAccountType), {account("A", kCalDAVAccountType)});
+  store_->insertAccount(account("A", kMailAccountType));
+
+  const FullAccountReference found = store_->fullAccountWithIdentifier_loader("A", nullptr);
+
+  EXPECT_EQ(dynamic_cast<RecordedFullAccount&>(*found).record.lock(),
+            store_->allBasicAccounts().back());
+}
+
 TEST_F(FullAccountsOfStoreTest, EachAccountOfTheTypesIsFollowedByItsOwnChildrenOfTheTypes) {
   insertWithChildren(account("P1", kMailAccountType),
                      {account("C1", kMailAccountType), account("C2", kCalDAVAccountType)});

@@ -142,5 +142,20 @@ TEST_F(AccountsManagerQueries, AfterAReplacementTheFirstOfSeveralAccountsIsStill
   EXPECT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("s")), "B");
 }
 
+TEST_F(AccountsManagerQueries, AChildThatIsAddedIsFoundByItsSyncIdentifierFromThenOn) {
+  const Store store = storeOf({mail("A")});
+  const BasicAccountReference child = syncing(calDAV("c"), "s").record();
+  ASSERT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("s")), "none");
+  store->addChild_toAccount(child, store->accountWithIdentifier("A"));
+  EXPECT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("s")), "c");
+}
+
+TEST_F(AccountsManagerQueries, AChildThatIsRemovedIsFoundByItsSyncIdentifierNoMore) {
+  const Store store = storeOf({mail("A").withChildren({syncing(calDAV("c"), "s")})});
+  ASSERT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("s")), "c");
+  store->_removeChildrenForAccountWithIdentifier(Text("A"));
+  EXPECT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("s")), "none");
+}
+
 }  // namespace
 }  // namespace accounts

@@ -238,5 +238,16 @@ TEST_F(AccountsManagerSaving, AMergeWithAbsentSidesIsLoggedAsSuch) {
                                 merge + "\"Merged to {\"a\":1}\""}));
 }
 
+TEST_F(AccountsManagerSaving, TheSidesOfAMergeAreLoggedInTheirOrder) {
+  EXPECT_EQ(AccountsManager::mergeInMemoryProperties_originalProperties_onDiskProperties(
+                {{"a", 1}}, PropertyDictionary{{"a", 2}}, PropertyDictionary{{"a", 3}}),
+            (PropertyDictionary{{"a", 1}}));
+  const std::string merge =
+      "-[AccountsManager mergeInMemoryProperties:originalProperties:onDiskProperties:] (N) ";
+  EXPECT_EQ(takeLines(),
+            (Lines{merge + "\"Merging inmem {\"a\":1} orig {\"a\":2} onDisk {\"a\":3}\"",
+                   merge + "\"Merged to {\"a\":1}\""}));
+}
+
 }  // namespace
 }  // namespace accounts

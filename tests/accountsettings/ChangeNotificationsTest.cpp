@@ -91,6 +91,39 @@ TEST_F(ChangeNotificationsTest, AnyOtherChangeNotifiesTheNotifiersOfAllThatIsEna
   EXPECT_EQ(calls_, (Calls{{"GroupwareNotifier", changes}, {"MailNotifier", changes}}));
 }
 
+TEST_F(ChangeNotificationsTest, ADataclassSwitchedOffBesideAnotherChangeNotifiesItsNotifiers) {
+  account_->setEnabledForDataclasses({kAccountDataclassContacts});
+  account_->setDisplayName("Home");
+
+  store_->saveAllAccounts();
+
+  const PropertyArray changes = {record(1, {kAccountDataclassMail})};
+  EXPECT_EQ(calls_, (Calls{{"GroupwareNotifier", changes}, {"MailNotifier", changes}}));
+}
+
+TEST_F(ChangeNotificationsTest, ARecordNamesTheTypeAndTheIdentifierThatTheAccountHasNow) {
+  const PropertyArray mailOn = {kAccountDataclassMail};
+  AccountsManager::NotificationBatch batch;
+  AccountsManager::_addNotificationToDictionary_forChangeType_originalProperties_currentProperties(
+      batch, AccountChangeType::Modified,
+      PropertyDictionary{{kAccountIdentifier, "before"}, {kAccountType, kLDAPAccountType}},
+      PropertyDictionary{{kAccountIdentifier, "now"},
+                         {kAccountType, kYahooAccountType},
+                         {kAccountEnabledDataclasses, mailOn}});
+  EXPECT_EQ(batch, (AccountsManager::NotificationBatch{{"MailNotifier", {record(1, {}, "now")}}}));
+}
+
+TEST_F(ChangeNotificationsTest, ARecordNamesTheOldTypeAndIdentifierWhereThereAreNoneNow) {
+  const PropertyArray mailOn = {kAccountDataclassMail};
+  AccountsManager::NotificationBatch batch;
+  AccountsManager::_addNotificationToDictionary_forChangeType_originalProperties_currentProperties(
+      batch, AccountChangeType::Modified,
+      PropertyDictionary{{kAccountIdentifier, "before"}, {kAccountType, kYahooAccountType}},
+      PropertyDictionary{{kAccountEnabledDataclasses, mailOn}});
+  EXPECT_EQ(batch,
+            (AccountsManager::NotificationBatch{{"MailNotifier", {record(1, {}, "before")}}}));
+}
+
 TEST_F(ChangeNotificationsTest, AnyOtherChangeOfAnAccountWithNothingEnabledNotifiesNobody) {
   account_->removeAccountPropertyForKey(kAccountEnabledDataclasses);
   store_->saveAllAccounts();

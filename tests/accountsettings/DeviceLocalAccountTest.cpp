@@ -64,6 +64,12 @@ TEST(DeviceTypeString, TheDeviceClassIsPutIntoUpperCaseWithoutBlanks) {
   EXPECT_EQ(DeviceLocalAccount::typeString(), "ON_MY_DEVICE_TYPE_HANDRA_MINI_2");
 }
 
+TEST(DeviceTypeString, EverySmallLetterOfTheDeviceClassIsPutIntoUpperCase) {
+  FakeProcess device;
+  device.deviceInfoService.answers.emplace("DeviceClass", "abcdefghijklmnopqrstuvwxyz");
+  EXPECT_EQ(DeviceLocalAccount::typeString(), "ON_MY_DEVICE_TYPE_ABCDEFGHIJKLMNOPQRSTUVWXYZ");
+}
+
 TEST(DeviceTypeString, WhatIsNoSmallLetterStaysAsItIs) {
   FakeProcess device;
   device.deviceInfoService.answers.emplace("DeviceClass", "a{Z}1");

@@ -127,6 +127,17 @@ TEST_F(OrderedAccountsTest, AssigningPutsOtherAccountsInThePlaceOfAll) {
   EXPECT_EQ(identifiers(), "C");
 }
 
+TEST_F(OrderedAccountsTest, AssignedAccountsAreFoundInTheirOwnPlaces) {
+  append("A");
+  append("B");
+  list.removeLast("nothing, but the list is indexed now");
+  list.assign({mail("B").record(), mail("C").record(), mail("A").record()});
+  const BasicAccountReference replacement = mail("Q").record();
+  EXPECT_TRUE(list.replaceAll("A", replacement));
+  EXPECT_EQ(identifiers(), "B C Q");
+  EXPECT_FALSE(list.replaceAll("A", replacement));
+}
+
 TEST_F(OrderedAccountsTest, IdentifiersDifferWhenEachAccountHasOneOfItsOwn) {
   append("A");
   append("B");
@@ -205,7 +216,7 @@ TEST_F(OrderedAccountsTest, AnySequenceOfOperationsGivesWhatPlainWalksGive) {
     const std::string& name = names[below(names.size())];
     const BasicAccountReference& record = records[below(records.size())];
     const BasicAccountReference& other = records[below(records.size())];
-    switch (below(6)) {
+    switch (below(7)) {
       case 0:
       case 1:
         list.append(record);
@@ -222,6 +233,13 @@ TEST_F(OrderedAccountsTest, AnySequenceOfOperationsGivesWhatPlainWalksGive) {
       case 4:
         list.removeLast(name);
         plain.removeLast(name);
+        break;
+      case 5:
+        // Now and then, since it makes a long list short.
+        if (below(4) == 0) {
+          list.assign({other, record, other});
+          plain.accounts = {other, record, other};
+        }
         break;
       default:
         record->setAccountProperty_forKey(name, kAccountIdentifier);
