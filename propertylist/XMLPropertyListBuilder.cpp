@@ -234,7 +234,7 @@ bool ValueBuilder::addValue(PropertyValue value, std::uint64_t expandedCount) {
 
 bool ValueBuilder::count(std::uint64_t expandedCount) {
   expandedCount_ += expandedCount;
-  return expandedCount_ <= kMaximumExpandedValueCount || fail("more values than the limit");
+  return expandedCount_ <= maximumExpandedCount_ || fail("more values than the limit");
 }
 
 }  // namespace accounts::xmlplist

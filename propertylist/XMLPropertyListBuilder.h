@@ -10,6 +10,7 @@
 
 #include "propertylist/ContentTable.h"
 #include "propertylist/KeyList.h"
+#include "propertylist/PropertyListLimits.h"
 #include "propertylist/PropertyValue.h"
 #include "propertylist/XMLPropertyListScalars.h"
 
@@ -55,6 +56,10 @@ class KeyTable {
 /// `problem()` saying why, when it is none; the builder is then of no more use.
 class ValueBuilder {
  public:
+  /// The value may stand for so many values, see kMaximumExpandedValueCount.
+  explicit ValueBuilder(std::uint64_t maximumExpandedCount = kMaximumExpandedValueCount)
+      : maximumExpandedCount_(maximumExpandedCount) {}
+
   [[nodiscard]] bool start(std::string_view elementName);
   [[nodiscard]] bool addCharacters(std::string_view characters) {
     if (scalar_) {
@@ -103,6 +108,7 @@ class ValueBuilder {
   std::string characters_;
   SharedBytesArena arena_;
   bool isInPropertyList_ = false;
+  std::uint64_t maximumExpandedCount_;
   std::uint64_t expandedCount_ = 0;
   std::string problem_;
 };

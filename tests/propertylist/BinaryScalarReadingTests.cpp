@@ -142,6 +142,7 @@ TEST(BinaryScalars, AKindThatPropertyListsDoNotHaveIsRefusedByName) {
   EXPECT_TRUE(contains(errorOf("\0"s), "a null"));
   EXPECT_TRUE(contains(errorOf("\x0F"), "a fill byte"));
   EXPECT_TRUE(contains(errorOf("\x0C\x50"), "a URL"));
+  EXPECT_TRUE(contains(errorOf("\x0D\x50\x50"), "a URL"));
   EXPECT_TRUE(contains(errorOf("\x0E" + std::string(16, 'u')), "a UUID"));
   EXPECT_TRUE(contains(errorOf("\x80\x01"), "a UID"));
   EXPECT_TRUE(contains(errorOf("\xB0"), "an ordered set"));

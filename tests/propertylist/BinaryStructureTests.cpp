@@ -257,5 +257,22 @@ TEST(BinaryStructure, AKeyThatIsNoTextIsRefused) {
   }
 }
 
+TEST(BinaryStructure, AKeyThatIsNotASCIIIsRead) {
+  BinaryFile file;
+  const std::size_t key = file.add(std::string_view("\x62\x00\xFC\x20\xAC", 5));
+  const std::size_t value = file.add("\x09");
+  file.addContainer(testing::kDictionaryOfOne, {key, value});
+
+  EXPECT_EQ(readBinary(file.build()),
+            PropertyValue(PropertyDictionary{{"\xC3\xBC\xE2\x82\xAC", true}}));
+}
+
+TEST(BinaryStructure, AKeyThatIsNotASCIIIsWrittenAndReadAgain) {
+  const PropertyValue value = PropertyDictionary{
+      {"B\xC3\xBCro", 1}, {"a", 2}, {"\xF0\x9F\x98\x80", PropertyDictionary{{"\xC3\xBC", 3}}}};
+
+  EXPECT_EQ(readBinary(testing::writeBinary(value)), value);
+}
+
 }  // namespace
 }  // namespace accounts

@@ -32,6 +32,11 @@ TEST(Description, LineBreaksAndControlCharactersOfATextAreEscaped) {
   EXPECT_EQ(describe("a\0b\x1B[31m\x7F"s), "a\\u0000b\\u001b[31m\\u007f");
 }
 
+TEST(Description, ControlCharactersAreEscapedUpToTheLastOfEachRange) {
+  EXPECT_EQ(describe("\x1F\x20~\x7F"), "\\u001f ~\\u007f");
+  EXPECT_EQ(describe("\xC2\x80\xC2\x9F\xC2\xA0"), "\\u0080\\u009f\xC2\xA0");
+}
+
 TEST(Description, LineBreaksBeyondASCIIAreEscapedToo) {
   EXPECT_EQ(describe("a\xC2\x85"
                      "b\xE2\x80\xA8"
@@ -92,6 +97,13 @@ TEST(Description, DatesAreISO8601) {
   EXPECT_EQ(describe(PropertyDate{0.25}), "\"2001-01-01T00:00:00.25Z\"");
   EXPECT_EQ(describe(PropertyDate{-0.5}), "\"2000-12-31T23:59:59.5Z\"");
   EXPECT_EQ(describe(PropertyDate{0.99999999}), "\"2001-01-01T00:00:01Z\"");
+}
+
+TEST(Description, TheCalendarReachesFromTheYear0ToTheYear9999) {
+  EXPECT_EQ(describe(PropertyDate{252'423'993'599}), "\"9999-12-31T23:59:59Z\"");
+  EXPECT_EQ(describe(PropertyDate{252'423'993'600}), "\"date 252423993600\"");
+  EXPECT_EQ(describe(PropertyDate{-63'145'526'400}), "\"0000-01-01T00:00:00Z\"");
+  EXPECT_EQ(describe(PropertyDate{-63'145'526'401}), "\"date -63145526401\"");
 }
 
 TEST(Description, DatesBeyondTheCalendarAreReadableToo) {

@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include <bit>
+#include <cmath>
 #include <limits>
 #include <string>
 #include <vector>
@@ -144,6 +145,37 @@ TEST(XMLWriting, MoreValuesThanTheLimitAreRefused) {
       PropertyArray(std::vector<PropertyValue>(kMaximumExpandedValueCount, true));
 
   EXPECT_TRUE(contains(errorOfWritingXML(value), "more values than the limit"));
+}
+
+TEST(XMLWriting, ContainersAreIndentedDownToTheSixteenthLevel) {
+  PropertyValue value = "innermost";
+  for (int level = 0; level < 18; ++level) {
+    value = PropertyArray{value};
+  }
+
+  const std::string file = writeXML(value);
+
+  const auto line = [](std::size_t blanks, const std::string& content) {
+    return "\n" + std::string(blanks, ' ') + content + "\n";
+  };
+  EXPECT_TRUE(contains(file, line(30, "<array>") + std::string(32, ' ') + "<array>\n" +
+                                 std::string(32, ' ') + "<array>\n" + std::string(32, ' ') +
+                                 "<string>innermost</string>\n"));
+  EXPECT_FALSE(contains(file, std::string(33, ' ')));
+}
+
+TEST(XMLWriting, AnErrorOfTheOutermostValueNamesTheRoot) {
+  EXPECT_EQ(errorOfWritingXML("\x01"),
+            "XML property list: cannot write a text with a character that XML cannot hold at /");
+}
+
+TEST(XMLWriting, TheSignOfAValueThatIsNoNumberIsKept) {
+  const double negative = std::copysign(std::numeric_limits<double>::quiet_NaN(), -1.0);
+
+  EXPECT_TRUE(contains(writeXML(negative), "<real>-nan</real>"));
+  EXPECT_TRUE(contains(writeXML(std::numeric_limits<double>::quiet_NaN()), "<real>nan</real>"));
+  expectKept(negative);
+  EXPECT_NE(PropertyValue(negative), PropertyValue(std::numeric_limits<double>::quiet_NaN()));
 }
 
 }  // namespace
