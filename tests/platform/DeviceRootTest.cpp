@@ -75,6 +75,15 @@ TEST_F(DeviceRootTest, LinksThatGoInACircleAreAnError) {
   EXPECT_EQ(error.number, ELOOP);
 }
 
+TEST_F(DeviceRootTest, ALinkOfTheKernelsOwnIsNotFollowed) {
+  const auto systemRoot = DeviceRoot::openRoot("/", error);
+  ASSERT_TRUE(systemRoot);
+  for (const std::string_view link : {"/proc/self/exe", "/proc/self/root/etc/passwd"}) {
+    EXPECT_EQ(systemRoot->readFile(link, error), std::nullopt);
+    EXPECT_EQ(error.number, ELOOP) << error.text;
+  }
+}
+
 TEST_F(DeviceRootTest, AnErrorNamesTheDevicePathAndTheReason) {
   EXPECT_EQ(read("/etc/name"), std::nullopt);
   EXPECT_EQ(error.text, "Cannot open /etc/name: No such file or directory");

@@ -1,8 +1,10 @@
 #include "platform/linux/OwnerNames.h"
 
 #include <gtest/gtest.h>
+#include <nss.h>
 #include <unistd.h>
 
+#include <cstdlib>
 #include <filesystem>
 
 #include "platform/linux/LinuxFileSystem.h"
@@ -99,6 +101,22 @@ TEST_F(OwnerNamesTest, TheRunningSystemAsksItsNameService) {
   EXPECT_EQ(systemNames.userIdentifier("no such user here", error), std::nullopt);
   EXPECT_EQ(error.text,
             "Cannot find \"no such user here\" in /etc/passwd: There is no usable entry");
+}
+
+// The name service is set to one that knows nobody, which cannot be undone.
+TEST_F(OwnerNamesTest, TheRunningSystemAsksItsNameServiceAndNotItsFiles) {
+  const auto systemRoot = DeviceRoot::openRoot("/", error);
+  ASSERT_TRUE(systemRoot);
+  EXPECT_EXIT(
+      {
+        ::__nss_configure_lookup("passwd", "none");
+        ::__nss_configure_lookup("group", "none");
+        OwnerNames systemNames(*systemRoot);
+        const auto user = systemNames.userIdentifier("root", error);
+        const auto group = systemNames.groupIdentifier("root", error);
+        std::_Exit((user ? 1 : 0) + (group ? 2 : 0));
+      },
+      ::testing::ExitedWithCode(0), "");
 }
 
 class SetOwnerTest : public DeviceFixture {

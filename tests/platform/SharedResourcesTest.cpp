@@ -1,19 +1,16 @@
 #include <fcntl.h>
 #include <gtest/gtest.h>
-#include <pthread.h>
 #include <sys/file.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include <atomic>
 #include <cerrno>
 #include <csignal>
-#include <fstream>
-#include <thread>
 
 #include "platform/linux/FileDescriptor.h"
 #include "platform/linux/LinuxSharedResources.h"
 #include "tests/platform/DeviceFixture.h"
+#include "tests/platform/WaitingThread.h"
 
 namespace accounts {
 namespace {
@@ -83,7 +80,8 @@ TEST_F(SharedResourcesTest, TheSharedDirectoryIsTheMobileUsersOne) {
 }
 
 TEST_F(SharedResourcesTest, ANewLockMakesItsFileAndIsNotHeld) {
-  ASSERT_TRUE(resources.makeLock(kName));
+  const auto lock = resources.makeLock(kName);
+  ASSERT_TRUE(lock);
   EXPECT_EQ(contentsOf(kLockFile), "");
   EXPECT_FALSE(isHeld());
 }
@@ -201,48 +199,17 @@ TEST_F(SharedResourcesTest, ANameWithASeparatorIsNoLock) {
   EXPECT_FALSE(resources.makeLock(""));
 }
 
-std::atomic<int> signalsReceived = 0;
-
-// The state letter of a thread of this process; 'S' while it waits in the kernel.
-char stateOfThread(pid_t thread) {
-  std::ifstream file("/proc/self/task/" + std::to_string(thread) + "/stat");
-  std::string line;
-  std::getline(file, line);
-  const std::size_t afterName = line.rfind(") ");
-  return afterName == std::string::npos ? '?' : line[afterName + 2];
-}
-
 TEST_F(SharedResourcesTest, ASignalDoesNotEndTheWait) {
-  struct sigaction interrupting = {};
-  interrupting.sa_handler = [](int) { ++signalsReceived; };
-  ASSERT_EQ(::sigaction(SIGUSR1, &interrupting, nullptr), 0);
   HoldingProcess holder(resources);
   const auto lock = resources.makeLock(kName);
-  std::atomic<pid_t> waiterIdentifier = 0;
-  std::atomic<bool> locked = false;
-  std::thread waiter([&] {
-    waiterIdentifier = ::gettid();
-    lock->lock();
-    locked = true;
-  });
-  const auto waitUntilItWaits = [&] {
-    while (!locked && (waiterIdentifier == 0 || stateOfThread(waiterIdentifier) != 'S')) {
-      std::this_thread::yield();
-    }
-  };
+  WaitingThread waiter([&] { lock->lock(); });
 
-  waitUntilItWaits();
-  ::pthread_kill(waiter.native_handle(), SIGUSR1);
-  while (signalsReceived == 0) {
-    std::this_thread::yield();
-  }
-  waitUntilItWaits();
+  waiter.interrupt();
 
-  EXPECT_FALSE(locked);
+  EXPECT_FALSE(waiter.hasEnded());
   holder.die();
   waiter.join();
-  EXPECT_TRUE(locked);
-  std::signal(SIGUSR1, SIG_DFL);
+  EXPECT_TRUE(isHeld());
 }
 
 }  // namespace
