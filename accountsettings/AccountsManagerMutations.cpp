@@ -33,8 +33,13 @@ void AccountsManager::updateAccount(const BasicAccountReference& account) {
                [&] { return logArguments(propertiesToLog(account)); });
   const BasicAccountReference updated = account;
   const std::optional<Text> identifier = updated->identifier();
-  if (identifier && _orderedTopLevelAccounts.replaceAll(*identifier, updated)) {
+  const std::size_t places =
+      identifier ? _orderedTopLevelAccounts.replaceAll(*identifier, updated) : 0;
+  if (places > 0) {
     _topLevelAccountsByID.set(*identifier, updated);
+  }
+  // Again for each place that the account takes: the lines about its children say so.
+  for (std::size_t place = 0; place < places; ++place) {
     _loadChildrenFromAccount(updated);
   }
 }

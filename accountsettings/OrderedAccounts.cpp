@@ -89,17 +89,18 @@ void OrderedAccounts::assign(std::vector<BasicAccountReference> accounts) {
   }
 }
 
-bool OrderedAccounts::replaceAll(std::string_view identifier,
-                                 const BasicAccountReference& account) {
+std::size_t OrderedAccounts::replaceAll(std::string_view identifier,
+                                        const BasicAccountReference& account) {
   bringIndexesUpToDate();
   const PlaceNumbers* places = placesByIdentifier_.find(identifier);
   if (places == nullptr) {
-    return false;
+    return 0;
   }
-  for (const PlaceNumber number : places->all()) {
+  const std::vector<PlaceNumber> numbers = places->all();
+  for (const PlaceNumber number : numbers) {
     replaceAt(number, account);
   }
-  return true;
+  return numbers.size();
 }
 
 bool OrderedAccounts::replaceFirst(const BasicAccountReference& oldAccount,

@@ -32,8 +32,8 @@ class OrderedAccounts {
   void append(BasicAccountReference account);
   /// Puts other accounts in the place of all.
   void assign(std::vector<BasicAccountReference> accounts);
-  /// Puts a record in every place whose account has the identifier. False when there is none.
-  bool replaceAll(std::string_view identifier, const BasicAccountReference& account);
+  /// Puts a record in every place whose account has the identifier; gives the number of places.
+  std::size_t replaceAll(std::string_view identifier, const BasicAccountReference& account);
   /// Puts a record in the first place of another one. False when that is not in the list.
   bool replaceFirst(const BasicAccountReference& oldAccount,
                     const BasicAccountReference& newAccount);

@@ -64,6 +64,15 @@ TEST_F(AccountsManagerMutations, AnUpdateTakesEveryPlaceOfTheIdentifier) {
   EXPECT_EQ(store->allBasicAccounts()[2], account);
 }
 
+TEST_F(AccountsManagerMutations, AnUpdateLoadsTheChildrenOnceForEachPlaceThatItTakes) {
+  const Store store = storeOf({mail("A"), mail("B"), mail("A")});
+  store->updateAccount(mail("A").withChildren({17}).record());
+  const std::string ignoring =
+      R"(-[AccountsManager _loadChildrenFromAccount:] (N) "Ignoring unknown child account with )"
+      R"(properties 17")";
+  EXPECT_EQ(takeLinesOf("-[AccountsManager _loadChildren"), (Lines{ignoring, ignoring}));
+}
+
 TEST_F(AccountsManagerMutations, AnUpdateOfAnAccountThatIsNotThereAddsNothing) {
   const Store store = storeOf({mail("A")});
   store->updateAccount(mail("B").withChildren({calDAV("c")}).record());

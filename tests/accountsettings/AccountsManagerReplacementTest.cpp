@@ -240,6 +240,18 @@ TEST_F(AccountsManagerReplacement, AChildThatIsReplacedHasItsParentsChildrenLoad
   EXPECT_EQ(takeLines(), (Lines{replacingLine, ignoringLine("17"), ignoringLine("17")}));
 }
 
+TEST_F(AccountsManagerReplacement, AnUnknownChildIsNamedEachTimeThatTheChildrenAreGoneThrough) {
+  const Store store = storeOf({mail("A").withChildren({ofUnknownType("x"), calDAV("c")})});
+  takeLines();
+  store->replaceAccountsWithTypes_withAccounts({}, {childOf("A", calDAV("c"))});
+  const std::string invalid =
+      R"(-[BasicAccount initWithProperties:] (N) "Invalid account type: Carrier Pigeon")";
+  const std::string ignoring =
+      ignoringLine(R"({"Class":"PigeonAccount","Identifier":"x","Type":"Carrier Pigeon"})");
+  // To find the child, to load the children without it, and to load them with the new one.
+  EXPECT_EQ(takeLines(), (Lines{replacingLine, invalid, invalid, ignoring, invalid, ignoring}));
+}
+
 TEST_F(AccountsManagerReplacement, EachNewChildHasItsParentsChildrenLoaded) {
   const Store store = storeOf({mail("A").withChildren({17}), mail("B").withChildren({18})});
   takeLines();

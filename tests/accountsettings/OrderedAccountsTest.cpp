@@ -31,7 +31,7 @@ TEST_F(OrderedAccountsTest, AReplacedAccountLeavesItsPlaceToTheNewOne) {
   append("A");
   append("B");
   const BasicAccountReference replacement = mail("A").record();
-  EXPECT_TRUE(list.replaceAll("A", replacement));
+  EXPECT_EQ(list.replaceAll("A", replacement), 1u);
   EXPECT_EQ(identifiers(), "A B");
   EXPECT_EQ(list.accounts().front(), replacement);
 }
@@ -41,14 +41,14 @@ TEST_F(OrderedAccountsTest, EveryPlaceOfAnIdentifierIsReplaced) {
   append("B");
   append("A");
   const BasicAccountReference replacement = mail("A").record();
-  EXPECT_TRUE(list.replaceAll("A", replacement));
+  EXPECT_EQ(list.replaceAll("A", replacement), 2u);
   EXPECT_EQ(list.accounts()[0], replacement);
   EXPECT_EQ(list.accounts()[2], replacement);
 }
 
 TEST_F(OrderedAccountsTest, ReplacingAnUnknownIdentifierChangesNothing) {
   append("A");
-  EXPECT_FALSE(list.replaceAll("B", mail("B").record()));
+  EXPECT_EQ(list.replaceAll("B", mail("B").record()), 0u);
   EXPECT_EQ(identifiers(), "A");
 }
 
@@ -133,9 +133,9 @@ TEST_F(OrderedAccountsTest, AssignedAccountsAreFoundInTheirOwnPlaces) {
   list.removeLast("nothing, but the list is indexed now");
   list.assign({mail("B").record(), mail("C").record(), mail("A").record()});
   const BasicAccountReference replacement = mail("Q").record();
-  EXPECT_TRUE(list.replaceAll("A", replacement));
+  EXPECT_EQ(list.replaceAll("A", replacement), 1u);
   EXPECT_EQ(identifiers(), "B C Q");
-  EXPECT_FALSE(list.replaceAll("A", replacement));
+  EXPECT_EQ(list.replaceAll("A", replacement), 0u);
 }
 
 TEST_F(OrderedAccountsTest, IdentifiersDifferWhenEachAccountHasOneOfItsOwn) {
