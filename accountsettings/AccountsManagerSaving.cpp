@@ -25,26 +25,24 @@ PropertyArray accountsOnDisk() {
   return root ? root->arrayForKey(kPlistAccountsKey).value_or(PropertyArray()) : PropertyArray();
 }
 
-/// The bytes of the account settings file, valid until the platform's property lists are used
-/// again; none, with a channel line, when they cannot be made.
-BytesInPieces serialize(const PropertyDictionary& root) {
-  BytesInPieces bytes;
+/// What the account settings file is to hold; none, with a channel line, when it cannot be written.
+SerializedPropertyList serialize(const PropertyDictionary& root) {
+  SerializedPropertyList serialized;
   const Result serialization =
-      Process::current().platform.propertyLists.serializeBinary(root, bytes);
-  if (!serialization || bytes.size() == 0) {
+      Process::current().platform.propertyLists.serializeBinary(root, serialized);
+  if (!serialized) {
     logToChannel(saveOperation, "Failed to serialize account settings data: %@", [&] {
       return logArguments(serialization ? std::optional<Text>() : Text(serialization.error()));
     });
-    return BytesInPieces();
   }
-  return bytes;
+  return serialized;
 }
 
 /// Fills the temporary file and moves it over the account settings file. False when a step fails.
-bool writeThroughTemporaryFile(const BytesInPieces& bytes, const std::string& temporaryPath,
-                               const std::string& path) {
+bool writeThroughTemporaryFile(const SerializedPropertyList& contents,
+                               const std::string& temporaryPath, const std::string& path) {
   FileSystem& fileSystem = Process::current().platform.fileSystem;
-  if (bytes.size() == 0 || !fileSystem.writeFile(temporaryPath, bytes)) {
+  if (!contents || !fileSystem.writeFile(temporaryPath, contents)) {
     return false;
   }
   const Result attributes = fileSystem.setOwnerAndGroup(temporaryPath, fileOwner, fileOwner);
@@ -61,10 +59,10 @@ bool writeThroughTemporaryFile(const BytesInPieces& bytes, const std::string& te
 /// that fails.
 bool writeSettingsFile(const PropertyDictionary& root) {
   FileSystem& fileSystem = Process::current().platform.fileSystem;
-  const BytesInPieces bytes = serialize(root);
+  const SerializedPropertyList contents = serialize(root);
   const std::string path = AccountsManager::fullPathToAccountSettingsPlist();
   const std::optional<std::string> temporaryPath = fileSystem.makeTemporaryFile();
-  if (temporaryPath && writeThroughTemporaryFile(bytes, *temporaryPath, path)) {
+  if (temporaryPath && writeThroughTemporaryFile(contents, *temporaryPath, path)) {
     return true;
   }
   logToChannel(saveOperation, "Failed to save accounts to filesystem.");

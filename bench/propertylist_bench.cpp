@@ -97,9 +97,7 @@ void writeBinaryInPieces(benchmark::State& state) {
   PropertyListError error;
   const PropertyValue value = readBinaryPropertyList(binaryFile(), error).value();
   for (auto _ : state) {
-    BinaryPropertyListWriter writer;
-    const BytesInPieces bytes = writer.write(value, error).value();
-    const bool areTaken = bytes.giveTo([](std::string_view piece) {
+    const bool areTaken = giveBinaryPropertyList(value, [](std::string_view piece) {
       benchmark::DoNotOptimize(piece.data());
       return true;
     });

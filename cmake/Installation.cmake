@@ -22,7 +22,7 @@ install(DIRECTORY ${PROJECT_SOURCE_DIR}/docs
   FILES_MATCHING PATTERN "*.md")
 
 # Parts of these libraries are in the programs; their licences ask for these notices then.
-foreach(library libcli11-dev libfmt-dev libxxhash-dev nlohmann-json3-dev)
+foreach(library libcli11-dev libfmt-dev nlohmann-json3-dev)
   install(FILES /usr/share/doc/${library}/copyright RENAME ${library}
     DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration/licences
     COMPONENT ${programs_component})

@@ -154,11 +154,11 @@ void AccountsDataMigrator::_saveCollatedMigrationInformation() {
   // Kept on purpose: ".txt" for a binary property list; the name is what collectors look for.
   const std::string name = "AccountMigrationInformation-" +
                            platform.dateFormatter.currentDate(informationDatePattern) + ".txt";
-  BytesInPieces bytes;
-  if (platform.propertyLists.serializeBinary(*_collatedMigrationData, bytes)) {
+  SerializedPropertyList information;
+  if (platform.propertyLists.serializeBinary(*_collatedMigrationData, information)) {
     // The file is a help for engineers: a migration never fails for want of it, nor reports it.
     static_cast<void>(
-        platform.fileSystem.writeFileAtomically(pathByAppending(directory, name), bytes));
+        platform.fileSystem.writeFileAtomically(pathByAppending(directory, name), information));
   }
 }
 

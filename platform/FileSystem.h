@@ -7,7 +7,7 @@
 #include <vector>
 
 #include "platform/Result.h"
-#include "propertylist/BytesInPieces.h"
+#include "propertylist/SerializedPropertyList.h"
 
 namespace accounts {
 
@@ -71,11 +71,12 @@ class FileSystem {
   /// maker still runs stays, and so does everything else. Failures leave a file for the next time.
   virtual void removeAbandonedTemporaryFiles(
       const std::vector<std::string>& furtherDirectories) = 0;
-  /// Writes contents to a path in place: after a failure the file may hold a part of them.
-  virtual Result writeFile(std::string_view path, const BytesInPieces& contents) = 0;
-  /// Writes contents to a path so that a reader sees the old file or the whole new one, never a
-  /// part.
-  virtual Result writeFileAtomically(std::string_view path, const BytesInPieces& contents) = 0;
+  /// Writes a property list to a path in place: after a failure the file may hold a part of it.
+  virtual Result writeFile(std::string_view path, const SerializedPropertyList& contents) = 0;
+  /// Writes a property list to a path so that a reader sees the old file or the whole new one,
+  /// never a part.
+  virtual Result writeFileAtomically(std::string_view path,
+                                     const SerializedPropertyList& contents) = 0;
   /// Gives a file to the user and the group with these account names.
   virtual Result setOwnerAndGroup(std::string_view path, std::string_view ownerName,
                                   std::string_view groupName) = 0;

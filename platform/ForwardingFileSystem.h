@@ -46,10 +46,11 @@ class ForwardingFileSystem : public FileSystem {
   void removeAbandonedTemporaryFiles(const std::vector<std::string>& furtherDirectories) override {
     files_.removeAbandonedTemporaryFiles(furtherDirectories);
   }
-  Result writeFile(std::string_view path, const BytesInPieces& contents) override {
+  Result writeFile(std::string_view path, const SerializedPropertyList& contents) override {
     return files_.writeFile(path, contents);
   }
-  Result writeFileAtomically(std::string_view path, const BytesInPieces& contents) override {
+  Result writeFileAtomically(std::string_view path,
+                             const SerializedPropertyList& contents) override {
     return files_.writeFileAtomically(path, contents);
   }
   Result setOwnerAndGroup(std::string_view path, std::string_view ownerName,

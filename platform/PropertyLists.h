@@ -4,8 +4,8 @@
 #include <string_view>
 
 #include "platform/Result.h"
-#include "propertylist/BytesInPieces.h"
 #include "propertylist/PropertyValue.h"
+#include "propertylist/SerializedPropertyList.h"
 
 namespace accounts {
 
@@ -19,10 +19,10 @@ class PropertyLists {
   /// dictionary.
   virtual std::optional<PropertyDictionary> readDictionary(std::string_view path) = 0;
 
-  /// Gives the bytes of a value in the binary format, which are valid until the next call of an
-  /// operation. Fails, leaving `bytes` empty, for a value that no reader would take back (one
-  /// nested too deeply).
-  virtual Result serializeBinary(const PropertyValue& value, BytesInPieces& bytes) = 0;
+  /// Makes of a value what is written in the binary format; its bytes are made when it is. Fails,
+  /// leaving `serialized` none, for a value that no reader would take back (PropertyListLimits.h).
+  virtual Result serializeBinary(const PropertyValue& value,
+                                 SerializedPropertyList& serialized) = 0;
 };
 
 }  // namespace accounts

@@ -116,7 +116,7 @@ class File::EncodedKeys {
 class Output {
  public:
   /// The piece has room for a trailer at least. The arguments must outlive this.
-  Output(std::span<char> piece, const BytesInPieces::Taker& take)
+  Output(std::span<char> piece, const SerializedPropertyList::Taker& take)
       : begin_(piece.data()), place_(begin_), end_(begin_ + piece.size()), take_(take) {}
 
   /// How many bytes were put down.
@@ -236,7 +236,7 @@ class Output {
   char* end_;
   std::size_t passedOn_ = 0;
   bool isRefused_ = false;
-  const BytesInPieces::Taker& take_;
+  const SerializedPropertyList::Taker& take_;
 };
 
 File::File(const Catalogue& catalogue, Catalogue::Reference top)
@@ -261,13 +261,11 @@ std::size_t File::size() const {
   return table_ + objectCount() * offsetSize_ + kTrailerSize;
 }
 
-BytesInPieces File::bytes() const {
-  return {size(), [this](const BytesInPieces::Taker& take) {
-            std::string piece(std::min(size(), kPieceSize), '\0');
-            Output output(piece, take);
-            write(output);
-            return !output.isRefused();
-          }};
+bool File::giveTo(const SerializedPropertyList::Taker& take) const {
+  std::string piece(std::min(size(), kPieceSize), '\0');
+  Output output(piece, take);
+  write(output);
+  return !output.isRefused();
 }
 
 void File::write(Output& output) const {

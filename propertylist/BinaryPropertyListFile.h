@@ -5,7 +5,7 @@
 
 #include "propertylist/BinaryPropertyListCatalogue.h"
 #include "propertylist/BinaryPropertyListFileOrder.h"
-#include "propertylist/BytesInPieces.h"
+#include "propertylist/SerializedPropertyList.h"
 
 namespace accounts::binaryplist {
 
@@ -19,12 +19,13 @@ class File {
   File(const Catalogue& catalogue, Catalogue::Reference top);
 
   [[nodiscard]] std::size_t objectCount() const { return order_.objectCount(); }
-  /// The bytes, made whenever they are asked for; valid as long as this.
-  [[nodiscard]] BytesInPieces bytes() const;
+  /// How many bytes it has.
+  [[nodiscard]] std::size_t size() const;
+  /// Passes the bytes to a taker as a serialised property list does.
+  [[nodiscard]] bool giveTo(const SerializedPropertyList::Taker& take) const;
 
  private:
   class EncodedKeys;
-  [[nodiscard]] std::size_t size() const;
   void write(Output& output) const;
   template <std::size_t OffsetSize>
   void writeObjectsAndTable(Output& output) const;

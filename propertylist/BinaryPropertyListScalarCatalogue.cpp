@@ -31,17 +31,6 @@ Number numberOf(const PropertyValue& value) {
   return {ScalarKind::LargeInteger, *value.asLargeUnsigned()};
 }
 
-bool isGeneralisedUTF8(std::string_view text) {
-  while (!text.empty()) {
-    const std::size_t length = decodeCodePoint(text).length;
-    if (length == 0) {
-      return false;
-    }
-    text.remove_prefix(length);
-  }
-  return true;
-}
-
 }  // namespace
 
 ScalarCatalogue::Announced ScalarCatalogue::announce(const PropertyValue& scalar) const {

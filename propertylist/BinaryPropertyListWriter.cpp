@@ -1,5 +1,3 @@
-#include <utility>
-
 #include "propertylist/BinaryPropertyList.h"
 #include "propertylist/BinaryPropertyListCatalogue.h"
 #include "propertylist/BinaryPropertyListFile.h"
@@ -13,36 +11,24 @@ std::optional<std::string> writeBinaryPropertyList(const PropertyValue& value,
                                                    PropertyListError& error) {
   Catalogue catalogue;
   const std::optional<Catalogue::Reference> top = catalogue.add(value, error);
-  return top ? std::optional(File(catalogue, *top).bytes().whole()) : std::nullopt;
+  if (!top) {
+    return std::nullopt;
+  }
+  const File file(catalogue, *top);
+  std::string bytes;
+  bytes.reserve(file.size());
+  static_cast<void>(file.giveTo([&bytes](std::string_view piece) {
+    bytes.append(piece);
+    return true;
+  }));
+  return bytes;
 }
 
-BinaryPropertyListWriter::BinaryPropertyListWriter() = default;
-
-BinaryPropertyListWriter::~BinaryPropertyListWriter() = default;
-
-std::optional<BytesInPieces> BinaryPropertyListWriter::write(const PropertyValue& value,
-                                                             PropertyListError& error) {
-  if (file_ != nullptr && value == lastValue_) {
-    return file_->bytes();
-  }
-  const std::size_t lastObjectCount = file_ != nullptr ? file_->objectCount() : 0;
-  file_.reset();
-  // Kept again only once the value is in it: nothing that ends halfway leaves half of it here.
-  std::unique_ptr<Catalogue> catalogue = std::move(catalogue_);
-  // More than as much again that only earlier values had is not worth its memory.
-  const bool isFirst = catalogue == nullptr || catalogue->objectCount() > 2 * lastObjectCount;
-  if (isFirst) {
-    catalogue = std::make_unique<Catalogue>();
-  }
-  const std::optional<Catalogue::Reference> top = catalogue->add(value, error);
-  if (!top) {
-    // What was written before may have used up the room for objects.
-    return isFirst ? std::nullopt : write(value, error);
-  }
-  file_ = std::make_unique<File>(*catalogue, *top);
-  catalogue_ = std::move(catalogue);
-  lastValue_ = value;
-  return file_->bytes();
+bool giveBinaryPropertyList(const PropertyValue& value, const SerializedPropertyList::Taker& take) {
+  PropertyListError error;
+  Catalogue catalogue;
+  const std::optional<Catalogue::Reference> top = catalogue.add(value, error);
+  return top && File(catalogue, *top).giveTo(take);
 }
 
 }  // namespace accounts

@@ -76,6 +76,18 @@ inline DecodedCodePoint decodeCodePoint(std::string_view text) {
   return {};
 }
 
+/// Whether a text is well-formed in it.
+inline bool isGeneralisedUTF8(std::string_view text) {
+  while (!text.empty()) {
+    const std::size_t length = decodeCodePoint(text).length;
+    if (length == 0) {
+      return false;
+    }
+    text.remove_prefix(length);
+  }
+  return true;
+}
+
 /// Appends a code point, surrogates included, as generalised UTF-8.
 inline void appendCodePoint(std::string& text, char32_t codePoint) {
   const auto append = [&](char32_t byte) { text.push_back(static_cast<char>(byte)); };

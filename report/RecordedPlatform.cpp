@@ -44,10 +44,11 @@ class RecordedFileSystem final : public ForwardingFileSystem {
     }
     return path;
   }
-  Result writeFile(std::string_view path, const BytesInPieces& contents) override {
+  Result writeFile(std::string_view path, const SerializedPropertyList& contents) override {
     return recorded("written", path, ForwardingFileSystem::writeFile(path, contents));
   }
-  Result writeFileAtomically(std::string_view path, const BytesInPieces& contents) override {
+  Result writeFileAtomically(std::string_view path,
+                             const SerializedPropertyList& contents) override {
     return recorded("written", path, ForwardingFileSystem::writeFileAtomically(path, contents));
   }
   Result setOwnerAndGroup(std::string_view path, std::string_view ownerName,

@@ -52,23 +52,6 @@ bool readBlocks(const FileDescriptor& file, std::string_view path, PathError& er
   }
 }
 
-// Writes one piece as writeAll writes all.
-int writePiece(int descriptor, std::string_view bytes) {
-  while (!bytes.empty()) {
-    const ssize_t count = ::write(descriptor, bytes.data(), bytes.size());
-    if (count >= 0) {
-      bytes.remove_prefix(static_cast<std::size_t>(count));
-    } else if (errno == EAGAIN) {
-      // Standard error may be a pipe that another program made non-blocking.
-      pollfd writable = {descriptor, POLLOUT, 0};
-      ::poll(&writable, 1, -1);
-    } else if (errno != EINTR) {
-      return errno;
-    }
-  }
-  return 0;
-}
-
 }  // namespace
 
 std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_view path,
@@ -94,12 +77,6 @@ std::optional<std::string> readContents(const FileDescriptor& file, std::string_
   return isRead ? std::optional(std::move(bytes)) : std::nullopt;
 }
 
-bool readInPieces(const FileDescriptor& file, std::string_view path, PathError& error,
-                  const BytesInPieces::Taker& take) {
-  return readBlocks(file, path, error,
-                    [&](std::string_view block, std::size_t) { return take(block); });
-}
-
 std::optional<std::string> readHostFile(const std::string& path, PathError& error) {
   const int number = ::open(path.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC | O_NOCTTY);
   if (number < 0) {
@@ -118,13 +95,30 @@ std::optional<std::string> readHostFile(const std::string& path, PathError& erro
   return readContents(file, path, error);
 }
 
-int writeAll(int descriptor, const BytesInPieces& bytes) {
+int writeAll(int descriptor, std::string_view bytes) {
+  while (!bytes.empty()) {
+    const ssize_t count = ::write(descriptor, bytes.data(), bytes.size());
+    if (count >= 0) {
+      bytes.remove_prefix(static_cast<std::size_t>(count));
+    } else if (errno == EAGAIN) {
+      // Standard error may be a pipe that another program made non-blocking.
+      pollfd writable = {descriptor, POLLOUT, 0};
+      ::poll(&writable, 1, -1);
+    } else if (errno != EINTR) {
+      return errno;
+    }
+  }
+  return 0;
+}
+
+int writeAll(int descriptor, const SerializedPropertyList& contents) {
   int number = 0;
-  static_cast<void>(bytes.giveTo([&](std::string_view piece) {
-    number = writePiece(descriptor, piece);
+  const bool isWhole = contents.giveTo([&](std::string_view piece) {
+    number = writeAll(descriptor, piece);
     return number == 0;
-  }));
-  return number;
+  });
+  // Half a file is never taken for a whole one, whatever kept its bytes from being made.
+  return isWhole || number != 0 ? number : EIO;
 }
 
 bool copyContents(const FileDescriptor& source, std::string_view sourcePath,

@@ -7,7 +7,7 @@
 
 #include "platform/linux/FileDescriptor.h"
 #include "platform/linux/PathError.h"
-#include "propertylist/BytesInPieces.h"
+#include "propertylist/SerializedPropertyList.h"
 
 namespace accounts {
 
@@ -24,18 +24,15 @@ std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_vi
 std::optional<std::string> readContents(const FileDescriptor& file, std::string_view path,
                                         PathError& error);
 
-/// The same bytes piece by piece: passes them to `take` until it returns false. Returns whether all
-/// were read and taken; `error` is set when it was the reading that failed.
-bool readInPieces(const FileDescriptor& file, std::string_view path, PathError& error,
-                  const BytesInPieces::Taker& take);
-
 /// The bytes of a regular file of the host, outside any device root. None, with `error` set, when
 /// it is missing, unreadable, too large or no regular file; opening never waits.
 std::optional<std::string> readHostFile(const std::string& path, PathError& error);
 
 /// Writes all bytes to an open file, waiting for it where it must, and returns 0 or the error
 /// number. A part may have been written after a failure.
-int writeAll(int descriptor, const BytesInPieces& bytes);
+int writeAll(int descriptor, std::string_view bytes);
+/// The same for the bytes of a property list, which are made as they are written.
+int writeAll(int descriptor, const SerializedPropertyList& contents);
 
 /// Copies the bytes of one open regular file to another; at most kLargestFileSize. Returns whether
 /// it did; `error` says why not.

@@ -75,7 +75,7 @@ Result LinuxFileSystem::removeFile(std::string_view path) {
 }
 
 Result LinuxFileSystem::createFile(std::string_view path, std::string_view contents) {
-  return writeFileAtomically(path, contents);
+  return replaceFile(path, contents);
 }
 
 Result LinuxFileSystem::createDirectoryWithIntermediates(std::string_view path,
@@ -105,7 +105,7 @@ Result LinuxFileSystem::createDirectoryWithIntermediates(std::string_view path,
                                                                                : asResult(error);
 }
 
-Result LinuxFileSystem::writeFile(std::string_view path, const BytesInPieces& contents) {
+Result LinuxFileSystem::writeFile(std::string_view path, const SerializedPropertyList& contents) {
   PathError error;
   const auto entry = entryOf(path, error);
   if (!entry) {
@@ -124,7 +124,13 @@ Result LinuxFileSystem::writeFile(std::string_view path, const BytesInPieces& co
   return asResult("write", path, writeAll(file->number(), contents));
 }
 
-Result LinuxFileSystem::writeFileAtomically(std::string_view path, const BytesInPieces& contents) {
+Result LinuxFileSystem::writeFileAtomically(std::string_view path,
+                                            const SerializedPropertyList& contents) {
+  return replaceFile(path, contents);
+}
+
+template <class Contents>
+Result LinuxFileSystem::replaceFile(std::string_view path, const Contents& contents) {
   PathError error;
   const auto destination = root_.locate(path, error);
   // In the target's own directory, so that both are on one file system.

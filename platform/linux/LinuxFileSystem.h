@@ -51,8 +51,9 @@ class LinuxFileSystem final : public FileSystem {
   /// A maker holds a lock (flock) on its file until it renames or removes it, or ends. Where the
   /// file system has no such locks, no file counts as abandoned.
   void removeAbandonedTemporaryFiles(const std::vector<std::string>& furtherDirectories) override;
-  Result writeFile(std::string_view path, const BytesInPieces& contents) override;
-  Result writeFileAtomically(std::string_view path, const BytesInPieces& contents) override;
+  Result writeFile(std::string_view path, const SerializedPropertyList& contents) override;
+  Result writeFileAtomically(std::string_view path,
+                             const SerializedPropertyList& contents) override;
   Result setOwnerAndGroup(std::string_view path, std::string_view ownerName,
                           std::string_view groupName) override;
   /// When only flushing the destination's directory fails, the file has been moved although the
@@ -60,6 +61,8 @@ class LinuxFileSystem final : public FileSystem {
   Result renameFile(std::string_view source, std::string_view destination) override;
 
  private:
+  template <class Contents>
+  Result replaceFile(std::string_view path, const Contents& contents);
   void removeAbandonedTemporaryFilesIn(const std::string& directory);
   /// As `DeviceRoot::locate`, but a temporary file is found in the directory in which it was made,
   /// without looking the directory up again. Null, with `error` set, for none.

@@ -193,13 +193,13 @@ std::optional<std::string> OverlayFileSystem::makeTemporaryFile() {
 void OverlayFileSystem::removeAbandonedTemporaryFiles(
     const std::vector<std::string>& /*furtherDirectories*/) {}
 
-Result OverlayFileSystem::writeFile(std::string_view path, const BytesInPieces& contents) {
-  return createFile(path, contents.whole());
+Result OverlayFileSystem::writeFile(std::string_view path, const SerializedPropertyList& contents) {
+  return createFile(path, bytesOf(contents));
 }
 
 Result OverlayFileSystem::writeFileAtomically(std::string_view path,
-                                              const BytesInPieces& contents) {
-  return createFile(path, contents.whole());
+                                              const SerializedPropertyList& contents) {
+  return createFile(path, bytesOf(contents));
 }
 
 Result OverlayFileSystem::setOwnerAndGroup(std::string_view path, std::string_view ownerName,

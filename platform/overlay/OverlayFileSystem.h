@@ -62,8 +62,9 @@ class OverlayFileSystem final : public FileSystem {
   std::optional<std::string> makeTemporaryFile() override;
   /// Does nothing: what is abandoned is not known without a look at other processes' locks.
   void removeAbandonedTemporaryFiles(const std::vector<std::string>& furtherDirectories) override;
-  Result writeFile(std::string_view path, const BytesInPieces& contents) override;
-  Result writeFileAtomically(std::string_view path, const BytesInPieces& contents) override;
+  Result writeFile(std::string_view path, const SerializedPropertyList& contents) override;
+  Result writeFileAtomically(std::string_view path,
+                             const SerializedPropertyList& contents) override;
   Result setOwnerAndGroup(std::string_view path, std::string_view ownerName,
                           std::string_view groupName) override;
   Result renameFile(std::string_view source, std::string_view destination) override;

@@ -19,8 +19,9 @@ std::optional<PropertyDictionary> OverlayPropertyLists::readDictionary(std::stri
   return dictionary != nullptr ? std::optional(*dictionary) : std::nullopt;
 }
 
-Result OverlayPropertyLists::serializeBinary(const PropertyValue& value, BytesInPieces& bytes) {
-  return beneath_.serializeBinary(value, bytes);
+Result OverlayPropertyLists::serializeBinary(const PropertyValue& value,
+                                             SerializedPropertyList& serialized) {
+  return beneath_.serializeBinary(value, serialized);
 }
 
 }  // namespace accounts

@@ -14,7 +14,7 @@ class OverlayPropertyLists final : public PropertyLists {
       : files_(files), beneath_(beneath) {}
 
   std::optional<PropertyDictionary> readDictionary(std::string_view path) override;
-  Result serializeBinary(const PropertyValue& value, BytesInPieces& bytes) override;
+  Result serializeBinary(const PropertyValue& value, SerializedPropertyList& serialized) override;
 
  private:
   const OverlayFileSystem& files_;

@@ -57,7 +57,7 @@ TEST_F(AccountsManagerSavingFailures, WithoutDataNothingIsWritten) {
 }
 
 TEST_F(AccountsManagerSavingFailures, WithoutDataAndWithoutAnErrorNothingIsWrittenEither) {
-  device.propertyLists.givesNoBytes = true;
+  device.propertyLists.givesNone = true;
   EXPECT_EQ(failureLinesOfASave(),
             (Lines{R"(-[AccountsManager saveAllAccounts] (N) )"
                    R"*("Failed to serialize account settings data: (null)")*",

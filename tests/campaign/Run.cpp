@@ -53,12 +53,12 @@ class ObservedPropertyLists : public PropertyLists {
   std::optional<PropertyDictionary> readDictionary(std::string_view path) override {
     return real_.readDictionary(path);
   }
-  Result serializeBinary(const PropertyValue& value, BytesInPieces& bytes) override {
-    Result result = real_.serializeBinary(value, bytes);
+  Result serializeBinary(const PropertyValue& value, SerializedPropertyList& serialized) override {
+    Result result = real_.serializeBinary(value, serialized);
     const AllocationsSucceed whileObserving;
     const PropertyDictionary* root = value.asDictionary();
     if (result && root != nullptr && root->contains(kPlistAccountsKey)) {
-      settingsWritten.push_back(bytes.whole());
+      settingsWritten.push_back(bytesOf(serialized));
     }
     return result;
   }

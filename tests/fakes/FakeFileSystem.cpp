@@ -178,12 +178,13 @@ std::optional<std::string> FakeFileSystem::makeTemporaryFile() {
   return result ? std::optional(path) : std::nullopt;
 }
 
-Result FakeFileSystem::writeFile(std::string_view path, const BytesInPieces& contents) {
-  return perform(words("write", path), [&] { return put(path, contents.whole()); });
+Result FakeFileSystem::writeFile(std::string_view path, const SerializedPropertyList& contents) {
+  return perform(words("write", path), [&] { return put(path, bytesOf(contents)); });
 }
 
-Result FakeFileSystem::writeFileAtomically(std::string_view path, const BytesInPieces& contents) {
-  return perform(words("writeAtomically", path), [&] { return put(path, contents.whole()); });
+Result FakeFileSystem::writeFileAtomically(std::string_view path,
+                                           const SerializedPropertyList& contents) {
+  return perform(words("writeAtomically", path), [&] { return put(path, bytesOf(contents)); });
 }
 
 Result FakeFileSystem::setOwnerAndGroup(std::string_view path, std::string_view ownerName,

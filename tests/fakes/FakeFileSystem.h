@@ -83,8 +83,9 @@ class FakeFileSystem : public FileSystem {
   /// A temporary file is abandoned unless the running process, which ends when the world stops,
   /// made it.
   void removeAbandonedTemporaryFiles(const std::vector<std::string>& furtherDirectories) override;
-  Result writeFile(std::string_view path, const BytesInPieces& contents) override;
-  Result writeFileAtomically(std::string_view path, const BytesInPieces& contents) override;
+  Result writeFile(std::string_view path, const SerializedPropertyList& contents) override;
+  Result writeFileAtomically(std::string_view path,
+                             const SerializedPropertyList& contents) override;
   Result setOwnerAndGroup(std::string_view path, std::string_view ownerName,
                           std::string_view groupName) override;
   Result renameFile(std::string_view source, std::string_view destination) override;

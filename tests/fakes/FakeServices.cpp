@@ -91,22 +91,18 @@ std::optional<PropertyDictionary> FakePropertyLists::readDictionary(std::string_
   return bytes ? dictionaryOf(*bytes) : std::nullopt;
 }
 
-Result FakePropertyLists::serializeBinary(const PropertyValue& value, BytesInPieces& bytes) {
-  bytes = {};
+Result FakePropertyLists::serializeBinary(const PropertyValue& value,
+                                          SerializedPropertyList& serialized) {
+  serialized = {};
   if (serializationError) {
     return Result::failure(*serializationError);
   }
-  if (givesNoBytes) {
+  if (givesNone) {
     return Result::success();
   }
   PropertyListError error;
-  std::optional<std::string> written = writeBinaryPropertyList(value, error);
-  if (!written) {
-    return Result::failure(error.text);
-  }
-  serialized_ = std::move(*written);
-  bytes = serialized_;
-  return Result::success();
+  serialized = serializer_.serialize(value, error);
+  return serialized ? Result::success() : Result::failure(error.text);
 }
 
 std::unique_ptr<NamedLock> FakeSharedResources::makeLock(std::string_view name) {

@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "platform/Platform.h"
+#include "propertylist/BinaryPropertyListSerializer.h"
 #include "tests/fakes/FakeFileSystem.h"
 #include "tests/fakes/FakeFrameworkLoader.h"
 
@@ -206,15 +207,15 @@ class FakePropertyLists : public PropertyLists {
   explicit FakePropertyLists(FakeFileSystem& fileSystem) : fileSystem_(fileSystem) {}
   /// When set, every serialisation fails with this text.
   std::optional<std::string> serializationError;
-  /// When set, every serialisation succeeds and gives no bytes.
-  bool givesNoBytes = false;
+  /// When set, every serialisation succeeds and gives none.
+  bool givesNone = false;
 
   std::optional<PropertyDictionary> readDictionary(std::string_view path) override;
-  Result serializeBinary(const PropertyValue& value, BytesInPieces& bytes) override;
+  Result serializeBinary(const PropertyValue& value, SerializedPropertyList& serialized) override;
 
  private:
   FakeFileSystem& fileSystem_;
-  std::string serialized_;
+  BinaryPropertyListSerializer serializer_;
 };
 
 class FakeSharedResources : public SharedResources {

@@ -6,6 +6,7 @@
 
 #include "platform/linux/LinuxFileSystem.h"
 #include "platform/linux/TemporaryFile.h"
+#include "tests/fakes/PlainContents.h"
 #include "tests/platform/DeviceFixture.h"
 
 namespace accounts {
@@ -53,7 +54,7 @@ TEST_F(AbandonedTemporaryFilesTest, AFileOfALivingMakerStays) {
 
   clean(files);
 
-  ASSERT_TRUE(living.writeFile(*path, "contents"));
+  ASSERT_TRUE(living.writeFile(*path, plainContents("contents")));
   EXPECT_EQ(contentsOf(*path), "contents");
 }
 

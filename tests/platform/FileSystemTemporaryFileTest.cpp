@@ -5,6 +5,7 @@
 
 #include "platform/linux/LinuxFileSystem.h"
 #include "platform/linux/TemporaryFile.h"
+#include "tests/fakes/PlainContents.h"
 #include "tests/platform/DeviceFixture.h"
 
 namespace accounts {
@@ -79,7 +80,7 @@ TEST_F(FileSystemTemporaryFileTest,
   fs::rename(onHost("/home/tmp"), onHost("/home/moved"));
   makeLink("/home/tmp", outside());
 
-  EXPECT_TRUE(files.writeFile(*path, "contents"));
+  EXPECT_TRUE(files.writeFile(*path, plainContents("contents")));
   EXPECT_TRUE(files.renameFile(*path, "/home/file"));
 
   EXPECT_EQ(contentsOf("/home/file"), "contents");
@@ -93,7 +94,7 @@ TEST_F(FileSystemTemporaryFileTest, ARenamedTemporaryFilesPathIsOneLikeAnyOther)
   fs::rename(onHost("/home/tmp"), onHost("/home/moved"));
   makeDirectory("/home/tmp");
 
-  EXPECT_TRUE(files.writeFile(*path, "contents"));
+  EXPECT_TRUE(files.writeFile(*path, plainContents("contents")));
 
   EXPECT_EQ(namesIn("/home/tmp").size(), 1u);
   EXPECT_TRUE(namesIn("/home/moved").empty());
@@ -108,7 +109,7 @@ TEST_F(FileSystemTemporaryFileTest, ALinkInTheTemporaryFilesPlaceIsNeitherWritte
   fs::remove(onHost(*path));
   makeLink(*path, "../other");
 
-  EXPECT_FALSE(files.writeFile(*path, "new"));
+  EXPECT_FALSE(files.writeFile(*path, plainContents("new")));
   EXPECT_FALSE(files.setOwnerAndGroup(*path, "mobile", "mobile"));
   EXPECT_FALSE(files.renameFile(*path, "/home/file"));
 

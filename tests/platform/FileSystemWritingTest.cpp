@@ -7,6 +7,7 @@
 
 #include "platform/linux/LinuxFileSystem.h"
 #include "platform/linux/TemporaryFile.h"
+#include "tests/fakes/PlainContents.h"
 #include "tests/platform/DeviceFixture.h"
 
 namespace accounts {
@@ -49,15 +50,16 @@ TEST_F(FileSystemWritingTest, CreatingInAMissingDirectoryFails) {
 TEST_F(FileSystemWritingTest, WritingInPlaceKeepsTheFileAndReplacesItsContents) {
   makeFile("/file", "old and longer");
   const auto before = statusOf("/file").st_ino;
-  ASSERT_TRUE(files.writeFile("/file", "new"));
+  ASSERT_TRUE(files.writeFile("/file", plainContents("new")));
   EXPECT_EQ(contentsOf("/file"), "new");
   EXPECT_EQ(statusOf("/file").st_ino, before);
 }
 
 TEST_F(FileSystemWritingTest, ContentsInPiecesAreWrittenOneBehindTheOther) {
-  const BytesInPieces contents(10, [](const BytesInPieces::Taker& take) {
-    return take("first") && take("") && take("later");
-  });
+  const SerializedPropertyList contents(
+      "value", [](const PropertyValue&, const SerializedPropertyList::Taker& take) {
+        return take("first") && take("") && take("later");
+      });
   ASSERT_TRUE(files.writeFile("/in-place", contents));
   EXPECT_EQ(contentsOf("/in-place"), "firstlater");
   ASSERT_TRUE(files.writeFileAtomically("/atomically", contents));
@@ -66,17 +68,29 @@ TEST_F(FileSystemWritingTest, ContentsInPiecesAreWrittenOneBehindTheOther) {
 
 TEST_F(FileSystemWritingTest, NoPieceIsAskedForAfterOneThatCannotBeWritten) {
   makeFile("/file", "old");
-  bool isAskedForMore = false;
-  const BytesInPieces contents(20, [&](const BytesInPieces::Taker& take) {
-    return take("longer than that") && (isAskedForMore = true) && take("more");
-  });
+  static bool isAskedForMore = false;
+  const SerializedPropertyList contents(
+      "value", [](const PropertyValue&, const SerializedPropertyList::Taker& take) {
+        return take("longer than that") && (isAskedForMore = true) && take("more");
+      });
   const WithLargestWrittenFile full(4);
   EXPECT_FALSE(files.writeFile("/file", contents));
   EXPECT_FALSE(isAskedForMore);
 }
 
+TEST_F(FileSystemWritingTest, ContentsThatCannotAllBeMadeAreAFailure) {
+  makeFile("/file", "old");
+  const SerializedPropertyList contents(
+      "value", [](const PropertyValue&, const SerializedPropertyList::Taker& take) {
+        return take("a part") && false;
+      });
+  EXPECT_FALSE(files.writeFile("/in-place", contents));
+  EXPECT_FALSE(files.writeFileAtomically("/file", contents));
+  EXPECT_EQ(contentsOf("/file"), "old");
+}
+
 TEST_F(FileSystemWritingTest, WritingInPlaceMakesAMissingFile) {
-  ASSERT_TRUE(files.writeFile("/file", "new"));
+  ASSERT_TRUE(files.writeFile("/file", plainContents("new")));
   EXPECT_EQ(contentsOf("/file"), "new");
   EXPECT_EQ(permissionsOf("/file"), 0600u);
 }
@@ -84,7 +98,7 @@ TEST_F(FileSystemWritingTest, WritingInPlaceMakesAMissingFile) {
 TEST_F(FileSystemWritingTest, WritingInPlaceDoesNotFollowALink) {
   makeFile("/target", "target");
   makeLink("/file", "/target");
-  const Result result = files.writeFile("/file", "new");
+  const Result result = files.writeFile("/file", plainContents("new"));
   ASSERT_FALSE(result);
   EXPECT_EQ(result.error(), "Cannot open /file: It is a symbolic link, not a regular file");
   EXPECT_EQ(contentsOf("/target"), "target");
@@ -92,18 +106,18 @@ TEST_F(FileSystemWritingTest, WritingInPlaceDoesNotFollowALink) {
 
 TEST_F(FileSystemWritingTest, WritingInPlaceToANamedPipeFailsAtOnce) {
   makeNamedPipe("/pipe");
-  EXPECT_FALSE(files.writeFile("/pipe", "new"));
+  EXPECT_FALSE(files.writeFile("/pipe", plainContents("new")));
 }
 
 TEST_F(FileSystemWritingTest, WritingInPlaceToADirectoryFails) {
   makeDirectory("/directory");
-  EXPECT_FALSE(files.writeFile("/directory", "new"));
+  EXPECT_FALSE(files.writeFile("/directory", plainContents("new")));
 }
 
 TEST_F(FileSystemWritingTest, WritingInPlaceFailsOnAFullDisk) {
   makeFile("/file", "old");
   const WithLargestWrittenFile full(4);
-  const Result result = files.writeFile("/file", "longer than that");
+  const Result result = files.writeFile("/file", plainContents("longer than that"));
   ASSERT_FALSE(result);
   EXPECT_EQ(result.error(), "Cannot write /file: File too large");
 }
@@ -111,7 +125,7 @@ TEST_F(FileSystemWritingTest, WritingInPlaceFailsOnAFullDisk) {
 TEST_F(FileSystemWritingTest, WritingAtomicallyReplacesTheFileWithANewOne) {
   makeFile("/directory/file", "old");
   const auto before = statusOf("/directory/file").st_ino;
-  ASSERT_TRUE(files.writeFileAtomically("/directory/file", "new"));
+  ASSERT_TRUE(files.writeFileAtomically("/directory/file", plainContents("new")));
   EXPECT_EQ(contentsOf("/directory/file"), "new");
   EXPECT_NE(statusOf("/directory/file").st_ino, before);
   EXPECT_EQ(namesIn("/directory"), std::vector<std::string>{"file"});
@@ -120,7 +134,7 @@ TEST_F(FileSystemWritingTest, WritingAtomicallyReplacesTheFileWithANewOne) {
 TEST_F(FileSystemWritingTest, WritingAtomicallyOnAFullDiskLeavesTheOldFileAlone) {
   makeFile("/directory/file", "old");
   const WithLargestWrittenFile full(4);
-  EXPECT_FALSE(files.writeFileAtomically("/directory/file", "longer than that"));
+  EXPECT_FALSE(files.writeFileAtomically("/directory/file", plainContents("longer than that")));
   EXPECT_EQ(contentsOf("/directory/file"), "old");
   EXPECT_EQ(namesIn("/directory"), std::vector<std::string>{"file"});
 }
@@ -130,7 +144,7 @@ TEST_F(FileSystemWritingTest, WritingAtomicallyFailsWhenTheContentsDoNotReachThe
   EXPECT_EXIT(
       {
         makeSystemCallFail(SYS_fsync, EIO);
-        const Result result = files.writeFileAtomically("/directory/file", "new");
+        const Result result = files.writeFileAtomically("/directory/file", plainContents("new"));
         std::fprintf(stderr, "%s\n", result ? "written" : result.error().c_str());
         std::_Exit(0);
       },
@@ -141,7 +155,7 @@ TEST_F(FileSystemWritingTest, WritingAtomicallyFailsWhenTheContentsDoNotReachThe
 
 TEST_F(FileSystemWritingTest, WritingAtomicallyOverADirectoryFailsAndLeavesNothingBehind) {
   makeDirectory("/directory/file");
-  const Result result = files.writeFileAtomically("/directory/file", "new");
+  const Result result = files.writeFileAtomically("/directory/file", plainContents("new"));
   ASSERT_FALSE(result);
   EXPECT_NE(result.error().find("Is a directory"), std::string::npos);
   EXPECT_EQ(namesIn("/directory"), std::vector<std::string>{"file"});

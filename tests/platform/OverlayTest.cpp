@@ -4,6 +4,7 @@
 #include "platform/overlay/OverlayPropertyLists.h"
 #include "platform/overlay/OverlaySharedResources.h"
 #include "tests/fakes/FakePlatform.h"
+#include "tests/fakes/PlainContents.h"
 
 namespace accounts {
 namespace {
@@ -70,9 +71,9 @@ TEST_F(Overlay, ADirectoryIsNotRemovedAsAFile) {
 }
 
 TEST_F(Overlay, AFileThatIsWrittenHoldsWhatWasWritten) {
-  EXPECT_TRUE(files.writeFile("/var/a", "new"));
+  EXPECT_TRUE(files.writeFile("/var/a", plainContents("new")));
   EXPECT_EQ(contents("/var/a"), "new");
-  EXPECT_TRUE(files.writeFileAtomically("/var/b", "b"));
+  EXPECT_TRUE(files.writeFileAtomically("/var/b", plainContents("b")));
   EXPECT_EQ(contents("/var/b"), "b");
 }
 
@@ -83,12 +84,12 @@ TEST_F(Overlay, AFileCannotBeMadeWithoutItsDirectoryOrInItsPlace) {
 
 TEST_F(Overlay, ACopyHoldsWhatItsSourceHeldThen) {
   EXPECT_TRUE(files.copyFile("/var/a", "/var/b"));
-  EXPECT_TRUE(files.writeFile("/var/a", "new"));
+  EXPECT_TRUE(files.writeFile("/var/a", plainContents("new")));
   EXPECT_EQ(contents("/var/b"), "beneath /var/a");
 }
 
 TEST_F(Overlay, NothingIsCopiedOverAFileOrFromNothing) {
-  EXPECT_TRUE(files.writeFile("/var/b", "b"));
+  EXPECT_TRUE(files.writeFile("/var/b", plainContents("b")));
   EXPECT_FALSE(files.copyFile("/var/a", "/var/b"));
   EXPECT_FALSE(files.copyFile("/var/none", "/var/c"));
 }
@@ -96,7 +97,7 @@ TEST_F(Overlay, NothingIsCopiedOverAFileOrFromNothing) {
 TEST_F(Overlay, ATemporaryFileTakesAnotherOnesPlace) {
   const std::optional<std::string> temporary = files.makeTemporaryFile();
   ASSERT_TRUE(temporary);
-  EXPECT_TRUE(files.writeFile(*temporary, "new"));
+  EXPECT_TRUE(files.writeFile(*temporary, plainContents("new")));
   EXPECT_TRUE(files.renameFile(*temporary, "/var/a"));
   EXPECT_EQ(contents("/var/a"), "new");
   EXPECT_FALSE(files.fileExists(*temporary));
@@ -149,21 +150,21 @@ TEST_F(Overlay, AFileIsGivenToWhoeverMayHaveIt) {
 TEST_F(Overlay, FilesThatAreTheSameBeneathAreTheSame) {
   static_cast<void>(files.linkFile("/var/a", "/var/b"));
   EXPECT_TRUE(files.haveSameContents("/var/a", "/var/b"));
-  static_cast<void>(files.writeFile("/var/b", "b"));
+  static_cast<void>(files.writeFile("/var/b", plainContents("b")));
   EXPECT_FALSE(files.haveSameContents("/var/a", "/var/b"));
 }
 
 TEST_F(Overlay, PropertyListsAreReadAsTheyAreInMemory) {
   OverlayPropertyLists propertyLists(files, device.propertyLists);
   const PropertyDictionary written = {{"key", "value"}};
-  BytesInPieces bytes;
-  ASSERT_TRUE(propertyLists.serializeBinary(written, bytes));
-  ASSERT_TRUE(files.writeFile("/var/b", bytes));
+  SerializedPropertyList contents;
+  ASSERT_TRUE(propertyLists.serializeBinary(written, contents));
+  ASSERT_TRUE(files.writeFile("/var/b", contents));
 
   EXPECT_EQ(propertyLists.readDictionary("/var/b"), written);
   static_cast<void>(files.removeFile("/var/b"));
   EXPECT_FALSE(propertyLists.readDictionary("/var/b"));
-  static_cast<void>(files.writeFile("/var/b", "no property list"));
+  static_cast<void>(files.writeFile("/var/b", plainContents("no property list")));
   EXPECT_FALSE(propertyLists.readDictionary("/var/b"));
 }
 

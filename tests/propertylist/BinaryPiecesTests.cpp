@@ -4,12 +4,15 @@
 #include <vector>
 
 #include "propertylist/BinaryPropertyList.h"
+#include "propertylist/PropertyListLimits.h"
 #include "tests/propertylist/PropertyListTesting.h"
 
 namespace accounts {
 namespace {
 
 using testing::piecesOf;
+using testing::readBinary;
+using testing::writeBinary;
 
 /// A value whose file has several pieces: each kind of content that can be long goes over the end
 /// of one.
@@ -30,44 +33,41 @@ PropertyValue largeValue() {
                             {"Numbers", PropertyArray(std::move(numbers))}};
 }
 
+SerializedPropertyList serialized(const PropertyValue& value) {
+  return {value, &giveBinaryPropertyList};
+}
+
 TEST(BinaryPieces, ASmallFileIsOnePiece) {
-  BinaryPropertyListWriter writer;
-  PropertyListError error;
-  const auto bytes = writer.write(PropertyArray{"a", 1}, error);
-  ASSERT_TRUE(bytes);
-  EXPECT_EQ(piecesOf(*bytes).size(), 1u);
+  EXPECT_EQ(piecesOf(serialized(PropertyArray{"a", 1})).size(), 1u);
 }
 
 TEST(BinaryPieces, ALargeFileIsGivenInPiecesThatMakeItUp) {
   const PropertyValue value = largeValue();
-  BinaryPropertyListWriter writer;
-  PropertyListError error;
-  const auto bytes = writer.write(value, error);
-  ASSERT_TRUE(bytes);
 
-  EXPECT_GT(piecesOf(*bytes).size(), 4u);
-  EXPECT_EQ(bytes->whole().size(), bytes->size());
-  EXPECT_TRUE(testing::readBinary(bytes->whole()) == value);
-}
+  const std::vector<std::string> pieces = piecesOf(serialized(value));
 
-TEST(BinaryPieces, TheBytesOfAFileCanBeAskedForAgain) {
-  BinaryPropertyListWriter writer;
-  PropertyListError error;
-  const auto bytes = writer.write(PropertyArray{"a", PropertyDictionary{{"b", 1}}}, error);
-  ASSERT_TRUE(bytes);
-  EXPECT_EQ(bytes->whole(), bytes->whole());
+  EXPECT_GT(pieces.size(), 4u);
+  for (const std::string& piece : pieces) {
+    EXPECT_LE(piece.size(), std::size_t{512} << 10);
+  }
+  EXPECT_TRUE(bytesOf(serialized(value)) == writeBinary(value));
+  EXPECT_TRUE(readBinary(writeBinary(value)) == value);
 }
 
 TEST(BinaryPieces, AFileGivesNoPieceAfterTheOneThatIsNotGoneOnAfter) {
-  BinaryPropertyListWriter writer;
-  PropertyListError error;
-  const auto bytes = writer.write(largeValue(), error);
-  ASSERT_TRUE(bytes);
+  const SerializedPropertyList large = serialized(largeValue());
   for (const std::size_t last : {1u, 2u, 5u}) {
     std::size_t count = 0;
-    EXPECT_FALSE(bytes->giveTo([&](std::string_view) { return ++count < last; }));
+    EXPECT_FALSE(large.giveTo([&](std::string_view) { return ++count < last; }));
     EXPECT_EQ(count, last);
   }
+}
+
+TEST(BinaryPieces, AValueThatTheReaderWouldRefuseIsNotGiven) {
+  EXPECT_FALSE(
+      serialized(testing::nestedArrays(kMaximumNestingDepth + 1)).giveTo([](std::string_view) {
+        return true;
+      }));
 }
 
 }  // namespace

@@ -107,9 +107,9 @@ inline std::string writeBinary(const PropertyValue& value) {
   return bytes.value_or("");
 }
 
-inline std::vector<std::string> piecesOf(const BytesInPieces& bytes) {
+inline std::vector<std::string> piecesOf(const SerializedPropertyList& serialized) {
   std::vector<std::string> pieces;
-  EXPECT_TRUE(bytes.giveTo([&pieces](std::string_view piece) {
+  EXPECT_TRUE(serialized.giveTo([&pieces](std::string_view piece) {
     pieces.emplace_back(piece);
     return true;
   }));

@@ -5,6 +5,7 @@
 #include "report/MigrationRecorder.h"
 #include "report/RecordedPlatform.h"
 #include "tests/fakes/FakePlatform.h"
+#include "tests/fakes/PlainContents.h"
 
 namespace accounts {
 namespace {
@@ -135,7 +136,7 @@ TEST_F(RecordedDevice, ASaveIsOneFileThatIsWritten) {
   const JSON files = filesOf([](FileSystem& fileSystem) {
     const std::optional<std::string> temporary = fileSystem.makeTemporaryFile();
     ASSERT_TRUE(temporary);
-    EXPECT_TRUE(fileSystem.writeFile(*temporary, "new"));
+    EXPECT_TRUE(fileSystem.writeFile(*temporary, plainContents("new")));
     EXPECT_TRUE(fileSystem.setOwnerAndGroup(*temporary, "mobile", "mobile"));
     EXPECT_TRUE(fileSystem.renameFile(*temporary, "/var/a"));
   });

@@ -5,6 +5,7 @@
 #include "accountsettings/AccountsManager.h"
 #include "accountsettings/Process.h"
 #include "tests/fakes/FakePlatform.h"
+#include "tests/fakes/PlainContents.h"
 
 namespace accounts {
 namespace {
@@ -79,7 +80,7 @@ TEST_F(SaveObserverTest, OtherFilesAreNoSaves) {
   device.fileSystem.addFile("/tmp/one", "contents");
 
   EXPECT_TRUE(observer.renameFile("/tmp/one", "/tmp/other"));
-  EXPECT_TRUE(observer.writeFileAtomically(kSentinelPath, "contents"));
+  EXPECT_TRUE(observer.writeFileAtomically(kSentinelPath, plainContents("contents")));
 
   EXPECT_EQ(observer.saves().last, LastSave::None);
 }

@@ -34,7 +34,7 @@ const std::map<std::string, bool (*)(Platform&)> behaviours = {
     {"print", [](Platform&) { return std::puts("printed by the plug-in") >= 0; }},
     {"break the settings",
      [](Platform& platform) {
-       return static_cast<bool>(platform.fileSystem.writeFileAtomically(kSettings, "half a file"));
+       return static_cast<bool>(platform.fileSystem.createFile(kSettings, "half a file"));
      }},
     {"lose mail and fail",
      [](Platform& platform) {
