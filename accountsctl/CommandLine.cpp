@@ -1,13 +1,15 @@
 #include "accountsctl/CommandLine.h"
 
 #include <CLI/CLI.hpp>
+#include <algorithm>
 #include <string_view>
 #include <utility>
+#include <vector>
 
 #include "accountsctl/HelpTexts.h"
-#include "accountsctl/PropertyListInput.h"
 #include "commandline/OptionDeclarations.h"
 #include "commandline/Subcommands.h"
+#include "platform/linux/FileContents.h"
 
 namespace accounts {
 namespace {
@@ -37,10 +39,10 @@ std::string requireList(const std::string& value) {
   return listNamed(value) ? "" : "must be retry, attention or migrated";
 }
 
-/// What is said of two names of which only one may be standard input.
-std::optional<std::string> bothStandardInput(const DiffOptions& options) {
-  return options.before == kStandardStream && options.after == kStandardStream
-             ? std::optional<std::string>("Only one of the two files can be standard input")
+/// What is said of names of which only one may be standard input; none when it is said of none.
+std::optional<std::string> severalStandardInputs(const std::vector<std::string>& files) {
+  return std::count(files.begin(), files.end(), kStandardStream) > 1
+             ? std::optional<std::string>("Only one of the files can be standard input")
              : std::nullopt;
 }
 
@@ -112,7 +114,7 @@ void addDiff(CLI::App& command, Arguments& arguments) {
 }
 
 Asked diffAsked(Arguments& arguments) {
-  if (const std::optional<std::string> problem = bothStandardInput(arguments.diff)) {
+  if (const auto problem = severalStandardInputs({arguments.diff.before, arguments.diff.after})) {
     return unusableArguments(*problem);
   }
   arguments.diff.reportsJSON = arguments.wantsJSON;
@@ -123,12 +125,17 @@ Asked diffAsked(Arguments& arguments) {
 void addCheck(CLI::App& command, Arguments& arguments) {
   addFile(command, "FILE", arguments.check.file, "The file, - for standard input");
   addPath(command, "--device", arguments.check.device, "FILE",
-          "The device description (default: this machine's /etc/device.plist, if there is one)");
+          "The device description, - for standard input (default: this machine's "
+          "/etc/device.plist, if there is one)");
   addBundle(command, arguments.check.bundle);
   addJSON(command, arguments);
 }
 
 Asked checkAsked(Arguments& arguments) {
+  if (const auto problem = severalStandardInputs(
+          {arguments.check.file, arguments.check.device.value_or(std::string())})) {
+    return unusableArguments(*problem);
+  }
   arguments.check.reportsJSON = arguments.wantsJSON;
   return arguments.check;
 }
@@ -136,7 +143,8 @@ Asked checkAsked(Arguments& arguments) {
 void addStatus(CLI::App& command, Arguments& arguments) {
   addDevice(command, arguments.status.root, arguments.status.home);
   addPath(command, "--device", arguments.status.device, "FILE",
-          "The device description (default: the root's /etc/device.plist, if there is one)");
+          "The device description, - for standard input (default: the root's /etc/device.plist, if "
+          "there is one)");
   addBundle(command, arguments.status.bundle);
   command.add_flag("--fail-if-pending", arguments.status.failsIfPending,
                    "Exit with 1 if a migration has something to do");
@@ -195,6 +203,9 @@ void addSummarize(CLI::App& command, Arguments& arguments) {
 }
 
 Asked summarizeAsked(Arguments& arguments) {
+  if (const auto problem = severalStandardInputs(arguments.summarize.files)) {
+    return unusableArguments(*problem);
+  }
   arguments.summarize.listed = listNamed(arguments.list);
   arguments.summarize.reportsJSON = arguments.wantsJSON;
   return arguments.summarize;

@@ -5,6 +5,7 @@
 #include "accountsctl/JSONText.h"
 #include "accountsctl/PropertyListInput.h"
 #include "commandline/ReplacedFile.h"
+#include "platform/linux/FileContents.h"
 #include "propertylist/BinaryPropertyList.h"
 #include "propertylist/XMLPropertyList.h"
 

@@ -1,8 +1,5 @@
 #include "accountsctl/PropertyListInput.h"
 
-#include <fcntl.h>
-#include <unistd.h>
-
 #include <cerrno>
 #include <optional>
 
@@ -10,23 +7,10 @@
 #include "propertylist/PropertyListFile.h"
 
 namespace accounts {
-namespace {
-
-constexpr const char* kNameOfStandardInput = "standard input";
-
-std::optional<std::string> readStandardInput(PathError& error) {
-  // A duplicate, since closing the standard stream itself would free its number.
-  const FileDescriptor input(fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, 0));
-  return readContents(input, kNameOfStandardInput, error);
-}
-
-}  // namespace
 
 std::variant<PropertyValue, ProgramError> readPropertyListInput(const std::string& file) {
-  const bool isStandardInput = file == kStandardStream;
   PathError error;
-  const std::optional<std::string> bytes =
-      isStandardInput ? readStandardInput(error) : readHostFile(file, error);
+  const std::optional<std::string> bytes = readHostFile(file, error);
   if (!bytes) {
     const bool isHardwareError = error.number == EIO;
     return ProgramError{isHardwareError ? ExitStatus::InputOutputError : ExitStatus::MissingInput,
@@ -35,9 +19,9 @@ std::variant<PropertyValue, ProgramError> readPropertyListInput(const std::strin
   PropertyListError malformed;
   std::optional<PropertyValue> value = readPropertyList(*bytes, malformed);
   if (!value) {
-    const std::string name = isStandardInput ? kNameOfStandardInput : file;
-    return ProgramError{ExitStatus::MalformedInput,
-                        pathError("read the property list", name, malformed.text).text};
+    return ProgramError{
+        ExitStatus::MalformedInput,
+        pathError("read the property list", nameOfInput(file), malformed.text).text};
   }
   return *std::move(value);
 }

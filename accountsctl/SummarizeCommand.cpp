@@ -10,8 +10,8 @@
 #include "accountsctl/FleetSummary.h"
 #include "accountsctl/JSONText.h"
 #include "accountsctl/ProgressLine.h"
-#include "accountsctl/PropertyListInput.h"
 #include "accountsctl/TextTable.h"
+#include "platform/linux/FileContents.h"
 
 namespace accounts {
 namespace {

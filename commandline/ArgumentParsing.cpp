@@ -47,7 +47,9 @@ std::string unknown(std::string_view what, const std::string& word,
 
 /// What is wrong with the first word that nothing in the program takes; none when all were taken.
 std::optional<std::string> problemOfUntakenWords(const CLI::App& program) {
-  const std::vector<std::string> untaken = program.remaining(/*recurse=*/true);
+  std::vector<std::string> untaken = program.remaining(/*recurse=*/true);
+  // The end of the options is nobody's, and never what is wrong.
+  std::erase(untaken, "--");
   if (untaken.empty()) {
     return std::nullopt;
   }

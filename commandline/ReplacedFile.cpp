@@ -1,9 +1,12 @@
 #include "commandline/ReplacedFile.h"
 
+#include <fcntl.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <cerrno>
 #include <filesystem>
+#include <system_error>
 #include <variant>
 
 #include "platform/linux/DevicePath.h"
@@ -34,11 +37,40 @@ std::optional<ProgramError> examine(const std::string& path, struct stat& status
     const bool isDanglingLink = number == ENOENT && ::lstat(path.c_str(), &link) == 0;
     return number == ENOENT && !isDanglingLink
                ? std::nullopt
-               : std::optional(cannotCreate(pathError("replace", path, number)));
+               : std::optional(cannotCreate(pathError("write", path, number)));
   }
-  return S_ISREG(status.st_mode)
+  return S_ISREG(status.st_mode) || S_ISFIFO(status.st_mode)
              ? std::nullopt
-             : std::optional(cannotCreate(notRegularError("replace", path, status.st_mode)));
+             : std::optional(cannotCreate(notRegularError("write", path, status.st_mode)));
+}
+
+/// The path from the machine's root, without links, of a file that is there or is to be made; a
+/// name without a directory stands for a file in the working directory.
+std::string resolved(const std::string& path, bool exists, std::error_code& error) {
+  const std::filesystem::path named(path);
+  if (exists) {
+    return std::filesystem::canonical(named, error).string();
+  }
+  const std::filesystem::path name = named.filename();
+  if (name.empty() || name == "." || name == "..") {
+    error = std::make_error_code(std::errc::is_a_directory);
+    return {};
+  }
+  const std::filesystem::path directory = named.has_parent_path() ? named.parent_path() : ".";
+  return (std::filesystem::canonical(directory, error) / name).string();
+}
+
+/// Writes to a pipe, which somebody must be reading.
+std::optional<ProgramError> writeToPipe(const std::string& path, std::string_view contents) {
+  const int opened = ::open(path.c_str(), O_WRONLY | O_NONBLOCK | O_NOCTTY | O_CLOEXEC);
+  if (opened < 0) {
+    return cannotCreate(errno == ENXIO ? pathError("write", path, "Nobody reads this pipe")
+                                       : pathError("write", path, errno));
+  }
+  const FileDescriptor pipe(opened);
+  const int number = writeAll(pipe.number(), contents);
+  return number == 0 ? std::nullopt
+                     : std::optional(cannotWrite(pathError("write", path, number).text));
 }
 
 /// Fills a temporary file; returns 0 or the error number.
@@ -62,15 +94,12 @@ struct Replacement {
   struct stat replaced = {};
 };
 
-std::variant<Replacement, ProgramError> makeReplacement(const std::string& path) {
-  struct stat replaced = {};
-  if (std::optional<ProgramError> error = examine(path, replaced)) {
-    return *std::move(error);
-  }
+std::variant<Replacement, ProgramError> makeReplacement(const std::string& path,
+                                                        const struct stat& replaced) {
   std::error_code unresolved;
-  std::string target = std::filesystem::weakly_canonical(path, unresolved).string();
+  std::string target = resolved(path, replaced.st_mode != 0, unresolved);
   if (unresolved) {
-    return cannotCreate(pathError("replace", path, unresolved.value()));
+    return cannotCreate(pathError("write", path, unresolved.value()));
   }
   PathError error;
   std::optional<DeviceRoot> machine = DeviceRoot::openRoot("/", error);
@@ -90,7 +119,14 @@ std::variant<Replacement, ProgramError> makeReplacement(const std::string& path)
 }  // namespace
 
 std::optional<ProgramError> replaceFile(const std::string& path, std::string_view contents) {
-  const std::variant<Replacement, ProgramError> made = makeReplacement(path);
+  struct stat status = {};
+  if (std::optional<ProgramError> error = examine(path, status)) {
+    return error;
+  }
+  if (S_ISFIFO(status.st_mode)) {
+    return writeToPipe(path, contents);
+  }
+  const std::variant<Replacement, ProgramError> made = makeReplacement(path, status);
   if (const auto* error = std::get_if<ProgramError>(&made)) {
     return *error;
   }
@@ -108,7 +144,17 @@ std::optional<ProgramError> replaceFile(const std::string& path, std::string_vie
 }
 
 std::optional<ProgramError> whyNotReplaceable(const std::string& path) {
-  const std::variant<Replacement, ProgramError> made = makeReplacement(path);
+  struct stat status = {};
+  if (std::optional<ProgramError> error = examine(path, status)) {
+    return error;
+  }
+  if (S_ISFIFO(status.st_mode)) {
+    // Not opened: closing it again would be the end for whoever reads it.
+    return ::access(path.c_str(), W_OK) == 0
+               ? std::nullopt
+               : std::optional(cannotCreate(pathError("write", path, errno)));
+  }
+  const std::variant<Replacement, ProgramError> made = makeReplacement(path, status);
   if (const auto* error = std::get_if<ProgramError>(&made)) {
     return *error;
   }

@@ -6,6 +6,7 @@
 #include "commandline/OptionDeclarations.h"
 #include "commandline/Subcommands.h"
 #include "host/HelpTexts.h"
+#include "platform/linux/FileContents.h"
 
 namespace accounts {
 namespace {
@@ -32,7 +33,8 @@ using Asked = decltype(CommandLine::asked);
 void addDeviceOptions(CLI::App& command, DeviceOptions& options) {
   addDevice(command, options.root, options.home);
   addPath(command, "--device", options.deviceDescription, "FILE",
-          "The device description (default: the root's /etc/device.plist, if there is one)");
+          "The device description, - for standard input (default: the root's /etc/device.plist, if "
+          "there is one)");
   addPath(command, "--plugin", options.plugin, "BUNDLE",
           "The plug-in bundle (default: that of the program)");
   addPath(command, "--temporary-directory", options.temporaryDirectory, "DIR",
@@ -50,11 +52,19 @@ void addDeviceOptions(CLI::App& command, DeviceOptions& options) {
       ->check(CLI::Range(0U, kLongestLockTimeout));
 }
 
+/// What is wrong with a report's file; empty when nothing is.
+std::string requireNamedFile(const std::string& value) {
+  return value == kStandardStream ? "must be a file, since standard output carries the summary"
+                                  : "";
+}
+
 void addReports(CLI::App& command, Arguments& arguments) {
   addPath(command, "--report", arguments.reports.json, "FILE",
-          "Write each stage and every change to FILE, as one JSON object");
+          "Write each stage and every change to FILE, as one JSON object")
+      ->check(requireNamedFile);
   addPath(command, "--html", arguments.reports.html, "FILE",
-          "Write the same to FILE, as one page for a browser");
+          "Write the same to FILE, as one page for a browser")
+      ->check(requireNamedFile);
   command.add_flag("--show-secrets", arguments.showsSecrets,
                    "Show passwords, tokens and the like in reports as well");
 }

@@ -35,7 +35,7 @@ std::optional<PropertyDictionary> readDictionaryFile(const DeviceRoot& root, std
 std::optional<PropertyDictionary> readHostDictionaryFile(const std::string& path,
                                                          PathError& error) {
   const std::optional<std::string> bytes = readHostFile(path, error);
-  return bytes ? dictionaryFromBytes(*bytes, path, error) : std::nullopt;
+  return bytes ? dictionaryFromBytes(*bytes, nameOfInput(path), error) : std::nullopt;
 }
 
 }  // namespace accounts

@@ -78,7 +78,16 @@ std::optional<std::string> readContents(const FileDescriptor& file, std::string_
 }
 
 std::optional<std::string> readHostFile(const std::string& path, PathError& error) {
-  const int number = ::open(path.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC | O_NOCTTY);
+  if (path == kStandardStream) {
+    // A duplicate, since closing the standard stream itself would free its number.
+    const FileDescriptor input(::fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, 0));
+    return readContents(input, nameOfInput(path), error);
+  }
+  // A pipe is waited for until somebody writes; opening anything else never waits.
+  struct stat named = {};
+  const bool isPipe = ::stat(path.c_str(), &named) == 0 && S_ISFIFO(named.st_mode);
+  const int flags = O_RDONLY | O_CLOEXEC | O_NOCTTY | (isPipe ? 0 : O_NONBLOCK);
+  const int number = ::open(path.c_str(), flags);
   if (number < 0) {
     error = pathError("open", path, errno);
     return std::nullopt;
@@ -88,11 +97,15 @@ std::optional<std::string> readHostFile(const std::string& path, PathError& erro
   if (!status) {
     return std::nullopt;
   }
-  if (!S_ISREG(status->st_mode)) {
+  if (!S_ISREG(status->st_mode) && !(isPipe && S_ISFIFO(status->st_mode))) {
     error = notRegularError("read", path, status->st_mode);
     return std::nullopt;
   }
   return readContents(file, path, error);
+}
+
+std::string nameOfInput(const std::string& path) {
+  return path == kStandardStream ? "standard input" : path;
 }
 
 int writeAll(int descriptor, std::string_view bytes) {

@@ -24,9 +24,16 @@ std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_vi
 std::optional<std::string> readContents(const FileDescriptor& file, std::string_view path,
                                         PathError& error);
 
-/// The bytes of a regular file of the host, outside any device root. None, with `error` set, when
-/// it is missing, unreadable, too large or no regular file; opening never waits.
+/// The name that stands for standard input, or output, where a file of the host is named.
+inline constexpr const char* kStandardStream = "-";
+
+/// The bytes of a file of the host, outside any device root: of a regular file, of standard input
+/// (kStandardStream) or of a pipe, which is read to its end. None, with `error` set, when it is
+/// missing, unreadable, too large or something else. Only for a pipe opening waits.
 std::optional<std::string> readHostFile(const std::string& path, PathError& error);
+
+/// How a message names what readHostFile() reads.
+std::string nameOfInput(const std::string& path);
 
 /// Writes all bytes to an open file, waiting for it where it must, and returns 0 or the error
 /// number. A part may have been written after a failure.

@@ -76,12 +76,6 @@ TEST_F(AccountsctlMisuse, ADirectoryIsMissingInput) {
   expectRefused(run({"show", path("")}), kMissingInput, "directory");
 }
 
-TEST_F(AccountsctlMisuse, AFIFOIsRefusedWithoutWaitingForIt) {
-  ASSERT_EQ(mkfifo(path("fifo").c_str(), 0600), 0);
-
-  expectRefused(run({"show", path("fifo")}), kMissingInput, "fifo");
-}
-
 TEST_F(AccountsctlMisuse, AFileThatMayNotBeReadIsMissingInput) {
   const std::string file = writeText("file", "x");
   ASSERT_EQ(chmod(file.c_str(), 0), 0);

@@ -73,7 +73,8 @@ void becomeProgram(const ProgramCall& call, int output, int errors) {
     arguments.push_back(const_cast<char*>(argument.c_str()));
   }
   arguments.push_back(nullptr);
-  if (!call.user || becomeUser(*call.user)) {
+  const bool isThere = !call.directory || chdir(call.directory->c_str()) == 0;
+  if (isThere && (!call.user || becomeUser(*call.user))) {
     execvp(call.program.c_str(), arguments.data());
   }
   _exit(kCannotStart);

@@ -19,6 +19,8 @@ struct ProgramCall {
   /// The user that the program runs as, with the group of the same number and no others; none for
   /// the test's own. Needs a test that is run by root.
   std::optional<uid_t> user = {};
+  /// The working directory; none for the test's own.
+  std::optional<std::string> directory = {};
   /// Where standard output goes instead of into the result.
   std::optional<std::string> outputFile = {};
   /// How long it may take. Generous, for machines that are busy: it only has to tell a program that
