@@ -3,6 +3,7 @@
 #include "accountsctl/JSONText.h"
 #include "accountsctl/PropertyListInput.h"
 #include "inspection/StoreLayout.h"
+#include "propertylist/HiddenSecrets.h"
 #include "propertylist/XMLPropertyList.h"
 
 namespace accounts {

@@ -5,7 +5,7 @@
 
 #include "accountsettings/Process.h"
 #include "propertylist/Description.h"
-#include "propertylist/SecretKeys.h"
+#include "propertylist/HiddenSecrets.h"
 
 namespace {
 
@@ -59,7 +59,7 @@ LogArgument::LogArgument(const std::optional<PropertyArray>& array) {
 
 void LogArgument::appendTo(std::string& line) const {
   if (const auto* text = std::get_if<std::string>(&content_)) {
-    appendEscapedText(line, *text);
+    appendEscapedText(line, textWithSecretsHidden(*text));
   } else if (const auto* number = std::get_if<std::int64_t>(&content_)) {
     line += std::to_string(*number);
   } else if (const auto* value = std::get_if<PropertyValue>(&content_)) {

@@ -6,6 +6,7 @@
 
 #include "accountsettings/AccountVocabulary.h"
 #include "inspection/ListedAccount.h"
+#include "propertylist/HiddenSecrets.h"
 
 namespace accounts {
 namespace {

@@ -1,6 +1,7 @@
 #include "inspection/ListedAccount.h"
 
 #include "propertylist/Description.h"
+#include "propertylist/HiddenSecrets.h"
 
 namespace accounts {
 namespace {
@@ -59,7 +60,9 @@ std::string titleOf(const ListedAccount& account, const StoreLayout& layout) {
   const std::string type = wordFor(*account.properties, layout.typeKey);
   const std::string name = wordFor(*account.properties, layout.nameKey);
   const std::string kind = type.empty() ? wordFor(*account.properties, layout.classKey) : type;
-  return name.empty() ? kind : (kind.empty() ? "" : kind + " ") + "'" + name + "'";
+  // Feeds are named after their addresses.
+  return textWithSecretsHidden(name.empty() ? kind
+                                            : (kind.empty() ? "" : kind + " ") + "'" + name + "'");
 }
 
 }  // namespace accounts

@@ -1,5 +1,7 @@
 #include "inspection/PropertyDifference.h"
 
+#include "propertylist/HiddenSecrets.h"
+
 namespace accounts {
 namespace {
 
