@@ -57,6 +57,7 @@ struct Arguments {
   bool wantsJSON = false;
   bool wantsXML = false;
   bool showsSecrets = false;
+  bool showsLongCells = false;
   std::string form;
   std::string list;
 
@@ -95,6 +96,8 @@ void addShow(CLI::App& command, Arguments& arguments) {
       ->excludes(json);
   command.add_flag("--properties", arguments.show.withProperties,
                    "Show every property of each account");
+  command.add_flag("--full", arguments.showsLongCells,
+                   "Show long texts whole on a terminal, over several lines");
   addShowSecrets(command, arguments);
 }
 
@@ -103,6 +106,7 @@ Asked showAsked(Arguments& arguments) {
                         : arguments.wantsJSON ? ShownForm::JSON
                                               : ShownForm::Tables;
   arguments.show.secrets = arguments.secrets();
+  arguments.show.longCells = arguments.showsLongCells ? LongCells::Wrapped : LongCells::Cut;
   return arguments.show;
 }
 

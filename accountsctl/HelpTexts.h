@@ -25,11 +25,14 @@ inline constexpr const char* kErrors =
 inline constexpr const char* kShow =
     "Show a settings file, a legacy store, a migration-information file, a device description or\n"
     "any other property list; which of them it is, its content tells. Passwords and the like are\n"
-    "hidden.";
+    "hidden. On a terminal texts that are too long are cut; in a pipe or a file each account is "
+    "one\n"
+    "line with its fields whole, separated by tabs.";
 inline constexpr const char* kShowStatuses = "  0   the file was shown\n";
 inline constexpr const char* kShowExamples =
     "  accountsctl show com.quarx.accountsettings.plist\n"
-    "  accountsctl show --properties Accounts.plist | less\n"
+    "  accountsctl show com.quarx.accountsettings.plist | cut -f 3,6\n"
+    "  accountsctl show --properties --full Accounts.plist\n"
     "  accountsctl show --json - < com.quarx.DataAccess.plist\n";
 
 inline constexpr const char* kDiff =

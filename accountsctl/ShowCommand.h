@@ -3,6 +3,7 @@
 #include <string>
 
 #include "accountsctl/CommandResult.h"
+#include "accountsctl/TextTable.h"
 #include "commandline/Terminal.h"
 #include "propertylist/PropertyValue.h"
 #include "propertylist/SecretKeys.h"
@@ -19,6 +20,8 @@ struct ShowOptions {
   Secrets secrets = Secrets::Hide;
   /// Whether tables also show every property of each account.
   bool withProperties = false;
+  /// What becomes of cells for which a terminal is too narrow.
+  LongCells longCells = LongCells::Cut;
 };
 
 /// Shows a file, whatever kind of property list it is.

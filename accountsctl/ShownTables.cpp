@@ -112,7 +112,10 @@ class Tables {
     TextTable table(
         layout.typeKey.empty()
             ? std::vector<std::string>{"", "Class", "Name", "User", "Identifier"}
-            : std::vector<std::string>{"", "Type", "Name", "User", "Enabled", "Identifier"});
+            : std::vector<std::string>{"", "Type", "Name", "User", "Enabled", "Identifier"},
+        options_.longCells);
+    // People copy identifiers.
+    table.keepWhole(layout.typeKey.empty() ? 4 : 5);
     for (const ListedAccount& account : accounts) {
       table.addRow(rowOf(account, layout));
     }
@@ -122,11 +125,12 @@ class Tables {
     }
   }
 
-  static std::vector<std::string> rowOf(const ListedAccount& account, const StoreLayout& layout) {
+  [[nodiscard]] std::vector<std::string> rowOf(const ListedAccount& account,
+                                               const StoreLayout& layout) const {
     const PropertyDictionary properties = account.properties.value_or(PropertyDictionary());
     const bool hasTypes = !layout.typeKey.empty();
     std::vector<std::string> row = {
-        (account.isChild ? "  " : "") + account.place,
+        (account.isChild && terminal_.isInteractive ? "  " : "") + account.place,
         wordFor(properties, hasTypes ? layout.typeKey : layout.classKey),
         account.properties ? wordFor(properties, layout.nameKey) : describe(account.element),
         wordFor(properties, layout.userKey)};
@@ -170,7 +174,7 @@ class Tables {
   }
 
   void addTableOf(const PropertyDictionary& dictionary) {
-    TextTable table({"", ""});
+    TextTable table({"", ""}, options_.longCells);
     addEntries(table, dictionary, "");
     text_ += table.text(terminal_);
   }

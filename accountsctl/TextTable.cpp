@@ -11,6 +11,7 @@ namespace accounts {
 namespace {
 
 constexpr std::string_view kGap = "  ";
+constexpr std::string_view kMarkOfACut = "\u2026";
 /// No column gets narrower, however narrow the terminal.
 constexpr std::size_t kNarrowestColumn = 6;
 /// Behind these a text may be broken.
@@ -66,12 +67,14 @@ std::size_t widestThatFits(const std::vector<std::size_t>& widths, std::size_t a
 
 /// One row as lines, its cells beside each other.
 void appendRow(std::string& text, const std::vector<std::string>& cells,
-               const std::vector<std::size_t>& widths, const Terminal& terminal,
-               const Emphasis* emphasis) {
+               const std::vector<std::size_t>& widths, LongCells longCells,
+               const Terminal& terminal, const Emphasis* emphasis) {
   std::vector<std::vector<std::string>> lines;
   std::size_t height = 1;
   for (std::size_t column = 0; column < cells.size(); ++column) {
-    lines.push_back(wrapped(cells[column], widths[column]));
+    lines.push_back(longCells == LongCells::Cut
+                        ? std::vector<std::string>{cut(cells[column], widths[column])}
+                        : wrapped(cells[column], widths[column]));
     height = std::max(height, lines.back().size());
   }
   for (std::size_t row = 0; row < height; ++row) {
@@ -91,6 +94,14 @@ void appendRow(std::string& text, const std::vector<std::string>& cells,
   }
 }
 
+/// One row for programs.
+void appendLine(std::string& text, const std::vector<std::string>& cells) {
+  for (std::size_t column = 0; column < cells.size(); ++column) {
+    text += (column > 0 ? "\t" : "") + cells[column];
+  }
+  text += "\n";
+}
+
 }  // namespace
 
 std::size_t displayWidth(std::string_view text) {
@@ -101,6 +112,23 @@ std::size_t displayWidth(std::string_view text) {
     text.remove_prefix(std::max<std::size_t>(next.length, 1));
   }
   return width;
+}
+
+std::string cut(std::string_view text, std::size_t width) {
+  if (displayWidth(text) <= width) {
+    return std::string(text);
+  }
+  const std::size_t room = width - std::min(width, displayWidth(kMarkOfACut));
+  std::size_t length = 0;
+  for (std::size_t taken = 0; length < text.size();) {
+    const DecodedCodePoint next = decodeCodePoint(text.substr(length));
+    taken += widthOf(next.value);
+    if (taken > room) {
+      break;
+    }
+    length += std::max<std::size_t>(next.length, 1);
+  }
+  return std::string(text.substr(0, length)).append(kMarkOfACut);
 }
 
 std::vector<std::string> wrapped(std::string_view text, std::size_t width) {
@@ -130,25 +158,44 @@ std::vector<std::size_t> TextTable::columnWidths(std::size_t tableWidth) const {
     }
     widths.push_back(width);
   }
-  const std::size_t gaps = kGap.size() * (widths.empty() ? 0 : widths.size() - 1);
-  const std::size_t widest = widestThatFits(widths, tableWidth > gaps ? tableWidth - gaps : 0);
-  for (std::size_t& width : widths) {
-    width = std::min(width, std::max(widest, kNarrowestColumn));
+  std::size_t taken = kGap.size() * (widths.empty() ? 0 : widths.size() - 1);
+  std::vector<std::size_t> narrowing;
+  for (std::size_t column = 0; column < widths.size(); ++column) {
+    if (wholeColumns_.contains(column)) {
+      taken += widths[column];
+    } else {
+      narrowing.push_back(widths[column]);
+    }
+  }
+  const std::size_t widest = widestThatFits(narrowing, tableWidth > taken ? tableWidth - taken : 0);
+  for (std::size_t column = 0; column < widths.size(); ++column) {
+    if (!wholeColumns_.contains(column)) {
+      widths[column] = std::min(widths[column], std::max(widest, kNarrowestColumn));
+    }
   }
   return widths;
 }
 
 std::string TextTable::text(const Terminal& terminal) const {
-  const std::vector<std::size_t> widths = columnWidths(terminal.width);
   std::string text;
   const bool hasHeadings = std::any_of(headings_.begin(), headings_.end(),
                                        [](const std::string& heading) { return !heading.empty(); });
+  if (!terminal.isInteractive) {
+    if (hasHeadings) {
+      appendLine(text, headings_);
+    }
+    for (const std::vector<std::string>& row : rows_) {
+      appendLine(text, row);
+    }
+    return text;
+  }
+  const std::vector<std::size_t> widths = columnWidths(terminal.width);
   if (hasHeadings) {
     const Emphasis heading = Emphasis::Heading;
-    appendRow(text, headings_, widths, terminal, &heading);
+    appendRow(text, headings_, widths, longCells_, terminal, &heading);
   }
   for (const std::vector<std::string>& row : rows_) {
-    appendRow(text, row, widths, terminal, nullptr);
+    appendRow(text, row, widths, longCells_, terminal, nullptr);
   }
   return text;
 }

@@ -48,12 +48,12 @@ ExitStatus run(const CommandLine& commandLine) {
       std::visit([](const auto& asked) { return runCommand(asked); }, commandLine.asked);
   if (const auto* error = std::get_if<ProgramError>(&result)) {
     printError(kProgramName, error->message);
-    return commandLine.wantsJSON
-               ? printResult(kProgramName, errorObject(commandLine, *error), error->exitStatus)
-               : error->exitStatus;
+    return commandLine.wantsJSON ? printResult(kProgramName, errorObject(commandLine, *error),
+                                               error->exitStatus, ReaderThatLeft::HasSeenEnough)
+                                 : error->exitStatus;
   }
   const auto& report = std::get<CommandReport>(result);
-  return printResult(kProgramName, report.text, report.exitStatus);
+  return printResult(kProgramName, report.text, report.exitStatus, ReaderThatLeft::HasSeenEnough);
 }
 
 }  // namespace

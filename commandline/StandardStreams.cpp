@@ -3,9 +3,11 @@
 #include <fcntl.h>
 #include <unistd.h>
 
+#include <cerrno>
 #include <csignal>
 #include <iostream>
 
+#include "platform/linux/FileContents.h"
 #include "propertylist/Description.h"
 
 namespace accounts {
@@ -40,9 +42,10 @@ void printWarning(std::string_view program, std::string_view message) {
   printLine(program, ": warning: ", message);
 }
 
-ExitStatus printResult(std::string_view program, const std::string& text, ExitStatus exitStatus) {
-  std::cout << text << std::flush;
-  if (std::cout.good()) {
+ExitStatus printResult(std::string_view program, const std::string& text, ExitStatus exitStatus,
+                       ReaderThatLeft reader) {
+  const int number = writeAll(STDOUT_FILENO, text);
+  if (number == 0 || (number == EPIPE && reader == ReaderThatLeft::HasSeenEnough)) {
     return exitStatus;
   }
   printError(program, "The result cannot be written to standard output");

@@ -18,8 +18,12 @@ void printError(std::string_view program, std::string_view message);
 /// The same for something that a person should know: "PROGRAM: warning: MESSAGE".
 void printWarning(std::string_view program, std::string_view message);
 
+/// Whether the result has arrived where the reader of a pipe went away before its end.
+enum class ReaderThatLeft { HasSeenEnough, LacksTheResult };
+
 /// Writes the program's whole result to standard output, and tells on standard error when it does
 /// not arrive. Returns how the program ends: with `exitStatus`, or with an input/output error.
-ExitStatus printResult(std::string_view program, const std::string& text, ExitStatus exitStatus);
+ExitStatus printResult(std::string_view program, const std::string& text, ExitStatus exitStatus,
+                       ReaderThatLeft reader = ReaderThatLeft::LacksTheResult);
 
 }  // namespace accounts

@@ -49,7 +49,8 @@ Terminal standardOutputTerminal(const EnvironmentLookup& environment) {
   Terminal terminal;
   const std::optional<std::size_t> columns = columnsIn(valueOf(environment, "COLUMNS"));
   terminal.width = columns ? *columns : widthOfStandardOutput().value_or(terminal.width);
-  terminal.isColoured = isatty(STDOUT_FILENO) == 1 && valueOf(environment, "NO_COLOR").empty() &&
+  terminal.isInteractive = isatty(STDOUT_FILENO) == 1;
+  terminal.isColoured = terminal.isInteractive && valueOf(environment, "NO_COLOR").empty() &&
                         valueOf(environment, "TERM") != "dumb";
   return terminal;
 }

@@ -14,6 +14,8 @@ using EnvironmentLookup = std::function<const char*(const char* variable)>;
 struct Terminal {
   /// Characters in a line.
   std::size_t width = 80;
+  /// Whether it is a terminal that a person looks at, rather than a file or a pipe.
+  bool isInteractive = true;
   /// Whether colours and heavy letters are understood and wanted.
   bool isColoured = false;
 };

@@ -92,6 +92,43 @@ TEST(TextTable, HeadingsStandOutOnAColouredTerminal) {
   EXPECT_EQ(table.text({.width = 80, .isColoured = true}), "\033[1mA\033[0m\na\n");
 }
 
+TEST(TextTable, WithoutATerminalARowIsOneLineWithTabs) {
+  TextTable table({"A", "B"}, LongCells::Cut);
+  table.addRow({std::string(100, 'x'), "tab\there"});
+
+  EXPECT_EQ(table.text({.width = 20, .isInteractive = false}),
+            "A\tB\n" + std::string(100, 'x') + "\ttab\\there\n");
+}
+
+TEST(TextTable, CutCellsAreOneLineWithAMark) {
+  TextTable table({"A", "B"}, LongCells::Cut);
+  table.addRow({"short", "one two three four five"});
+
+  EXPECT_EQ(table.text(ofWidth(20)),
+            "A      B\n"
+            "short  one two thre\u2026\n");
+}
+
+TEST(TextTable, AColumnThatIsKeptWholeIsNeitherCutNorBroken) {
+  for (const LongCells longCells : {LongCells::Cut, LongCells::Wrapped}) {
+    TextTable table({"A", "B"}, longCells);
+    table.keepWhole(1);
+    table.addRow({"1234567", "0123456789-0123456789"});
+
+    const std::string text = table.text(ofWidth(20));
+
+    EXPECT_NE(text.find("0123456789-0123456789\n"), std::string::npos) << text;
+    EXPECT_EQ(text.find("\n1234567"), std::string::npos) << text;
+  }
+}
+
+TEST(TextTable, ACutTextFitsItsWidth) {
+  EXPECT_EQ(cut("abc", 3), "abc");
+  EXPECT_EQ(cut("abcd", 3), "ab\u2026");
+  EXPECT_EQ(cut("\u4E2D\u6587\u5B57", 4), "\u4E2D\u2026");
+  EXPECT_EQ(cut("ab", 1), "\u2026");
+}
+
 TEST(TextTable, ATextIsBrokenBehindBlanksAndMarks) {
   EXPECT_EQ(wrapped("one two", 5), (Lines{"one", "two"}));
   EXPECT_EQ(wrapped("1234-5678", 6), (Lines{"1234-", "5678"}));

@@ -31,8 +31,8 @@ TEST_F(AccountsctlCheck, FindingsAreATableAndGiveOne) {
 
   EXPECT_EQ(result.exitStatus, kAttention);
   EXPECT_EQ(result.output,
-            "Place  Account        Effect   Finding\n"
-            "1      Pigeon 'Loft'  dropped  The type 'Pigeon' is unknown\n");
+            "Place\tAccount\tEffect\tFinding\n"
+            "1\tPigeon 'Loft'\tdropped\tThe type 'Pigeon' is unknown\n");
   EXPECT_EQ(result.errors, "");
 }
 

@@ -114,17 +114,6 @@ TEST_F(AccountsctlMisuse, AResultThatCannotBeWrittenIsAnError) {
   }
 }
 
-TEST_F(AccountsctlMisuse, AReaderThatGoesAwayEndsTheProgramWithoutASignal) {
-  const std::string file = write("file", PropertyDictionary{{"text", std::string(300'000, 'x')}});
-
-  const ProgramResult result =
-      runProgram({.program = "/bin/sh",
-                  .arguments = {"-c", "{ \"$0\" show \"$1\"; echo $? >&2; } | head -n 1",
-                                accountsctl(), file}});
-
-  EXPECT_TRUE(result.hasErrorLine("74")) << result.errors;
-}
-
 TEST_F(AccountsctlMisuse, HelpOfEachSubcommandHasItsExitStatusesAndExamples) {
   for (const char* subcommand : {"show", "diff", "check", "status", "convert"}) {
     const std::string help = textFor({subcommand, "--help"});

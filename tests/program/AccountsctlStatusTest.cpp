@@ -17,8 +17,7 @@ class AccountsctlStatus : public DeviceRootFixture {
   [[nodiscard]] ProgramResult status(const std::vector<std::string>& arguments = {}) const {
     std::vector<std::string> all = {"status", "--root", root()};
     all.insert(all.end(), arguments.begin(), arguments.end());
-    return runProgram(
-        {.program = accountsctl(), .arguments = all, .environment = {{"COLUMNS", "200"}}});
+    return runProgram({.program = accountsctl(), .arguments = all});
   }
   /// The object that tells of the device, which must be pending or not.
   [[nodiscard]] nlohmann::json statusObject(bool isPending) const {
@@ -36,8 +35,8 @@ TEST_F(AccountsctlStatus, ADeviceWithoutAccountsHasNothingToDo) {
 
   EXPECT_EQ(result.exitStatus, 0);
   EXPECT_EQ(result.output,
-            "Account settings   none\n"
-            "A migration would  find nothing to do\n");
+            "Account settings\tnone\n"
+            "A migration would\tfind nothing to do\n");
   EXPECT_EQ(statusObject(false)["settings"]["exists"], false);
 }
 
@@ -54,8 +53,8 @@ TEST_F(AccountsctlStatus, OldSettingsAreToBeUpgraded) {
   write(kSettingsPath, accountSettings(9));
 
   EXPECT_EQ(status().output,
-            "Account settings   version 9 (current is 12), 0 accounts\n"
-            "A migration would  upgrade the accounts from version 9 to 12\n");
+            "Account settings\tversion 9 (current is 12), 0 accounts\n"
+            "A migration would\tupgrade the accounts from version 9 to 12\n");
   EXPECT_EQ(statusObject(true)["work"], nlohmann::json::array({"upgrade"}));
 }
 
@@ -103,7 +102,7 @@ TEST_F(AccountsctlStatus, KeptInputsAreNamed) {
   writeText("/var/mobile/Library/AccountMigration/Other-20260101T000000Z/file", "");
 
   EXPECT_EQ(statusObject(true)["keptFolders"], nlohmann::json::array({folder}));
-  EXPECT_NE(status().output.find("Kept inputs        " + folder + "\n"), std::string::npos);
+  EXPECT_NE(status().output.find("Kept inputs\t" + folder + "\n"), std::string::npos);
 }
 
 TEST_F(AccountsctlStatus, AbandonedTemporaryFilesAreNamedButNotPending) {

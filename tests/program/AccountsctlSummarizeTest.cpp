@@ -24,19 +24,19 @@ TEST_F(AccountsctlSummarize, ShowsCountsByOutcomeStepAndError) {
   EXPECT_EQ(result.exitStatus, kAttention);
   EXPECT_EQ(result.errors, "");
   EXPECT_EQ(result.output,
-            "Images  Status  Outcome\n"
-            "1       0       migrated\n"
-            "1       66      no such root, description or bundle\n"
-            "1       75      something that may pass\n"
-            "2               no result yet\n"
-            "3               all results\n"
+            "Images\tStatus\tOutcome\n"
+            "1\t0\tmigrated\n"
+            "1\t66\tno such root, description or bundle\n"
+            "1\t75\tsomething that may pass\n"
+            "2\t\tno result yet\n"
+            "3\t\tall results\n"
             "\n"
-            "Images  Step\n"
-            "1       7A149\n"
+            "Images\tStep\n"
+            "1\t7A149\n"
             "\n"
-            "Images  Error\n"
-            "1       Cannot open ROOT: Missing\n"
-            "1       No space left on device\n"
+            "Images\tError\n"
+            "1\tCannot open ROOT: Missing\n"
+            "1\tNo space left on device\n"
             "\n"
             "1 migrated with warnings\n"
             "1 to run again: --list retry\n"
@@ -105,7 +105,7 @@ TEST_F(AccountsctlSummarize, ATerminalShowsProgressAndThenTheSummaryAlone) {
 
   EXPECT_NE(result.output.find("1 of 3 images: 1 migrated"), std::string::npos) << result.output;
   EXPECT_TRUE(result.output.ends_with("\r\033[K")) << result.output;
-  EXPECT_TRUE(readText("summary").starts_with("Images  Status")) << readText("summary");
+  EXPECT_TRUE(readText("summary").starts_with("Images\tStatus")) << readText("summary");
 }
 
 }  // namespace
