@@ -23,20 +23,22 @@ std::string requireForm(const std::string& value) {
 }
 
 /// The lists of images that a summary can give in its place.
-constexpr std::pair<std::string_view, Remedy> kLists[] = {
-    {"retry", Remedy::Retry}, {"attention", Remedy::Attention}, {"migrated", Remedy::None}};
+constexpr std::pair<std::string_view, ListedImages> kLists[] = {{"retry", {Remedy::Retry}},
+                                                                {"attention", {Remedy::Attention}},
+                                                                {"migrated", {Remedy::None}},
+                                                                {"missing", {std::nullopt}}};
 
-std::optional<Remedy> listNamed(std::string_view name) {
-  for (const auto& [known, remedy] : kLists) {
+std::optional<ListedImages> listNamed(std::string_view name) {
+  for (const auto& [known, images] : kLists) {
     if (known == name) {
-      return remedy;
+      return images;
     }
   }
   return std::nullopt;
 }
 
 std::string requireList(const std::string& value) {
-  return listNamed(value) ? "" : "must be retry, attention or migrated";
+  return listNamed(value) ? "" : "must be retry, attention, migrated or missing";
 }
 
 /// What is said of names of which only one may be standard input; none when it is said of none.
@@ -192,23 +194,38 @@ void addSummarize(CLI::App& command, Arguments& arguments) {
           "How many images there are; those without a result are counted, too")
       ->option_text("COUNT")
       ->check(CLI::NonNegativeNumber);
+  addPath(command, "--roots", options.rootsFile, "ROOTS",
+          "The roots of all images, one a line, - for standard input; results of others do not "
+          "count")
+      ->excludes("--expected");
   CLI::Option* list =
       command
           .add_option("--list", arguments.list,
-                      "Write only the roots of the images to retry, that need attention, or that\n"
-                      "are migrated: WHICH is retry, attention or migrated")
+                      "Write only the roots of the images to retry, that need attention, that are\n"
+                      "migrated, or that --roots names and no result: WHICH is retry, attention,\n"
+                      "migrated or missing")
           ->option_text("WHICH")
           ->check(requireList);
   command
       .add_flag("--null", options.endsWithNull,
                 "End each root of a list with a null character, as xargs -0 takes it")
       ->needs(list);
+  command
+      .add_flag("--reasons", options.withReasons,
+                "Write behind each root of a list why it is there, after a tab")
+      ->needs(list)
+      ->excludes("--null");
   addJSON(command, arguments)->excludes(list);
 }
 
 Asked summarizeAsked(Arguments& arguments) {
-  if (const auto problem = severalStandardInputs(arguments.summarize.files)) {
+  std::vector<std::string> files = arguments.summarize.files;
+  files.push_back(arguments.summarize.rootsFile.value_or(std::string()));
+  if (const auto problem = severalStandardInputs(files)) {
     return unusableArguments(*problem);
+  }
+  if (arguments.list == "missing" && !arguments.summarize.rootsFile) {
+    return unusableArguments("--list missing needs --roots, which names the images");
   }
   arguments.summarize.listed = listNamed(arguments.list);
   arguments.summarize.reportsJSON = arguments.wantsJSON;

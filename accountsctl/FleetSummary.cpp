@@ -17,6 +17,11 @@ Counts<std::string> mostFrequentFirst(const std::map<std::string, std::size_t>& 
 
 }  // namespace
 
+void FleetSummary::expect(const std::vector<std::string>& roots) {
+  expected_ = roots;
+  expectedRoots_ = {roots.begin(), roots.end()};
+}
+
 void FleetSummary::addLine(std::string_view line) {
   if (line.empty()) {
     return;
@@ -24,6 +29,9 @@ void FleetSummary::addLine(std::string_view line) {
   std::optional<RunResult> result = runResultFrom(line);
   if (!result) {
     ++unreadableLines_;
+    return;
+  }
+  if (expected_ && !(result->root && expectedRoots_.contains(*result->root))) {
     return;
   }
   ++exitStatuses_[result->exitStatus];
@@ -86,12 +94,30 @@ Counts<std::string> FleetSummary::errors() const {
   return mostFrequentFirst(counts);
 }
 
-std::vector<std::string> FleetSummary::rootsWith(Remedy remedy) const {
-  std::vector<std::string> roots;
+std::vector<const RunResult*> FleetSummary::resultsWith(Remedy remedy) const {
+  std::vector<const RunResult*> found;
   for (const RunResult& result : results_) {
     if (result.root && outcomeOf(result.exitStatus).remedy == remedy) {
-      roots.push_back(*result.root);
+      found.push_back(&result);
     }
+  }
+  return found;
+}
+
+std::vector<std::string> FleetSummary::missingRoots() const {
+  std::vector<std::string> missing;
+  for (const std::string& root : expected_.value_or(std::vector<std::string>())) {
+    if (!places_.contains(root)) {
+      missing.push_back(root);
+    }
+  }
+  return missing;
+}
+
+std::vector<std::string> FleetSummary::rootsWith(Remedy remedy) const {
+  std::vector<std::string> roots;
+  for (const RunResult* result : resultsWith(remedy)) {
+    roots.push_back(*result->root);
   }
   return roots;
 }

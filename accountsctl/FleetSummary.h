@@ -6,6 +6,7 @@
 #include <string>
 #include <string_view>
 #include <unordered_map>
+#include <unordered_set>
 #include <utility>
 #include <vector>
 
@@ -21,6 +22,9 @@ using Counts = std::vector<std::pair<What, std::size_t>>;
 /// its last result alone.
 class FleetSummary {
  public:
+  /// Says which images there are, each once; results of others do not count. To be called before
+  /// lines are added.
+  void expect(const std::vector<std::string>& roots);
   /// Adds a line of output; an empty one is nothing.
   void addLine(std::string_view line);
 
@@ -41,8 +45,13 @@ class FleetSummary {
   [[nodiscard]] Counts<std::string> steps() const;
   [[nodiscard]] Counts<std::string> errors() const;
 
+  /// The images that were expected and have no result, in the order in which they were named.
+  [[nodiscard]] std::vector<std::string> missingRoots() const;
+
   /// The roots of the images with a remedy, in the order of their first results.
   [[nodiscard]] std::vector<std::string> rootsWith(Remedy remedy) const;
+  /// The results of those images, which have roots.
+  [[nodiscard]] std::vector<const RunResult*> resultsWith(Remedy remedy) const;
 
  private:
   std::vector<RunResult> results_;
@@ -50,6 +59,9 @@ class FleetSummary {
   std::unordered_map<std::string, std::size_t> places_;
   std::map<int, std::size_t> exitStatuses_;
   std::size_t unreadableLines_ = 0;
+  /// None: any image may have a result.
+  std::optional<std::vector<std::string>> expected_;
+  std::unordered_set<std::string> expectedRoots_;
   std::size_t replaced_ = 0;
 };
 

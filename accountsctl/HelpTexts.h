@@ -89,7 +89,9 @@ inline constexpr const char* kSummarizeStatuses =
     "  1   an image is not migrated or has no result, or a line is no result\n";
 inline constexpr const char* kSummarizeExamples =
     "  accountsctl summarize results.jsonl\n"
+    "  accountsctl summarize --roots roots.txt results.jsonl\n"
     "  accountsctl summarize results.jsonl --list retry > again.txt\n"
+    "  accountsctl summarize results.jsonl --list attention --reasons\n"
     "  parallel migration-host run --json --root {} :::: roots.txt | tee results.jsonl |\n"
     "    accountsctl summarize --expected 5000 -\n";
 

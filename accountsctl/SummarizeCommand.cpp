@@ -6,11 +6,14 @@
 #include <cstring>
 #include <fstream>
 #include <iostream>
+#include <sstream>
+#include <unordered_set>
 
 #include "accountsctl/FleetSummary.h"
 #include "accountsctl/JSONText.h"
 #include "accountsctl/ProgressLine.h"
 #include "accountsctl/TextTable.h"
+#include "commandline/PlatformError.h"
 #include "platform/linux/FileContents.h"
 
 namespace accounts {
@@ -48,6 +51,27 @@ std::optional<ProgramError> addFile(const std::string& file, const SummarizeOpti
                       fmt::format("Cannot read {}: {}", file, std::strerror(errno))};
 }
 
+/// The roots in a file, each once. Lines may end as on another system, and blank ones are none.
+std::variant<std::vector<std::string>, ProgramError> readRoots(const std::string& file) {
+  PathError error;
+  const std::optional<std::string> text = readHostFile(file, error);
+  if (!text) {
+    return programErrorOf(error, ExitStatus::MissingInput);
+  }
+  std::vector<std::string> roots;
+  std::unordered_set<std::string> known;
+  std::istringstream lines(*text);
+  for (std::string line; std::getline(lines, line);) {
+    if (line.ends_with('\r')) {
+      line.pop_back();
+    }
+    if (line.find_first_not_of(" \t") != line.npos && known.insert(line).second) {
+      roots.push_back(line);
+    }
+  }
+  return roots;
+}
+
 std::size_t missingCount(const SummarizeOptions& options, const FleetSummary& summary) {
   const std::size_t expected = options.expected.value_or(0);
   return expected > summary.imageCount() ? expected - summary.imageCount() : 0;
@@ -60,6 +84,26 @@ std::string listText(const std::vector<std::string>& roots, bool endsWithNull) {
     text += endsWithNull ? '\0' : '\n';
   }
   return text;
+}
+
+/// Each root with why it is in the list, ROOT standing for it.
+std::string reasonsText(const std::vector<const RunResult*>& results, const Terminal& terminal) {
+  TextTable table({"", ""});
+  table.keepWhole(0);
+  for (const RunResult* result : results) {
+    table.addRow(
+        {*result->root, result->error.value_or(std::string(outcomeOf(result->exitStatus).words))});
+  }
+  return table.text(terminal);
+}
+
+std::string listOf(const ListedImages& images, const SummarizeOptions& options,
+                   const FleetSummary& summary, const Terminal& terminal) {
+  if (!images.remedy) {
+    return listText(summary.missingRoots(), options.endsWithNull);
+  }
+  return options.withReasons ? reasonsText(summary.resultsWith(*images.remedy), terminal)
+                             : listText(summary.rootsWith(*images.remedy), options.endsWithNull);
 }
 
 std::string outcomesText(const SummarizeOptions& options, const FleetSummary& summary,
@@ -103,6 +147,7 @@ std::string remarksText(const FleetSummary& summary) {
       {summary.countOf(Remedy::Attention),
        "to look at before they are run again: --list attention"},
       {summary.replacedCount(), "results replaced by later ones of the same image"},
+      {summary.missingRoots().size(), "without a result: --list missing"},
       {summary.unreadableLineCount(), "lines that are no results"},
   };
   std::string text;
@@ -140,13 +185,23 @@ std::string objectLine(const SummarizeOptions& options, const FleetSummary& summ
   object["unreadableLines"] = summary.unreadableLineCount();
   object["retry"] = summary.rootsWith(Remedy::Retry);
   object["attention"] = summary.rootsWith(Remedy::Attention);
+  object["missing"] = options.rootsFile ? JSON(summary.missingRoots()) : JSON(nullptr);
   return lineOf(std::move(object), exitStatus);
 }
 
 }  // namespace
 
-CommandResult summarize(const SummarizeOptions& options, const Terminal& terminal) {
+CommandResult summarize(const SummarizeOptions& asked, const Terminal& terminal) {
+  SummarizeOptions options = asked;
   FleetSummary summary;
+  if (options.rootsFile) {
+    const auto roots = readRoots(*options.rootsFile);
+    if (const auto* error = std::get_if<ProgramError>(&roots)) {
+      return *error;
+    }
+    summary.expect(std::get<std::vector<std::string>>(roots));
+    options.expected = std::get<std::vector<std::string>>(roots).size();
+  }
   {
     ProgressLine progress;
     for (const std::string& file : options.files) {
@@ -156,8 +211,7 @@ CommandResult summarize(const SummarizeOptions& options, const Terminal& termina
     }
   }
   if (options.listed) {
-    return CommandReport{listText(summary.rootsWith(*options.listed), options.endsWithNull),
-                         ExitStatus::Success};
+    return CommandReport{listOf(*options.listed, options, summary, terminal), ExitStatus::Success};
   }
   const bool isDone = summary.countOf(Remedy::None) == summary.imageCount() &&
                       missingCount(options, summary) == 0 && summary.unreadableLineCount() == 0;

@@ -11,13 +11,24 @@
 
 namespace accounts {
 
+/// Images that can be listed: with a result that has a remedy, or without a result.
+struct ListedImages {
+  /// None: those without a result.
+  std::optional<Remedy> remedy;
+};
+
 struct SummarizeOptions {
   /// Files with the lines that runs wrote, "-" for standard input; not empty.
   std::vector<std::string> files;
   /// How many images there are; none if that is not known.
   std::optional<std::size_t> expected;
-  /// Gives the roots of the images with this remedy in the place of the summary.
-  std::optional<Remedy> listed;
+  /// A file of this machine with the roots of all images, one a line, blank lines apart; "-" for
+  /// standard input, none if the images are not known.
+  std::optional<std::string> rootsFile;
+  /// Gives the roots of these images in the place of the summary.
+  std::optional<ListedImages> listed;
+  /// Whether each listed root is followed by the reason.
+  bool withReasons = false;
   /// Whether listed roots end with a null character rather than with the line.
   bool endsWithNull = false;
   bool reportsJSON = false;

@@ -9,6 +9,7 @@
 #include <system_error>
 #include <variant>
 
+#include "commandline/PlatformError.h"
 #include "platform/linux/DevicePath.h"
 #include "platform/linux/DeviceRoot.h"
 #include "platform/linux/FileContents.h"
@@ -21,11 +22,11 @@ namespace {
 constexpr mode_t kPermissionBits = 07777;
 
 ProgramError cannotCreate(const PathError& error) {
-  return ProgramError{ExitStatus::CannotCreate, error.text};
+  return programErrorOf(error, ExitStatus::CannotCreate);
 }
 
-ProgramError cannotWrite(const std::string& text) {
-  return ProgramError{ExitStatus::InputOutputError, text};
+ProgramError cannotWrite(const PathError& error) {
+  return programErrorOf(error, ExitStatus::InputOutputError);
 }
 
 /// What stat says of the file to replace; a mode of 0 when there is none.
@@ -69,8 +70,7 @@ std::optional<ProgramError> writeToPipe(const std::string& path, std::string_vie
   }
   const FileDescriptor pipe(opened);
   const int number = writeAll(pipe.number(), contents);
-  return number == 0 ? std::nullopt
-                     : std::optional(cannotWrite(pathError("write", path, number).text));
+  return number == 0 ? std::nullopt : std::optional(cannotWrite(pathError("write", path, number)));
 }
 
 /// Fills a temporary file; returns 0 or the error number.
@@ -104,7 +104,7 @@ std::variant<Replacement, ProgramError> makeReplacement(const std::string& path,
   PathError error;
   std::optional<DeviceRoot> machine = DeviceRoot::openRoot("/", error);
   if (!machine) {
-    return cannotWrite(error.text);
+    return cannotWrite(error);
   }
   // In the target's own directory, so that both are on one file system.
   std::string directory(splitPath(target).directory);
@@ -133,14 +133,14 @@ std::optional<ProgramError> replaceFile(const std::string& path, std::string_vie
   const auto& [machine, temporary, directory, target, replaced] = std::get<Replacement>(made);
   const int number = fill(temporary.file, contents, replaced);
   const Result moved =
-      number != 0 ? Result::failure(pathError("write", path, number).text)
+      number != 0 ? Result::failure(pathError("write", path, number).text, failureKind(number))
                   : LinuxFileSystem(machine, directory).renameFile(temporary.entry.path(), target);
   if (moved) {
     return std::nullopt;
   }
   // Gone already when only the directory could not be flushed; then there is nothing to remove.
   (void)temporary.entry.remove();
-  return cannotWrite(moved.error());
+  return programErrorOf(moved, ExitStatus::InputOutputError);
 }
 
 std::optional<ProgramError> whyNotReplaceable(const std::string& path) {

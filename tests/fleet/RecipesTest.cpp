@@ -1,14 +1,9 @@
-#include <fcntl.h>
-#include <sys/file.h>
-#include <unistd.h>
-
 #include <fstream>
 #include <set>
 #include <sstream>
 
 #include "tests/fleet/FleetFixture.h"
 #include "tests/program/DeviceRootFixture.h"
-#include "tests/program/ExitStatuses.h"
 
 // The recipes for engines that are not here: what they run is run, with what the engine would give
 // it.
@@ -32,57 +27,6 @@ TEST_F(Recipes, ShellScriptsHaveNothingThatACheckerWarnsOf) {
       runProgram(call("shellcheck", {example("migrate-image"), example("migrate-fleet"),
                                      example("slurm-array.sbatch")}));
   EXPECT_EQ(result.exitStatus, 0) << result.output;
-}
-
-/// The task of a Slurm array, with a program in the place of the one that asks Slurm.
-class SlurmTask : public Recipes {
- protected:
-  SlurmTask() {
-    roots_ = makeImages(3);
-    fs::create_directories(directory() / "bin");
-    std::ofstream(directory() / "bin/scontrol")
-        << "#!/bin/sh\necho \"$*\" >> '" << (directory() / "requeued").string() << "'\n";
-    fs::permissions(directory() / "bin/scontrol", fs::perms(0755));
-    environment["PATH"] = (directory() / "bin").string() + ":" + environment["PATH"];
-    environment["SLURM_ARRAY_JOB_ID"] = "77";
-  }
-
-  [[nodiscard]] ProgramCall task(int number, int restarts = 0) const {
-    ProgramCall taskCall = call("bash", {example("slurm-array.sbatch"), roots_});
-    taskCall.environment["SLURM_ARRAY_TASK_ID"] = std::to_string(number);
-    taskCall.environment["SLURM_RESTART_COUNT"] = std::to_string(restarts);
-    return taskCall;
-  }
-
- private:
-  std::string roots_;
-};
-
-TEST_F(SlurmTask, MigratesTheImageOfItsNumber) {
-  const ProgramResult result = runProgram(task(2));
-  EXPECT_EQ(result.exitStatus, 0) << result.errors;
-  EXPECT_EQ(onlyObject(result)["root"], image(2).string());
-  EXPECT_EQ(versionOf(1), 11);
-  EXPECT_EQ(versionOf(2), 12);
-  EXPECT_EQ(textOf("requeued"), "");
-}
-
-TEST_F(SlurmTask, WhatFailsForGoodIsNotPutInTheQueueAgain) {
-  fs::remove_all(image(3));
-  EXPECT_EQ(runProgram(task(3)).exitStatus, 66);
-  EXPECT_EQ(textOf("requeued"), "");
-}
-
-TEST_F(SlurmTask, WhatMayPassIsPutInTheQueueAgainFiveTimes) {
-  const int busy = open(image(1).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-  ASSERT_EQ(flock(busy, LOCK_EX), 0);
-  environment["LOCK_TIMEOUT"] = "0";
-  EXPECT_EQ(runProgram(task(1, 4)).exitStatus, kMayPass);
-  EXPECT_EQ(textOf("requeued"), "requeue 77_1\n");
-  EXPECT_EQ(runProgram(task(1, 5)).exitStatus, kMayPass);
-  EXPECT_EQ(textOf("requeued"), "requeue 77_1\n");
-  EXPECT_EQ(versionOf(1), 11);
-  close(busy);
 }
 
 /// The Kubernetes Job, read as YAML.

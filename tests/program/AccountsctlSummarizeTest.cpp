@@ -74,6 +74,48 @@ TEST_F(AccountsctlSummarize, ListsRootsForTheNextRun) {
   EXPECT_EQ(run({"summarize", results(), "--list", "retry"}).exitStatus, 0);
 }
 
+TEST_F(AccountsctlSummarize, ListsRootsWithTheirReasons) {
+  const std::string file =
+      writeText("more.jsonl", std::string(kResults) + R"({"root":"/i/tab\there","exitStatus":70})"
+                                                      "\n");
+
+  EXPECT_EQ(run({"summarize", file, "--list", "attention", "--reasons"}).output,
+            "/i/3\tCannot open ROOT: Missing\n"
+            "/i/tab\\there\tthe plug-in ended by an assertion or a signal\n");
+  expectRefused(run({"summarize", file, "--reasons"}), kUnusableArguments, "--list");
+}
+
+TEST_F(AccountsctlSummarize, KnowsWhichImagesHaveNoResult) {
+  const std::string roots = writeText("roots", "/i/4\r\n\n  \n/i/1\r\n/i/5\n/i/4\n/i/3");
+
+  const nlohmann::json object =
+      onlyObject(run({"summarize", results(), "--roots", roots, "--json"}));
+
+  EXPECT_EQ(object["expected"], 4);
+  EXPECT_EQ(object["images"], 2);
+  EXPECT_EQ(object["retry"], nlohmann::json::array());
+  EXPECT_EQ(object["missing"], nlohmann::json::array({"/i/4", "/i/5"}));
+  EXPECT_EQ(run({"summarize", results(), "--roots", roots, "--list", "missing"}).output,
+            "/i/4\n/i/5\n");
+  EXPECT_NE(run({"summarize", results(), "--roots", roots})
+                .output.find("\n2 without a result: --list missing\n"),
+            std::string::npos);
+  EXPECT_EQ(onlyObject(run({"summarize", results(), "--json"}))["missing"], nullptr);
+}
+
+TEST_F(AccountsctlSummarize, AFleetWithEveryResultIsASuccessWhateverOthersBecame) {
+  const std::string roots = writeText("roots", "/i/1");
+
+  EXPECT_EQ(run({"summarize", results(), "--roots", roots}).exitStatus, 0);
+}
+
+TEST_F(AccountsctlSummarize, RootsThatCannotBeReadAreMissingInput) {
+  expectRefused(run({"summarize", results(), "--roots", path("none")}), kMissingInput, "none");
+  expectRefused(run({"summarize", results(), "--list", "missing"}), kUnusableArguments, "--roots");
+  expectRefused(run({"summarize", results(), "--roots", "a", "--expected", "1"}),
+                kUnusableArguments, "--expected");
+}
+
 TEST_F(AccountsctlSummarize, ReadsSeveralFilesAndStandardInput) {
   const std::string later = writeText("later.jsonl", R"({"root":"/i/2","exitStatus":0})");
   const nlohmann::json object =
@@ -90,7 +132,7 @@ TEST_F(AccountsctlSummarize, AMissingFileIsMissingInput) {
 TEST_F(AccountsctlSummarize, UnusableArgumentsAreRefused) {
   expectRefused(run({"summarize"}), kUnusableArguments, "FILE");
   expectRefused(run({"summarize", "a", "--list", "all"}), kUnusableArguments,
-                "must be retry, attention or migrated");
+                "must be retry, attention, migrated or missing");
   expectRefused(run({"summarize", "a", "--null"}), kUnusableArguments, "--list");
   expectRefused(run({"summarize", "a", "--expected", "-1"}), kUnusableArguments, "--expected");
 }
