@@ -46,11 +46,6 @@ TEST_F(Demo, EndsWithCommandsThatWork) {
   }
 }
 
-TEST_F(Demo, CanBeRunAgain) {
-  EXPECT_EQ(run("./demo").exitStatus, 0);
-  EXPECT_EQ(run("./demo").exitStatus, 0);
-}
-
 /// tools/install-dependencies on a machine where nothing is installed, with programs in the place
 /// of Debian's that write down what they are asked to do.
 class InstalledDependencies : public testing::Test {
