@@ -12,6 +12,7 @@
 
 #include "AccountsCorpus.h"
 #include "propertylist/BinaryPropertyList.h"
+#include "propertylist/BinaryPropertyListSerializer.h"
 #include "propertylist/XMLPropertyList.h"
 
 namespace accounts::bench {
@@ -97,7 +98,8 @@ void writeBinaryInPieces(benchmark::State& state) {
   PropertyListError error;
   const PropertyValue value = readBinaryPropertyList(binaryFile(), error).value();
   for (auto _ : state) {
-    const bool areTaken = giveBinaryPropertyList(value, [](std::string_view piece) {
+    const SerializedPropertyList file = BinaryPropertyListSerializer().serialize(value, error);
+    const bool areTaken = file.giveTo([](std::string_view piece) {
       benchmark::DoNotOptimize(piece.data());
       return true;
     });

@@ -6,7 +6,6 @@
 
 #include "propertylist/PropertyListError.h"
 #include "propertylist/PropertyValue.h"
-#include "propertylist/SerializedPropertyList.h"
 
 namespace accounts {
 
@@ -24,9 +23,5 @@ std::optional<PropertyValue> readBinaryPropertyList(std::string_view bytes,
 /// would not take back.
 std::optional<std::string> writeBinaryPropertyList(const PropertyValue& value,
                                                    PropertyListError& error);
-
-/// Passes the same bytes, no more than 512 kB at a time, to a taker until it wants no more. Returns
-/// whether it took all; false also for a value that the reader would not take back.
-bool giveBinaryPropertyList(const PropertyValue& value, const SerializedPropertyList::Taker& take);
 
 }  // namespace accounts

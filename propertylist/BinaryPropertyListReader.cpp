@@ -33,6 +33,9 @@ bool readTrailer(std::string_view bytes, Layout& layout, PropertyListError& erro
   if (bytes.size() < kHeader.size() + kTrailerSize) {
     return failAt(error, "a file too short for its trailer", bytes.size());
   }
+  if (bytes.size() > kMaximumFileSize) {
+    return failAt(error, "a file larger than the limit", kMaximumFileSize);
+  }
   const std::size_t trailerOffset = bytes.size() - kTrailerSize;
   const char* trailer = bytes.data() + trailerOffset;
   layout.offsetSize = static_cast<unsigned char>(trailer[kOffsetSizePosition]);

@@ -5,7 +5,7 @@
 #include <utility>
 
 #include "propertylist/BinaryPropertyList.h"
-#include "propertylist/BinaryPropertyListCatalogue.h"
+#include "propertylist/BinaryPropertyListFile.h"
 #include "propertylist/GeneralisedUTF8.h"
 #include "propertylist/PropertyListLimits.h"
 
@@ -26,10 +26,11 @@ class BinaryPropertyListSerializer::Check {
     if (!(dictionary != nullptr ? passesRoot(*dictionary) : passesPart(root, 0))) {
       return false;
     }
-    // Each value and each key is at most one object. Whether those of a huge value are few enough,
-    // because many are equal, the writer's catalogue alone can tell.
-    return 2 * expandedCount_ <= kMaximumObjectCount ||
-           binaryplist::Catalogue().add(root, error_).has_value();
+    // Each value and each key is at most one object. Whether those of a huge value are few and
+    // small enough, because many are equal, is seen when they are put down.
+    return (2 * whole_.expandedCount <= kMaximumObjectCount && whole_.size <= kMaximumFileSize) ||
+           binaryplist::giveFile(root, [](std::string_view) { return true; }) ||
+           fail("more objects or bytes than the limit");
   }
 
   /// Those of the value that passed.
@@ -39,16 +40,25 @@ class BinaryPropertyListSerializer::Check {
   /// How far off its place an element is looked for.
   static constexpr std::size_t kReach = 16;
 
+  // The most that an object takes beside its content: its head, its place in the table, and, for
+  // each time that it is reached, a reference.
+  static constexpr std::uint64_t kSizeOfText = 6 + 4 + 4;
+  static constexpr std::uint64_t kSizeOfContainer = kSizeOfText;
+  static constexpr std::uint64_t kSizeOfNumber = 17 + 4 + 4;
+  /// More than header and trailer.
+  static constexpr std::uint64_t kSizeOfFrame = 64;
+
   bool passesRoot(const PropertyDictionary& root) {
-    return addCount(1) && std::all_of(root.begin(), root.end(), [this](const PropertyEntry& entry) {
+    return add({1, kSizeOfContainer}) &&
+           std::all_of(root.begin(), root.end(), [this](const PropertyEntry& entry) {
              const PropertyArray* const array = entry.value.asArray();
-             return passesText(entry.key) &&
+             return passesText(entry.key, 0) &&
                     (array != nullptr ? passesArrayOfRoot(*array) : passesPart(entry.value, 1));
            });
   }
 
   bool passesArrayOfRoot(const PropertyArray& array) {
-    return addCount(1) &&
+    return add({1, kSizeOfContainer}) &&
            std::all_of(array.begin(), array.end(), [this](const PropertyValue& value) {
              const PropertyDictionary* const dictionary = value.asDictionary();
              return dictionary != nullptr && !dictionary->empty()
@@ -58,10 +68,12 @@ class BinaryPropertyListSerializer::Check {
   }
 
   bool passesElement(const PropertyValue& value, const SharedNodeBase* node) {
-    const std::uint64_t countBefore = expandedCount_;
+    const Extent before = whole_;
     const Element* const known = findKnown(node);
-    const bool isPassed = known != nullptr ? addCount(known->expandedCount) : passesPart(value, 2);
-    elements_.push_back({.node = node, .expandedCount = expandedCount_ - countBefore});
+    const bool isPassed = known != nullptr ? add(known->extent) : passesPart(value, 2);
+    elements_.push_back({.node = node,
+                         .extent = {.expandedCount = whole_.expandedCount - before.expandedCount,
+                                    .size = whole_.size - before.size}});
     return isPassed;
   }
 
@@ -87,41 +99,47 @@ class BinaryPropertyListSerializer::Check {
   /// `depth` is the number of containers around the value; it bounds the recursion.
   bool passesPart(const PropertyValue& value, std::size_t depth) {
     if (const Text* text = value.asText()) {
-      return addCount(1) && passesText(*text);
+      return passesText(*text, 1);
     }
     if (const PropertyData* data = value.asData()) {
-      return addCount(1 + expandedCountOfBytes(data->bytes.view().size()));
+      const std::size_t size = data->bytes.view().size();
+      return add({1 + expandedCountOfBytes(size), kSizeOfText + size});
     }
     const PropertyDictionary* const dictionary = value.asDictionary();
     const PropertyArray* const array = value.asArray();
     if (dictionary == nullptr && array == nullptr) {
-      return addCount(1);
+      return add({1, kSizeOfNumber});
     }
     if (depth == kMaximumNestingDepth) {
       return fail("containers nested deeper than the limit");
     }
     if (array != nullptr) {
-      return addCount(1) &&
+      return add({1, kSizeOfContainer}) &&
              std::all_of(array->begin(), array->end(),
                          [&](const PropertyValue& child) { return passesPart(child, depth + 1); });
     }
-    return addCount(1) &&
+    return add({1, kSizeOfContainer}) &&
            std::all_of(dictionary->begin(), dictionary->end(), [&](const PropertyEntry& entry) {
-             return passesText(entry.key) && passesPart(entry.value, depth + 1);
+             return passesText(entry.key, 0) && passesPart(entry.value, depth + 1);
            });
   }
 
-  bool passesText(const Text& text) {
+  /// `valueCount` is 1 for a text that is a value, 0 for a key, which counts its bytes alone.
+  bool passesText(const Text& text, std::uint64_t valueCount) {
     const std::string_view view = text.view();
-    return (isASCII(view) || isGeneralisedUTF8(view) ||
-            fail("a text that is not well-formed UTF-8")) &&
-           addCount(expandedCountOfBytes(view.size()));
+    const bool isWideInFile = !isASCII(view);
+    if (isWideInFile && !isGeneralisedUTF8(view)) {
+      return fail("a text that is not well-formed UTF-8");
+    }
+    return add({valueCount + expandedCountOfBytes(view.size()),
+                kSizeOfText + (isWideInFile ? 2 : 1) * view.size()});
   }
 
   /// Ends the walk as soon as it can: a value of a few parts can stand for billions.
-  bool addCount(std::uint64_t count) {
-    expandedCount_ += count;
-    return expandedCount_ <= kMaximumExpandedValueCount ||
+  bool add(Extent extent) {
+    whole_.expandedCount += extent.expandedCount;
+    whole_.size += extent.size;
+    return whole_.expandedCount <= kMaximumExpandedValueCount ||
            fail("a container that stands for more values than the limit");
   }
 
@@ -133,7 +151,7 @@ class BinaryPropertyListSerializer::Check {
 
   const std::vector<Element>& lastElements_;
   PropertyListError& error_;
-  std::uint64_t expandedCount_ = 0;
+  Extent whole_ = {.expandedCount = 0, .size = kSizeOfFrame};
   std::vector<Element> elements_;
   /// Where among the last elements the next one is looked for first.
   std::size_t next_ = 0;
@@ -147,7 +165,13 @@ SerializedPropertyList BinaryPropertyListSerializer::serialize(const PropertyVal
   }
   lastElements_ = check.takeElements();
   lastValue_ = value;
-  return {value, &giveBinaryPropertyList};
+  return {value, &binaryplist::giveFile};
+}
+
+std::optional<std::string> writeBinaryPropertyList(const PropertyValue& value,
+                                                   PropertyListError& error) {
+  const SerializedPropertyList serialized = BinaryPropertyListSerializer().serialize(value, error);
+  return serialized ? std::optional(bytesOf(serialized)) : std::nullopt;
 }
 
 }  // namespace accounts

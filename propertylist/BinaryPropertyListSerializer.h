@@ -1,6 +1,5 @@
 #pragma once
 
-#include <cstddef>
 #include <cstdint>
 #include <optional>
 #include <vector>
@@ -20,10 +19,16 @@ class BinaryPropertyListSerializer {
 
  private:
   class Check;
-  /// A dictionary in an array of the root, and what it adds to the expanded count.
+  /// What a part adds to what the limits are for.
+  struct Extent {
+    std::uint64_t expandedCount = 0;
+    /// The most bytes that it can take in a file.
+    std::uint64_t size = 0;
+  };
+  /// A dictionary in an array of the root.
   struct Element {
     const SharedNodeBase* node;
-    std::uint64_t expandedCount;
+    Extent extent;
   };
 
   /// What was checked last, kept alive so that its nodes' addresses tell something.

@@ -5,18 +5,6 @@
 
 namespace accounts {
 
-namespace {
-
-// A table that grows in small steps moves everything often; the largest tables are megabytes, and
-// with a larger step they could be several times what is needed.
-constexpr std::size_t kLargeSlotCount = std::size_t{1} << 16;
-
-std::size_t slotCountAfter(std::size_t count) {
-  return count < kLargeSlotCount ? 4 * count : count + count / 2;
-}
-
-}  // namespace
-
 KeyedHash::KeyedHash() {
   // Where this object stands in memory and the time of the call: nobody who prepares a file knows
   // either. Odd, because a factor of 0 would hash everything to 0.
@@ -29,8 +17,7 @@ KeyedHash::KeyedHash() {
 }
 
 void ContentTable::grow() {
-  const std::vector<Slot> old =
-      std::exchange(slots_, std::vector<Slot>(slotCountAfter(slots_.size())));
+  const std::vector<Slot> old = std::exchange(slots_, std::vector<Slot>(2 * slots_.size()));
   for (const Slot& slot : old) {
     if (slot.numberPlusOne != 0) {
       std::size_t place = firstPlace(slot.hash);

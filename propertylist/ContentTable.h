@@ -87,10 +87,6 @@ class ContentTable {
     return kNone;
   }
 
-  /// Says that a hash will be looked for soon: memory then has its answer ready. Worth it for
-  /// several hashes in a row, since a table of many entries is not in the nearest cache.
-  void announce(std::uint32_t hash) const { __builtin_prefetch(slots_.data() + firstPlace(hash)); }
-
   /// The number under this hash of which `hasContent(number)` is true. If there is none, adds
   /// `newNumber` and returns it.
   template <class HasContent>

@@ -3,12 +3,18 @@
 #include <cstddef>
 #include <cstdint>
 
+/// What readers, writers and those who serialise refuse, so that nothing is written that cannot be
+/// read again.
 namespace accounts {
 
 /// How deep containers may stand in each other; a scalar alone has depth 0, an array of scalars 1.
 /// Account files need fewer than ten. The bound is low enough for everything that walks a value
 /// (comparison, description, destruction) to recurse safely on a small thread stack.
 inline constexpr std::size_t kMaximumNestingDepth = 512;
+
+/// How many bytes a file may have. Settings files hold kilobytes; a larger one, such as a sparse
+/// file of terabytes in a damaged image, would only use up the machine's memory or disk.
+inline constexpr std::size_t kMaximumFileSize = std::size_t{256} << 20;
 
 /// How many objects a binary file may list. Four times what 100,000 accounts with 40 values each
 /// need if no two values are equal; the tables for as many still fit a small machine's memory.

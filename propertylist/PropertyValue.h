@@ -80,7 +80,6 @@ class PropertyArray {
   [[nodiscard]] bool isSameAs(const PropertyArray& other) const {
     return node_.get() == other.node_.get();
   }
-  [[nodiscard]] const SharedNodeBase* sharedNode() const { return node_.get(); }
 
   /// Deep equality, in order.
   friend bool operator==(const PropertyArray& left, const PropertyArray& right);
@@ -128,6 +127,8 @@ class PropertyDictionary {
   [[nodiscard]] bool isSameAs(const PropertyDictionary& other) const {
     return node_.get() == other.node_.get();
   }
+  /// The node, null for an empty one: as long as a handle to it lives, its address names the
+  /// content.
   [[nodiscard]] const SharedNodeBase* sharedNode() const { return node_.get(); }
 
   /// Deep equality.

@@ -41,14 +41,8 @@ class SharedNodeBase {
   /// True when exactly one handle holds the node, so that it may be changed in place.
   [[nodiscard]] bool isUnshared() const { return references_.load(std::memory_order_acquire) == 1; }
 
-  /// A number that a writer notes on a node that it has met, in order to know it again without a
-  /// table. It may be out of date or another writer's, so it tells nothing by itself.
-  [[nodiscard]] std::uint32_t note() const { return note_.load(std::memory_order_relaxed); }
-  void setNote(std::uint32_t note) const { note_.store(note, std::memory_order_relaxed); }
-
  private:
   std::atomic<std::uint32_t> references_{1};
-  mutable std::atomic<std::uint32_t> note_{UINT32_MAX};
 };
 
 /// An owning handle to a shared node, null allowed. Copying shares the node. `Owner` is the class

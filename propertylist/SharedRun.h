@@ -15,7 +15,7 @@ namespace accounts {
 /// node, not by a second piece of memory. It never moves; what does not fit goes into a larger one.
 /// `Head` is what the node has besides its elements.
 template <class Element, class Head = SharedNodeBase>
-class SharedRun : public Head {
+class alignas(std::uint64_t) SharedRun : public Head {
  public:
   /// An empty run with room for a number of elements.
   static SharedRun* make(std::size_t capacity) {

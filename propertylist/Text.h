@@ -27,10 +27,6 @@ class SharedBytes {
     return node_.get() == other.node_.get();
   }
 
-  /// The node, null for no bytes: its address names the content for as long as a handle to it
-  /// lives.
-  [[nodiscard]] const SharedNodeBase* sharedNode() const { return node_.get(); }
-
  private:
   friend class SharedNode<SharedBytes>;
   friend class SharedBytesArena;

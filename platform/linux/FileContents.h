@@ -7,13 +7,13 @@
 
 #include "platform/linux/FileDescriptor.h"
 #include "platform/linux/PathError.h"
+#include "propertylist/PropertyListLimits.h"
 #include "propertylist/SerializedPropertyList.h"
 
 namespace accounts {
 
-/// No file larger than this is read or copied. Settings files hold kilobytes; a larger one, such as
-/// a sparse file of terabytes in a damaged image, would only use up the machine's memory or disk.
-inline constexpr std::size_t kLargestFileSize = std::size_t{256} << 20;
+/// No file larger than this is read or copied.
+inline constexpr std::size_t kLargestFileSize = kMaximumFileSize;
 
 /// What stat says of an open file; none, with `error` set, when it says nothing.
 std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_view path,

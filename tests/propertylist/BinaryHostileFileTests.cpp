@@ -1,5 +1,8 @@
 #include <gtest/gtest.h>
 
+#include <cstdlib>
+#include <cstring>
+#include <memory>
 #include <string>
 
 #include "PropertyListTesting.h"
@@ -40,6 +43,16 @@ std::string doublingArraysFile(std::size_t depth) {
   file.add("\xA0");
   file.setTopObject(0);
   return file.build();
+}
+
+TEST(HostileBinaryFile, AFileLargerThanTheLimitIsRefused) {
+  constexpr std::size_t kSize = kMaximumFileSize + 1;
+  // Memory that nobody touches, and which is there only in name.
+  const std::unique_ptr<char, decltype(&std::free)> bytes(static_cast<char*>(std::calloc(kSize, 1)),
+                                                          &std::free);
+  ASSERT_NE(bytes, nullptr);
+  std::memcpy(bytes.get(), "bplist00", 8);
+  EXPECT_TRUE(contains(errorOfReadingBinary({bytes.get(), kSize}), "larger than the limit"));
 }
 
 TEST(HostileBinaryFile, ContainersMayNestAsDeepAsTheLimit) {

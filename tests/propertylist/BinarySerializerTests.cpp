@@ -132,5 +132,18 @@ TEST_F(BinarySerializer, LongTextsDataAndKeysCountMoreThanOnce) {
   }
 }
 
+TEST_F(BinarySerializer, AValueWhoseFileTheReaderWouldFindTooLargeIsRefused) {
+  EXPECT_FALSE(serialize(PropertyData(std::string(kMaximumFileSize - 8, '\0'))));
+  EXPECT_TRUE(contains(error.text, "more objects or bytes than the limit"));
+}
+
+TEST_F(BinarySerializer, EqualPartsCountOnceForTheSizeOfTheFile) {
+  constexpr std::size_t kLarge = std::size_t{1} << 20;
+  const PropertyData data(std::string(kLarge, 'd'));
+  const std::vector<PropertyValue> many(kMaximumFileSize / kLarge + 1, data);
+
+  EXPECT_TRUE(serialize(PropertyArray(many)));
+}
+
 }  // namespace
 }  // namespace accounts

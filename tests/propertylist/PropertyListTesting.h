@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "propertylist/BinaryPropertyList.h"
+#include "propertylist/SerializedPropertyList.h"
 #include "propertylist/XMLPropertyList.h"
 
 namespace accounts::testing {
