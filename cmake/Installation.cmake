@@ -44,7 +44,11 @@ install(EXPORT AccountsFrameworkTargets NAMESPACE accounts::
 foreach(header
     platform/AccountFramework.h
     propertylist/Description.h
+    propertylist/PropertyArray.h
+    propertylist/PropertyContent.h
+    propertylist/PropertyDictionary.h
     propertylist/PropertyKeys.h
+    propertylist/PropertyScalars.h
     propertylist/PropertyValue.h
     propertylist/SharedNode.h
     propertylist/SharedRun.h

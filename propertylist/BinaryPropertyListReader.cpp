@@ -8,6 +8,7 @@
 #include "propertylist/BinaryPropertyListScalars.h"
 #include "propertylist/ContentTable.h"
 #include "propertylist/KeyList.h"
+#include "propertylist/OrderedValues.h"
 #include "propertylist/PropertyListLimits.h"
 
 namespace accounts {

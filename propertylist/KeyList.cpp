@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <numeric>
 
+#include "propertylist/OrderedValues.h"
+
 namespace accounts {
 
 KeyList::KeyList(std::span<const Text> keys) {

@@ -1,5 +1,6 @@
 #include <algorithm>
 
+#include "propertylist/OrderedValues.h"
 #include "propertylist/PropertyValue.h"
 
 namespace accounts {
@@ -49,6 +50,18 @@ PropertyArray PropertyArray::withRoomFor(std::size_t count) {
     array.node_ = SharedNode<PropertyArray>(Run::make(count));
   }
   return array;
+}
+
+void PropertyArray::destroyNode(SharedNodeBase* node) {
+  Run::destroy(node);
+}
+
+const PropertyValue* PropertyArray::begin() const {
+  return node_ ? run()->begin() : nullptr;
+}
+
+const PropertyValue* PropertyArray::end() const {
+  return node_ ? run()->end() : nullptr;
 }
 
 const PropertyValue& PropertyArray::at(std::size_t index) const {
@@ -196,6 +209,20 @@ std::optional<PropertyValue> PropertyDictionary::take(std::string_view key) {
   std::optional<PropertyValue> value(std::move(*place));
   run.truncate(std::move(place + 1, run.end(), place));
   return value;
+}
+
+void PropertyDictionary::destroyNode(SharedNodeBase* node) {
+  Run::destroy(node);
+}
+
+const PropertyKeys& PropertyDictionary::keys() const {
+  static const PropertyKeys kNone;
+  return node_ ? run()->keys : kNone;
+}
+
+std::span<const PropertyValue> PropertyDictionary::values() const {
+  return node_ ? std::span<const PropertyValue>(run()->begin(), run()->size())
+               : std::span<const PropertyValue>();
 }
 
 bool operator==(const PropertyDictionary& left, const PropertyDictionary& right) {

@@ -3,24 +3,19 @@
 #include <concepts>
 #include <cstddef>
 #include <cstdint>
-#include <initializer_list>
 #include <iterator>
 #include <optional>
-#include <span>
+#include <string>
 #include <string_view>
 #include <utility>
-#include <vector>
 
-#include "propertylist/PropertyKeys.h"
-#include "propertylist/SharedNode.h"
-#include "propertylist/SharedRun.h"
+#include "propertylist/PropertyArray.h"
+#include "propertylist/PropertyContent.h"
+#include "propertylist/PropertyDictionary.h"
+#include "propertylist/PropertyScalars.h"
 #include "propertylist/Text.h"
 
 namespace accounts {
-
-class PropertyValue;
-class PropertyEntryIterator;
-struct KeyedValue;
 
 /// The kinds of value that a property list holds. Boolean is a kind of its own: the integer 1 is
 /// not true.
@@ -33,193 +28,6 @@ enum class PropertyKind : std::uint8_t {
   Boolean,
   Date,
   Data
-};
-
-/// A point in time, kept bit for bit as it was read.
-struct PropertyDate {
-  /// Seconds since 2001-01-01T00:00:00Z; fractions, infinities and NaN included.
-  double secondsSinceReferenceDate = 0;
-};
-
-/// Opaque bytes.
-struct PropertyData {
-  PropertyData() = default;
-  explicit PropertyData(std::string_view content) : bytes(content) {}
-  explicit PropertyData(SharedBytes content) : bytes(std::move(content)) {}
-  SharedBytes bytes;
-};
-
-/// An ordered list of values. A value type: a copy is O(1), and a change to one copy is never seen
-/// by another.
-class PropertyArray {
- public:
-  PropertyArray() = default;
-  PropertyArray(std::initializer_list<PropertyValue> values);
-  explicit PropertyArray(std::vector<PropertyValue> values);
-  /// An empty array with room for a number of elements: as many are appended without moving those
-  /// before, as long as there is no copy.
-  static PropertyArray withRoomFor(std::size_t count);
-
-  [[nodiscard]] std::size_t size() const { return node_ ? run()->size() : 0; }
-  [[nodiscard]] bool empty() const { return size() == 0; }
-  /// The element at an index, which must be below size().
-  [[nodiscard]] const PropertyValue& at(std::size_t index) const;
-  [[nodiscard]] const PropertyValue* begin() const;
-  [[nodiscard]] const PropertyValue* end() const;
-  /// True when an element is the given text.
-  [[nodiscard]] bool containsText(std::string_view text) const;
-
-  /// Returns the element in its place.
-  const PropertyValue& append(PropertyValue value);
-  /// Puts a value in the place of the one at an index, which must be below size().
-  void replace(std::size_t index, PropertyValue value);
-  /// Removes every element that is the given text.
-  void removeText(std::string_view text);
-
-  /// True when both share the same elements in memory: equal without a comparison.
-  [[nodiscard]] bool isSameAs(const PropertyArray& other) const {
-    return node_.get() == other.node_.get();
-  }
-
-  /// Deep equality, in order.
-  friend bool operator==(const PropertyArray& left, const PropertyArray& right);
-
- private:
-  friend class SharedNode<PropertyArray>;
-  friend class PropertyContent;
-  using Run = SharedRun<PropertyValue>;
-  [[nodiscard]] Run* run() const { return static_cast<Run*>(node_.get()); }
-  static void destroyNode(SharedNodeBase* node) { Run::destroy(node); }
-  SharedNode<PropertyArray> node_;
-};
-
-/// Values by text key, in the order of the keys' bytes. A value type: a copy is O(1), and a change
-/// to one copy is never seen by another. Looking a key up is O(log n).
-class PropertyDictionary {
- public:
-  PropertyDictionary() = default;
-  PropertyDictionary(std::initializer_list<KeyedValue> values);
-  /// Takes values in any order, in O(n log n); of those with the same key the last one holds.
-  explicit PropertyDictionary(std::vector<KeyedValue> values);
-  [[nodiscard]] std::size_t size() const { return node_ ? run()->size() : 0; }
-  [[nodiscard]] bool empty() const { return size() == 0; }
-  /// The entries in key order.
-  [[nodiscard]] PropertyEntryIterator begin() const;
-  [[nodiscard]] PropertyEntryIterator end() const;
-  /// The keys alone, and the values alone, in the same order.
-  [[nodiscard]] const PropertyKeys& keys() const;
-  [[nodiscard]] std::span<const PropertyValue> values() const;
-
-  /// The value under a key, null for none; valid until the dictionary changes or goes.
-  [[nodiscard]] const PropertyValue* find(std::string_view key) const;
-  [[nodiscard]] bool contains(std::string_view key) const { return find(key) != nullptr; }
-  /// The text, array or dictionary under a key; none when there is no value or one of another kind.
-  [[nodiscard]] std::optional<Text> textForKey(std::string_view key) const;
-  [[nodiscard]] std::optional<PropertyArray> arrayForKey(std::string_view key) const;
-  [[nodiscard]] std::optional<PropertyDictionary> dictionaryForKey(std::string_view key) const;
-
-  void set(std::string_view key, PropertyValue value);
-  void remove(std::string_view key);
-  /// Removes the value under a key and returns it; none when there was none.
-  std::optional<PropertyValue> take(std::string_view key);
-
-  /// True when both share the same keys and values in memory: equal without a comparison.
-  [[nodiscard]] bool isSameAs(const PropertyDictionary& other) const {
-    return node_.get() == other.node_.get();
-  }
-  /// The node, null for an empty one: as long as a handle to it lives, its address names the
-  /// content.
-  [[nodiscard]] const SharedNodeBase* sharedNode() const { return node_.get(); }
-
-  /// Deep equality.
-  friend bool operator==(const PropertyDictionary& left, const PropertyDictionary& right);
-
- private:
-  friend class SharedNode<PropertyDictionary>;
-  friend class PropertyContent;
-  friend class OrderedValues;
-  struct Head : SharedNodeBase {
-    PropertyKeys keys;
-  };
-  using Run = SharedRun<PropertyValue, Head>;
-  PropertyDictionary(PropertyKeys keys, std::size_t room);
-  [[nodiscard]] Run* run() const { return static_cast<Run*>(node_.get()); }
-  static void destroyNode(SharedNodeBase* node) { Run::destroy(node); }
-  SharedNode<PropertyDictionary> node_;
-};
-
-/// What a value holds: a variant that knows that every kind is either a plain number or one handle
-/// to a shared node, so that moving takes no look at the kind and copying only one. Reading a file
-/// takes a seventh more instructions with std::variant in its place.
-class PropertyContent {
- public:
-  /// Those that hold a node come first.
-  enum class Form : std::uint8_t {
-    Dictionary,
-    Array,
-    Text,
-    Data,
-    Signed,
-    LargeUnsigned,
-    Real,
-    Boolean,
-    Date
-  };
-
-  explicit PropertyContent(PropertyDictionary content)
-      : form_(Form::Dictionary), dictionary(std::move(content)) {}
-  explicit PropertyContent(PropertyArray content) : form_(Form::Array), array(std::move(content)) {}
-  explicit PropertyContent(Text content) : form_(Form::Text), text(std::move(content)) {}
-  explicit PropertyContent(PropertyData content) : form_(Form::Data), data(std::move(content)) {}
-  explicit PropertyContent(std::int64_t content) : form_(Form::Signed), signedInteger(content) {}
-  explicit PropertyContent(std::uint64_t content)
-      : form_(Form::LargeUnsigned), unsignedInteger(content) {}
-  explicit PropertyContent(double content) : form_(Form::Real), real(content) {}
-  explicit PropertyContent(bool content) : form_(Form::Boolean), bits_(0) { boolean = content; }
-  explicit PropertyContent(PropertyDate content) : form_(Form::Date), date(content) {}
-
-  PropertyContent(const PropertyContent& other) : form_(other.form_), bits_(other.bits_) {
-    if (holdsNode()) {
-      node_->retain();
-    }
-  }
-  PropertyContent(PropertyContent&& other) noexcept
-      : form_(std::exchange(other.form_, Form::Signed)), bits_(other.bits_) {}
-  PropertyContent& operator=(PropertyContent other) noexcept {
-    std::swap(form_, other.form_);
-    std::swap(bits_, other.bits_);
-    return *this;
-  }
-  ~PropertyContent() {
-    if (holdsNode() && node_->releaseIsLast()) {
-      destroyNode();
-    }
-  }
-
-  [[nodiscard]] Form form() const { return form_; }
-
- private:
-  [[nodiscard]] bool holdsNode() const { return form_ <= Form::Data && node_ != nullptr; }
-  void destroyNode();
-
-  Form form_;
-
- public:
-  /// Which of them there is, the form says.
-  union {
-    PropertyDictionary dictionary;
-    PropertyArray array;
-    Text text;
-    PropertyData data;
-    std::int64_t signedInteger;
-    std::uint64_t unsignedInteger;
-    double real;
-    bool boolean;
-    PropertyDate date;
-    /// Whatever there is as plain bits, or as the node of one of the first four.
-    std::uint64_t bits_;
-    SharedNodeBase* node_;
-  };
 };
 
 /// One value of a property list, of any kind. Copying is O(1). Equality is deep, takes a shortcut
@@ -357,31 +165,6 @@ class PropertyEntryIterator {
   const PropertyValue* value_ = nullptr;
 };
 
-/// The values of a dictionary in the making, of which the keys are known: each keeps its place in
-/// memory, in the dictionary that is made of them too.
-class OrderedValues {
- public:
-  OrderedValues() = default;
-  explicit OrderedValues(PropertyKeys keys);
-
-  /// Adds the next key's value, not more of them than there are keys, and returns it in its place.
-  const PropertyValue& append(PropertyValue value) {
-    return values_.run()->append(std::move(value));
-  }
-  /// The dictionary, once each key has its value.
-  [[nodiscard]] PropertyDictionary take() { return std::move(values_); }
-
- private:
-  /// One only when it is taken.
-  PropertyDictionary values_;
-};
-
-inline const PropertyValue* PropertyArray::begin() const {
-  return node_ ? run()->begin() : nullptr;
-}
-inline const PropertyValue* PropertyArray::end() const {
-  return node_ ? run()->end() : nullptr;
-}
 inline PropertyEntryIterator PropertyDictionary::begin() const {
   return node_ ? PropertyEntryIterator(run()->keys.begin(), run()->begin())
                : PropertyEntryIterator();
@@ -389,14 +172,6 @@ inline PropertyEntryIterator PropertyDictionary::begin() const {
 inline PropertyEntryIterator PropertyDictionary::end() const {
   return node_ ? PropertyEntryIterator(run()->keys.begin() + run()->size(), run()->end())
                : PropertyEntryIterator();
-}
-inline const PropertyKeys& PropertyDictionary::keys() const {
-  static const PropertyKeys kNone;
-  return node_ ? run()->keys : kNone;
-}
-inline std::span<const PropertyValue> PropertyDictionary::values() const {
-  return node_ ? std::span<const PropertyValue>(run()->begin(), run()->size())
-               : std::span<const PropertyValue>();
 }
 
 }  // namespace accounts

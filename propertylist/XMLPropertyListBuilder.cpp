@@ -4,6 +4,7 @@
 #include <iterator>
 #include <utility>
 
+#include "propertylist/OrderedValues.h"
 #include "propertylist/PropertyListLimits.h"
 
 namespace accounts::xmlplist {
