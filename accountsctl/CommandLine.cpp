@@ -37,6 +37,15 @@ std::optional<ListedImages> listNamed(std::string_view name) {
   return std::nullopt;
 }
 
+/// More than there are devices.
+constexpr std::size_t kMostDigitsOfACount = 9;
+
+std::string requireCount(const std::string& value) {
+  const bool isCount = !value.empty() && value.size() <= kMostDigitsOfACount &&
+                       value.find_first_not_of("0123456789") == value.npos;
+  return isCount ? "" : "must be a whole number, at most 999999999";
+}
+
 std::string requireList(const std::string& value) {
   return listNamed(value) ? "" : "must be retry, attention, migrated or missing";
 }
@@ -193,7 +202,7 @@ void addSummarize(CLI::App& command, Arguments& arguments) {
           "--expected", [&options](std::size_t count) { options.expected = count; },
           "How many images there are; those without a result are counted, too")
       ->option_text("COUNT")
-      ->check(CLI::NonNegativeNumber);
+      ->check(requireCount);
   addPath(command, "--roots", options.rootsFile, "ROOTS",
           "The roots of all images, one a line, - for standard input; results of others do not "
           "count")
@@ -258,6 +267,7 @@ CommandLine parseCommandLine(int argumentCount, const char* const* arguments) {
       parseSubcommands<Arguments, Asked>(kProgram, kSubcommands, argumentCount, arguments, parsed);
   return {.asked = std::move(asked),
           .subcommand = std::move(subcommand),
+          .root = valueOfOption(argumentCount, arguments, "--root"),
           .wantsJSON = hasArgument(argumentCount, arguments, "--json")};
 }
 

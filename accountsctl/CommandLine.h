@@ -23,6 +23,8 @@ struct CommandLine {
       asked;
   /// The subcommand's name; none when the arguments name none.
   std::optional<std::string> subcommand;
+  /// The root that is named; none when none is, whatever else is wrong.
+  std::optional<std::string> root;
   /// Whether the report is to be a JSON object, that of an error too.
   bool wantsJSON = false;
 };

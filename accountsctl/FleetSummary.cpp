@@ -123,8 +123,9 @@ std::vector<std::string> FleetSummary::rootsWith(Remedy remedy) const {
 }
 
 std::string progressText(const FleetSummary& summary, std::optional<std::size_t> expected) {
-  return fmt::format("{}{} images: {} migrated, {} to retry, {} need attention",
-                     summary.imageCount(), expected ? fmt::format(" of {}", *expected) : "",
+  return fmt::format("{}{} {}: {} migrated, {} to retry, {} for a person", summary.imageCount(),
+                     expected ? fmt::format(" of {}", *expected) : "",
+                     expected.value_or(summary.imageCount()) == 1 ? "image" : "images",
                      summary.countOf(Remedy::None), summary.countOf(Remedy::Retry),
                      summary.countOf(Remedy::Attention));
 }

@@ -131,7 +131,7 @@ std::string countsText(const char* heading, const Counts<std::string>& counts, s
   }
   std::string text = "\n" + table.text(terminal);
   if (counts.size() > shown) {
-    text += fmt::format("and {} others\n", counts.size() - shown);
+    text += fmt::format("and {} more\n", counts.size() - shown);
   }
   return text;
 }
@@ -139,21 +139,25 @@ std::string countsText(const char* heading, const Counts<std::string>& counts, s
 std::string remarksText(const FleetSummary& summary) {
   struct Remark {
     std::size_t count;
+    const char* wordsForOne;
     const char* words;
   };
   const Remark remarks[] = {
-      {summary.warningCount(), "migrated with warnings"},
-      {summary.countOf(Remedy::Retry), "to run again: --list retry"},
-      {summary.countOf(Remedy::Attention),
+      {summary.warningCount(), "migrated with warnings", "migrated with warnings"},
+      {summary.countOf(Remedy::Retry), "to run again: --list retry", "to run again: --list retry"},
+      {summary.countOf(Remedy::Attention), "to look at before it is run again: --list attention",
        "to look at before they are run again: --list attention"},
-      {summary.replacedCount(), "results replaced by later ones of the same image"},
-      {summary.missingRoots().size(), "without a result: --list missing"},
-      {summary.unreadableLineCount(), "lines that are no results"},
+      {summary.replacedCount(), "result replaced by a later one of the same image",
+       "results replaced by later ones of the same image"},
+      {summary.missingRoots().size(), "without a result: --list missing",
+       "without a result: --list missing"},
+      {summary.unreadableLineCount(), "line that is no result", "lines that are no results"},
   };
   std::string text;
   for (const Remark& remark : remarks) {
     if (remark.count > 0) {
-      text += fmt::format("{}{} {}\n", text.empty() ? "\n" : "", remark.count, remark.words);
+      text += fmt::format("{}{} {}\n", text.empty() ? "\n" : "", remark.count,
+                          remark.count == 1 ? remark.wordsForOne : remark.words);
     }
   }
   return text;

@@ -39,6 +39,9 @@ CommandResult runCommand(const UnusableArguments& unusable) {
 std::string errorObject(const CommandLine& commandLine, const ProgramError& error) {
   JSON object = reportObject("");
   object["command"] = commandLine.subcommand ? JSON(*commandLine.subcommand) : JSON(nullptr);
+  if (commandLine.root) {
+    object["root"] = *commandLine.root;
+  }
   object["error"] = error.message;
   return lineOf(std::move(object), error.exitStatus);
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <CLI/App.hpp>
+#include <optional>
 #include <string>
 #include <variant>
 
@@ -32,5 +33,10 @@ ArgumentParsing parseArguments(CLI::App& program, int argumentCount, const char*
 
 /// Whether a word stands among the arguments, also when the arguments as a whole cannot be used.
 bool hasArgument(int argumentCount, const char* const* arguments, std::string_view word);
+
+/// The value that an option is given, in either way of writing it, also when the arguments as a
+/// whole cannot be used; none when it is given none.
+std::optional<std::string> valueOfOption(int argumentCount, const char* const* arguments,
+                                         const std::string& name);
 
 }  // namespace accounts

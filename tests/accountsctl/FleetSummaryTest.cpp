@@ -103,9 +103,9 @@ TEST(FleetSummary, ANumberThatNoProcessEndsWithIsNoExitStatus) {
 
 TEST(FleetSummary, ProgressSaysHowManyOfHowMany) {
   const FleetSummary summary = summaryOf({line("/a", 0), line("/b", 75), line("/c", 70)});
-  EXPECT_EQ(progressText(summary, 5), "3 of 5 images: 1 migrated, 1 to retry, 1 need attention");
+  EXPECT_EQ(progressText(summary, 5), "3 of 5 images: 1 migrated, 1 to retry, 1 for a person");
   EXPECT_EQ(progressText(summary, std::nullopt),
-            "3 images: 1 migrated, 1 to retry, 1 need attention");
+            "3 images: 1 migrated, 1 to retry, 1 for a person");
 }
 
 }  // namespace

@@ -85,7 +85,7 @@ TEST_F(ArgumentParsingTest, ASurplusArgumentIsNamed) {
 }
 
 TEST_F(ArgumentParsingTest, AMissingArgumentIsNamed) {
-  EXPECT_EQ(problemOf({"show"}), "FILE is required (--help explains)");
+  EXPECT_EQ(problemOf({"show"}), "FILE is needed (--help explains)");
 }
 
 TEST_F(ArgumentParsingTest, WithoutASubcommandAllOfThemAreNamed) {

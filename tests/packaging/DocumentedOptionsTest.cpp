@@ -88,6 +88,20 @@ INSTANTIATE_TEST_SUITE_P(
                     Subcommand{"accountsctl", "status"}, Subcommand{"accountsctl", "convert"},
                     Subcommand{"accountsctl", "summarize"}));
 
+TEST(ManualPages, HaveTheSectionsThatPeopleLookFor) {
+  for (const char* page : {"migration-host.1", "accountsctl.1"}) {
+    std::ostringstream text;
+    text << std::ifstream(SOURCE_DIRECTORY "/docs/man/" + std::string(page)).rdbuf();
+    for (const char* section : {"NAME", "SYNOPSIS", "DESCRIPTION", "EXIT STATUS", "FILES",
+                                "ENVIRONMENT", "EXAMPLES", "SEE ALSO"}) {
+      const std::string heading = "\n.SH " + std::string(section) + "\n";
+      const std::size_t place = text.str().find(heading);
+      ASSERT_NE(place, std::string::npos) << page << " " << section;
+      EXPECT_NE(text.str().substr(place + heading.size(), 4), ".SH ") << page << " " << section;
+    }
+  }
+}
+
 TEST(ManualPages, HaveNothingThatACheckerWarnsOf) {
   for (const char* page : {"migration-host.1", "accountsctl.1"}) {
     const ProgramResult result =

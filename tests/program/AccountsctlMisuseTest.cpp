@@ -52,6 +52,43 @@ TEST_F(AccountsctlMisuse, TwoFormsAtOnceAreRefused) {
   EXPECT_EQ(result.exitStatus, kUnusableArguments);
 }
 
+TEST_F(AccountsctlMisuse, EveryRefusalIsInTheProgramsOwnWords) {
+  const std::pair<std::vector<std::string>, std::string> cases[] = {
+      {{"show"}, "FILE is needed"},
+      {{"show", "a", "--json", "--xml"}, "--json and --xml cannot be given together"},
+      {{"show", "show", "show"}, "Unexpected argument: show"},
+      {{"--properties", "show", "a"}, "--properties has to stand behind show"},
+      {{"status"}, "--root DIR is needed"},
+      {{"status", "--root"}, "The DIR of --root is missing"},
+      {{"status", "--root", "a", "--root", "b"}, "--root is given more than once"},
+      {{"check", "a", "--plugin"}, "The BUNDLE of --plugin is missing"},
+      {{"convert", "a", "b"}, "--to FORM is needed"},
+      {{"convert", "a", "b", "--to", "json"}, "--to: must be xml or binary"},
+      {{"summarize", "a", "--null"}, "--null needs --list WHICH"},
+      {{"summarize", "a", "--expected", "-1"},
+       "--expected: must be a whole number, at most 999999999"},
+      {{"summarize", "a", "--expected", "1e999"},
+       "--expected: must be a whole number, at most 999999999"},
+      {{"summarize", "a", "--expected", "10000000000000000000000"},
+       "--expected: must be a whole number, at most 999999999"}};
+  for (const auto& [arguments, message] : cases) {
+    const ProgramResult result = run(arguments);
+    EXPECT_EQ(result.exitStatus, kUnusableArguments) << message;
+    EXPECT_EQ(result.errors, "accountsctl: " + message + " (--help explains)\n");
+  }
+}
+
+TEST_F(AccountsctlMisuse, ARefusalAsAnObjectHasTheRootThatWasNamed) {
+  for (const std::vector<std::string>& arguments :
+       {std::vector<std::string>{"status", "--json", "--root", "/image", "--what"},
+        {"status", "--root=/image", "--json", "--home", "relative"}}) {
+    const nlohmann::json object = onlyObject(run(arguments));
+    EXPECT_EQ(object["root"], "/image");
+    EXPECT_EQ(object["exitStatus"], kUnusableArguments);
+  }
+  EXPECT_FALSE(onlyObject(run({"status", "--json"})).contains("root"));
+}
+
 TEST_F(AccountsctlMisuse, AnArgumentWithALineBreakStillGivesOneLine) {
   expectRefused(run({"a\nb"}), kUnusableArguments, "a\\nb");
 }

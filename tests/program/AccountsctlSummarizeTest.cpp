@@ -40,7 +40,7 @@ TEST_F(AccountsctlSummarize, ShowsCountsByOutcomeStepAndError) {
             "\n"
             "1 migrated with warnings\n"
             "1 to run again: --list retry\n"
-            "1 to look at before they are run again: --list attention\n");
+            "1 to look at before it is run again: --list attention\n");
 }
 
 TEST_F(AccountsctlSummarize, WritesOneJSONObject) {
@@ -83,6 +83,15 @@ TEST_F(AccountsctlSummarize, ListsRootsWithTheirReasons) {
             "/i/3\tCannot open ROOT: Missing\n"
             "/i/tab\\there\tthe plug-in ended by an assertion or a signal\n");
   expectRefused(run({"summarize", file, "--reasons"}), kUnusableArguments, "--list");
+}
+
+TEST_F(AccountsctlSummarize, OneIsNotSeveral) {
+  const std::string file = writeText("one", "no result\n" + std::string(kResults));
+
+  const std::string output = run({"summarize", file}).output;
+
+  EXPECT_NE(output.find("\n1 line that is no result\n"), std::string::npos) << output;
+  EXPECT_NE(output.find("\n1 to look at before it is run again"), std::string::npos) << output;
 }
 
 TEST_F(AccountsctlSummarize, KnowsWhichImagesHaveNoResult) {

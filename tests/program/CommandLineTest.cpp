@@ -63,6 +63,20 @@ TEST(CommandLine, AMisspeltWordIsNamedWithTheOneThatWasMeant) {
   expectRefused({"plan", "--root", "/nowhere", "--htlm", "x"}, "did you mean '--html'?");
 }
 
+TEST(CommandLine, EveryRefusalIsInTheProgramsOwnWords) {
+  expectRefused({"run"}, ": --root DIR is needed (");
+  expectRefused({"run", "--root"}, ": The DIR of --root is missing (");
+  expectRefused({"run", "--root", "/a", "--root", "/b"}, ": --root is given more than once (");
+  expectRefused({"--root", "/nowhere", "run"}, ": --root has to stand behind run (");
+  expectRefused({"run", "--root", "/nowhere", "--lock-timeout", "99999999999"},
+                ": --lock-timeout cannot be 99999999999 (");
+  expectRefused({"run", "--root", "/nowhere", "--lock-timeout", "soon"},
+                ": --lock-timeout cannot be soon (");
+  expectRefused({"run", "--root", "/nowhere", "--broadcast", "radio"},
+                ": --broadcast cannot be radio (");
+  expectRefused({"run", "--root", "/nowhere", "--report"}, ": The FILE of --report is missing (");
+}
+
 TEST(CommandLine, PlanIsRefusedWhereRunIs) {
   expectRefused({"plan"}, "--root");
   expectRefused({"plan", "--root", ""}, "--root");
