@@ -8,6 +8,7 @@
 
 #include "propertylist/BinaryPropertyList.h"
 #include "propertylist/PropertyListFile.h"
+#include "tests/program/JSONSchema.h"
 #include "tests/program/Programs.h"
 
 namespace accounts {
@@ -137,6 +138,7 @@ nlohmann::json onlyObject(const ProgramResult& result) {
   EXPECT_TRUE(result.output.ends_with("}\n")) << result.output;
   nlohmann::json object = nlohmann::json::parse(result.output, nullptr, false);
   EXPECT_TRUE(object.is_object()) << result.output;
+  EXPECT_EQ(problemWithSchema(object), "") << result.output;
   return object.is_object() ? object : nlohmann::json::object();
 }
 

@@ -5,6 +5,7 @@
 #include <fstream>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/JSONSchema.h"
 #include "tests/program/Programs.h"
 
 namespace accounts {
@@ -28,7 +29,9 @@ class ReportFilesOfARun : public DeviceRootFixture {
   }
   [[nodiscard]] nlohmann::json reportIn(const std::string& name) const {
     std::ifstream stream(path(name));
-    return nlohmann::json::parse(stream);
+    nlohmann::json report = nlohmann::json::parse(stream);
+    EXPECT_EQ(problemWithSchema(report), "");
+    return report;
   }
 
  private:
