@@ -37,6 +37,11 @@ std::optional<ListedImages> listNamed(std::string_view name) {
   return std::nullopt;
 }
 
+std::string requireNamedPage(const std::string& value) {
+  return value == kStandardStream ? "must be a file, since standard output carries the summary"
+                                  : "";
+}
+
 /// More than there are devices.
 constexpr std::size_t kMostDigitsOfACount = 9;
 
@@ -193,7 +198,9 @@ Asked convertAsked(Arguments& arguments) {
 
 void addSummarize(CLI::App& command, Arguments& arguments) {
   SummarizeOptions& options = arguments.summarize;
-  command.add_option("FILE", options.files, "The results, - for standard input")
+  command
+      .add_option("FILE", options.files,
+                  "The results or reports, a directory with them, - for standard input")
       ->option_text("...")
       ->required()
       ->check(requireText);
@@ -207,6 +214,10 @@ void addSummarize(CLI::App& command, Arguments& arguments) {
           "The roots of all images, one a line, - for standard input; results of others do not "
           "count")
       ->excludes("--expected");
+  CLI::Option* html = addPath(command, "--html", options.html, "PAGE",
+                              "Write a page over all images to PAGE, each with a link to the page "
+                              "of its report")
+                          ->check(requireNamedPage);
   CLI::Option* list =
       command
           .add_option("--list", arguments.list,
@@ -214,7 +225,8 @@ void addSummarize(CLI::App& command, Arguments& arguments) {
                       "migrated, or that --roots names and no result: WHICH is retry, attention,\n"
                       "migrated or missing")
           ->option_text("WHICH")
-          ->check(requireList);
+          ->check(requireList)
+          ->excludes(html);
   command
       .add_flag("--null", options.endsWithNull,
                 "End each root of a list with a null character, as xargs -0 takes it")

@@ -22,7 +22,7 @@ void FleetSummary::expect(const std::vector<std::string>& roots) {
   expectedRoots_ = {roots.begin(), roots.end()};
 }
 
-void FleetSummary::addLine(std::string_view line) {
+void FleetSummary::addLine(std::string_view line, const std::optional<std::string>& page) {
   if (line.empty()) {
     return;
   }
@@ -31,6 +31,7 @@ void FleetSummary::addLine(std::string_view line) {
     ++unreadableLines_;
     return;
   }
+  result->page = page;
   if (expected_ && !(result->root && expectedRoots_.contains(*result->root))) {
     return;
   }
@@ -59,7 +60,7 @@ std::size_t FleetSummary::countOf(Remedy remedy) const {
 std::size_t FleetSummary::warningCount() const {
   return static_cast<std::size_t>(
       std::count_if(results_.begin(), results_.end(), [](const RunResult& result) {
-        return result.hasWarnings && outcomeOf(result.exitStatus).remedy == Remedy::None;
+        return !result.warnings.empty() && outcomeOf(result.exitStatus).remedy == Remedy::None;
       }));
 }
 

@@ -25,8 +25,9 @@ class FleetSummary {
   /// Says which images there are, each once; results of others do not count. To be called before
   /// lines are added.
   void expect(const std::vector<std::string>& roots);
-  /// Adds a line of output; an empty one is nothing.
-  void addLine(std::string_view line);
+  /// Adds a line of output; an empty one is nothing. `page` is the page of the report that the line
+  /// is, if there is one.
+  void addLine(std::string_view line, const std::optional<std::string>& page = std::nullopt);
 
   /// How many images there are results of.
   [[nodiscard]] std::size_t imageCount() const { return results_.size(); }

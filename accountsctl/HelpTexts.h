@@ -90,6 +90,7 @@ inline constexpr const char* kSummarizeStatuses =
 inline constexpr const char* kSummarizeExamples =
     "  accountsctl summarize results.jsonl\n"
     "  accountsctl summarize --roots roots.txt results.jsonl\n"
+    "  accountsctl summarize --roots roots.txt --html images.html results/reports\n"
     "  accountsctl summarize results.jsonl --list retry > again.txt\n"
     "  accountsctl summarize results.jsonl --list attention --reasons\n"
     "  parallel migration-host run --json --root {} :::: roots.txt | tee results.jsonl |\n"

@@ -59,6 +59,20 @@ std::vector<std::string> textsIn(const JSON& object, const char* key) {
   return texts;
 }
 
+/// How long the stages of a report took together.
+std::optional<double> secondsIn(const JSON& object) {
+  const auto stages = object.find("stages");
+  if (stages == object.end() || !stages->is_array()) {
+    return std::nullopt;
+  }
+  double sum = 0;
+  for (const JSON& stage : *stages) {
+    const auto seconds = stage.is_object() ? stage.find("seconds") : stage.end();
+    sum += seconds != stage.end() && seconds->is_number() ? seconds->get<double>() : 0;
+  }
+  return sum;
+}
+
 /// Whether a value is what a process can end with: no other number may pass for one by being cut.
 bool isExitStatus(const JSON& value) {
   constexpr int kLargest = 255;
@@ -83,7 +97,8 @@ std::optional<RunResult> runResultFrom(std::string_view line) {
   if (std::optional<std::string> error = textIn(object, "error")) {
     result.error = withoutRoot(*std::move(error), result.root);
   }
-  result.hasWarnings = !textsIn(object, "warnings").empty();
+  result.warnings = textsIn(object, "warnings");
+  result.seconds = secondsIn(object);
   return result;
 }
 

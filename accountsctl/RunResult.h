@@ -18,7 +18,11 @@ struct RunResult {
   /// What went wrong, "ROOT" standing for the root's name, so that the same error on many images is
   /// one error; none when nothing did.
   std::optional<std::string> error;
-  bool hasWarnings = false;
+  std::vector<std::string> warnings;
+  /// How long its stages took together; none where the line is no report, which alone tells.
+  std::optional<double> seconds;
+  /// The page of its report, a file of this machine; none where none is known.
+  std::optional<std::string> page;
 };
 
 /// The result in a line; none when the line is no result, such as one that a killed program left

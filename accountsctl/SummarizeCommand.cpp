@@ -2,18 +2,22 @@
 
 #include <fmt/format.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
+#include <filesystem>
 #include <fstream>
 #include <iostream>
 #include <sstream>
 #include <unordered_set>
 
+#include "accountsctl/FleetPage.h"
 #include "accountsctl/FleetSummary.h"
 #include "accountsctl/JSONText.h"
 #include "accountsctl/ProgressLine.h"
 #include "accountsctl/TextTable.h"
 #include "commandline/PlatformError.h"
+#include "commandline/ReplacedFile.h"
 #include "platform/linux/FileContents.h"
 
 namespace accounts {
@@ -23,10 +27,10 @@ namespace {
 constexpr std::size_t kShownErrors = 10;
 
 /// Reads every line of a stream; whether it came to its end.
-bool addLines(std::istream& stream, const SummarizeOptions& options, FleetSummary& summary,
-              ProgressLine& progress) {
+bool addLines(std::istream& stream, const std::optional<std::string>& page,
+              const SummarizeOptions& options, FleetSummary& summary, ProgressLine& progress) {
   for (std::string line; std::getline(stream, line);) {
-    summary.addLine(line);
+    summary.addLine(line, page);
     if (progress.wantsText()) {
       progress.show(progressText(summary, options.expected));
     }
@@ -34,15 +38,48 @@ bool addLines(std::istream& stream, const SummarizeOptions& options, FleetSummar
   return !stream.bad();
 }
 
+/// The page of the report that a file holds: it has the same name, but for its end.
+std::optional<std::string> pageBeside(const std::string& file) {
+  std::filesystem::path page(file);
+  if (page.extension() != ".json") {
+    return std::nullopt;
+  }
+  std::error_code error;
+  page = std::filesystem::absolute(page.replace_extension(".html"), error);
+  return std::filesystem::is_regular_file(page, error) ? std::optional(page.lexically_normal())
+                                                       : std::nullopt;
+}
+
+/// The files that a name stands for: those of a directory that are no hidden ones, in their order.
+std::vector<std::string> filesOf(const std::string& name) {
+  std::error_code error;
+  if (!std::filesystem::is_directory(name, error)) {
+    return {name};
+  }
+  std::vector<std::string> files;
+  for (const auto& entry : std::filesystem::directory_iterator(name, error)) {
+    const std::filesystem::path path = entry.path();
+    if (path.extension() == ".json" && !path.filename().string().starts_with('.')) {
+      files.push_back(path.string());
+    }
+  }
+  if (error) {
+    // Reading it tells why.
+    return {name};
+  }
+  std::sort(files.begin(), files.end());
+  return files;
+}
+
 std::optional<ProgramError> addFile(const std::string& file, const SummarizeOptions& options,
                                     FleetSummary& summary, ProgressLine& progress) {
   errno = 0;
   bool isRead = false;
   if (file == kStandardStream) {
-    isRead = addLines(std::cin, options, summary, progress);
+    isRead = addLines(std::cin, std::nullopt, options, summary, progress);
   } else {
     std::ifstream stream(file, std::ios::binary);
-    isRead = stream.is_open() && addLines(stream, options, summary, progress);
+    isRead = stream.is_open() && addLines(stream, pageBeside(file), options, summary, progress);
   }
   if (isRead) {
     return std::nullopt;
@@ -208,10 +245,21 @@ CommandResult summarize(const SummarizeOptions& asked, const Terminal& terminal)
   }
   {
     ProgressLine progress;
-    for (const std::string& file : options.files) {
-      if (std::optional<ProgramError> error = addFile(file, options, summary, progress)) {
-        return *std::move(error);
+    for (const std::string& name : options.files) {
+      for (const std::string& file : filesOf(name)) {
+        if (std::optional<ProgramError> error = addFile(file, options, summary, progress)) {
+          return *std::move(error);
+        }
       }
+    }
+  }
+  if (options.html) {
+    std::error_code error;
+    const std::filesystem::path page = std::filesystem::absolute(*options.html, error);
+    const std::string directory = page.parent_path().lexically_normal().string();
+    if (std::optional<ProgramError> problem =
+            replaceFile(*options.html, fleetPage(summary, directory))) {
+      return *std::move(problem);
     }
   }
   if (options.listed) {

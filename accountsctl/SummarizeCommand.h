@@ -18,13 +18,16 @@ struct ListedImages {
 };
 
 struct SummarizeOptions {
-  /// Files with the lines that runs wrote, "-" for standard input; not empty.
+  /// Files with the lines that runs wrote, directories whose files *.json are such, "-" for
+  /// standard input; not empty.
   std::vector<std::string> files;
   /// How many images there are; none if that is not known.
   std::optional<std::size_t> expected;
   /// A file of this machine with the roots of all images, one a line, blank lines apart; "-" for
   /// standard input, none if the images are not known.
   std::optional<std::string> rootsFile;
+  /// A file of this machine that gets a page over all images; none for no page.
+  std::optional<std::string> html;
   /// Gives the roots of these images in the place of the summary.
   std::optional<ListedImages> listed;
   /// Whether each listed root is followed by the reason.

@@ -131,6 +131,18 @@ TEST_F(FleetProgram, WritesAReportAndAPageOfEachImageIfWanted) {
   for (const fs::path& file : filesIn("reports")) {
     EXPECT_TRUE(textOf(file).starts_with(file.extension() == ".html" ? "<!" : "{")) << file;
   }
+  // As a browser reads the link: %25 is what %2F begins with in the file's name.
+  std::string link = "reports/" + filesIn("reports")[0].filename().string();
+  for (std::size_t place = link.find('%'); place != std::string::npos;
+       place = link.find('%', place + 3)) {
+    link.replace(place, 1, "%25");
+  }
+  for (std::size_t place = link.find(' '); place != std::string::npos; place = link.find(' ')) {
+    link.replace(place, 1, "%20");
+  }
+  EXPECT_NE(textOf(fs::path(results()) / "images.html").find("<a href=\"" + link + "\">"),
+            std::string::npos)
+      << link;
 }
 
 TEST_F(FleetProgram, GivesOptionsToEachRun) {

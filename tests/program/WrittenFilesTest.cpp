@@ -172,9 +172,9 @@ TEST_F(WrittenFiles, ReplaceTheSummaryOnStandardOutputNowhere) {
   EXPECT_EQ(readDictionary(kSettingsPath), accountSettings(11));
 }
 
-class LogChannel : public NamedFiles {};
+class ChannelFile : public NamedFiles {};
 
-TEST_F(LogChannel, GoesWhereItsNameLeads) {
+TEST_F(ChannelFile, GoesWhereItsNameLeads) {
   fs::create_directory(path("folder"));
   fs::create_symlink("folder/target", path("link"));
   for (const auto& [name, target] : {std::pair("log", "log"),
