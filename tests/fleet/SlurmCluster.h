@@ -34,8 +34,10 @@ class SlurmCluster {
   void waitForTask(const std::string& task, const std::vector<std::string>& words) const;
   /// Waits until no task is in the queue.
   void waitForEmptyQueue() const;
-  /// Lets a task that waits in the queue start at once rather than after Slurm's two minutes.
-  void startNow(const std::string& task) const;
+  /// Lets a task that waits in the queue start at once rather than after Slurm's two minutes, and
+  /// waits until it has completed. While the run before is being cleared away the queue can look
+  /// empty, and a start is not taken.
+  void completeNow(const std::string& task) const;
 
   /// The working directory of jobs.
   [[nodiscard]] std::filesystem::path workingDirectory() const { return directory_ / "work"; }

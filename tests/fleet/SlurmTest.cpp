@@ -140,8 +140,7 @@ TEST_F(Slurm, WhatMayPassIsPutInTheQueueAgain) {
   EXPECT_NE(summary().output.find("1\t75\tsomething that may pass\n"), std::string::npos);
 
   close(root);
-  cluster().startNow(job + "_1");
-  cluster().waitForEmptyQueue();
+  cluster().completeNow(job + "_1");
 
   EXPECT_EQ(summary().exitStatus, 0) << summary().output << logs();
   EXPECT_EQ(versionOf(1), 12);
@@ -158,8 +157,7 @@ TEST_F(Slurm, AHostThatIsKilledIsRunAgain) {
   cluster().waitForTask(job + "_1", {"JobState=PENDING", "Restarts=1"});
   EXPECT_NE(summary().output.find("1 without a result"), std::string::npos) << summary().output;
   close(root);
-  cluster().startNow(job + "_1");
-  cluster().waitForEmptyQueue();
+  cluster().completeNow(job + "_1");
   EXPECT_EQ(summary().exitStatus, 0) << summary().output << logs();
   EXPECT_EQ(versionOf(1), 12);
 }
