@@ -6,6 +6,7 @@
 #include "accountsettings/AccountsManager.h"
 #include "migrator/AccountsDataMigrator.h"
 #include "platform/linux/DevicePath.h"
+#include "platform/linux/LinuxDevicePlaces.h"
 #include "platform/linux/TemporaryFile.h"
 #include "safetynet/KeptFolders.h"
 
@@ -75,8 +76,9 @@ bool isAbandoned(const DeviceRoot& root, const std::string& path) {
 }
 
 void lookAtLeftovers(LinuxPlatform& platform, DeviceStatus& status) {
-  status.keptFolders = KeptFolders(platform.fileSystem()).ofMigrations();
   const std::string home = platform.platform().homeDirectory.path();
+  LinuxDevicePlaces places(platform.root(), platform.fileSystem(), home);
+  status.keptFolders = KeptFolders(platform.fileSystem(), places).keptFor(KeptFor::Migration);
   for (const std::string_view place : kTemporaryPlaces) {
     for (std::string& path :
          pathsWithPrefix(platform, joinedPath(home, place), kTemporaryFilePrefix)) {

@@ -19,7 +19,7 @@ constexpr unsigned kLongestLockTimeout = 31 * 24 * 60 * 60;
 /// The arguments of every subcommand; those of the one that is chosen are filled.
 struct Arguments {
   RunOptions run;
-  PlanOptions plan;
+  RunOptions plan;
   RestoreOptions restore;
   ReportFiles reports;
   bool wantsJSON = false;
@@ -30,6 +30,17 @@ struct Arguments {
 
 using Asked = decltype(CommandLine::asked);
 
+void addLockTimeout(CLI::App& command, std::optional<std::chrono::seconds>& timeout) {
+  command
+      .add_option_function<unsigned>(
+          "--lock-timeout",
+          [&timeout](unsigned seconds) { timeout = std::chrono::seconds(seconds); },
+          "How long each lock is waited for that another process has (default: as long as it "
+          "takes)")
+      ->option_text("SECONDS")
+      ->check(CLI::Range(0U, kLongestLockTimeout));
+}
+
 void addDeviceOptions(CLI::App& command, DeviceOptions& options) {
   addDevice(command, options.root, options.home);
   addPath(command, "--device", options.deviceDescription, "FILE",
@@ -37,19 +48,14 @@ void addDeviceOptions(CLI::App& command, DeviceOptions& options) {
           "there is one)");
   addPath(command, "--plugin", options.plugin, "BUNDLE",
           "The plug-in bundle (default: that of the program)");
-  addPath(command, "--temporary-directory", options.temporaryDirectory, "DIR",
-          "Where temporary files go, a device path (default: tmp in the home directory)")
+  addPath(
+      command, "--temporary-directory", options.temporaryDirectory, "DIR",
+      "Where the temporary files of --bare go, a device path (default: tmp in the home directory)")
       ->check(requireDevicePath);
   addPath(command, "--channel", options.channel, "FILE",
           "Append the log channel to FILE, - for standard error, journal for the system's journal "
           "(default: off)");
-  command
-      .add_option_function<unsigned>(
-          "--lock-timeout",
-          [&options](unsigned seconds) { options.lockTimeout = std::chrono::seconds(seconds); },
-          "How long another host on the root is waited for (default: as long as it takes)")
-      ->option_text("SECONDS")
-      ->check(CLI::Range(0U, kLongestLockTimeout));
+  addLockTimeout(command, options.lockTimeout);
 }
 
 /// What is wrong with a report's file; empty when nothing is.
@@ -84,8 +90,12 @@ void addRun(CLI::App& command, Arguments& arguments) {
           "Announce changed preferences and cloud tabs on BUS, which is dbus (default: not at all)")
       ->option_text("BUS")
       ->check(CLI::IsMember({"dbus"}));
-  command.add_flag("--bare", arguments.run.bare,
-                   "Run the plug-in without keeping or verifying anything");
+  command.add_flag_callback(
+      "--keep", [&arguments] { arguments.run.keep = KeepFiles::Always; },
+      "Keep the files as they were after a clean run, too");
+  command.add_flag(
+      "--bare", arguments.run.bare,
+      "Run the plug-in on the device itself, save by save, without verifying anything");
   addJSON(command, arguments);
 }
 
@@ -103,7 +113,8 @@ void addPlan(CLI::App& command, Arguments& arguments) {
 }
 
 Asked planAsked(Arguments& arguments) {
-  arguments.plan.secrets = arguments.secrets();
+  arguments.plan.purpose = RunPurpose::Plan;
+  arguments.plan.recorded = arguments.secrets();
   return arguments.plan;
 }
 
@@ -111,6 +122,16 @@ void addRestore(CLI::App& command, Arguments& arguments) {
   addDevice(command, arguments.restore.root, arguments.restore.home);
   addPath(command, "--from", arguments.restore.folder, "FOLDER",
           "The folder of kept files, by its name or device path (default: the only one)");
+  const auto asks = [&arguments](RestoreAction action) {
+    return [&arguments, action] { arguments.restore.action = action; };
+  };
+  CLI::Option* const list = command.add_flag_callback(
+      "--list", asks(RestoreAction::List), "Show the folders of kept files with what is in them");
+  command
+      .add_flag_callback("--discard", asks(RestoreAction::Discard),
+                         "Remove a folder of kept files; nothing is put back")
+      ->excludes(list);
+  addLockTimeout(command, arguments.restore.lockTimeout);
   addJSON(command, arguments);
 }
 
@@ -143,6 +164,7 @@ CommandLine parseCommandLine(int argumentCount, const char* const* arguments) {
           .asked;
   return {.asked = std::move(asked),
           .wantsJSON = hasArgument(argumentCount, arguments, "--json"),
+          .root = valueOfOption(argumentCount, arguments, "--root"),
           .reports = std::move(parsed.reports)};
 }
 

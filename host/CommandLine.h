@@ -5,7 +5,6 @@
 #include <variant>
 
 #include "commandline/ArgumentParsing.h"
-#include "host/PlanCommand.h"
 #include "host/ReportFiles.h"
 #include "host/RestoreCommand.h"
 #include "host/RunCommand.h"
@@ -16,9 +15,11 @@ inline constexpr const char* kProgramName = "migration-host";
 
 /// What the arguments ask for.
 struct CommandLine {
-  std::variant<RunOptions, PlanOptions, RestoreOptions, RequestedText, UnusableArguments> asked;
+  std::variant<RunOptions, RestoreOptions, RequestedText, UnusableArguments> asked;
   /// Whether the report is to be a JSON object, that of an error too.
   bool wantsJSON = false;
+  /// The device root, also where the arguments cannot be used; none when they do not say.
+  std::optional<std::string> root;
   /// Where the report of a run or a plan goes besides.
   ReportFiles reports;
 };

@@ -19,20 +19,22 @@ inline constexpr const char* kErrors =
 
 inline constexpr const char* kRun =
     "Run the account-settings migration on one device root.\n\n"
-    "The settings file and the legacy stores are kept until the result is verified, and put back\n"
-    "if it cannot be; with --bare the plug-in's result is reported as it stands. Standard error\n"
-    "carries the plug-in's console lines, standard output a short summary or, with --json, one\n"
-    "object on one line.";
+    "The plug-in works in memory. What came of it is verified and then put on the device in one\n"
+    "step; until then nothing beneath the root is changed, whatever fails. The files as they were\n"
+    "are kept when something may not have been carried over. Standard error carries the plug-in's\n"
+    "console lines, standard output a short summary or, with --json, one object on one line.\n"
+    "With --bare the plug-in works on the device itself, and its result is reported as it stands.";
 inline constexpr const char* kRunStatuses =
     "  0   the plug-in reported success, which was verified unless --bare is given\n"
-    "  1   the plug-in reported failure\n"
-    "  2   the plug-in reported success, which was not verified: the files are put back\n";
+    "  1   the plug-in reported failure; without --bare nothing is changed\n"
+    "  2   the plug-in reported success, which was not verified: nothing is changed\n";
 inline constexpr const char* kRunErrors =
     "  70  the plug-in ended by an assertion or a signal\n"
     "  73  a file of the host's own cannot be created\n"
     "  74  a file or stream of the host's own cannot be written or read\n"
-    "  75  what stands in the way may pass: another host has the root, no room, a device that\n"
-    "      does not answer, the host was asked to stop\n";
+    "  75  what stands in the way may pass: another process has the root or the migration lock, "
+    "no\n"
+    "      room, a program that writes the files again and again, the host was asked to stop\n";
 inline constexpr const char* kRunExamples =
     "  migration-host run --root /                             the running device\n"
     "  migration-host run --root /mnt/image --json             an image, for a program to read\n"
@@ -58,17 +60,22 @@ inline constexpr const char* kPlanExamples =
     "  migration-host plan --root /mnt/image --html plan.html --json > plan.json\n";
 
 inline constexpr const char* kRestore =
-    "Put back the settings file and the legacy stores that a run kept.\n\n"
-    "A run that was killed, or that may not have carried over everything, leaves them in\n"
-    "/var/mobile/Library/AccountMigration/Kept-TIME on the device. What is replaced is itself\n"
-    "kept, in Replaced-TIME beside it, and the folder whose files are back is removed.";
-inline constexpr const char* kRestoreStatuses = "  0   the files are back\n";
+    "Put back what a run kept, or show or remove it.\n\n"
+    "A run that may not have carried over everything, or that is asked to, keeps the files as "
+    "they\n"
+    "were in /var/mobile/Library/AccountMigration/Kept-TIME on the device. They come back as they\n"
+    "were, and where nothing was, nothing is again. What is replaced or removed is itself kept, "
+    "in\n"
+    "Replaced-TIME beside it, and the folder whose files are back is removed.";
+inline constexpr const char* kRestoreStatuses = "  0   the files are back, shown or removed\n";
 inline constexpr const char* kRestoreErrors =
     "  73  what would be replaced cannot be kept; nothing was changed\n"
     "  74  the files cannot be put back; the folder is still whole\n"
     "  75  what stands in the way may pass; nothing was changed\n";
 inline constexpr const char* kRestoreExamples =
     "  migration-host restore --root /mnt/image\n"
-    "  migration-host restore --root /mnt/image --from Kept-20260102T030405Z\n";
+    "  migration-host restore --root /mnt/image --list\n"
+    "  migration-host restore --root /mnt/image --from Kept-20260102T030405Z\n"
+    "  migration-host restore --root /mnt/image --discard --from Replaced-20260102T030406Z\n";
 
 }  // namespace accounts::help

@@ -2,18 +2,18 @@
 
 #include "commandline/ReplacedFile.h"
 #include "host/CurrentTime.h"
-#include "report/HTMLReport.h"
 
 namespace accounts {
 
-JSON fullReport(std::string_view command, const HostOutcome& outcome) {
-  JSON report = {{"command", command}, {"time", currentTimeForReports()}};
-  report.update(objectOf(outcome.report));
-  report["versions"] = outcome.recorded.versions;
-  report["stages"] = outcome.recorded.stages;
-  report["accountsBefore"] = outcome.recorded.accountsBefore;
-  report["accountsAfter"] = outcome.recorded.accountsAfter;
-  return report;
+JSON fullReport(std::string_view command, const RunReport& report,
+                const RecordedMigration& recorded) {
+  JSON object = {{"command", command}, {"time", currentTimeForReports()}};
+  object.update(objectOf(report));
+  object["versions"] = recorded.versions;
+  object["stages"] = recorded.stages;
+  object["accountsBefore"] = recorded.accountsBefore;
+  object["accountsAfter"] = recorded.accountsAfter;
+  return object;
 }
 
 std::optional<ProgramError> whyNotWritable(const ReportFiles& files) {
@@ -27,17 +27,14 @@ std::optional<ProgramError> whyNotWritable(const ReportFiles& files) {
   return std::nullopt;
 }
 
-std::optional<ProgramError> writeReport(const ReportFiles& files, const JSON& report) {
-  if (!files.areWanted()) {
-    return std::nullopt;
-  }
-  const std::string text = lineOf(report);
+std::optional<ProgramError> writeReport(const ReportFiles& files, std::string_view json,
+                                        std::string_view page) {
   std::optional<ProgramError> error;
   if (files.json) {
-    error = replaceFile(*files.json, text + "\n");
+    error = replaceFile(*files.json, json);
   }
   if (files.html && !error) {
-    error = replaceFile(*files.html, htmlReport(text));
+    error = replaceFile(*files.html, page);
   }
   return error;
 }

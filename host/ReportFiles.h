@@ -5,8 +5,9 @@
 #include <string_view>
 
 #include "commandline/ExitStatus.h"
-#include "host/HostOutcome.h"
+#include "host/RunReport.h"
 #include "inspection/PropertyListJSON.h"
+#include "report/RecordedMigration.h"
 
 namespace accounts {
 
@@ -20,13 +21,16 @@ struct ReportFiles {
 
 /// Everything that a run or a plan came to as a JSON object (docs/json.md). `command` is the
 /// subcommand's name.
-JSON fullReport(std::string_view command, const HostOutcome& outcome);
+JSON fullReport(std::string_view command, const RunReport& report,
+                const RecordedMigration& recorded);
 
 /// Why a report could not be written; none when it could be. To be asked before a migration, which
 /// is not run without the report that was asked for.
 std::optional<ProgramError> whyNotWritable(const ReportFiles& files);
 
-/// Writes a report; an error for the first file that cannot be written.
-std::optional<ProgramError> writeReport(const ReportFiles& files, const JSON& report);
+/// Writes a report, as the bytes of each file that is wanted; an error for the first that cannot be
+/// written.
+std::optional<ProgramError> writeReport(const ReportFiles& files, std::string_view json,
+                                        std::string_view page);
 
 }  // namespace accounts

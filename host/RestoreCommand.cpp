@@ -1,75 +1,199 @@
 #include "host/RestoreCommand.h"
 
+#include <algorithm>
+#include <utility>
+
+#include "commandline/StandardStreams.h"
+#include "host/CommandLine.h"
 #include "host/CurrentTime.h"
-#include "host/HeldLock.h"
-#include "host/RootLock.h"
+#include "host/StopSignals.h"
 #include "inspection/PropertyListJSON.h"
 #include "platform/linux/DeviceRoot.h"
+#include "platform/linux/LinuxDevicePlaces.h"
 #include "platform/linux/LinuxFileSystem.h"
+#include "platform/linux/LinuxHostLocks.h"
 #include "platform/linux/LinuxPlatform.h"
-#include "platform/linux/LinuxSharedResources.h"
 #include "propertylist/Description.h"
+#include "safetynet/MigrationRun.h"
 
 namespace accounts {
 namespace {
 
-Restoration failed(ExitStatus exitStatus, const std::string& message) {
-  Restoration restoration;
-  restoration.error = ProgramError{exitStatus, message};
-  return restoration;
+struct ReasonText {
+  KeptFor reason;
+  const char* text;
+};
+constexpr ReasonText kReasonTexts[] = {
+    {KeptFor::Migration, "kept before a migration, on request"},
+    {KeptFor::MigrationWithLosses, "kept before a migration that did not carry over everything"},
+    {KeptFor::Restoration, "kept when other files were put back"}};
+
+struct KindText {
+  EntryKind kind;
+  const char* text;
+};
+constexpr KindText kKindTexts[] = {{EntryKind::Nothing, "nothing"},
+                                   {EntryKind::RegularFile, "file"},
+                                   {EntryKind::Directory, "directory"},
+                                   {EntryKind::Other, "other"}};
+
+const char* textOf(EntryKind kind) {
+  return std::ranges::find(kKindTexts, kind, &KindText::kind)->text;
+}
+
+std::optional<std::string> textOf(const std::optional<KeptFor>& reason) {
+  const auto* const found = std::ranges::find(kReasonTexts, reason, &ReasonText::reason);
+  return found != std::end(kReasonTexts) ? std::optional<std::string>(found->text) : std::nullopt;
+}
+
+std::string nameOf(const std::string& folder) {
+  return folder.substr(folder.rfind('/') + 1);
+}
+
+std::string homeOf(const RestoreOptions& options) {
+  return options.home.value_or(LinuxPlatformOptions().homeDirectory);
+}
+
+RestoreResult failed(ProgramError error) {
+  RestoreResult result;
+  result.restoration.error = std::move(error);
+  return result;
+}
+
+RestoreResult listFolders(const KeptFolders& folders, const RestoreOptions& options) {
+  RestoreResult result;
+  std::vector<std::string> paths;
+  if (options.folder) {
+    auto chosen = chosenFolder(folders, options.folder);
+    if (auto* error = std::get_if<ProgramError>(&chosen)) {
+      return failed(std::move(*error));
+    }
+    paths.push_back(std::get<std::string>(std::move(chosen)));
+  } else {
+    paths = folders.keptFor(KeptFor::Migration);
+    std::ranges::move(folders.keptFor(KeptFor::Restoration), std::back_inserter(paths));
+  }
+  for (std::string& path : paths) {
+    result.folders.push_back(
+        {path, folders.reasonOf(path), folders.listOf(path).value_or(KeptPlaces())});
+  }
+  return result;
+}
+
+RestoreResult discardFolder(KeptFolders& folders, const RestoreOptions& options) {
+  auto chosen = chosenFolder(folders, options.folder);
+  if (auto* error = std::get_if<ProgramError>(&chosen)) {
+    return failed(std::move(*error));
+  }
+  RestoreResult result;
+  std::string& folder = std::get<std::string>(chosen);
+  if (const Result discarded = folders.discard(folder); !discarded) {
+    return failed({ExitStatus::InputOutputError,
+                   "The folder cannot be removed and is still whole: " + discarded.error()});
+  }
+  result.discarded = std::move(folder);
+  return result;
 }
 
 }  // namespace
 
-Restoration runRestoration(const RestoreOptions& options) {
+RestoreResult runRestoration(const RestoreOptions& options) {
   PathError error;
   const auto root = DeviceRoot::openRoot(options.root, error);
   if (!root) {
-    return failed(ExitStatus::MissingInput, error.text);
-  }
-  ProgramError lockError;
-  const auto rootLock =
-      RootLock::take(*root, /*timeLimit=*/std::nullopt, /*stop=*/nullptr, lockError);
-  if (!rootLock) {
-    return failed(lockError.exitStatus, lockError.message);
-  }
-  LinuxSharedResources sharedResources(*root);
-  const HeldLock migrationLock(sharedResources, kMigrationLockName);
-  if (!migrationLock.isHeld()) {
-    return failed(ExitStatus::CannotCreate,
-                  "The migration lock cannot be made in /tmp of the device");
+    return failed({ExitStatus::MissingInput, error.text});
   }
   // No temporary file is made; the directory is only named.
-  const std::string home = options.home.value_or(LinuxPlatformOptions().homeDirectory);
+  const std::string home = homeOf(options);
   LinuxFileSystem files(*root, home + "/tmp");
-  return restoreKeptFiles(files, accountFilesInHome(home), options.folder, currentTimeText());
+  LinuxDevicePlaces places(*root, files, home);
+  KeptFolders folders(files, places);
+  if (options.action == RestoreAction::List) {
+    return listFolders(folders, options);
+  }
+  StopSignals stop;
+  LinuxHostLocks locks(
+      *root, [&stop] { return stop.haveArrived(); },
+      [](std::string_view line) { printError(kProgramName, line); });
+  LockEnd end = locks.takeRoot(options.lockTimeout);
+  if (end == LockEnd::Taken && options.action == RestoreAction::PutBack) {
+    end = locks.takeMigration(options.lockTimeout);
+  }
+  if (end != LockEnd::Taken) {
+    return failed(lockErrorOf(end, locks));
+  }
+  if (options.action == RestoreAction::Discard) {
+    return discardFolder(folders, options);
+  }
+  RestoreResult result;
+  result.restoration = restoreKeptFiles(places, folders, home, options.folder, currentTimeText());
+  return result;
 }
 
-ExitStatus exitStatusOf(const Restoration& restoration) {
-  return restoration.error ? restoration.error->exitStatus : ExitStatus::Success;
+ExitStatus exitStatusOf(const RestoreResult& result) {
+  const auto& error = result.restoration.error;
+  return error ? error->exitStatus : ExitStatus::Success;
 }
 
-std::string jsonText(const Restoration& restoration, const std::string& root) {
-  JSON object = {{"root", root},
-                 {"from", textOrNull(restoration.folder)},
-                 {"restored", restoration.restored},
-                 {"replaced", textOrNull(restoration.replaced)},
-                 {"exitStatus", static_cast<int>(exitStatusOf(restoration))}};
-  if (restoration.error) {
-    object["error"] = restoration.error->message;
+std::string jsonText(const RestoreResult& result, const RestoreOptions& options) {
+  JSON object = {{"root", options.root}};
+  if (options.action == RestoreAction::PutBack) {
+    object["from"] = textOrNull(result.restoration.folder);
+    object["restored"] = result.restoration.restored;
+    object["removed"] = result.restoration.removed;
+    object["replaced"] = textOrNull(result.restoration.replaced);
+  } else if (options.action == RestoreAction::Discard) {
+    object["discarded"] = textOrNull(result.discarded);
+  } else {
+    JSON folders = JSON::array();
+    for (const ListedFolder& each : result.folders) {
+      JSON places = JSON::array();
+      for (const auto& [place, kind] : each.places) {
+        places.push_back({{"place", listed(place).name},
+                          {"path", pathOfPlace(place, homeOf(options))},
+                          {"stood", textOf(kind)}});
+      }
+      folders.push_back({{"name", nameOf(each.path)},
+                         {"path", each.path},
+                         {"reason", textOrNull(textOf(each.reason))},
+                         {"places", std::move(places)}});
+    }
+    object["folders"] = std::move(folders);
+  }
+  object["exitStatus"] = static_cast<int>(exitStatusOf(result));
+  if (result.restoration.error) {
+    object["error"] = result.restoration.error->message;
   }
   return lineOf(object);
 }
 
-std::string summaryText(const Restoration& restoration) {
+std::string summaryText(const RestoreResult& result, const RestoreOptions& options) {
   std::string summary;
-  for (const std::string& path : restoration.restored) {
+  for (const std::string& path : result.restoration.restored) {
     summary += "Put back " + escapedText(path) + "\n";
   }
-  if (restoration.replaced) {
-    summary += "What was there is kept in " + escapedText(*restoration.replaced) + "\n";
+  for (const std::string& path : result.restoration.removed) {
+    summary += "Removed " + escapedText(path) + ", where nothing was before\n";
   }
-  return summary;
+  if (result.restoration.replaced) {
+    summary += "What was there is kept in " + escapedText(*result.restoration.replaced) + "\n";
+  }
+  if (result.discarded) {
+    summary += "Removed " + escapedText(*result.discarded) + "\n";
+  }
+  for (const ListedFolder& each : result.folders) {
+    summary += escapedText(nameOf(each.path)) + "  " +
+               textOf(each.reason).value_or("its list cannot be read") + "\n";
+    for (const auto& [place, kind] : each.places) {
+      if (kind != EntryKind::Nothing) {
+        summary += std::string("  ") + textOf(kind) + "  " +
+                   escapedText(pathOfPlace(place, homeOf(options))) + "\n";
+      }
+    }
+  }
+  const bool isNone =
+      options.action == RestoreAction::List && result.folders.empty() && !result.restoration.error;
+  return isNone ? "No files are kept.\n" : summary;
 }
 
 }  // namespace accounts

@@ -1,97 +1,223 @@
 #include "host/RunCommand.h"
 
+#include <sys/mman.h>
+
+#include <memory>
 #include <string>
 #include <utility>
 #include <variant>
 
-#include "commandline/PlatformError.h"
-#include "host/Broadcasting.h"
+#include "commandline/StandardStreams.h"
+#include "host/Announcements.h"
+#include "host/CommandLine.h"
 #include "host/CurrentTime.h"
-#include "host/HeldLock.h"
-#include "host/PluginRun.h"
-#include "host/RootLock.h"
-#include "safetynet/SafetyNet.h"
+#include "host/PluginWork.h"
+#include "host/StopSignals.h"
+#include "host/ToldResult.h"
+#include "host/WorkerProcess.h"
+#include "platform/linux/LinuxDevicePlaces.h"
+#include "platform/linux/LinuxHostLocks.h"
+#include "report/HTMLReport.h"
 
 namespace accounts {
 namespace {
 
-/// What a person types to put kept files back, without the folder.
-std::string restoreCommand(const DeviceOptions& options) {
-  std::string command = "migration-host restore --root " + options.root;
-  if (options.home) {
-    command += " --home " + *options.home;
+/// Writes a result where people and programs look for it.
+ExitStatus print(const ToldResult& told, ExitStatus exitStatus) {
+  for (const std::string& warning : told.warnings) {
+    printWarning(kProgramName, warning);
   }
-  return command;
+  if (told.error) {
+    printError(kProgramName, *told.error);
+  }
+  return printResult(kProgramName, told.result, exitStatus);
 }
 
-PluginEnd endOf(const std::variant<RunReport, ProgramError>& outcome) {
-  if (const auto* report = std::get_if<RunReport>(&outcome)) {
-    return report->result ? PluginEnd::GaveTrue : PluginEnd::GaveFalse;
+/// Tells of a run without a worker: none could be made, or it ended before its time.
+ExitStatus tellAlone(const RunOptions& options, const RunConclusion& conclusion) {
+  RunReport report;
+  note(report, conclusion, options);
+  const std::string text = lineOf(fullReport(commandOf(options), report, {}));
+  if (const auto error =
+          writeReport(options.reports, text + "\n", options.reports.html ? htmlReport(text) : "")) {
+    noteReportError(report, *error);
   }
-  return PluginEnd::Died;
+  return print(toldResult(options, report, {}), report.exitStatus);
 }
 
-/// Runs the plug-in with its inputs kept around it.
-HostOutcome runPluginSafely(const RunOptions& options, const PluginRun& run, StopSignals& stop) {
-  ProgramError lockError;
-  const auto rootLock =
-      RootLock::take(run.linux.root(), options.device.lockTimeout, &stop, lockError);
-  if (!rootLock) {
-    return failedOutcome(lockError);
+/// Lets the worker tell of a run, which it knows best.
+ExitStatus tell(const RunOptions& options, const RunConclusion& conclusion, WorkerProcess* worker) {
+  const auto reports =
+      worker != nullptr
+          ? worker->ask(FrameKind::Conclusion, bytesOf(conclusion),
+                        options.reports.areWanted()
+                            ? std::vector<FrameKind>{FrameKind::Report, FrameKind::Page}
+                            : std::vector<FrameKind>())
+          : std::nullopt;
+  if (!reports) {
+    return tellAlone(options, conclusion);
   }
-  SafetyNet safetyNet(run.linux.fileSystem(), run.platform.propertyLists, run.files,
-                      restoreCommand(options.device));
-  if (const Result kept = safetyNet.keepInputs(currentTimeText()); !kept) {
-    ProgramError error = programErrorOf(kept, ExitStatus::CannotCreate);
-    error.message.insert(0, "The files cannot be kept: ");
-    return failedOutcome(error);
+  ExitStatus exitStatus = conclusion.exitStatus;
+  std::optional<ProgramError> reportError;
+  if (options.reports.areWanted()) {
+    reportError = writeReport(options.reports, reports->at(0), reports->at(1));
   }
-  PluginOutcome outcome = runPluginInChild(run, stop);
-  const PluginEnd end = endOf(outcome.report);
-  RunReport report = reportOf(std::move(outcome.report));
-  std::optional<HeldLock> migrationLock;
-  const bool isStopped = report.exitStatus == ExitStatus::TemporaryFailure;
-  if ((end == PluginEnd::Died && !isStopped) || report.dataClassName) {
-    // Readers that wait for the migration wait until it is verified or undone, too. Where the
-    // plug-in could not be loaded, not even the lock's file is made; nor does a host that is to
-    // stop, perhaps because it waits for the lock, wait for it again.
-    migrationLock.emplace(run.platform.sharedResources, kMigrationLockName);
+  if (reportError && exitStatus == ExitStatus::Success) {
+    // A report that is missing is an error of a program that otherwise succeeded.
+    exitStatus = reportError->exitStatus;
   }
-  Settlement settlement = safetyNet.settle(end, report.settingsSaves);
-  if (settlement.error) {
-    setError(report, *settlement.error);
-  }
-  report.warnings = std::move(settlement.warnings);
-  report.keptInputs = std::move(settlement.keptFolders);
-  return {std::move(report), std::move(outcome.recorded)};
+  const auto answer =
+      worker->ask(FrameKind::ReportErrors, bytesOfReportError(reportError), {FrameKind::Result});
+  const auto told = answer ? toldResultFrom(answer->front()) : std::nullopt;
+  return told ? print(*told, exitStatus) : tellAlone(options, conclusion);
 }
 
-HostOutcome runPlugin(const RunOptions& options, const OpenedDevice& device, StopSignals& stop) {
-  LinuxPlatform& linux = *device.platform;
-  const AccountFiles files = accountFilesInHome(linux.platform().homeDirectory.path());
-  const PluginRun run{.bundle = device.bundle,
-                      .platform = linux.platform(),
-                      .linux = linux,
-                      .files = files,
-                      .recorded = options.recorded,
-                      .inspect = nullptr};
-  if (!options.bare) {
-    return runPluginSafely(options, run, stop);
-  }
-  return outcomeOf(runPluginInChild(run, stop));
+RunConclusion conclusionOf(ProgramError error) {
+  RunConclusion conclusion;
+  conclusion.exitStatus = error.exitStatus;
+  conclusion.error = std::move(error);
+  return conclusion;
 }
+
+/// One run on an opened device.
+class OpenedRun {
+ public:
+  OpenedRun(const RunOptions& options, const OpenedDevice& device, StopSignals& stop)
+      : options_(options),
+        stop_(stop),
+        linux_(*device.platform),
+        locks_(
+            linux_.root(), [&stop] { return stop.haveArrived(); }, &OpenedRun::say),
+        places_(linux_.root(), linux_.fileSystem(), linux_.platform().homeDirectory.path(),
+                options.purpose == RunPurpose::Plan ? ReadOnlyMounts::Overlook
+                                                    : ReadOnlyMounts::Refuse),
+        work_{.options = options,
+              .device = device,
+              .home = linux_.platform().homeDirectory.path(),
+              .leaveHost = [this] { locks_.closeInChild(); },
+              .recording = recording_} {}
+
+  ExitStatus run() { return options_.bare ? runBare() : runInMemory(options_.purpose); }
+
+ private:
+  static void say(std::string_view line) { printError(kProgramName, line); }
+
+  std::unique_ptr<WorkerProcess> makeWorker() {
+    return std::make_unique<WorkerProcess>(
+        [this](const WorkerSide& side, const DeviceSnapshot& snapshot, const WorkerTask& task) {
+          workInMemory(work_, side, snapshot, task);
+        },
+        stop_, StopGrace::None);
+  }
+
+  RunMeans means() {
+    return {.locks = locks_,
+            .places = places_,
+            .files = linux_.fileSystem(),
+            .makeWorker = [this] { return makeWorker(); },
+            .isStopped = [this] { return stop_.haveArrived(); },
+            .tell = [this](std::string_view line) { tellOfAttempt(line); },
+            .time = currentTimeText(),
+            .lockTimeout = options_.device.lockTimeout};
+  }
+
+  /// In both logs, so that their lines of an attempt that counts for nothing are not taken for
+  /// more.
+  void tellOfAttempt(std::string_view line) {
+    linux_.platform().consoleLog.writeLine(line);
+    if (channel_ == nullptr) {
+      channel_ = &linux_.platform().logSystem.makeChannel("com.quarx.accountsettings", "log");
+    }
+    if (channel_->isEnabled()) {
+      channel_->write({.text = line});
+    }
+  }
+
+  ExitStatus runInMemory(RunPurpose purpose) {
+    RunMeans given = means();
+    MigrationRun run(given);
+    RunConclusion conclusion = run.run(purpose, options_.keep);
+    auto* const worker = static_cast<WorkerProcess*>(run.worker());
+    if (options_.broadcastsOnDBus && conclusion.isCommitted) {
+      announce(worker->announcements(), conclusion);
+    }
+    return worker != nullptr && worker->hasEnded() ? tellOfEndedWorker(conclusion)
+                                                   : tell(options_, conclusion, worker);
+  }
+
+  ExitStatus tellOfEndedWorker(const RunConclusion& conclusion) {
+    if (!options_.recorded) {
+      return tell(options_, conclusion, nullptr);
+    }
+    WorkerProcess teller([this](const WorkerSide& side, const DeviceSnapshot&,
+                                const WorkerTask&) { accounts::tellOfEndedWorker(work_, side); },
+                         stop_, StopGrace::None);
+    const bool isThere = std::holds_alternative<HandedOver>(teller.work({}, {}));
+    return tell(options_, conclusion, isThere ? &teller : nullptr);
+  }
+
+  ExitStatus runBare() {
+    // An interrupted commit is finished first, by its own rules.
+    if (linux_.fileSystem().fileExists(pathOfPlace(DevicePlace::CommitRecord, work_.home))) {
+      RunMeans given = means();
+      const RunConclusion finished =
+          MigrationRun(given).run(RunPurpose::FinishingAlone, KeepFiles::WhenNeeded);
+      if (finished.exitStatus != ExitStatus::Success) {
+        return tell(options_, finished, nullptr);
+      }
+    }
+    WorkerProcess worker([this](const WorkerSide& side, const DeviceSnapshot&,
+                                const WorkerTask&) { workOnDevice(work_, side); },
+                         stop_, StopGrace::ForAPluginOnTheDevice);
+    RunConclusion conclusion;
+    const auto worked = worker.work({}, {});
+    if (const auto* error = std::get_if<ProgramError>(&worked)) {
+      conclusion = conclusionOf(*error);
+    } else {
+      const auto& handedOver = std::get<HandedOver>(worked);
+      const auto proposal = proposalFrom(handedOver.proposal, handedOver.memoryFileSize);
+      conclusion.exitStatus = proposal ? proposal->status : ExitStatus::PluginEnded;
+      if (options_.broadcastsOnDBus) {
+        announce(worker.announcements(), conclusion);
+      }
+    }
+    return worker.hasEnded() ? tellOfEndedWorker(conclusion) : tell(options_, conclusion, &worker);
+  }
+
+  static void announce(const std::string& bytes, RunConclusion& conclusion) {
+    if (const auto announcements = announcementsFrom(bytes)) {
+      if (auto sentence = broadcastOnDBus(*announcements)) {
+        conclusion.warnings.push_back(*std::move(sentence));
+      }
+    }
+  }
+
+  const RunOptions& options_;
+  StopSignals& stop_;
+  LinuxPlatform& linux_;
+  LinuxHostLocks locks_;
+  LinuxDevicePlaces places_;
+  /// In memory; a descriptor of nothing where there is no memory for it, and then nothing is kept.
+  const FileDescriptor recording_{memfd_create("recording", MFD_CLOEXEC)};
+  PluginWork work_;
+  LogChannel* channel_ = nullptr;
+};
 
 }  // namespace
 
-HostOutcome runMigration(const RunOptions& options) {
-  HostOutcome outcome =
-      outcomeOnDevice(options.device, [&](const OpenedDevice& device, StopSignals& stop) {
-        return runPlugin(options, device, stop);
-      });
-  if (options.broadcastsOnDBus) {
-    broadcastOnDBus(outcome.report);
+ExitStatus runMigration(const RunOptions& options) {
+  if (const auto error = whyNotWritable(options.reports)) {
+    // There is no file to tell it in either.
+    RunOptions withoutReports = options;
+    withoutReports.reports = {};
+    return tellAlone(withoutReports, conclusionOf(*error));
   }
-  return outcome;
+  StopSignals stop;
+  const std::variant<OpenedDevice, ProgramError> opened = openDevice(options.device);
+  if (const auto* error = std::get_if<ProgramError>(&opened)) {
+    return tellAlone(options, conclusionOf(*error));
+  }
+  return OpenedRun(options, std::get<OpenedDevice>(opened), stop).run();
 }
 
 }  // namespace accounts

@@ -1,27 +1,38 @@
 #pragma once
 
 #include <optional>
+#include <string>
 
+#include "commandline/Terminal.h"
 #include "host/DeviceOptions.h"
-#include "host/HostOutcome.h"
+#include "host/ReportFiles.h"
 #include "propertylist/SecretKeys.h"
+#include "safetynet/MigrationRun.h"
 
 namespace accounts {
 
-/// One run of the plug-in.
+/// One run of the plug-in, or a plan of one.
 struct RunOptions {
   DeviceOptions device;
-  /// Runs the plug-in without the safety net.
+  /// A migration or a plan.
+  RunPurpose purpose = RunPurpose::Migration;
+  /// Runs the plug-in on the device itself, save by save.
   bool bare = false;
+  KeepFiles keep = KeepFiles::WhenNeeded;
   /// Whether what the plug-in announces is announced on the system's D-Bus, too.
   bool broadcastsOnDBus = false;
   /// How values are recorded; none for a run that is not recorded.
   std::optional<Secrets> recorded;
+  /// Whether the result is one JSON object, and how people see it otherwise.
+  bool wantsJSON = false;
+  Terminal terminal;
+  ReportFiles reports;
 };
 
-/// Runs one migration on one device root, in a child process, and reports it; also every error,
-/// for this never fails in another way. Touches nothing beneath the root when the plug-in cannot be
-/// run.
-HostOutcome runMigration(const RunOptions& options);
+/// Migrates one device root, or plans it, and tells of it: reports in their files, the result on
+/// standard output, warnings and errors on standard error. Nothing beneath the root is changed
+/// unless the whole migration was made in memory and verified; with a plan, nothing at all. Every
+/// error is told in the same way. Returns how the program ends.
+ExitStatus runMigration(const RunOptions& options);
 
 }  // namespace accounts

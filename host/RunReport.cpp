@@ -22,26 +22,13 @@ constexpr const char* kWarningsKey = "warnings";
 constexpr const char* kExitStatusKey = "exitStatus";
 constexpr const char* kErrorKey = "error";
 
-std::optional<std::string> optionalText(const JSON& object, const char* key) {
-  const auto found = object.find(key);
-  return found != object.end() && found->is_string() ? std::optional(found->get<std::string>())
-                                                     : std::nullopt;
-}
-
-JSON jsonOf(const SettingsSaves& saves) {
-  return {{kLastWrittenKey,
-           saves.last == LastSave::None ? JSON(nullptr) : JSON(saves.last == LastSave::Written)},
-          {kReplacedFileKey, saves.replacedFile}};
-}
-
-SettingsSaves settingsSavesFrom(const JSON& object) {
-  const JSON& written = object.at(kLastWrittenKey);
-  SettingsSaves saves;
-  if (!written.is_null()) {
-    saves.last = written.get<bool>() ? LastSave::Written : LastSave::Failed;
+JSON jsonOf(const std::optional<RunReport::SettingsSaves>& saves) {
+  if (!saves) {
+    return nullptr;
   }
-  saves.replacedFile = object.at(kReplacedFileKey).get<bool>();
-  return saves;
+  return {{kLastWrittenKey,
+           saves->last == LastSave::None ? JSON(nullptr) : JSON(saves->last == LastSave::Written)},
+          {kReplacedFileKey, saves->replacedFile}};
 }
 
 }  // namespace
@@ -49,6 +36,14 @@ SettingsSaves settingsSavesFrom(const JSON& object) {
 void setError(RunReport& report, const ProgramError& error) {
   report.exitStatus = error.exitStatus;
   report.error = error.message;
+}
+
+void noteReportError(RunReport& report, const ProgramError& error) {
+  if (report.error) {
+    report.warnings.push_back(error.message);
+  } else {
+    setError(report, error);
+  }
 }
 
 JSON objectOf(const RunReport& report) {
@@ -77,30 +72,6 @@ std::string jsonText(const RunReport& report) {
   return lineOf(objectOf(report));
 }
 
-std::optional<RunReport> reportFromJSONText(const std::string& text) {
-  try {
-    const JSON object = JSON::parse(text);
-    RunReport report;
-    report.root = optionalText(object, kRootKey);
-    report.dataClassName = optionalText(object, kDataClassNameKey);
-    report.result = object.at(kResultKey).get<bool>();
-    report.steps = object.at(kStepsKey).get<std::vector<std::string>>();
-    for (const JSON& broadcast : object.at(kBroadcastsKey)) {
-      report.broadcasts.push_back({broadcast.at(kApplicationKey).get<std::string>(),
-                                   broadcast.at(kPreferenceKey).get<std::string>()});
-    }
-    report.cloudTabAnnouncements = object.at(kCloudTabAnnouncementsKey).get<std::size_t>();
-    report.settingsSaves = settingsSavesFrom(object.at(kSettingsSavesKey));
-    report.keptInputs = object.at(kKeptInputsKey).get<std::vector<std::string>>();
-    report.warnings = object.at(kWarningsKey).get<std::vector<std::string>>();
-    report.exitStatus = static_cast<ExitStatus>(object.at(kExitStatusKey).get<int>());
-    report.error = optionalText(object, kErrorKey);
-    return report;
-  } catch (const JSON::exception&) {
-    return std::nullopt;
-  }
-}
-
 std::string summaryText(const RunReport& report) {
   if (!report.dataClassName) {
     return "";
@@ -115,6 +86,12 @@ std::string summaryText(const RunReport& report) {
   if (report.cloudTabAnnouncements > 0) {
     summary += "  Announced cloud tabs, " + std::to_string(report.cloudTabAnnouncements) +
                (report.cloudTabAnnouncements == 1 ? " time.\n" : " times.\n");
+  }
+  if (report.keptFolder) {
+    summary += "  Kept the files as they were in " + escapedText(*report.keptFolder) + ".\n";
+  }
+  for (const std::string& warning : report.warnings) {
+    summary += "  Warning: " + escapedText(warning) + ".\n";
   }
   return summary;
 }

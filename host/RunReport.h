@@ -8,7 +8,7 @@
 #include "commandline/ExitStatus.h"
 #include "inspection/PropertyListJSON.h"
 #include "platform/linux/RecordingPreferencesBroadcast.h"
-#include "safetynet/SettingsSaves.h"
+#include "transaction/Transaction.h"
 
 namespace accounts {
 
@@ -25,8 +25,15 @@ struct RunReport {
   std::vector<PreferencesChange> broadcasts;
   /// How often cloud tabs were announced to be on.
   std::size_t cloudTabAnnouncements = 0;
-  /// What the plug-in did to the settings file, as far as that was looked at.
-  SettingsSaves settingsSaves;
+  /// What became of the plug-in's newest save, and whether the settings file was replaced by it;
+  /// none where nobody looked, as with a plug-in that works on the device.
+  struct SettingsSaves {
+    LastSave last = LastSave::None;
+    bool replacedFile = false;
+  };
+  std::optional<SettingsSaves> settingsSaves;
+  /// The folder in which this run kept the files as they were; none when it kept none.
+  std::optional<std::string> keptFolder;
   /// The folders of kept files that are there after the run, device paths, oldest first.
   std::vector<std::string> keptInputs;
   /// What a person should know, one sentence each.
@@ -39,14 +46,15 @@ struct RunReport {
 /// Notes an error of the host's own in a report.
 void setError(RunReport& report, const ProgramError& error);
 
+/// Notes that a report of the run could not be written: an error of a run that otherwise succeeded,
+/// else a warning.
+void noteReportError(RunReport& report, const ProgramError& error);
+
 /// A report as a JSON object.
 JSON objectOf(const RunReport& report);
 /// A report as one JSON object on one line, without a line end. Bytes that are no UTF-8 are
 /// replaced.
 std::string jsonText(const RunReport& report);
-/// The report that a text of jsonText() stands for; none when the text is no such report.
-std::optional<RunReport> reportFromJSONText(const std::string& text);
-
 /// A report in a few lines for a person, each with its line end. Errors are not part of it: they
 /// belong on standard error.
 std::string summaryText(const RunReport& report);

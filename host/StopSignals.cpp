@@ -18,6 +18,7 @@ FileDescriptor blockedSignals() {
   sigemptyset(&signals);
   sigaddset(&signals, SIGTERM);
   sigaddset(&signals, SIGINT);
+  sigaddset(&signals, SIGHUP);
   sigprocmask(SIG_BLOCK, &signals, nullptr);
   return FileDescriptor(signalfd(-1, &signals, SFD_CLOEXEC | SFD_NONBLOCK));
 }
@@ -30,6 +31,20 @@ bool StopSignals::haveArrived() {
   pollfd signals = {signals_.number(), POLLIN, 0};
   arrived_ = arrived_ || poll(&signals, 1, 0) > 0;
   return arrived_;
+}
+
+bool StopSignals::waitForEither(const FileDescriptor& process, const FileDescriptor& readable) {
+  if (haveArrived()) {
+    return false;
+  }
+  std::array<pollfd, 3> events = {pollfd{process.number(), POLLIN, 0},
+                                  pollfd{readable.number(), POLLIN, 0},
+                                  pollfd{signals_.number(), POLLIN, 0}};
+  while (poll(events.data(), events.size(), -1) < 0 && errno == EINTR) {
+  }
+  const bool isEither = events[0].revents != 0 || events[1].revents != 0;
+  arrived_ = arrived_ || !isEither;
+  return isEither;
 }
 
 bool StopSignals::waitForEndOf(const FileDescriptor& process, std::chrono::milliseconds grace) {

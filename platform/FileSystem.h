@@ -11,15 +11,6 @@
 
 namespace accounts {
 
-/// What stands under a name, a symbolic link there not followed.
-enum class EntryKind : std::uint8_t {
-  Nothing,
-  RegularFile,
-  Directory,
-  /// A symbolic link, a named pipe, a socket or a device.
-  Other
-};
-
 /// The files and directories of the device. All paths are absolute device paths; they never lead
 /// out of the device, whatever symbolic links it holds. Failures are reported by the result and
 /// leave no half-made file behind unless an operation says otherwise.
@@ -31,21 +22,8 @@ class FileSystem {
   virtual bool fileExists(std::string_view path) = 0;
   /// Whether a directory exists at a path, symbolic links followed.
   virtual bool isDirectory(std::string_view path) = 0;
-  /// What stands at a path, a symbolic link there not followed; none when that cannot be told.
-  virtual std::optional<EntryKind> kindOfEntry(std::string_view path) = 0;
-  /// The names in a directory, sorted bytewise; none when it cannot be read.
-  virtual std::optional<std::vector<std::string>> directoryEntries(std::string_view path) = 0;
-  /// Whether two paths lead to regular files with the same bytes, symbolic links at their ends not
-  /// followed. One file under two names has them whether it can be read or not; false also when one
-  /// of two files is missing or cannot be read.
-  virtual bool haveSameContents(std::string_view first, std::string_view second) = 0;
-
   /// Copies a regular file byte for byte to a path where nothing exists yet.
   virtual Result copyFile(std::string_view source, std::string_view destination) = 0;
-  /// Gives a regular file, no symbolic link, a second name where nothing exists yet: a hard link,
-  /// or, where the file system makes none, a copy with the same contents, owner, permissions and
-  /// time. The contents are on the medium afterwards; the name is after synchronizeDirectory.
-  virtual Result linkFile(std::string_view source, std::string_view destination) = 0;
   /// Removes a file, or a symbolic link itself. A directory is not removed: that is a failure, like
   /// a missing file.
   virtual Result removeFile(std::string_view path) = 0;
@@ -55,14 +33,6 @@ class FileSystem {
   /// permission bits; the parents get the platform's default ones. It is a failure when something
   /// exists at the path.
   virtual Result createDirectoryWithIntermediates(std::string_view path, unsigned permissions) = 0;
-  /// Removes an empty directory.
-  virtual Result removeDirectory(std::string_view path) = 0;
-  /// Gives a directory another name in one step; at most an empty directory may exist there. It is
-  /// on the medium when the operation succeeds.
-  virtual Result renameDirectory(std::string_view source, std::string_view destination) = 0;
-  /// Waits until the names in a directory, as they are, are on the medium.
-  virtual Result synchronizeDirectory(std::string_view path) = 0;
-
   /// Makes a new, empty file with a unique name in the default temporary directory, readable by its
   /// owner alone, and gives its path; none when it cannot be made.
   virtual std::optional<std::string> makeTemporaryFile() = 0;

@@ -13,20 +13,8 @@ class ForwardingFileSystem : public FileSystem {
 
   bool fileExists(std::string_view path) override { return files_.fileExists(path); }
   bool isDirectory(std::string_view path) override { return files_.isDirectory(path); }
-  std::optional<EntryKind> kindOfEntry(std::string_view path) override {
-    return files_.kindOfEntry(path);
-  }
-  std::optional<std::vector<std::string>> directoryEntries(std::string_view path) override {
-    return files_.directoryEntries(path);
-  }
-  bool haveSameContents(std::string_view first, std::string_view second) override {
-    return files_.haveSameContents(first, second);
-  }
   Result copyFile(std::string_view source, std::string_view destination) override {
     return files_.copyFile(source, destination);
-  }
-  Result linkFile(std::string_view source, std::string_view destination) override {
-    return files_.linkFile(source, destination);
   }
   Result removeFile(std::string_view path) override { return files_.removeFile(path); }
   Result createFile(std::string_view path, std::string_view contents) override {
@@ -34,13 +22,6 @@ class ForwardingFileSystem : public FileSystem {
   }
   Result createDirectoryWithIntermediates(std::string_view path, unsigned permissions) override {
     return files_.createDirectoryWithIntermediates(path, permissions);
-  }
-  Result removeDirectory(std::string_view path) override { return files_.removeDirectory(path); }
-  Result renameDirectory(std::string_view source, std::string_view destination) override {
-    return files_.renameDirectory(source, destination);
-  }
-  Result synchronizeDirectory(std::string_view path) override {
-    return files_.synchronizeDirectory(path);
   }
   std::optional<std::string> makeTemporaryFile() override { return files_.makeTemporaryFile(); }
   void removeAbandonedTemporaryFiles(const std::vector<std::string>& furtherDirectories) override {

@@ -9,6 +9,7 @@ struct ReplacedParts {
   ConsoleLog* consoleLog = nullptr;
   FileSystem* fileSystem = nullptr;
   LogSystem* logSystem = nullptr;
+  PreferenceDomain* preferenceDomain = nullptr;
   PropertyLists* propertyLists = nullptr;
   SharedResources* sharedResources = nullptr;
   MigrationObserver* migrationObserver = nullptr;
@@ -33,7 +34,7 @@ inline Platform platformWith(const Platform& original, const ReplacedParts& part
           .logSystem = chosen(parts.logSystem, original.logSystem),
           .mailDirectory = original.mailDirectory,
           .pairingValueStore = original.pairingValueStore,
-          .preferenceDomain = original.preferenceDomain,
+          .preferenceDomain = chosen(parts.preferenceDomain, original.preferenceDomain),
           .preferencesBroadcast = original.preferencesBroadcast,
           .profileRestrictions = original.profileRestrictions,
           .propertyLists = chosen(parts.propertyLists, original.propertyLists),

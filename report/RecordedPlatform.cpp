@@ -9,6 +9,9 @@
 namespace accounts {
 namespace {
 
+/// What a temporary file is called: its name means nothing to anybody, and is another each time.
+constexpr std::string_view kTemporaryFile = "temporary file";
+
 /// Another file system whose changes are recorded. What happens to a temporary file counts when it
 /// takes the place of another one.
 class RecordedFileSystem final : public ForwardingFileSystem {
@@ -19,12 +22,9 @@ class RecordedFileSystem final : public ForwardingFileSystem {
   Result copyFile(std::string_view source, std::string_view destination) override {
     return recorded("copied", destination, ForwardingFileSystem::copyFile(source, destination));
   }
-  Result linkFile(std::string_view source, std::string_view destination) override {
-    return recorded("linked", destination, ForwardingFileSystem::linkFile(source, destination));
-  }
   Result removeFile(std::string_view path) override {
     // That nothing was there to remove is no news.
-    const bool wasThere = kindOfEntry(path) != EntryKind::Nothing;
+    const bool wasThere = fileExists(path);
     Result result = ForwardingFileSystem::removeFile(path);
     return wasThere ? recorded("removed", path, std::move(result)) : result;
   }
@@ -40,7 +40,7 @@ class RecordedFileSystem final : public ForwardingFileSystem {
     if (path) {
       temporaryFiles_.insert(*path);
     } else {
-      recorder_.recordFile("created", "temporary file", "No temporary file can be made");
+      recorder_.recordFile("created", kTemporaryFile, "No temporary file can be made");
     }
     return path;
   }
@@ -62,8 +62,10 @@ class RecordedFileSystem final : public ForwardingFileSystem {
 
  private:
   Result recorded(std::string_view action, std::string_view path, Result result) {
-    if (!result || !temporaryFiles_.contains(path)) {
-      recorder_.recordFile(action, path, result ? std::nullopt : std::optional(result.error()));
+    const bool isTemporary = temporaryFiles_.contains(path);
+    if (!result || !isTemporary) {
+      recorder_.recordFile(action, isTemporary ? kTemporaryFile : path,
+                           result ? std::nullopt : std::optional(result.error()));
     }
     return result;
   }

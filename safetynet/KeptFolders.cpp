@@ -2,9 +2,9 @@
 
 #include <algorithm>
 #include <array>
-#include <optional>
+#include <utility>
 
-#include "safetynet/AccountFiles.h"
+#include "safetynet/PlaceErrors.h"
 
 namespace accounts {
 namespace {
@@ -14,23 +14,61 @@ constexpr std::string_view kRestorationPrefix = "Replaced-";
 constexpr std::string_view kUnfinishedPrefix = "Unfinished-";
 constexpr std::array kAllPrefixes = {kMigrationPrefix, kRestorationPrefix, kUnfinishedPrefix};
 
+/// The list of what stood where: why it was kept, and a line for each place: what, a tab, the name
+/// of the place.
+constexpr std::string_view kList = "List";
+constexpr std::size_t kLongestList = 4096;
+
+struct KindName {
+  EntryKind kind;
+  std::string_view name;
+};
+constexpr KindName kKindNames[] = {{EntryKind::Nothing, "nothing"},
+                                   {EntryKind::RegularFile, "file"},
+                                   {EntryKind::Directory, "directory"},
+                                   {EntryKind::Other, "other"}};
+
+struct ReasonLine {
+  KeptFor reason;
+  std::string_view line;
+};
+constexpr ReasonLine kReasonLines[] = {{KeptFor::Migration, "kept on request\n"},
+                                       {KeptFor::MigrationWithLosses, "kept for losses\n"},
+                                       {KeptFor::Restoration, "kept by a restoration\n"}};
+
 constexpr unsigned kDirectoryPermissions = 0755;
 constexpr unsigned kOwnerOnly = 0700;
 
 // Hosts on one root take turns, so that hardly ever two folders are made in one second.
 constexpr int kMostFoldersOfOneTime = 1000;
 
+std::string inDirectory(std::string_view directory, std::string_view name) {
+  return std::string(directory).append("/").append(name);
+}
+
+std::string_view directoryOf(std::string_view path) {
+  return path.substr(0, path.rfind('/'));
+}
+
+std::string_view nameOf(std::string_view path) {
+  return path.substr(path.rfind('/') + 1);
+}
+
 std::string prefixed(std::string_view prefix, std::string_view suffix) {
-  return pathIn(kAccountMigrationDirectory, std::string(prefix).append(suffix));
+  return inDirectory(kAccountMigrationDirectory, std::string(prefix).append(suffix));
 }
 
 std::string_view prefixOf(KeptFor purpose) {
-  return purpose == KeptFor::Migration ? kMigrationPrefix : kRestorationPrefix;
+  return purpose == KeptFor::Restoration ? kRestorationPrefix : kMigrationPrefix;
+}
+
+PlaceOutcome outcomeOf(const Result& result) {
+  return result ? PlaceOutcome::done() : PlaceOutcome::failed(placeFailureOf(result));
 }
 
 /// The time, made unique by a number where folders of that time exist; none when that cannot be
 /// told.
-std::optional<std::string> freeSuffix(FileSystem& files, std::string_view time) {
+std::optional<std::string> freeSuffix(FileKeeping& files, std::string_view time) {
   for (int number = 1; number <= kMostFoldersOfOneTime; ++number) {
     std::string suffix(time);
     if (number > 1) {
@@ -45,13 +83,22 @@ std::optional<std::string> freeSuffix(FileSystem& files, std::string_view time) 
   return std::nullopt;
 }
 
+std::string listText(KeptFor purpose, const std::vector<PlaceToKeep>& places) {
+  std::string text(std::ranges::find(kReasonLines, purpose, &ReasonLine::reason)->line);
+  for (const PlaceToKeep& each : places) {
+    const auto* const kind = std::ranges::find(kKindNames, each.identity.kind, &KindName::kind);
+    text.append(kind->name).append("\t").append(listed(each.place).name).append("\n");
+  }
+  return text;
+}
+
 }  // namespace
 
-std::vector<std::string> KeptFolders::ofMigrations() const {
+std::vector<std::string> KeptFolders::keptFor(KeptFor purpose) const {
   std::vector<std::string> folders;
   for (const std::string& name :
        files_.directoryEntries(kAccountMigrationDirectory).value_or(std::vector<std::string>())) {
-    if (name.starts_with(kMigrationPrefix) && contains(name)) {
+    if (name.starts_with(prefixOf(purpose)) && contains(name)) {
       folders.push_back(pathOf(name));
     }
   }
@@ -65,44 +112,86 @@ bool KeptFolders::contains(std::string_view name) const {
 }
 
 std::string KeptFolders::pathOf(std::string_view name) {
-  return pathIn(kAccountMigrationDirectory, name);
+  return inDirectory(kAccountMigrationDirectory, name);
 }
 
-Result KeptFolders::keep(const std::vector<std::string>& paths, KeptFor purpose,
-                         std::string_view time, std::string& folder) {
+std::string KeptFolders::pathIn(std::string_view folder, DevicePlace place) {
+  return inDirectory(folder, listed(place).name);
+}
+
+std::optional<std::string> KeptFolders::listTextOf(std::string_view folder) const {
+  return files_.shortContents(inDirectory(folder, kList), kLongestList);
+}
+
+std::optional<KeptFor> KeptFolders::reasonOf(std::string_view folder) const {
+  const std::optional<std::string> text = listTextOf(folder);
+  for (const ReasonLine& each : kReasonLines) {
+    if (text && text->starts_with(each.line)) {
+      return each.reason;
+    }
+  }
+  return std::nullopt;
+}
+
+std::optional<KeptPlaces> KeptFolders::listOf(std::string_view folder) const {
+  const std::optional<std::string> contents = listTextOf(folder);
+  if (!contents) {
+    return std::nullopt;
+  }
+  const std::size_t reasonSize = reasonOf(folder) ? contents->find('\n') + 1 : 0;
+  KeptPlaces places;
+  for (std::string_view rest = std::string_view(*contents).substr(reasonSize); !rest.empty();) {
+    const std::string_view line = rest.substr(0, rest.find('\n'));
+    const std::size_t tab = line.find('\t');
+    const auto* const kind = std::ranges::find(kKindNames, line.substr(0, tab), &KindName::name);
+    const auto place =
+        tab != std::string_view::npos ? placeNamed(line.substr(tab + 1)) : std::nullopt;
+    if (line.size() == rest.size() || kind == std::end(kKindNames) || !place ||
+        !places.emplace(*place, kind->kind).second) {
+      return std::nullopt;
+    }
+    rest.remove_prefix(line.size() + 1);
+  }
+  return places;
+}
+
+PlaceOutcome KeptFolders::keep(const std::vector<PlaceToKeep>& places, KeptFor purpose,
+                               std::string_view time, std::string& folder) {
   if (const Result made = makeDirectory(); !made) {
-    return made;
+    return outcomeOf(made);
   }
   const std::optional<std::string> suffix = freeSuffix(files_, time);
   if (!suffix) {
-    return Result::failure("No name is free in " + std::string(kAccountMigrationDirectory));
+    return outcomeOf(
+        Result::failure("No name is free in " + std::string(kAccountMigrationDirectory)));
   }
   const std::string unfinished = prefixed(kUnfinishedPrefix, *suffix);
   const std::string finished = prefixed(prefixOf(purpose), *suffix);
-  Result result = fill(unfinished, paths);
-  if (result) {
-    result = files_.renameDirectory(unfinished, finished);
+  PlaceOutcome outcome = fill(unfinished, purpose, places);
+  if (outcome.isDone()) {
+    outcome = outcomeOf(files_.renameDirectory(unfinished, finished));
   }
-  if (!result) {
+  if (!outcome.isDone()) {
     removeWithContents(unfinished);
     // Renamed all the same when only the flush after that failed.
     if (files_.kindOfEntry(finished) == EntryKind::Directory) {
       (void)discard(finished);
     }
-    return result;
+    removeDirectoryIfMade();
+    return outcome;
   }
   folder = finished;
-  return result;
+  return outcome;
 }
 
 Result KeptFolders::makeDirectory() {
-  if (files_.isDirectory(kAccountMigrationDirectory)) {
-    return Result::success();
+  Result result = Result::success();
+  if (files_.kindOfEntry(kAccountMigrationDirectory) != EntryKind::Directory) {
+    result =
+        files_.createDirectoryWithIntermediates(kAccountMigrationDirectory, kDirectoryPermissions);
+    madeDirectory_ = static_cast<bool>(result);
   }
-  madeDirectory_ = true;
-  Result result =
-      files_.createDirectoryWithIntermediates(kAccountMigrationDirectory, kDirectoryPermissions);
-  // Each of its parents may be a new name too.
+  // Each of its parents may be a new name too, also where it was made by a run that was killed.
   for (std::string_view parent = directoryOf(kAccountMigrationDirectory); result && !parent.empty();
        parent = directoryOf(parent)) {
     result = files_.synchronizeDirectory(parent);
@@ -110,15 +199,28 @@ Result KeptFolders::makeDirectory() {
   return result;
 }
 
-Result KeptFolders::fill(const std::string& unfinished, const std::vector<std::string>& paths) {
-  Result result = files_.createDirectoryWithIntermediates(unfinished, kOwnerOnly);
-  for (const std::string& path : paths) {
-    if (!result) {
-      return result;
-    }
-    result = files_.linkFile(path, pathIn(unfinished, nameOf(path)));
+void KeptFolders::removeDirectoryIfMade() {
+  if (madeDirectory_) {
+    // Fails while there is anything else in it.
+    (void)files_.removeDirectory(kAccountMigrationDirectory);
   }
-  return result ? files_.synchronizeDirectory(unfinished) : result;
+}
+
+PlaceOutcome KeptFolders::fill(const std::string& unfinished, KeptFor purpose,
+                               const std::vector<PlaceToKeep>& places) {
+  PlaceOutcome outcome = outcomeOf(files_.createDirectoryWithIntermediates(unfinished, kOwnerOnly));
+  for (const PlaceToKeep& each : places) {
+    const bool isKept =
+        each.identity.kind == EntryKind::RegularFile || each.identity.kind == EntryKind::Other;
+    if (outcome.isDone() && isKept) {
+      outcome = places_.keep(each.place, pathIn(unfinished, each.place), each.identity);
+    }
+  }
+  if (outcome.isDone()) {
+    outcome =
+        outcomeOf(files_.createFile(inDirectory(unfinished, kList), listText(purpose, places)));
+  }
+  return outcome.isDone() ? outcomeOf(files_.synchronizeDirectory(unfinished)) : outcome;
 }
 
 Result KeptFolders::discard(std::string_view folder) {
@@ -127,6 +229,7 @@ Result KeptFolders::discard(std::string_view folder) {
   const Result renamed = files_.renameDirectory(folder, unfinished);
   if (renamed || files_.kindOfEntry(folder) == EntryKind::Nothing) {
     removeWithContents(unfinished);
+    removeDirectoryIfMade();
     return Result::success();
   }
   return renamed;
@@ -145,13 +248,9 @@ void KeptFolders::removeUnfinished() {
 void KeptFolders::removeWithContents(const std::string& folder) {
   for (const std::string& name :
        files_.directoryEntries(folder).value_or(std::vector<std::string>())) {
-    (void)files_.removeFile(pathIn(folder, name));
+    (void)files_.removeFile(inDirectory(folder, name));
   }
   (void)files_.removeDirectory(folder);
-  if (madeDirectory_) {
-    // Fails while there is anything else in it.
-    (void)files_.removeDirectory(kAccountMigrationDirectory);
-  }
 }
 
 }  // namespace accounts

@@ -1,43 +1,64 @@
 #pragma once
 
+#include <cstdint>
+#include <map>
+#include <optional>
 #include <string>
 #include <string_view>
+#include <variant>
 #include <vector>
 
-#include "platform/FileSystem.h"
-#include "platform/Result.h"
+#include "platform/DevicePlaces.h"
+#include "platform/FileKeeping.h"
 
 namespace accounts {
 
 /// Why files are kept.
-enum class KeptFor {
-  /// A run of the plug-in; the folder is called "Kept-TIME".
+enum class KeptFor : std::uint8_t {
+  /// A migration, because somebody asked for it; the folder is called "Kept-TIME".
   Migration,
+  /// The same, because the migration may not have carried over everything.
+  MigrationWithLosses,
   /// Other files were put in their place; the folder is called "Replaced-TIME".
   Restoration
 };
 
+/// What a folder of kept files says stood at each of its places.
+using KeptPlaces = std::map<DevicePlace, EntryKind>;
+
+/// A place to be kept, with what stands there.
+struct PlaceToKeep {
+  DevicePlace place = DevicePlace::Settings;
+  FileIdentity identity;
+};
+
 /// The folders of kept files on one device. A folder has its name only while it is whole: it is
-/// filled and emptied under the name "Unfinished-TIME". Whoever changes anything here holds the
+/// filled and emptied under the name "Unfinished-TIME". Each file in it has the name of its place;
+/// a list says what stood at every one, nothing included. Whoever changes anything here holds the
 /// host's lock.
 class KeptFolders {
  public:
-  /// `fileSystem` must outlive this.
-  explicit KeptFolders(FileSystem& fileSystem) : files_(fileSystem) {}
+  /// The arguments must outlive this.
+  KeptFolders(FileKeeping& files, DevicePlaces& places) : files_(files), places_(places) {}
 
-  /// The paths of all folders that were kept for a migration, oldest first.
-  [[nodiscard]] std::vector<std::string> ofMigrations() const;
-
-  /// Whether there is a folder of kept files with this name.
+  /// The paths of all folders that were kept for a migration, or for a restoration, oldest first.
+  [[nodiscard]] std::vector<std::string> keptFor(KeptFor purpose) const;
+  /// Why a folder was kept, as its list says; none when it does not.
+  [[nodiscard]] std::optional<KeptFor> reasonOf(std::string_view folder) const;
+  /// Whether there is a folder of kept files with this name, of either purpose.
   [[nodiscard]] bool contains(std::string_view name) const;
   /// The path of the folder with a name.
   [[nodiscard]] static std::string pathOf(std::string_view name);
+  /// Where a folder has what stood at a place.
+  [[nodiscard]] static std::string pathIn(std::string_view folder, DevicePlace place);
+  /// What a folder says stood at its places; none when its list is missing or is no such list.
+  [[nodiscard]] std::optional<KeptPlaces> listOf(std::string_view folder) const;
 
-  /// Gives files second names in a new folder, durably, and writes the folder's path to `folder`.
-  /// `time` is sortable text; a folder that exists is never touched. A failure leaves no folder and
-  /// `folder` as it was.
-  Result keep(const std::vector<std::string>& paths, KeptFor purpose, std::string_view time,
-              std::string& folder);
+  /// Gives what stands at places second names in a new folder, durably, and writes the folder's
+  /// path to `folder`. `time` is sortable text; a folder that exists is never touched. Whatever is
+  /// not done leaves no folder and `folder` as it was. Of a directory the list alone tells.
+  PlaceOutcome keep(const std::vector<PlaceToKeep>& places, KeptFor purpose, std::string_view time,
+                    std::string& folder);
 
   /// Removes a folder, and the directory of all of them if this made it and it is empty. A failure
   /// leaves it whole; once it has lost its name it is gone, though parts may stay under the
@@ -48,12 +69,19 @@ class KeptFolders {
   /// next run.
   void removeUnfinished();
 
- private:
+  /// Makes the directory of all folders if it is missing, and sees to it that it is on the medium.
   Result makeDirectory();
-  Result fill(const std::string& unfinished, const std::vector<std::string>& paths);
-  void removeWithContents(const std::string& folder);
+  /// Removes it if this made it and it is empty.
+  void removeDirectoryIfMade();
 
-  FileSystem& files_;
+ private:
+  PlaceOutcome fill(const std::string& unfinished, KeptFor purpose,
+                    const std::vector<PlaceToKeep>& places);
+  void removeWithContents(const std::string& folder);
+  [[nodiscard]] std::optional<std::string> listTextOf(std::string_view folder) const;
+
+  FileKeeping& files_;
+  DevicePlaces& places_;
   bool madeDirectory_ = false;
 };
 

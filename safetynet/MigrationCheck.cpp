@@ -4,8 +4,6 @@
 #include <cstddef>
 #include <set>
 
-#include "safetynet/PutBack.h"
-
 namespace accounts {
 namespace {
 
@@ -58,11 +56,33 @@ Identifiers identifiersOf(const PropertyDictionary& settings) {
   return identifiers;
 }
 
+/// Whether a settings file has an account with this identifier, children included.
+bool hasAccount(const PropertyDictionary& settings, std::string_view identifier) {
+  const auto isIt = [&](const PropertyValue& account) {
+    const PropertyDictionary* const properties = account.asDictionary();
+    const auto text = properties != nullptr ? properties->textForKey(kIdentifier) : std::nullopt;
+    return text && text->view() == identifier;
+  };
+  const PropertyArray accounts = arrayIn(settings, kAccounts);
+  return std::ranges::any_of(accounts, isIt) ||
+         std::ranges::any_of(accounts, [&](const PropertyValue& account) {
+           const PropertyDictionary* const properties = account.asDictionary();
+           return properties != nullptr &&
+                  std::ranges::any_of(arrayIn(*properties, kChildAccounts), isIt);
+         });
+}
+
 /// Whether a settings file had accounts of which none is left: as after a plug-in that could not
 /// read it. Accounts that come from elsewhere, too, do not count: they are there in any case.
 bool hasLostAll(const PropertyDictionary& before, const PropertyDictionary& after,
                 const Identifiers& fromElsewhere) {
-  if (arrayIn(before, kAccounts).size() == 0) {
+  const PropertyArray accounts = arrayIn(before, kAccounts);
+  if (accounts.size() == 0) {
+    return false;
+  }
+  // Hardly ever is the first one not there any more.
+  const auto first = identifierIn(*accounts.begin(), kIdentifier);
+  if (first && !fromElsewhere.contains(*first) && hasAccount(after, *first)) {
     return false;
   }
   const Identifiers left = identifiersOf(after);
@@ -97,42 +117,71 @@ bool isAmong(const Identifiers& identifiers, const PropertyDictionary& store,
 
 }  // namespace
 
-std::optional<std::string> whyNotMigrated(PropertyLists& propertyLists, const std::string& settings,
-                                          LastSave lastSave) {
-  if (lastSave == LastSave::Failed) {
-    return "the settings file was not written";
-  }
-  const std::optional<PropertyDictionary> contents = propertyLists.readDictionary(settings);
-  if (!contents) {
-    return "the settings file cannot be read as a property list";
-  }
-  const PropertyValue* const version = contents->find(kVersion);
-  if (version == nullptr || version->integerValue() != kMigratedVersion) {
-    return "the settings file has not the current version";
-  }
-  return std::nullopt;
+bool isMigrated(const std::optional<PropertyDictionary>& settings) {
+  const PropertyValue* const version = settings ? settings->find(kVersion) : nullptr;
+  return version != nullptr && version->integerValue() == kMigratedVersion;
 }
 
-std::vector<std::string> whatMayBeMissing(PropertyLists& propertyLists, const AccountFiles& files,
-                                          const std::vector<std::string>& inputs,
-                                          const ReadInput& readInput) {
+bool mayHoldAccountsOf(const PropertyDictionary& settings, DevicePlace place,
+                       const std::optional<PropertyDictionary>& store) {
+  if (!store) {
+    return true;
+  }
+  const LegacyLayout& layout = place == DevicePlace::LegacyMail ? kMailLayout : kExchangeLayout;
+  Identifiers named;
+  for (const std::string_view key : layout.arrays) {
+    addIdentifiers(named, arrayIn(*store, key), layout.identifier);
+  }
+  const Identifiers held = identifiersOf(settings);
+  return named.empty() ||
+         std::ranges::any_of(named, [&](const auto& each) { return held.contains(each); });
+}
+
+std::optional<std::string> whyNotMigrated(Transaction& transaction) {
+  if (transaction.lastSave() == LastSave::Failed) {
+    const std::optional<std::string>& reason = transaction.saveFailure();
+    return "the settings file was not written" + (reason ? ": " + *reason : "");
+  }
+  const std::optional<PropertyDictionary> contents =
+      transaction.dictionaryAt(DevicePlace::Settings);
+  if (isMigrated(contents)) {
+    return std::nullopt;
+  }
+  std::string reason = contents ? "the settings file has not the current version"
+                                : "the settings file cannot be read as a property list";
+  const PlaceState& sentinel = transaction.snapshot().at(DevicePlace::RemovalSentinel);
+  if (transaction.lastSave() == LastSave::None && sentinel.identity.exists()) {
+    reason += ", although " + sentinel.path +
+              " says that the legacy stores were being removed after a migration; without that "
+              "file a run migrates them";
+  }
+  return reason;
+}
+
+std::vector<std::string> whatMayBeMissing(Transaction& transaction,
+                                          const std::vector<DevicePlace>& inputs) {
   std::vector<std::string> sentences;
   const PropertyDictionary migrated =
-      propertyLists.readDictionary(files.settings).value_or(PropertyDictionary());
-  const Identifiers identifiers = identifiersOf(migrated);
+      transaction.dictionaryAt(DevicePlace::Settings).value_or(PropertyDictionary());
+  // Made where there is a legacy store to look for.
+  std::optional<Identifiers> identifiers;
   Identifiers fromElsewhere = {std::string(kDeviceLocalIdentifier)};
   // The settings file comes last, when what the legacy stores hold is known.
-  for (const std::string& path : inputs) {
-    const auto contents = readInput(path);
+  for (const DevicePlace place : inputs) {
+    const std::string& path = transaction.snapshot().at(place).path;
+    const auto contents = transaction.dictionaryBefore(place);
     if (!contents) {
       sentences.push_back(path + " could not be read as a property list");
-    } else if (path == files.settings) {
+    } else if (place == DevicePlace::Settings) {
       if (hasLostAll(*contents, migrated, fromElsewhere)) {
         sentences.push_back(path + " had accounts and has none of them now");
       }
     } else {
-      const LegacyLayout& layout = path == files.legacyMail ? kMailLayout : kExchangeLayout;
-      if (!isAmong(identifiers, *contents, layout)) {
+      const LegacyLayout& layout = place == DevicePlace::LegacyMail ? kMailLayout : kExchangeLayout;
+      if (!identifiers) {
+        identifiers = identifiersOf(migrated);
+      }
+      if (!isAmong(*identifiers, *contents, layout)) {
         sentences.push_back("Not every account of " + path + " was found in the settings file");
       }
       for (const std::string_view key : layout.arrays) {

@@ -1,133 +1,217 @@
 #include "safetynet/Restoration.h"
 
+#include <array>
+#include <memory>
 #include <utility>
 #include <variant>
 
-#include "safetynet/KeptFolders.h"
-#include "safetynet/PutBack.h"
+#include "safetynet/PlaceErrors.h"
 
 namespace accounts {
 namespace {
+
+/// The order in which places are put back: the settings file last, for as long as a legacy store is
+/// there, the next migration converts it.
+constexpr std::array kOrder = {DevicePlace::CopyAside,
+                               DevicePlace::AutoFetchEnabled,
+                               DevicePlace::LegacyMailOriginal,
+                               DevicePlace::LegacyExchangeOriginal,
+                               DevicePlace::LegacyMail,
+                               DevicePlace::LegacyExchange,
+                               DevicePlace::Settings};
 
 ProgramError missing(std::string message) {
   return ProgramError{ExitStatus::MissingInput, std::move(message)};
 }
 
+/// A place that is not as it was.
+struct Difference {
+  DevicePlace place = DevicePlace::Settings;
+  EntryKind before = EntryKind::Nothing;
+  FileIdentity now;
+};
+
+class Restorer {
+ public:
+  Restorer(DevicePlaces& places, KeptFolders& folders, std::string_view home,
+           Restoration& restoration)
+      : places_(places), folders_(folders), home_(home), restoration_(restoration) {}
+
+  std::optional<ProgramError> run(std::string_view time) {
+    const std::optional<KeptPlaces> list = folders_.listOf(*restoration_.folder);
+    if (!list || list->empty()) {
+      return missing("No kept files in " + *restoration_.folder);
+    }
+    folders_.removeUnfinished();
+    static_cast<void>(places_.settleLeftovers());
+    std::optional<ProgramError> error = findDifferences(*list);
+    if (!error) {
+      error = keepReplaced(time);
+    }
+    for (const DevicePlace place : {DevicePlace::CommitRecord, DevicePlace::RemovalSentinel}) {
+      if (!error) {
+        error = end(place);
+      }
+    }
+    for (const Difference& each : differences_) {
+      if (!error) {
+        error = putBack(each);
+      }
+    }
+    return error;
+  }
+
+ private:
+  [[nodiscard]] std::string pathOf(DevicePlace place) const { return pathOfPlace(place, home_); }
+
+  std::optional<ProgramError> findDifferences(const KeptPlaces& list) {
+    for (const DevicePlace place : kOrder) {
+      const auto listed = list.find(place);
+      // Of a directory nothing is kept, and nothing was done to it.
+      if (listed == list.end() || listed->second == EntryKind::Directory) {
+        continue;
+      }
+      const auto now = places_.identityAt(place);
+      if (const auto* failure = std::get_if<PlaceFailure>(&now)) {
+        return writingError(kOperation, *failure);
+      }
+      const auto& identity = std::get<FileIdentity>(now);
+      if (identity.kind == EntryKind::Directory) {
+        return ProgramError{ExitStatus::CannotCreate,
+                            pathOf(place) + " is a directory, so it is not replaced"};
+      }
+      if (listed->second != EntryKind::Nothing || identity.exists()) {
+        differences_.push_back({place, listed->second, identity});
+      }
+    }
+    return std::nullopt;
+  }
+
+  std::optional<ProgramError> keepReplaced(std::string_view time) {
+    std::vector<PlaceToKeep> replaced;
+    bool isAny = false;
+    for (const Difference& each : differences_) {
+      replaced.push_back({each.place, each.now});
+      isAny = isAny || each.now.exists();
+    }
+    if (!isAny) {
+      return std::nullopt;
+    }
+    std::string folder;
+    const PlaceOutcome kept = folders_.keep(replaced, KeptFor::Restoration, time, folder);
+    if (!kept.isDone()) {
+      return writingError("What would be replaced cannot be kept", failureOf(kept));
+    }
+    restoration_.replaced = std::move(folder);
+    return std::nullopt;
+  }
+
+  std::optional<ProgramError> end(DevicePlace place) {
+    const auto now = places_.identityAt(place);
+    const auto* identity = std::get_if<FileIdentity>(&now);
+    PlaceOutcome outcome;
+    if (identity == nullptr) {
+      outcome = PlaceOutcome::failed(std::get<PlaceFailure>(now));
+    } else if (identity->exists()) {
+      outcome = places_.remove(place, *identity);
+      if (outcome.isDone()) {
+        flush(place, outcome);
+      }
+    }
+    return outcome.isDone() ? std::nullopt : std::optional(wholeStill(outcome));
+  }
+
+  std::optional<ProgramError> putBack(const Difference& difference) {
+    PlaceOutcome outcome;
+    if (difference.before == EntryKind::Nothing) {
+      outcome = places_.remove(difference.place, difference.now);
+    } else {
+      auto staged = places_.stageKept(difference.place,
+                                      KeptFolders::pathIn(*restoration_.folder, difference.place));
+      outcome = std::holds_alternative<PlaceFailure>(staged)
+                    ? PlaceOutcome::failed(std::get<PlaceFailure>(std::move(staged)))
+                    : places_.put(difference.place, *std::get<std::unique_ptr<StagedFile>>(staged),
+                                  difference.now);
+    }
+    if (outcome.isDone()) {
+      flush(difference.place, outcome);
+    }
+    if (!outcome.isDone()) {
+      return wholeStill(outcome);
+    }
+    (difference.before == EntryKind::Nothing ? restoration_.removed : restoration_.restored)
+        .push_back(pathOf(difference.place));
+    return std::nullopt;
+  }
+
+  void flush(DevicePlace place, PlaceOutcome& outcome) {
+    if (auto failure = places_.flush(place)) {
+      outcome = PlaceOutcome::failed(*std::move(failure));
+    }
+  }
+
+  static PlaceFailure failureOf(const PlaceOutcome& outcome) {
+    constexpr int kNoNumber = 0;
+    return outcome.kind == PlaceOutcome::Kind::Disturbed
+               ? PlaceFailure{kNoNumber, "Another program wrote meanwhile"}
+               : outcome.failure;
+  }
+
+  [[nodiscard]] ProgramError wholeStill(const PlaceOutcome& outcome) const {
+    return {ExitStatus::InputOutputError, "Not everything could be put back, " +
+                                              *restoration_.folder +
+                                              " is still whole: " + failureOf(outcome).text};
+  }
+
+  static constexpr const char* kOperation = "The kept files cannot be put back";
+
+  DevicePlaces& places_;
+  KeptFolders& folders_;
+  std::string_view home_;
+  Restoration& restoration_;
+  std::vector<Difference> differences_;
+};
+
+}  // namespace
+
 std::variant<std::string, ProgramError> chosenFolder(const KeptFolders& folders,
                                                      const std::optional<std::string>& asked) {
   if (asked) {
-    const std::string name(nameOf(*asked));
+    const std::string name = asked->substr(asked->rfind('/') + 1);
     const bool isElsewhere = *asked != name && *asked != KeptFolders::pathOf(name);
     if (isElsewhere || !folders.contains(name)) {
       return missing("No folder of kept files: " + *asked);
     }
     return KeptFolders::pathOf(name);
   }
-  const std::vector<std::string> kept = folders.ofMigrations();
+  const std::vector<std::string> kept = folders.keptFor(KeptFor::Migration);
   if (kept.empty()) {
     return missing("No files are kept in " + std::string(kAccountMigrationDirectory));
   }
   if (kept.size() > 1) {
     std::string message = "Several folders hold kept files, --from must name one:";
     for (const std::string& folder : kept) {
-      message.append(" ").append(nameOf(folder));
+      message.append(" ").append(folder.substr(folder.rfind('/') + 1));
     }
     return ProgramError{ExitStatus::UnusableArguments, std::move(message)};
   }
   return kept.front();
 }
 
-std::variant<std::vector<std::string>, ProgramError> filesIn(FileSystem& files,
-                                                             const AccountFiles& accountFiles,
-                                                             const std::string& folder) {
-  std::vector<std::string> held;
-  for (const std::string& path : accountFiles.inputs()) {
-    const std::optional<EntryKind> kind = files.kindOfEntry(keptPath(folder, path));
-    if (kind == EntryKind::RegularFile) {
-      held.push_back(path);
-    } else if (kind != EntryKind::Nothing) {
-      return missing(keptPath(folder, path) + " is no regular file");
-    }
-  }
-  if (held.empty()) {
-    return missing("No kept files in " + folder);
-  }
-  return held;
-}
-
-/// Keeps the files that are about to be replaced.
-std::optional<ProgramError> keepReplaced(FileSystem& files, KeptFolders& folders,
-                                         Restoration& restoration,
-                                         const std::vector<std::string>& paths,
-                                         std::string_view time) {
-  std::vector<std::string> replaced;
-  for (const std::string& path : paths) {
-    const std::optional<EntryKind> kind = files.kindOfEntry(path);
-    if (kind == EntryKind::RegularFile) {
-      if (!files.haveSameContents(keptPath(*restoration.folder, path), path)) {
-        replaced.push_back(path);
-      }
-    } else if (kind != EntryKind::Nothing) {
-      return ProgramError{ExitStatus::CannotCreate,
-                          path + " is no regular file, so it is not replaced"};
-    }
-  }
-  if (replaced.empty()) {
-    return std::nullopt;
-  }
-  std::string folder;
-  if (const Result kept = folders.keep(replaced, KeptFor::Restoration, time, folder); !kept) {
-    return ProgramError{ExitStatus::CannotCreate,
-                        "What would be replaced cannot be kept: " + kept.error()};
-  }
-  restoration.replaced = std::move(folder);
-  return std::nullopt;
-}
-
-Result putAllBack(FileSystem& files, const AccountFiles& accountFiles, Restoration& restoration,
-                  const std::vector<std::string>& paths) {
-  // A sentinel would have the next migration remove the legacy stores without converting them.
-  Result result = removeDurably(files, accountFiles.removalSentinel);
-  for (const std::string& path : paths) {
-    if (result) {
-      result = putBack(files, *restoration.folder, path);
-    }
-    if (result) {
-      restoration.restored.push_back(path);
-    }
-  }
-  return result;
-}
-
-}  // namespace
-
-Restoration restoreKeptFiles(FileSystem& files, const AccountFiles& accountFiles,
+Restoration restoreKeptFiles(DevicePlaces& places, KeptFolders& folders, std::string_view home,
                              const std::optional<std::string>& folder, std::string_view time) {
   Restoration restoration;
-  KeptFolders folders(files);
   auto chosen = chosenFolder(folders, folder);
   if (auto* error = std::get_if<ProgramError>(&chosen)) {
     restoration.error = std::move(*error);
     return restoration;
   }
   restoration.folder = std::get<std::string>(std::move(chosen));
-  auto held = filesIn(files, accountFiles, *restoration.folder);
-  if (auto* error = std::get_if<ProgramError>(&held)) {
-    restoration.error = std::move(*error);
-    return restoration;
-  }
-  const auto& paths = std::get<std::vector<std::string>>(held);
-  folders.removeUnfinished();
-  removePutBackLeftovers(files, accountFiles);
-  restoration.error = keepReplaced(files, folders, restoration, paths, time);
+  restoration.error = Restorer(places, folders, home, restoration).run(time);
   if (restoration.error) {
     return restoration;
   }
-  if (const Result back = putAllBack(files, accountFiles, restoration, paths); !back) {
-    restoration.error = ProgramError{ExitStatus::InputOutputError,
-                                     "Not everything could be put back, " + *restoration.folder +
-                                         " is still whole: " + back.error()};
-  } else if (const Result discarded = folders.discard(*restoration.folder); !discarded) {
+  if (const Result discarded = folders.discard(*restoration.folder); !discarded) {
     restoration.error = ProgramError{
         ExitStatus::InputOutputError,
         "Everything is put back, but the folder cannot be removed: " + discarded.error()};

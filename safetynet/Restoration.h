@@ -6,8 +6,8 @@
 #include <vector>
 
 #include "commandline/ExitStatus.h"
-#include "platform/FileSystem.h"
-#include "safetynet/AccountFiles.h"
+#include "platform/DevicePlaces.h"
+#include "safetynet/KeptFolders.h"
 
 namespace accounts {
 
@@ -15,20 +15,27 @@ namespace accounts {
 struct Restoration {
   /// The folder whose files were asked for; none when it is not known which.
   std::optional<std::string> folder;
-  /// The paths of the files that it held and that are back, in the order in which they were put
-  /// back.
+  /// The paths of the files that are back, in the order in which they were put back.
   std::vector<std::string> restored;
-  /// The folder in which the files that they replaced are kept; none when they replaced none.
+  /// The paths at which nothing stands again, as before.
+  std::vector<std::string> removed;
+  /// The folder in which what was replaced is kept; none when nothing was.
   std::optional<std::string> replaced;
   std::optional<ProgramError> error;
 };
 
-/// Puts the files of a folder of kept files back and removes the folder. Files that it does not
-/// hold are left alone; what is replaced is itself kept first. `folder` is a folder's name or
-/// device path; none for the only one that was kept for a migration. `time` is sortable text. It
-/// can be killed at any moment and run again: the folder stays whole until everything is back. The
-/// caller holds the host's lock and that of the migration.
-Restoration restoreKeptFiles(FileSystem& files, const AccountFiles& accountFiles,
+/// The folder that a name or a device path means, or the only one that was kept for a migration
+/// where none is given.
+std::variant<std::string, ProgramError> chosenFolder(const KeptFolders& folders,
+                                                     const std::optional<std::string>& asked);
+
+/// Brings the places of a device back to what a folder of kept files says stood there, and removes
+/// the folder. What is replaced or removed is itself kept first. A commit record and a removal
+/// sentinel end before anything else: with either the next migration would take the stores that
+/// come back for converted ones. It can be killed at any moment and run again: the folder stays
+/// whole until everything is back. `home` is the home directory, `time` sortable text. The caller
+/// holds the host's lock and that of the migration.
+Restoration restoreKeptFiles(DevicePlaces& places, KeptFolders& folders, std::string_view home,
                              const std::optional<std::string>& folder, std::string_view time);
 
 }  // namespace accounts

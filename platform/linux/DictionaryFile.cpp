@@ -32,9 +32,9 @@ std::optional<PropertyDictionary> readDictionaryFile(const DeviceRoot& root, std
   return bytes ? dictionaryFromBytes(*bytes, path, error) : std::nullopt;
 }
 
-std::optional<PropertyDictionary> readHostDictionaryFile(const std::string& path,
-                                                         PathError& error) {
-  const std::optional<std::string> bytes = readHostFile(path, error);
+std::optional<PropertyDictionary> readHostDictionaryFile(const std::string& path, PathError& error,
+                                                         Pipes pipes) {
+  const std::optional<std::string> bytes = readHostFile(path, error, pipes);
   return bytes ? dictionaryFromBytes(*bytes, nameOfInput(path), error) : std::nullopt;
 }
 

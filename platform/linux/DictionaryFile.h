@@ -5,6 +5,7 @@
 #include <string_view>
 
 #include "platform/linux/DeviceRoot.h"
+#include "platform/linux/FileContents.h"
 #include "platform/linux/PathError.h"
 #include "propertylist/PropertyValue.h"
 
@@ -21,6 +22,7 @@ std::optional<PropertyDictionary> readDictionaryFile(const DeviceRoot& root, std
                                                      PathError& error);
 
 /// The same for a file of the host, outside any device root.
-std::optional<PropertyDictionary> readHostDictionaryFile(const std::string& path, PathError& error);
+std::optional<PropertyDictionary> readHostDictionaryFile(const std::string& path, PathError& error,
+                                                         Pipes pipes = Pipes::Read);
 
 }  // namespace accounts

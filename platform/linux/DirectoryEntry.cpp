@@ -25,7 +25,8 @@ std::optional<FileDescriptor> asOpened(int number, std::string_view operation,
 
 }  // namespace
 
-DirectoryEntry::DirectoryEntry(FileDescriptor directory, std::string name, std::string path)
+DirectoryEntry::DirectoryEntry(std::shared_ptr<const FileDescriptor> directory, std::string name,
+                               std::string path)
     : directory_(std::move(directory)), name_(std::move(name)), path_(std::move(path)) {}
 
 std::optional<FileDescriptor> DirectoryEntry::openRegularFile(int flags, PathError& error) const {
@@ -53,6 +54,11 @@ std::optional<FileDescriptor> DirectoryEntry::openRegularFile(int flags, PathErr
     return std::nullopt;
   }
   return file;
+}
+
+std::optional<FileDescriptor> DirectoryEntry::openForItsPath(PathError& error) const {
+  return asOpened(::openat(directory(), name(), O_PATH | O_NOFOLLOW | O_CLOEXEC), "open", path_,
+                  error);
 }
 
 std::optional<FileDescriptor> DirectoryEntry::createFile(mode_t permissions,

@@ -2,8 +2,10 @@
 
 #include <sys/types.h>
 
+#include <memory>
 #include <optional>
 #include <string>
+#include <utility>
 
 #include "platform/linux/FileDescriptor.h"
 #include "platform/linux/PathError.h"
@@ -20,15 +22,28 @@ class DirectoryEntry {
  public:
   /// `directory` may be open for its path alone. `name` is one component, neither "." nor "..".
   /// `path` is the device path of the entry, for error texts.
-  DirectoryEntry(FileDescriptor directory, std::string name, std::string path);
+  DirectoryEntry(FileDescriptor directory, std::string name, std::string path)
+      : DirectoryEntry(std::make_shared<const FileDescriptor>(std::move(directory)),
+                       std::move(name), std::move(path)) {}
+  /// The same in a directory that several share.
+  DirectoryEntry(std::shared_ptr<const FileDescriptor> directory, std::string name,
+                 std::string path);
 
-  [[nodiscard]] int directory() const { return directory_.number(); }
+  [[nodiscard]] int directory() const { return directory_->number(); }
   [[nodiscard]] const char* name() const { return name_.c_str(); }
   [[nodiscard]] const std::string& path() const { return path_; }
+  /// Another name in the same directory.
+  [[nodiscard]] DirectoryEntry withName(std::string name) const {
+    return DirectoryEntry(directory_, std::move(name), path_);
+  }
 
   /// Opens the regular file of this name with open's `flags`, without waiting. None, with `error`
   /// set, when it is missing, may not be opened or is anything but a regular file.
   [[nodiscard]] std::optional<FileDescriptor> openRegularFile(int flags, PathError& error) const;
+
+  /// Opens what has this name for its path alone, whatever it is; none, with `error` set, when
+  /// nothing has it.
+  [[nodiscard]] std::optional<FileDescriptor> openForItsPath(PathError& error) const;
 
   /// Creates a file of this name with the given permission bits (less the process's mask), open for
   /// reading and writing. None, with `error` set, when anything exists there or creating fails.
@@ -48,7 +63,7 @@ class DirectoryEntry {
   [[nodiscard]] std::optional<FileDescriptor> openDirectory(PathError& error) const;
 
  private:
-  FileDescriptor directory_;
+  std::shared_ptr<const FileDescriptor> directory_;
   std::string name_;
   std::string path_;
 };

@@ -77,7 +77,7 @@ std::optional<std::string> readContents(const FileDescriptor& file, std::string_
   return isRead ? std::optional(std::move(bytes)) : std::nullopt;
 }
 
-std::optional<std::string> readHostFile(const std::string& path, PathError& error) {
+std::optional<std::string> readHostFile(const std::string& path, PathError& error, Pipes pipes) {
   if (path == kStandardStream) {
     // A duplicate, since closing the standard stream itself would free its number.
     const FileDescriptor input(::fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, 0));
@@ -85,7 +85,8 @@ std::optional<std::string> readHostFile(const std::string& path, PathError& erro
   }
   // A pipe is waited for until somebody writes; opening anything else never waits.
   struct stat named = {};
-  const bool isPipe = ::stat(path.c_str(), &named) == 0 && S_ISFIFO(named.st_mode);
+  const bool isPipe =
+      pipes == Pipes::Read && ::stat(path.c_str(), &named) == 0 && S_ISFIFO(named.st_mode);
   const int flags = O_RDONLY | O_CLOEXEC | O_NOCTTY | (isPipe ? 0 : O_NONBLOCK);
   const int number = ::open(path.c_str(), flags);
   if (number < 0) {

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstddef>
+#include <cstdint>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -27,10 +28,14 @@ std::optional<std::string> readContents(const FileDescriptor& file, std::string_
 /// The name that stands for standard input, or output, where a file of the host is named.
 inline constexpr const char* kStandardStream = "-";
 
+/// Whether a named pipe is read, which waits for whoever writes it, or is no file to be read.
+enum class Pipes : std::uint8_t { Read, Refuse };
+
 /// The bytes of a file of the host, outside any device root: of a regular file, of standard input
 /// (kStandardStream) or of a pipe, which is read to its end. None, with `error` set, when it is
 /// missing, unreadable, too large or something else. Only for a pipe opening waits.
-std::optional<std::string> readHostFile(const std::string& path, PathError& error);
+std::optional<std::string> readHostFile(const std::string& path, PathError& error,
+                                        Pipes pipes = Pipes::Read);
 
 /// How a message names what readHostFile() reads.
 std::string nameOfInput(const std::string& path);

@@ -25,7 +25,7 @@ bool LinuxBundleResources::hasPropertyList(std::string_view name) {
 
 std::optional<PropertyDictionary> LinuxBundleResources::readPropertyList(std::string_view name) {
   PathError error;
-  return readHostDictionaryFile(resourcePath(resourcesDirectory_, name), error);
+  return readHostDictionaryFile(resourcePath(resourcesDirectory_, name), error, Pipes::Refuse);
 }
 
 }  // namespace accounts

@@ -8,6 +8,7 @@
 #include <string_view>
 #include <vector>
 
+#include "platform/FileKeeping.h"
 #include "platform/FileSystem.h"
 #include "platform/linux/DeviceRoot.h"
 #include "platform/linux/OwnerNames.h"
@@ -19,7 +20,7 @@ namespace accounts {
 /// beneath the root; a link in the place of the file itself is followed only where a file is looked
 /// at or copied from. Files that are made can be read by their owner alone. Only regular files are
 /// read, written, moved and given away; nothing else is waited for.
-class LinuxFileSystem final : public FileSystem {
+class LinuxFileSystem final : public FileSystem, public FileKeeping {
  public:
   /// Temporary files go to `temporaryDirectory`, a device path; it is made when first needed, its
   /// parent must exist. `root` must outlive this.
@@ -32,13 +33,10 @@ class LinuxFileSystem final : public FileSystem {
   bool isDirectory(std::string_view path) override;
   std::optional<EntryKind> kindOfEntry(std::string_view path) override;
   std::optional<std::vector<std::string>> directoryEntries(std::string_view path) override;
-  bool haveSameContents(std::string_view first, std::string_view second) override;
+  std::optional<std::string> shortContents(std::string_view path, std::size_t most) override;
 
   /// The copy gets the permission bits of its source. Files above kLargestFileSize are not copied.
   Result copyFile(std::string_view source, std::string_view destination) override;
-  /// A file that may not be read is linked without being flushed. A copy stays the user's own when
-  /// that user may give no file away.
-  Result linkFile(std::string_view source, std::string_view destination) override;
   Result removeFile(std::string_view path) override;
   Result createFile(std::string_view path, std::string_view contents) override;
   Result createDirectoryWithIntermediates(std::string_view path, unsigned permissions) override;

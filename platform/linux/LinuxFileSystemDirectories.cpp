@@ -10,6 +10,7 @@
 #include "platform/linux/FileContents.h"
 #include "platform/linux/LinuxFileSystem.h"
 #include "platform/linux/PathResult.h"
+#include "platform/linux/PlaceFailures.h"
 
 namespace accounts {
 namespace {
@@ -17,17 +18,6 @@ namespace {
 struct CloseDirectory {
   void operator()(DIR* directory) const { ::closedir(directory); }
 };
-
-EntryKind kindOfMode(mode_t mode) {
-  switch (mode & S_IFMT) {
-    case S_IFREG:
-      return EntryKind::RegularFile;
-    case S_IFDIR:
-      return EntryKind::Directory;
-    default:
-      return EntryKind::Other;
-  }
-}
 
 }  // namespace
 
@@ -71,6 +61,15 @@ std::optional<std::vector<std::string>> LinuxFileSystem::directoryEntries(std::s
   }
   std::ranges::sort(names);
   return names;
+}
+
+std::optional<std::string> LinuxFileSystem::shortContents(std::string_view path, std::size_t most) {
+  PathError error;
+  const auto file = root_.openRegularFile(path, error);
+  const auto status = file ? fileStatus(*file, path, error) : std::nullopt;
+  return status && static_cast<std::size_t>(status->st_size) <= most
+             ? readContents(*file, path, error)
+             : std::nullopt;
 }
 
 Result LinuxFileSystem::removeDirectory(std::string_view path) {

@@ -8,6 +8,7 @@
 
 #include "platform/linux/DevicePath.h"
 #include "platform/linux/LinuxFileSystem.h"
+#include "platform/linux/StagedName.h"
 #include "platform/linux/TemporaryFile.h"
 
 namespace accounts {
@@ -57,7 +58,8 @@ void LinuxFileSystem::removeAbandonedTemporaryFiles(
 void LinuxFileSystem::removeAbandonedTemporaryFilesIn(const std::string& directory) {
   for (const std::string& name : directoryEntries(directory).value_or(std::vector<std::string>())) {
     PathError error;
-    const auto entry = name.starts_with(kTemporaryFilePrefix)
+    // What a commit left is dealt with by those who know what it replaced.
+    const auto entry = name.starts_with(kTemporaryFilePrefix) && !StagedName::parse(name)
                            ? root_.locate(joinedPath(directory, name), error)
                            : std::nullopt;
     const auto file = entry ? entry->openRegularFile(O_RDONLY, error) : std::nullopt;

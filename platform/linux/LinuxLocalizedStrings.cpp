@@ -31,7 +31,7 @@ const PropertyDictionary& LinuxLocalizedStrings::stringTable(const std::string& 
     return known->second;
   }
   PathError error;
-  auto read = readHostDictionaryFile(path, error);
+  auto read = readHostDictionaryFile(path, error, Pipes::Refuse);
   // A table that cannot be read translates nothing.
   return tablesByPath_.emplace(std::move(path), std::move(read).value_or(PropertyDictionary()))
       .first->second;

@@ -49,8 +49,7 @@ std::optional<FileDescriptor> openExisting(const DirectoryEntry& entry, PathErro
   return file || error.number == ENOENT ? std::move(file) : entry.openRegularFile(O_RDONLY, error);
 }
 
-std::optional<FileDescriptor> openOrCreate(const DirectoryEntry& entry) {
-  PathError error;
+std::optional<FileDescriptor> openOrCreate(const DirectoryEntry& entry, PathError& error) {
   auto file = openExisting(entry, error);
   if (file || error.number != ENOENT) {
     return file;
@@ -74,6 +73,12 @@ bool canBeLocked(const FileDescriptor& file) {
 
 }  // namespace
 
+std::optional<FileDescriptor> openLockFile(const DeviceRoot& root, std::string_view name,
+                                           PathError& error) {
+  const auto entry = root.locate(joinedPath(kLockDirectory, name), error);
+  return entry ? openOrCreate(*entry, error) : std::nullopt;
+}
+
 std::string LinuxSharedResources::systemRootDirectory() {
   return "/";
 }
@@ -87,8 +92,7 @@ std::unique_ptr<NamedLock> LinuxSharedResources::makeLock(std::string_view name)
     return nullptr;
   }
   PathError error;
-  const auto entry = root_.locate(joinedPath(kLockDirectory, name), error);
-  auto file = entry ? openOrCreate(*entry) : std::nullopt;
+  auto file = openLockFile(root_, name, error);
   if (!file || !canBeLocked(*file)) {
     return nullptr;
   }

@@ -1,5 +1,6 @@
 #include "platform/linux/TemporaryFile.h"
 
+#include <fcntl.h>
 #include <sys/file.h>
 #include <sys/random.h>
 #include <sys/stat.h>
@@ -18,17 +19,8 @@ namespace {
 constexpr int kMostNames = 16;
 
 std::optional<std::string> uniqueName() {
-  std::array<std::uint8_t, 8> bytes;
-  if (::getrandom(bytes.data(), bytes.size(), 0) != static_cast<ssize_t>(bytes.size())) {
-    return std::nullopt;
-  }
-  constexpr std::string_view kDigits = "0123456789abcdef";
-  std::string name(kTemporaryFilePrefix);
-  for (const std::uint8_t byte : bytes) {
-    name += kDigits[byte >> 4];
-    name += kDigits[byte & 0x0f];
-  }
-  return name;
+  const auto digits = randomDigits();
+  return digits ? std::optional(std::string(kTemporaryFilePrefix) + *digits) : std::nullopt;
 }
 
 // Locks a new file, so that nobody takes it for an abandoned one, and tells whether nobody did
@@ -42,19 +34,46 @@ bool isOurs(const FileDescriptor& file) {
 
 }  // namespace
 
-std::optional<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::string_view directory,
-                                                 PathError& error) {
+std::optional<std::string> randomDigits() {
+  std::array<std::uint8_t, 8> bytes;
+  if (::getrandom(bytes.data(), bytes.size(), 0) != static_cast<ssize_t>(bytes.size())) {
+    return std::nullopt;
+  }
+  constexpr std::string_view kDigits = "0123456789abcdef";
+  std::string digits;
+  for (const std::uint8_t byte : bytes) {
+    digits += kDigits[byte >> 4];
+    digits += kDigits[byte & 0x0f];
+  }
+  return digits;
+}
+
+std::optional<DirectoryEntry> freeEntryIn(const std::shared_ptr<const FileDescriptor>& directory,
+                                          std::string_view directoryPath, PathError& error) {
+  auto name = uniqueName();
+  if (!name) {
+    error = pathError("make a temporary name in", directoryPath, errno);
+    return std::nullopt;
+  }
+  std::string path = joinedPath(directoryPath, *name);
+  return DirectoryEntry(directory, *std::move(name), std::move(path));
+}
+
+std::optional<TemporaryFile> makeTemporaryFileIn(
+    const std::shared_ptr<const FileDescriptor>& directory, std::string_view directoryPath,
+    PathError& error) {
   for (int attempt = 0; attempt < kMostNames; ++attempt) {
-    const auto name = uniqueName();
-    if (!name) {
-      error = pathError("make a temporary name in", directory, errno);
-      return std::nullopt;
-    }
-    auto entry = root.locate(joinedPath(directory, *name), error);
+    auto entry = freeEntryIn(directory, directoryPath, error);
     if (!entry) {
       return std::nullopt;
     }
     auto file = entry->createFile(kOwnerOnlyFile, error);
+    // The process's mask applies to open but not to fchmod.
+    if (file && ::fchmod(file->number(), kOwnerOnlyFile) != 0) {
+      error = pathError("set the permissions of", entry->path(), errno);
+      (void)entry->remove();
+      return std::nullopt;
+    }
     if (file && isOurs(*file)) {
       return TemporaryFile{std::move(*entry), std::move(*file)};
     }
@@ -63,6 +82,14 @@ std::optional<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::st
     }
   }
   return std::nullopt;
+}
+
+std::optional<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::string_view directory,
+                                                 PathError& error) {
+  auto opened = root.open(directory, O_PATH | O_DIRECTORY, error);
+  return opened ? makeTemporaryFileIn(std::make_shared<const FileDescriptor>(*std::move(opened)),
+                                      directory, error)
+                : std::nullopt;
 }
 
 }  // namespace accounts

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -15,6 +16,9 @@ namespace accounts {
 /// from everything else.
 inline constexpr std::string_view kTemporaryFilePrefix = ".accounts-migration-";
 
+/// 64 random bits as text, which no two names have by chance; none when the system has none.
+std::optional<std::string> randomDigits();
+
 /// A new, empty file with a unique name, readable and writable by its owner alone. It is locked
 /// (flock) as long as it is open, which tells others that its maker still runs.
 struct TemporaryFile {
@@ -22,6 +26,15 @@ struct TemporaryFile {
   FileDescriptor file;
 };
 
+/// A temporary name in an open directory that nothing has yet. None, with `error` set, when the
+/// system has no random bytes.
+std::optional<DirectoryEntry> freeEntryIn(const std::shared_ptr<const FileDescriptor>& directory,
+                                          std::string_view directoryPath, PathError& error);
+
+/// Makes a temporary file in an open directory. None, with `error` set, when it cannot be made.
+std::optional<TemporaryFile> makeTemporaryFileIn(
+    const std::shared_ptr<const FileDescriptor>& directory, std::string_view directoryPath,
+    PathError& error);
 /// Makes a temporary file in a directory that exists. None, with `error` set, when it cannot be
 /// made.
 std::optional<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::string_view directory,

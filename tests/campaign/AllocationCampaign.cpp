@@ -1,3 +1,4 @@
+#include <memory>
 #include <new>
 #include <string>
 
@@ -15,23 +16,23 @@ constexpr std::string_view kFault = "bad-alloc";
 
 /// A process that runs out of memory ends. What it leaves is what a kill there would leave.
 void tryAllocationsIn(const Scenario& scenario, Report& report) {
-  Invariants invariants(scenario);
-  const std::size_t count = invariants.undisturbed().allocations;
+  const std::unique_ptr<Invariants> invariants = Invariants::of(scenario);
+  const std::size_t count = invariants->undisturbed().allocations;
   for (std::size_t allocation = 0; allocation < count; ++allocation) {
     if (!report.takes(scenario.name, allocation, kFault)) {
       continue;
     }
     const Run run = runOn(scenario.disk, scenario, {.failingAllocation = allocation});
-    Complaint complaint = invariants.ofInterruption(run.disk, run.settingsWritten);
+    Complaint complaint = invariants->ofInterruption(run.disk, run.settingsWritten);
     if (!complaint && run.openDescriptors != 0) {
       complaint = "a descriptor stayed open";
     }
     if (!complaint) {
-      complaint = invariants.ofNextRun(run.disk);
+      complaint = invariants->ofNextRun(run.disk);
     }
     report.judge(complaint, "allocation " + std::to_string(allocation));
   }
-  report.add("distinct disks afterwards", invariants.distinctDisks());
+  report.add("distinct disks afterwards", invariants->distinctDisks());
 }
 
 /// A codec gives what it gives with memory enough, or ends with std::bad_alloc: it never takes a

@@ -1,5 +1,6 @@
 #include <array>
 #include <cerrno>
+#include <memory>
 #include <string>
 
 #include "tests/campaign/Campaigns.h"
@@ -18,51 +19,38 @@ struct NamedFault {
 
 constexpr auto kOnce = Fault::Duration::Once;
 constexpr auto kFromThenOn = Fault::Duration::FromThenOn;
-constexpr auto kUntilThePluginEnds = Fault::Duration::UntilThePluginEnds;
 
 constexpr NamedFault kFaults[] = {
-    {"EIO-once", EIO, kOnce},
-    {"EIO-from-then-on", EIO, kFromThenOn},
-    {"ENOSPC-once", ENOSPC, kOnce},
-    {"ENOSPC-from-then-on", ENOSPC, kFromThenOn},
-    {"EDQUOT-once", EDQUOT, kOnce},
-    {"EDQUOT-from-then-on", EDQUOT, kFromThenOn},
-    {"EACCES-once", EACCES, kOnce},
-    {"EACCES-from-then-on", EACCES, kFromThenOn},
-    {"EROFS-once", EROFS, kOnce},
-    {"EROFS-from-then-on", EROFS, kFromThenOn},
-    {"EMFILE-once", EMFILE, kOnce},
-    {"EMFILE-from-then-on", EMFILE, kFromThenOn},
-    {"short-write-once", 0, kOnce},
-    {"short-write-from-then-on", 0, kFromThenOn},
-    {"plugin-killed", EIO, kUntilThePluginEnds},
+    {"EIO-once", EIO, kOnce},       {"EIO-from-then-on", EIO, kFromThenOn},
+    {"ENOSPC-once", ENOSPC, kOnce}, {"ENOSPC-from-then-on", ENOSPC, kFromThenOn},
+    {"EDQUOT-once", EDQUOT, kOnce}, {"EDQUOT-from-then-on", EDQUOT, kFromThenOn},
+    {"EACCES-once", EACCES, kOnce}, {"EACCES-from-then-on", EACCES, kFromThenOn},
+    {"EROFS-once", EROFS, kOnce},   {"EROFS-from-then-on", EROFS, kFromThenOn},
+    {"EMFILE-once", EMFILE, kOnce}, {"EMFILE-from-then-on", EMFILE, kFromThenOn},
+    {"short-write-once", 0, kOnce}, {"short-write-from-then-on", 0, kFromThenOn},
 };
 
 void tryFaultsIn(const Scenario& scenario, Report& report) {
-  Invariants invariants(scenario);
-  // A plug-in that is killed alone leaves a host that goes on.
-  const bool hasPlugin =
-      scenario.host == Scenario::Host::SafetyNet && scenario.action == Scenario::Action::Migration;
-  const std::vector<SimulatedKernel::Call>& calls = invariants.undisturbed().calls;
+  const std::unique_ptr<Invariants> invariants = Invariants::of(scenario);
+  const std::vector<SimulatedKernel::Call>& calls = invariants->undisturbed().calls;
   for (std::size_t operation = 0; operation < calls.size(); ++operation) {
     for (const NamedFault& named : kFaults) {
-      const bool canHit = (named.error != 0 || calls[operation].line.starts_with("write ")) &&
-                          (named.duration != kUntilThePluginEnds || hasPlugin);
+      const bool canHit = named.error != 0 || calls[operation].line.starts_with("write ");
       if (!canHit || !report.takes(scenario.name, operation, named.name)) {
         continue;
       }
       const Fault fault = {operation, named.error, named.duration};
       const Run run = runOn(scenario.disk, scenario, {.fault = fault});
-      Complaint complaint = invariants.ofFaultedRun(run, fault);
+      Complaint complaint = invariants->ofFaultedRun(run, fault);
       if (!complaint) {
-        complaint = invariants.ofNextRun(run.disk);
+        complaint = invariants->ofNextRun(run.disk);
       }
       report.judge(complaint, calls[operation].line);
     }
   }
   report.add("system calls", calls.size());
-  report.add("distinct disks afterwards", invariants.distinctDisks());
-  report.add("legacy stores removed without a save", invariants.removalsWithoutSave());
+  report.add("distinct disks afterwards", invariants->distinctDisks());
+  report.add("legacy stores removed without a save", invariants->removalsWithoutSave());
 }
 
 }  // namespace

@@ -1,3 +1,4 @@
+#include <memory>
 #include <string>
 
 #include "tests/campaign/Campaigns.h"
@@ -30,10 +31,10 @@ std::vector<SimulatedDisk> disksOf(const SimulatedDisk& before, const Run& run) 
 class KilledScenario {
  public:
   KilledScenario(const Scenario& scenario, Report& report)
-      : scenario_(scenario), report_(report), invariants_(scenario) {}
+      : scenario_(scenario), report_(report), invariants_(Invariants::of(scenario)) {}
 
   void tryAll() {
-    const Run& run = invariants_.undisturbed();
+    const Run& run = invariants_->undisturbed();
     const std::vector<SimulatedDisk> disks = disksOf(scenario_.disk, run);
     std::optional<std::uint64_t> previous;
     for (std::size_t operation = 0; operation < run.calls.size(); ++operation) {
@@ -50,13 +51,13 @@ class KilledScenario {
         previous = fingerprint;
       }
     }
-    report_.add("distinct disks", invariants_.distinctDisks());
+    report_.add("distinct disks", invariants_->distinctDisks());
   }
 
  private:
   Complaint judge(const SimulatedDisk& disk, const std::vector<std::string>& settingsWritten) {
-    const Complaint complaint = invariants_.ofInterruption(disk, settingsWritten);
-    return complaint ? complaint : invariants_.ofNextRun(disk);
+    const Complaint complaint = invariants_->ofInterruption(disk, settingsWritten);
+    return complaint ? complaint : invariants_->ofNextRun(disk);
   }
 
   void killSecondRun(const SimulatedDisk& left, std::size_t firstOperation, const Run& first) {
@@ -80,7 +81,7 @@ class KilledScenario {
   static constexpr unsigned kSecondRun = 4;
   const Scenario& scenario_;
   Report& report_;
-  Invariants invariants_;
+  std::unique_ptr<Invariants> invariants_;
 };
 
 }  // namespace

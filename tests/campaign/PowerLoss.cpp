@@ -18,7 +18,7 @@ constexpr std::size_t kMostCombinations = 216;
 
 /// The directory whose order of changes a change of a name belongs to.
 std::size_t directoryOf(const DiskChange& change) {
-  return change.kind == Kind::Rename ? change.newDirectory : change.directory;
+  return change.isOfTwoNames() ? change.newDirectory : change.directory;
 }
 
 void addReachable(const SimulatedDisk& disk, std::size_t number, std::set<std::size_t>& reachable) {
@@ -39,12 +39,12 @@ void PowerLoss::advance(const DiskChange& change, std::size_t index) {
     for (std::size_t earlier = 0; earlier < index; ++earlier) {
       const DiskChange& each = changes_[earlier];
       if (each.isOfNames() && (each.directory == change.inode ||
-                               (each.kind == Kind::Rename && each.newDirectory == change.inode))) {
+                               (each.isOfTwoNames() && each.newDirectory == change.inode))) {
         isOnMedium_[earlier] = true;
       }
     }
     if (std::erase(changedFiles_, change.inode) != 0) {
-      medium_.setContents(change.inode, newest_.inode(change.inode).contents);
+      setContents(medium_, change.inode, contentsOf(newest_, change.inode));
     }
   } else if (change.isOfContents()) {
     newest_.apply(change);
@@ -74,7 +74,10 @@ void PowerLoss::forEachDiskAfter(std::size_t count,
       names[pending[index]] = selection[index];
     }
     SimulatedDisk disk = diskWithNames(names);
-    forEachContents(disk, take);
+    // A file does not get another one's number as long as the other one's name is on the medium.
+    if (disk.hasDistinctNumbers()) {
+      forEachContents(disk, take);
+    }
   }
 }
 
@@ -121,15 +124,24 @@ SimulatedDisk PowerLoss::diskWithNames(const Selection& isOnMedium) const {
   return disk;
 }
 
-std::vector<std::string> PowerLoss::contentsVariants(std::size_t inode) const {
-  const std::string& newest = newest_.inode(inode).contents;
+PowerLoss::Contents PowerLoss::contentsOf(const SimulatedDisk& disk, std::size_t inode) {
+  return {disk.inode(inode).contents, disk.inode(inode).modified};
+}
+
+void PowerLoss::setContents(SimulatedDisk& disk, std::size_t inode, const Contents& contents) {
+  disk.setContents(inode, contents.bytes, contents.modified);
+}
+
+std::vector<PowerLoss::Contents> PowerLoss::contentsVariants(std::size_t inode) const {
+  const auto [newest, modified] = contentsOf(newest_, inode);
+  const Contents old = contentsOf(medium_, inode);
   const std::string half = newest.substr(0, newest.size() / 2);
   const std::string rest(newest.size() - half.size(), '\0');
-  std::vector<std::string> variants;
-  for (const std::string& contents : {newest, medium_.inode(inode).contents, half, half + rest,
-                                      std::string(newest.size(), '\0'), std::string()}) {
-    if (std::ranges::find(variants, contents) == variants.end()) {
-      variants.push_back(contents);
+  std::vector<Contents> variants = {old};
+  for (const std::string& bytes :
+       {newest, half, half + rest, std::string(newest.size(), '\0'), std::string()}) {
+    if (std::ranges::find(variants, bytes, &Contents::bytes) == variants.end()) {
+      variants.push_back({bytes, modified});
     }
   }
   return variants;
@@ -139,7 +151,7 @@ void PowerLoss::forEachContents(SimulatedDisk& disk,
                                 const std::function<void(const SimulatedDisk&)>& take) const {
   std::set<std::size_t> reachable;
   addReachable(disk, SimulatedDisk::kRoot, reachable);
-  std::map<std::size_t, std::vector<std::string>> variants;
+  std::map<std::size_t, std::vector<Contents>> variants;
   std::size_t combinations = 1;
   for (const std::size_t inode : changedFiles_) {
     if (reachable.contains(inode)) {
@@ -150,7 +162,7 @@ void PowerLoss::forEachContents(SimulatedDisk& disk,
     for (std::size_t combination = 0; combination < combinations; ++combination) {
       std::size_t rest = combination;
       for (const auto& [inode, each] : variants) {
-        disk.setContents(inode, each[rest % each.size()]);
+        setContents(disk, inode, each[rest % each.size()]);
         rest /= each.size();
       }
       take(disk);
@@ -159,14 +171,14 @@ void PowerLoss::forEachContents(SimulatedDisk& disk,
   }
   for (const bool othersAreNew : {false, true}) {
     const auto reset = [&](std::size_t inode) {
-      disk.setContents(inode, (othersAreNew ? newest_ : medium_).inode(inode).contents);
+      setContents(disk, inode, contentsOf(othersAreNew ? newest_ : medium_, inode));
     };
     for (const auto& [inode, each] : variants) {
       reset(inode);
     }
     for (const auto& [inode, each] : variants) {
-      for (const std::string& contents : each) {
-        disk.setContents(inode, contents);
+      for (const Contents& contents : each) {
+        setContents(disk, inode, contents);
         take(disk);
       }
       reset(inode);

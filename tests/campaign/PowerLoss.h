@@ -18,7 +18,9 @@ namespace accounts {
 /// - of each changed file the old contents, the new ones, half of them, half of them and then
 ///   zeroes, zeroes alone, or nothing. With several such files all combinations while they are few,
 ///   else one file at a time with the others old, and with the others new.
-/// A rename happens or does not; permissions and owners are always there.
+/// A rename or exchange happens or does not, in one step; permissions, owners and times that were
+/// set are always there. A file says that it was modified when its contents that are there were
+/// written.
 class PowerLoss {
  public:
   /// `before` is what was on the medium when the run began, `changes` what the run recorded.
@@ -37,7 +39,13 @@ class PowerLoss {
   [[nodiscard]] SimulatedDisk diskWithNames(const Selection& isOnMedium) const;
   void forEachContents(SimulatedDisk& disk,
                        const std::function<void(const SimulatedDisk&)>& take) const;
-  [[nodiscard]] std::vector<std::string> contentsVariants(std::size_t inode) const;
+  struct Contents {
+    std::string bytes;
+    std::uint64_t modified = 0;
+  };
+  [[nodiscard]] static Contents contentsOf(const SimulatedDisk& disk, std::size_t inode);
+  [[nodiscard]] std::vector<Contents> contentsVariants(std::size_t inode) const;
+  static void setContents(SimulatedDisk& disk, std::size_t inode, const Contents& contents);
 
   const std::vector<DiskChange>& changes_;
   std::size_t count_ = 0;

@@ -1,3 +1,4 @@
+#include <memory>
 #include <string>
 #include <unordered_set>
 
@@ -16,10 +17,10 @@ constexpr std::size_t kKills = 3;
 class PowerlessScenario {
  public:
   PowerlessScenario(const Scenario& scenario, Report& report)
-      : scenario_(scenario), report_(report), invariants_(scenario) {}
+      : scenario_(scenario), report_(report), invariants_(Invariants::of(scenario)) {}
 
   void tryAll() {
-    const Run& run = invariants_.undisturbed();
+    const Run& run = invariants_->undisturbed();
     tryRun("", run.changes, 0, run.settingsWritten);
     for (std::size_t kill = 1; kill <= kKills; ++kill) {
       trySecondRun(run.changes.size() * kill / (kKills + 1));
@@ -45,7 +46,7 @@ class PowerlessScenario {
 
   /// What a killed run did is not on the medium either when the power fails in the next one.
   void trySecondRun(std::size_t killedAfter) {
-    const Run& first = invariants_.undisturbed();
+    const Run& first = invariants_->undisturbed();
     std::vector<DiskChange> changes(
         first.changes.begin(), first.changes.begin() + static_cast<std::ptrdiff_t>(killedAfter));
     SimulatedDisk left = scenario_.disk;
@@ -63,14 +64,14 @@ class PowerlessScenario {
   }
 
   Complaint judge(const SimulatedDisk& disk, const std::vector<std::string>& settingsWritten) {
-    const Complaint complaint = invariants_.ofInterruption(disk, settingsWritten);
-    return complaint ? complaint : invariants_.ofNextRun(disk);
+    const Complaint complaint = invariants_->ofInterruption(disk, settingsWritten);
+    return complaint ? complaint : invariants_->ofNextRun(disk);
   }
 
   static constexpr unsigned kSecondRun = 4;
   const Scenario& scenario_;
   Report& report_;
-  Invariants invariants_;
+  std::unique_ptr<Invariants> invariants_;
   std::unordered_set<std::uint64_t> known_;
 };
 

@@ -7,7 +7,7 @@ namespace accounts {
 
 namespace {
 
-constexpr std::size_t kMostComplaintsShown = 10;
+constexpr std::size_t kMostComplaintsShown = 1000000;
 
 }  // namespace
 
@@ -27,7 +27,7 @@ bool Report::takes(std::string_view scenario, std::size_t operation, std::string
 void Report::judge(const Complaint& complaint, std::string_view call) {
   if (complaint) {
     complaints_.push_back(*complaint + "\n    at \"" + std::string(call) + "\"\n    repeat with: " +
-                          (selection_.host == Scenario::Host::SafetyNet ? "--net " : "") +
+                          (selection_.host == Scenario::Host::Bare ? "--bare " : "") +
                           "--scenario " + scenario_ + " --operation " + std::to_string(operation_) +
                           " --fault " + fault_);
   }

@@ -13,7 +13,7 @@ namespace accounts {
 
 /// Which cases a campaign tries.
 struct Selection {
-  Scenario::Host host = Scenario::Host::Bare;
+  Scenario::Host host = Scenario::Host::Transaction;
   /// Empty for all.
   std::string scenario = {};
   /// None for all.

@@ -1,10 +1,13 @@
 #pragma once
 
 #include <cstddef>
+#include <functional>
 #include <optional>
 #include <string>
 #include <vector>
 
+#include "commandline/ExitStatus.h"
+#include "tests/campaign/InProcessWorker.h"
 #include "tests/campaign/Scenario.h"
 #include "tests/campaign/SimulatedDisk.h"
 #include "tests/campaign/SimulatedKernel.h"
@@ -19,20 +22,30 @@ struct RunOptions {
   unsigned number = 1;
   /// The allocation that fails, counted over the action alone.
   std::optional<std::size_t> failingAllocation = {};
+  /// What becomes of a worker's result on its way.
+  std::optional<Handover::Limit> handover = {};
+  /// What another program does, and when.
+  std::optional<Intrusion> intrusion = {};
+  /// Who runs the plug-in; none for the scenario's own.
+  std::optional<Scenario::Host> host = {};
 };
 
 /// What came of a run.
 struct Run {
   SimulatedDisk disk;
-  /// Whether the action was a success: the plug-in gave true, and a safety net verified it. A save
-  /// gives nothing and counts as one.
+  /// Whether the action was a success: the plug-in gave true, or what it did in memory is on the
+  /// device. A save gives nothing and counts as one.
   bool succeeded = false;
-  /// Whether a safety net refused to start, or gave true but was undone and says so.
-  bool wasRefused = false;
-  /// Whether the action ended with std::bad_alloc.
+  /// How the host would end. Not of a bare plug-in.
+  ExitStatus exitStatus = ExitStatus::Success;
+  std::string error;
+  std::vector<std::string> warnings;
+  /// Whether the process ended with std::bad_alloc.
   bool ranOutOfMemory = false;
   /// The bytes of every account settings file that the run meant to write, in order.
   std::vector<std::string> settingsWritten;
+  /// What the workers handed over.
+  Handover handover;
   /// How many notifier classes were told of changes.
   std::size_t notifications = 0;
   /// The paths of the system calls that the fault made fail.

@@ -5,8 +5,9 @@
 #include <vector>
 
 #include "platform/linux/DeviceDescription.h"
+#include "safetynet/MigrationInMemory.h"
 #include "tests/campaign/SimulatedDisk.h"
-#include "tests/fakes/FakePlatform.h"
+#include "tests/campaign/SimulatedKernel.h"
 
 namespace accounts {
 
@@ -19,13 +20,20 @@ struct Scenario {
     /// Kept files are put back.
     Restoration,
   };
-  /// What is around the plug-in.
-  enum class Host : std::uint8_t { Bare, SafetyNet };
+  /// Who runs the plug-in.
+  enum class Host : std::uint8_t {
+    /// Nobody: it is alone on the device.
+    Bare,
+    /// A run that is one transaction.
+    Transaction
+  };
   std::string name;
   SimulatedDisk disk;
   DeviceDescription description = {};
   Action action = Action::Migration;
   Host host = Host::Bare;
+  KeepFiles keep = KeepFiles::WhenNeeded;
+  FileSystemAbilities abilities = {};
 };
 
 /// All scenarios of a host, in a fixed order. Names are unique.

@@ -76,6 +76,10 @@ class ScenarioBuilder {
     scenario_.action = action;
     return *this;
   }
+  ScenarioBuilder& onTransaction() {
+    scenario_.host = Scenario::Host::Transaction;
+    return *this;
+  }
   operator Scenario() const { return scenario_; }
 
  private:
@@ -225,10 +229,11 @@ std::vector<Scenario> scenariosOfMigrations() {
   return scenarios;
 }
 
-/// A device on which a protected migration was killed when it had replaced the settings file.
+/// A device on which a migration that keeps the files was killed when it had replaced the settings
+/// file.
 Scenario killedMigration(std::string name, Scenario scenario) {
   scenario.name = std::move(name);
-  scenario.host = Scenario::Host::SafetyNet;
+  scenario.keep = KeepFiles::Always;
   const Run run =
       runOn(scenario.disk, scenario, {.recording = SimulatedKernel::Recording::On, .number = 0});
   const std::optional<std::string> before = scenario.disk.contentsOf(kSettingsPath);
@@ -238,6 +243,32 @@ Scenario killedMigration(std::string name, Scenario scenario) {
       break;
     }
   }
+  return scenario;
+}
+
+/// A device on which one has come to its end.
+Scenario keptMigration(std::string name, Scenario scenario) {
+  scenario.name = std::move(name);
+  scenario.keep = KeepFiles::Always;
+  scenario.disk = runOn(scenario.disk, scenario, {.number = 0}).disk;
+  return scenario;
+}
+
+/// Puts back what a migration kept.
+Scenario restorationOf(Scenario scenario) {
+  scenario.action = Scenario::Action::Restoration;
+  return scenario;
+}
+
+Scenario keeping(std::string name, Scenario scenario) {
+  scenario.name = std::move(name);
+  scenario.keep = KeepFiles::Always;
+  return scenario;
+}
+
+Scenario on(const FileSystemAbilities& abilities, std::string name, Scenario scenario) {
+  scenario.name = std::move(name);
+  scenario.abilities = abilities;
   return scenario;
 }
 
@@ -251,16 +282,24 @@ std::vector<Scenario> allScenarios(Scenario::Host host) {
                             .doing(Scenario::Action::SaveOutsideMigration));
     return scenarios;
   }
-  for (Scenario& scenario : scenarios) {
-    scenario.host = host;
-  }
   const Scenario both = ScenarioBuilder("")
                             .with(kLegacyMailPath, legacyMail())
                             .with(kLegacyExchangePath, legacyExchange())
-                            .with(kSettingsPath, settings(9));
+                            .with(kSettingsPath, settings(9))
+                            .onTransaction();
+  constexpr FileSystemAbilities kNoExchange = {.exchangesNames = false};
+  constexpr FileSystemAbilities kPlain = {
+      .exchangesNames = false, .sparesNames = false, .hasFlags = false};
+  scenarios.push_back(keeping("keeping", both));
   scenarios.push_back(killedMigration("after-a-kill", both));
-  scenarios.push_back(killedMigration("restoration", both));
-  scenarios.back().action = Scenario::Action::Restoration;
+  scenarios.push_back(on(kNoExchange, "without-exchange", both));
+  scenarios.push_back(on(kPlain, "plain-renames", both));
+  scenarios.push_back(on(kPlain, "keeping-with-plain-renames", keeping("", both)));
+  scenarios.push_back(restorationOf(keptMigration("restoration", both)));
+  scenarios.push_back(restorationOf(killedMigration("restoration-after-a-kill", both)));
+  for (Scenario& scenario : scenarios) {
+    scenario.host = host;
+  }
   return scenarios;
 }
 

@@ -4,21 +4,13 @@
 #include <functional>
 #include <utility>
 
+#include "platform/linux/DevicePath.h"
+
 namespace accounts {
 
 namespace {
 
 using Kind = DiskChange::Kind;
-
-struct SplitPath {
-  std::string_view directory;
-  std::string_view name;
-};
-
-SplitPath split(std::string_view path) {
-  const std::size_t separator = path.rfind('/');
-  return {separator == 0 ? "/" : path.substr(0, separator), path.substr(separator + 1)};
-}
 
 void addFilesBeneath(const SimulatedDisk& disk, std::size_t directory, const std::string& path,
                      std::vector<std::string>& files) {
@@ -54,6 +46,11 @@ void addTree(Fingerprint& fingerprint, const SimulatedDisk& disk, std::size_t nu
   fingerprint.add(inode.owner);
   fingerprint.add(inode.group);
   fingerprint.add(inode.contents);
+  // A directory's own time is nobody's business, and neither is when an inode changed otherwise.
+  if (!inode.isDirectory) {
+    fingerprint.add(inode.number);
+    fingerprint.add(inode.modified);
+  }
   fingerprint.add(inode.entries.size());
   for (const auto& [name, entry] : inode.entries) {
     fingerprint.add(name);
@@ -63,32 +60,83 @@ void addTree(Fingerprint& fingerprint, const SimulatedDisk& disk, std::size_t nu
 
 }  // namespace
 
-SimulatedDisk::SimulatedDisk() : inodes_{{.isDirectory = true, .permissions = 0755}} {}
+SimulatedDisk::SimulatedDisk() {
+  add({.isDirectory = true, .permissions = 0755, .links = 1});
+}
+
+std::size_t SimulatedDisk::add(SimulatedInode inode) {
+  inode.modified = inode.changed = ++clock_;
+  inode.number = freeNumber({});
+  inodes_.push_back(std::move(inode));
+  return inodes_.size() - 1;
+}
+
+std::uint64_t SimulatedDisk::freeNumber(const std::set<std::size_t>& inUse) const {
+  std::set<std::uint64_t> taken;
+  for (std::size_t index = 0; index < inodes_.size(); ++index) {
+    if (inodes_[index].links != 0 || inUse.contains(index)) {
+      taken.insert(inodes_[index].number);
+    }
+  }
+  std::uint64_t number = 1;
+  while (taken.contains(number)) {
+    ++number;
+  }
+  return number;
+}
+
+bool SimulatedDisk::hasDistinctNumbers() const {
+  std::set<std::uint64_t> seen;
+  return std::ranges::all_of(inodes_, [&](const SimulatedInode& inode) {
+    return inode.links == 0 || seen.insert(inode.number).second;
+  });
+}
 
 void SimulatedDisk::addDirectory(std::string_view path) {
   if (exists(path)) {
     return;
   }
-  const auto [parent, name] = split(path);
+  const auto [parent, name] = splitPath(path);
   addDirectory(parent);
-  const std::size_t number = nextInode();
-  inodes_.push_back({.isDirectory = true, .permissions = 0755});
-  inodes_[*find(parent)].entries.emplace(name, number);
+  const std::size_t number = add({.isDirectory = true, .permissions = 0755});
+  give(*find(parent), std::string(name), number, clock_);
 }
 
 void SimulatedDisk::addFile(std::string_view path, std::string contents) {
-  const auto [parent, name] = split(path);
+  const auto [parent, name] = splitPath(path);
   addDirectory(parent);
-  const std::size_t number = nextInode();
-  inodes_.push_back({.contents = std::move(contents)});
-  inodes_[*find(parent)].entries.insert_or_assign(std::string(name), number);
+  const std::size_t number = add({.contents = std::move(contents)});
+  give(*find(parent), std::string(name), number, clock_);
 }
 
 void SimulatedDisk::removeFile(std::string_view path) {
-  const auto [parent, name] = split(path);
+  const auto [parent, name] = splitPath(path);
   if (const std::optional<std::size_t> directory = find(parent)) {
-    inodes_[*directory].entries.erase(std::string(name));
+    take(*directory, std::string(name), ++clock_);
   }
+}
+
+void SimulatedDisk::give(std::size_t directory, const std::string& name, std::size_t number,
+                         std::uint64_t time) {
+  take(directory, name, time);
+  inodes_[directory].entries.emplace(name, number);
+  SimulatedInode& inode = inodes_[number];
+  inode.changed = std::max(inode.changed, time);
+  ++inode.links;
+}
+
+void SimulatedDisk::take(std::size_t directory, const std::string& name, std::uint64_t time) {
+  SimulatedInode& parent = inodes_[directory];
+  parent.modified = std::max(parent.modified, time);
+  parent.changed = std::max(parent.changed, time);
+  const auto entry = parent.entries.find(name);
+  if (entry == parent.entries.end()) {
+    return;
+  }
+  SimulatedInode& inode = inodes_[entry->second];
+  inode.changed = std::max(inode.changed, time);
+  --inode.links;
+  parent.entries.erase(entry);
 }
 
 std::optional<std::size_t> SimulatedDisk::find(std::string_view path) const {
@@ -119,46 +167,80 @@ std::vector<std::string> SimulatedDisk::filesBeneath(std::string_view directory)
   return files;
 }
 
+void SimulatedDisk::make(DiskChange& change, const std::set<std::size_t>& inUse) {
+  change.time = clock_ + 1;
+  if (change.kind == Kind::Allocate) {
+    change.inodeNumber = freeNumber(inUse);
+  }
+  if (change.kind == Kind::SetModified && change.modified == 0) {
+    change.modified = change.time;
+  }
+  apply(change);
+}
+
 void SimulatedDisk::apply(const DiskChange& change) {
+  clock_ = std::max(clock_, change.time);
   switch (change.kind) {
     case Kind::Allocate:
-      inodes_.push_back(
-          {.isDirectory = change.isDirectory, .permissions = static_cast<unsigned>(change.number)});
-      break;
+      inodes_.push_back({.isDirectory = change.isDirectory,
+                         .permissions = static_cast<unsigned>(change.number),
+                         .modified = change.time,
+                         .changed = change.time,
+                         .number = change.inodeNumber});
+      return;
     case Kind::Link:
-      inodes_[change.directory].entries.insert_or_assign(change.name, change.inode);
-      break;
+      give(change.directory, change.name, change.inode, change.time);
+      return;
     case Kind::Unlink:
-      inodes_[change.directory].entries.erase(change.name);
-      break;
+      take(change.directory, change.name, change.time);
+      return;
     case Kind::Rename: {
       // A name that was used again meanwhile is not this file's any more.
-      auto& entries = inodes_[change.directory].entries;
+      const auto& entries = inodes_[change.directory].entries;
       const auto old = entries.find(change.name);
       if (old != entries.end() && old->second == change.inode) {
-        entries.erase(old);
+        take(change.directory, change.name, change.time);
       }
-      inodes_[change.newDirectory].entries.insert_or_assign(change.newName, change.inode);
-      break;
+      give(change.newDirectory, change.newName, change.inode, change.time);
+      return;
     }
-    case Kind::Write: {
-      std::string& contents = inodes_[change.inode].contents;
-      contents.resize(std::max(contents.size(), change.number + change.bytes.size()));
-      contents.replace(change.number, change.bytes.size(), change.bytes);
-      break;
-    }
-    case Kind::Truncate:
-      inodes_[change.inode].contents.resize(change.number);
-      break;
-    case Kind::SetPermissions:
-      inodes_[change.inode].permissions = static_cast<unsigned>(change.number);
-      break;
-    case Kind::SetOwner:
-      inodes_[change.inode].owner = static_cast<unsigned>(change.number);
-      inodes_[change.inode].group = change.group;
-      break;
+    case Kind::Exchange:
+      give(change.directory, change.name, change.otherInode, change.time);
+      give(change.newDirectory, change.newName, change.inode, change.time);
+      return;
     case Kind::Synchronize:
-      break;
+      return;
+    default:
+      applyToInode(change);
+  }
+}
+
+void SimulatedDisk::applyToInode(const DiskChange& change) {
+  SimulatedInode& inode = inodes_[change.inode];
+  inode.changed = std::max(inode.changed, change.time);
+  if (change.isOfContents()) {
+    inode.modified = change.time;
+  }
+  switch (change.kind) {
+    case Kind::Write:
+      inode.contents.resize(std::max(inode.contents.size(), change.number + change.bytes.size()));
+      inode.contents.replace(change.number, change.bytes.size(), change.bytes);
+      return;
+    case Kind::Truncate:
+      inode.contents.resize(change.number);
+      return;
+    case Kind::SetPermissions:
+      inode.permissions = static_cast<unsigned>(change.number);
+      return;
+    case Kind::SetOwner:
+      inode.owner = static_cast<unsigned>(change.number);
+      inode.group = change.group;
+      return;
+    case Kind::SetModified:
+      inode.modified = change.modified;
+      return;
+    default:
+      return;
   }
 }
 

@@ -5,30 +5,45 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <ctime>
+#include <functional>
+#include <limits>
 #include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
 
+#include "tests/campaign/OtherProgram.h"
 #include "tests/campaign/SimulatedDisk.h"
 
 namespace accounts {
 
 /// What goes wrong in a run.
 struct Fault {
-  enum class Duration : std::uint8_t {
-    Once,
-    FromThenOn,
-    /// From then on, but only in the plug-in: as if its process had been killed there, while the
-    /// host lives on.
-    UntilThePluginEnds
-  };
+  enum class Duration : std::uint8_t { Once, FromThenOn };
   /// The number of the system call that fails, counted from 0.
   std::size_t operation = 0;
   /// The error number; 0 stands for a short write: half of the bytes are written, and the next
   /// write finds the disk full.
   int error = 0;
   Duration duration = Duration::Once;
+};
+
+/// What a file system can do beyond what every one can.
+struct FileSystemAbilities {
+  bool exchangesNames = true;
+  /// Whether it renames without replacing anything, when it is asked to.
+  bool sparesNames = true;
+  /// Whether it says what is immutable.
+  bool hasFlags = true;
+};
+
+/// What another program does while a process runs.
+struct Intrusion {
+  /// It acts just before the numbered call, and before so many calls altogether, one after another.
+  std::size_t operation = 0;
+  std::size_t count = 1;
+  std::function<void(OtherProgram&)> act;
 };
 
 /// The system calls of the Linux platform over a simulated disk. While one of these is alive, the
@@ -38,7 +53,8 @@ struct Fault {
 ///
 /// Every call that could fail for want of a working disk is numbered. Closing is not, nor are
 /// locking (the platform waits for a lock as long as it takes) and random numbers, which count up.
-/// Reading a directory is one call.
+/// Reading a directory is one call. The process may do what it likes, as root may, but for what is
+/// immutable.
 class SimulatedKernel {
  public:
   /// The directory of the host that the device seems to be in.
@@ -59,9 +75,6 @@ class SimulatedKernel {
   /// and every change from here on for calls() and changes().
   void start(const std::optional<Fault>& fault, Recording recording);
 
-  /// Ends a fault that lasts until the plug-in ends. Whether there was one and it has hit.
-  bool endPlugin();
-
   [[nodiscard]] const SimulatedDisk& disk() const { return disk_; }
   [[nodiscard]] std::size_t operationCount() const { return operationCount_; }
   /// How many descriptors are open.
@@ -77,33 +90,64 @@ class SimulatedKernel {
   /// The paths of the calls that the fault made fail, in order.
   [[nodiscard]] const std::vector<std::string>& refusedPaths() const { return refusedPaths_; }
 
-  int open(std::string_view hostPath);
-  int openBeneath(int directory, std::string_view path, int flags);
+  /// Lets another program act. Its changes are recorded, too.
+  void intrude(Intrusion intrusion) { intrusion_ = std::move(intrusion); }
+
+  /// Another process has the lock of a file or directory. `count` calls that ask for it are in
+  /// vain: those that would wait are interrupted. The last thing that it does with the lock is
+  /// `act`.
+  void lockByAnother(
+      std::string_view path, std::size_t count,
+      std::function<void(OtherProgram&)> act = [](OtherProgram&) {});
+  /// A number of calls after which nobody gives a lock back. A process that asks that often would
+  /// wait for ever: that throws.
+  static constexpr std::size_t kNever = std::numeric_limits<std::size_t>::max();
+
+  void setAbilities(const FileSystemAbilities& abilities) { abilities_ = abilities; }
+
+  // Opening and closing.
+  int open(std::string_view hostPath, int flags);
+  int openBeneath(std::string_view path, int flags);
   int openAt(int directory, std::string_view name, int flags, unsigned permissions);
+  int close(int descriptor);
+
+  // What is open.
   int status(int descriptor, struct stat& status);
-  int statusAt(int directory, std::string_view name, struct stat& status);
   ssize_t read(int descriptor, char* bytes, std::size_t count);
+  ssize_t readAt(int descriptor, char* bytes, std::size_t count, std::size_t offset);
   ssize_t write(int descriptor, std::string_view bytes);
-  int synchronize(int descriptor);
+  ssize_t writeAt(int descriptor, std::string_view bytes, std::size_t offset);
+  int synchronize(std::string_view call, int descriptor);
   int truncate(int descriptor, std::size_t size);
   int setPermissions(int descriptor, unsigned permissions);
   int setOwner(int descriptor, unsigned owner, unsigned group);
-  int rename(int directory, std::string_view name, int newDirectory, std::string_view newName);
-  int unlink(int directory, std::string_view name, int flags);
-  int link(int directory, std::string_view name, int newDirectory, std::string_view newName);
-  /// The names in an open directory, "." and ".." included, through `names`.
+  /// `times` as futimens takes them. The time of the last access is not kept.
+  int setTimes(int descriptor, const timespec* times);
+  /// What FS_IOC_GETFLAGS gives.
+  int flags(int descriptor, int& flags);
   int readNames(int descriptor, std::vector<std::string>& names);
-  /// `operation` as flock takes it. Waiting for a lock would never end here: that is refused.
+  /// `operation` as flock takes it. The process would wait for ever for a lock of its own: that is
+  /// refused.
   int lock(int descriptor, int operation);
-  int setTimes(int descriptor);
+
+  // Names in open directories. `flags` as the calls take them.
+  int statusAt(int directory, std::string_view name, struct stat& status, int flags);
+  int access(int directory, std::string_view name, int mode, int flags);
+  int rename(int directory, std::string_view name, int newDirectory, std::string_view newName,
+             unsigned flags);
+  int unlink(int directory, std::string_view name, int flags);
+  int link(int directory, std::string_view name, int newDirectory, std::string_view newName,
+           int flags);
   int makeDirectory(int directory, std::string_view name, unsigned permissions);
-  void close(int descriptor);
+
   void random(char* bytes, std::size_t count);
 
  private:
   struct OpenFile {
     std::size_t inode = 0;
     std::string path = {};
+    /// As it was opened with.
+    int flags = 0;
     std::size_t offset = 0;
     bool isOpen = true;
     bool isLocked = false;
@@ -112,11 +156,28 @@ class SimulatedKernel {
     return files_[static_cast<std::size_t>(descriptor - kFirstDescriptor)];
   }
   [[nodiscard]] std::string pathIn(int directory, std::string_view name);
-  /// The inode of a name in an open directory; none when there is none.
-  std::optional<std::size_t> entry(int directory, std::string_view name);
-  int addDescriptor(std::size_t inode, std::string path);
+  int addDescriptor(std::size_t inode, std::string path, int flags);
+  int openInode(std::size_t number, const std::string& path, int flags);
+  /// A name in a directory, or the directory itself, and what is there.
+  struct Place {
+    std::size_t directory = 0;
+    std::string name = {};
+    std::optional<std::size_t> inode = {};
+  };
+  Place place(int directory, std::string_view name);
+  /// 0 when a name may be given, taken or replaced, else the negative error number.
+  [[nodiscard]] int mayChange(const Place& place) const;
+  int exchange(const Place& one, const Place& other);
+  ssize_t read(std::string_view call, int descriptor, char* bytes, std::size_t count,
+               std::size_t offset);
+  ssize_t write(std::string_view call, int descriptor, std::string_view bytes, std::size_t offset);
+  [[nodiscard]] struct stat statusOf(std::size_t number) const;
   /// Numbers a call. 0 when it goes on, else the negative error number that it must give.
   int begin(std::string_view call, const std::string& path);
+  /// The same for a call on an open file, which one that was opened for its path alone refuses.
+  int beginOn(std::string_view call, int descriptor);
+  /// The same for a call that changes an open file.
+  int beginToChange(std::string_view call, int descriptor);
   void change(DiskChange change);
   std::size_t allocate(bool isDirectory, unsigned permissions);
 
@@ -131,6 +192,16 @@ class SimulatedKernel {
   std::vector<DiskChange> changes_;
   std::vector<std::string> refusedPaths_;
   std::uint64_t randomNumber_;
+  FileSystemAbilities abilities_;
+  OtherProgram otherProgram_;
+  std::optional<Intrusion> intrusion_;
+  struct OtherLock {
+    std::size_t inode = 0;
+    std::size_t count = 0;
+    std::size_t asked = 0;
+    std::function<void(OtherProgram&)> act;
+  };
+  std::vector<OtherLock> otherLocks_;
 };
 
 }  // namespace accounts

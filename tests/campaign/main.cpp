@@ -44,15 +44,15 @@ int main(int argumentCount, char** arguments) {
   Selection selection;
   application.add_option("campaign", campaign, "faults, kills, power-loss or allocations")
       ->required();
-  bool hasNet = false;
-  application.add_flag("--net", hasNet, "with the host's safety net around the plug-in");
+  bool isBare = false;
+  application.add_flag("--bare", isBare, "the plug-in alone on the device");
   application.add_option("--scenario", selection.scenario, "only this scenario");
   application.add_option("--operation", selection.operation, "only this operation");
   application.add_option("--fault", selection.fault, "only this fault");
   application.add_option("--every", selection.every, "only every n-th case")
       ->check(CLI::PositiveNumber);
   CLI11_PARSE(application, argumentCount, arguments);
-  selection.host = hasNet ? Scenario::Host::SafetyNet : Scenario::Host::Bare;
+  selection.host = isBare ? Scenario::Host::Bare : Scenario::Host::Transaction;
   try {
     return runSelected(campaign, selection);
   } catch (const std::exception& exception) {

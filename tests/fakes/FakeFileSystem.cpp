@@ -220,4 +220,26 @@ Result FakeFileSystem::renameFile(std::string_view source, std::string_view dest
   });
 }
 
+EntryKind FakeFileSystem::kindOf(std::string_view path) const {
+  if (otherEntries.contains(path)) {
+    return EntryKind::Other;
+  }
+  if (directories.contains(path)) {
+    return EntryKind::Directory;
+  }
+  return files.contains(path) ? EntryKind::RegularFile : EntryKind::Nothing;
+}
+
+void FakeFileSystem::removeAbandonedTemporaryFiles(
+    const std::vector<std::string>& /*furtherDirectories*/) {
+  (void)perform("removeAbandonedTemporaryFiles", [&] {
+    for (const std::string& path : temporaryFiles()) {
+      if (!ownTemporaryFiles_.contains(path)) {
+        files.erase(path);
+      }
+    }
+    return Result::success();
+  });
+}
+
 }  // namespace accounts

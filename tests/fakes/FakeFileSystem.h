@@ -9,6 +9,7 @@
 #include <string_view>
 #include <vector>
 
+#include "platform/FileIdentity.h"
 #include "platform/FileSystem.h"
 
 namespace accounts {
@@ -68,17 +69,10 @@ class FakeFileSystem : public FileSystem {
 
   bool fileExists(std::string_view path) override;
   bool isDirectory(std::string_view path) override;
-  std::optional<EntryKind> kindOfEntry(std::string_view path) override;
-  std::optional<std::vector<std::string>> directoryEntries(std::string_view path) override;
-  bool haveSameContents(std::string_view first, std::string_view second) override;
   Result copyFile(std::string_view source, std::string_view destination) override;
-  Result linkFile(std::string_view source, std::string_view destination) override;
   Result removeFile(std::string_view path) override;
   Result createFile(std::string_view path, std::string_view contents) override;
   Result createDirectoryWithIntermediates(std::string_view path, unsigned permissions) override;
-  Result removeDirectory(std::string_view path) override;
-  Result renameDirectory(std::string_view source, std::string_view destination) override;
-  Result synchronizeDirectory(std::string_view path) override;
   std::optional<std::string> makeTemporaryFile() override;
   /// A temporary file is abandoned unless the running process, which ends when the world stops,
   /// made it.
@@ -95,7 +89,6 @@ class FakeFileSystem : public FileSystem {
   Result perform(const std::string& line, const std::function<Result()>& operation);
   [[nodiscard]] bool parentExists(std::string_view path) const;
   [[nodiscard]] EntryKind kindOf(std::string_view path) const;
-  [[nodiscard]] std::vector<std::string> namesIn(std::string_view path) const;
   [[noreturn]] void stopWorld();
   Result put(std::string_view path, std::string_view contents);
 

@@ -20,7 +20,7 @@ namespace fs = std::filesystem;
 constexpr int kImages = 50;
 // Some of the images.
 constexpr int kMissing = 7;
-constexpr int kWithPipe = 11;
+constexpr int kWithOnePlaceForTwo = 11;
 constexpr int kWithBrokenDescription = 23;
 constexpr int kBusy = 31;
 
@@ -71,14 +71,16 @@ class Parallel : public FleetFixture {
 TEST_F(Parallel, EachImageIsMigratedOnceAndTheBrokenOnesAreReported) {
   (void)makeImages(kImages);
   fs::remove_all(image(kMissing));
-  fs::remove(image(kWithPipe) / fs::path(kSettingsPath).relative_path());
-  mkfifo((image(kWithPipe) / fs::path(kSettingsPath).relative_path()).c_str(), 0600);
+  fs::remove_all(image(kWithOnePlaceForTwo) / "var/mobile/Library/Logs/CrashReporter");
+  fs::create_directories(image(kWithOnePlaceForTwo) / "var/mobile/Library/Logs");
+  fs::create_directory_symlink(
+      "../Preferences", image(kWithOnePlaceForTwo) / "var/mobile/Library/Logs/CrashReporter");
   std::ofstream(image(kWithBrokenDescription) / "etc/device.plist") << "broken";
 
   const ProgramResult first = migrateFleet();
 
   EXPECT_EQ(first.exitStatus, 1) << first.output << first.errors;
-  expectMigratedBut({kMissing, kWithPipe, kWithBrokenDescription});
+  expectMigratedBut({kMissing, kWithOnePlaceForTwo, kWithBrokenDescription});
   const nlohmann::json counted = summary();
   EXPECT_EQ(counted["images"], kImages);
   EXPECT_EQ(counted["unreadableLines"], 0);
@@ -90,8 +92,8 @@ TEST_F(Parallel, EachImageIsMigratedOnceAndTheBrokenOnesAreReported) {
 
   EXPECT_NE(first.output.find("\nImages that need a person:\n"), std::string::npos);
   for (const auto& [number, reason] :
-       {std::pair(kMissing, "Cannot open the device root"),
-        {kWithPipe, "The files cannot be kept"},
+       {std::pair<int, std::string>(kMissing, "Cannot open the device root"),
+        {kWithOnePlaceForTwo, kSettingsPath + std::string(" and ")},
         {kWithBrokenDescription, "Cannot read the property list /etc/device.plist"}}) {
     EXPECT_NE(first.output.find("\n" + image(number).string() + "\t" + reason), std::string::npos)
         << first.output;

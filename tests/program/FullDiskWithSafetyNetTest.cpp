@@ -4,6 +4,7 @@
 #include <string>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/ExitStatuses.h"
 #include "tests/program/SmallDisk.h"
 
 namespace accounts {
@@ -38,7 +39,7 @@ TEST_F(FullDiskWithSafetyNet, LosesNoLegacyStore) {
 
   const ProgramResult result = migrate();
 
-  EXPECT_EQ(result.exitStatus, 2) << result.errors;
+  EXPECT_EQ(result.exitStatus, kMayPass) << result.errors;
   EXPECT_EQ(readText(kSettingsPath), settingsBefore);
   EXPECT_EQ(readText(kLegacyMailPath), legacyBefore);
   EXPECT_FALSE(exists(kSentinelPath));
@@ -46,7 +47,7 @@ TEST_F(FullDiskWithSafetyNet, LosesNoLegacyStore) {
 }
 
 TEST_F(FullDiskWithSafetyNet, IsMigratedOnceThereIsRoomAgain) {
-  ASSERT_EQ(migrate().exitStatus, 2);
+  ASSERT_EQ(migrate().exitStatus, kMayPass);
   makeRoom();
 
   EXPECT_EQ(migrate().exitStatus, 0);

@@ -120,18 +120,25 @@ TEST_F(HostReport, AnotherHomeDirectoryIsMigratedOnRequest) {
   EXPECT_FALSE(exists("/home/ada/Library/Mail/Accounts.plist"));
 }
 
-TEST_F(HostReport, TheTemporaryDirectoryOfTheHomeIsMadeForItsOwnerAlone) {
-  migrate();
+TEST_F(HostReport, TheTemporaryDirectoryOfABareRunIsMadeForItsOwnerAlone) {
+  migrate({"--bare"});
 
   ASSERT_TRUE(exists("/var/mobile/tmp"));
   EXPECT_EQ(std::filesystem::status(onThisMachine("/var/mobile/tmp")).permissions(),
             std::filesystem::perms::owner_all);
 }
 
+TEST_F(HostReport, ARunNeedsNoTemporaryDirectory) {
+  migrate();
+
+  EXPECT_TRUE(exists(kSettingsPath));
+  EXPECT_FALSE(exists("/var/mobile/tmp"));
+}
+
 TEST_F(HostReport, AnotherTemporaryDirectoryIsUsedOnRequest) {
   std::filesystem::create_directory(onThisMachine("/var/scratch"));
 
-  EXPECT_EQ(migrate({"--temporary-directory", "/var/scratch"}).exitStatus, 0);
+  EXPECT_EQ(migrate({"--bare", "--temporary-directory", "/var/scratch"}).exitStatus, 0);
 
   EXPECT_TRUE(exists(kSettingsPath));
   EXPECT_FALSE(exists("/var/mobile/tmp"));

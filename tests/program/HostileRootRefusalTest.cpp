@@ -39,7 +39,7 @@ constexpr Refusal kFileRefusals[] = {
      "migration-host: Cannot read /etc/device.plist: File too large\n"},
     {"AnUnreadableFile", kDevicePropertyListPath,
      "migration-host: Cannot open /etc/device.plist: Permission denied\n"},
-    {"ASocket", kLockPath, "migration-host: The plug-in reported that it failed\n"},
+    {"ASocket", kLockPath, "migration-host: The plug-in reported that it failed"},
     {"ADirectory", kSettingsPath, "\"Failed to save accounts to filesystem.\"\n"},
     {"AnImmutableFile", kSettingsPath, "\"Failed to save accounts to filesystem.\"\n"},
     {"ANamedPipe", kSettingsPath,
@@ -72,7 +72,7 @@ constexpr Refusal kFileRefusals[] = {
 constexpr Refusal kDirectoryRefusals[] = {
     {"ALinkToItself", "/etc",
      "migration-host: Cannot open /etc/device.plist: Too many levels of symbolic links\n"},
-    {"AnAbsoluteLinkOut", "/tmp", "migration-host: The plug-in reported that it failed\n"},
+    {"AnAbsoluteLinkOut", "/tmp", "migration-host: The plug-in reported that it failed"},
     {"AFile", "/var/mobile/tmp", "\"Failed to save accounts to filesystem.\"\n"},
     {"AnAbsoluteLinkOut", "/var/mobile/tmp", "\"Failed to save accounts to filesystem.\"\n"},
     {"AFile", kInformationDirectory,

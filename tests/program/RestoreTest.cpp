@@ -35,9 +35,13 @@ TEST_F(Restore, PutsTheFilesBackAndKeepsWhatTheyReplace) {
   EXPECT_EQ(readText(kSettingsPath), "refused");
   ASSERT_EQ(hostFolders().size(), 1u);
   const std::string replaced = hostFolders()[0];
-  EXPECT_EQ(readText(replaced + "/com.quarx.accountsettings.plist"), migrated);
-  EXPECT_EQ(result.output, "Put back " + std::string(kSettingsPath) +
-                               "\nWhat was there is kept in " + replaced + "\n");
+  EXPECT_EQ(readText(replaced + "/Settings"), migrated);
+  EXPECT_FALSE(exists(kSettingsCopyPath));
+  EXPECT_EQ(readText(replaced + "/CopyAside"), "refused");
+  EXPECT_EQ(result.output, "Put back " + std::string(kSettingsPath) + "\nRemoved " +
+                               std::string(kSettingsCopyPath) +
+                               ", where nothing was before\nWhat was there is kept in " + replaced +
+                               "\n");
   EXPECT_EQ(result.errors, "");
 }
 
@@ -47,6 +51,7 @@ TEST_F(Restore, TellsInJSONWhatItDid) {
   const nlohmann::json expected = {{"root", root()},
                                    {"from", folder},
                                    {"restored", {kSettingsPath}},
+                                   {"removed", {kSettingsCopyPath}},
                                    {"replaced", hostFolders().at(0)},
                                    {"exitStatus", 0}};
   EXPECT_EQ(onlyObject(result), expected);
@@ -102,14 +107,27 @@ TEST_F(Restore, ReportsAnErrorInJSONAsWell) {
   EXPECT_EQ(object["error"], "No folder of kept files: Kept-missing");
 }
 
-TEST_F(Restore, DoesNotReplaceWhatIsNoRegularFile) {
+TEST_F(Restore, KeepsALinkThatItReplacesAndLeavesWhatItLeadsTo) {
   std::filesystem::remove(onThisMachine(kSettingsPath));
   std::filesystem::create_symlink("/etc/passwd", onThisMachine(kSettingsPath));
+  const std::string passwords = readText("/etc/passwd");
+
+  const ProgramResult result = restore();
+
+  EXPECT_EQ(result.exitStatus, 0) << result.errors;
+  EXPECT_EQ(readText(kSettingsPath), "refused");
+  EXPECT_TRUE(std::filesystem::is_symlink(onThisMachine(hostFolders().at(0) + "/Settings")));
+  EXPECT_EQ(readText("/etc/passwd"), passwords);
+}
+
+TEST_F(Restore, DoesNotReplaceADirectory) {
+  std::filesystem::remove(onThisMachine(kSettingsPath));
+  std::filesystem::create_directory(onThisMachine(kSettingsPath));
 
   const ProgramResult result = restore();
 
   EXPECT_EQ(result.exitStatus, 73);
-  EXPECT_TRUE(std::filesystem::is_symlink(onThisMachine(kSettingsPath)));
+  EXPECT_TRUE(std::filesystem::is_directory(onThisMachine(kSettingsPath)));
   EXPECT_TRUE(exists(folder));
 }
 
@@ -123,15 +141,18 @@ TEST_F(Restore, WithNothingKeptSaysSo) {
             "migration-host: No files are kept in /var/mobile/Library/AccountMigration\n");
 }
 
-TEST_F(Restore, AfterAKilledRunBringsTheAccountsToTheNextMigration) {
+TEST_F(Restore, EndsWhatWouldTakeTheStoresForConvertedOnes) {
   ASSERT_EQ(restore().exitStatus, 0);
   std::filesystem::remove_all(onThisMachine(kAccountMigration));
+  std::filesystem::remove(onThisMachine(kSettingsPath));
   write(kSettingsPath, accountSettings(12));
   write(kLegacyMailPath, legacyMail());
+  ASSERT_EQ(migrate({"--keep"}).exitStatus, 0);
   writeText(kSentinelPath, "Old Account Information Removal Sentinel");
-  ASSERT_EQ(migrateMisbehaving("lose mail and kill the host").exitStatus, -9);
 
   EXPECT_EQ(restore().exitStatus, 0);
+  EXPECT_FALSE(exists(kSentinelPath));
+  EXPECT_EQ(accountIdentifiers(), std::vector<std::string>{});
 
   EXPECT_EQ(migrate().exitStatus, 0);
   EXPECT_EQ(accountIdentifiers(), std::vector<std::string>{"M"});

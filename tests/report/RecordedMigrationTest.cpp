@@ -155,6 +155,19 @@ TEST_F(RecordedDevice, AFailureIsRecordedWithItsReason) {
   EXPECT_TRUE(files[0].contains("error"));
 }
 
+TEST_F(RecordedDevice, AFailureWithATemporaryFileDoesNotSayItsName) {
+  const JSON files = filesOf([](FileSystem& fileSystem) {
+    const std::optional<std::string> temporary = fileSystem.makeTemporaryFile();
+    ASSERT_TRUE(temporary);
+    EXPECT_FALSE(fileSystem.setOwnerAndGroup(*temporary, "nobody", "nobody"));
+  });
+
+  ASSERT_EQ(files.size(), 1U);
+  EXPECT_EQ(files[0]["action"], "given away");
+  EXPECT_EQ(files[0]["path"], "temporary file");
+  EXPECT_TRUE(files[0].contains("error"));
+}
+
 TEST_F(RecordedDevice, ThatNothingWasThereToRemoveIsNoNews) {
   EXPECT_TRUE(filesOf([](FileSystem& fileSystem) {
                 EXPECT_FALSE(fileSystem.removeFile("/var/none"));

@@ -1,0 +1,28 @@
+#include "host/KernelOwnershipRule.h"
+
+#include <unistd.h>
+
+#include <cerrno>
+#include <string>
+
+#include "platform/linux/PlaceFailures.h"
+
+namespace accounts {
+
+std::variant<FileOwner, PlaceFailure> KernelOwnershipRule::ownerNamed(std::string_view ownerName,
+                                                                      std::string_view groupName) {
+  PathError error;
+  const auto user = names_.userIdentifier(std::string(ownerName), error);
+  const auto group = user ? names_.groupIdentifier(std::string(groupName), error) : std::nullopt;
+  if (!group) {
+    return placeFailure(error);
+  }
+  const bool isAllowed = ::geteuid() == 0 || (*user == ::geteuid() && *group == ::getegid());
+  if (!isAllowed) {
+    return PlaceFailure{
+        EPERM, "A file cannot be given to " + std::string(ownerName) + ": Operation not permitted"};
+  }
+  return FileOwner{*user, *group};
+}
+
+}  // namespace accounts

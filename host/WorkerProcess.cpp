@@ -1,0 +1,189 @@
+#include "host/WorkerProcess.h"
+
+#include <fcntl.h>
+#include <poll.h>
+#include <sys/mman.h>
+#include <sys/prctl.h>
+#include <sys/socket.h>
+#include <sys/stat.h>
+#include <sys/syscall.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <array>
+#include <cerrno>
+#include <csignal>
+#include <cstdlib>
+#include <cstring>
+#include <utility>
+
+#include "platform/linux/OpenedBytes.h"
+
+namespace accounts {
+namespace {
+
+// A migration takes far less; one that takes longer waits for something.
+constexpr auto kGrace = std::chrono::seconds(5);
+
+/// The system lacks what a process needs; at another time it may have it.
+ProgramError temporaryFailure(const std::string& message) {
+  return ProgramError{ExitStatus::TemporaryFailure, message + ": " + std::strerror(errno)};
+}
+
+// noexcept: an exception of the plug-in ends the worker as an abort, not the host's own main().
+[[noreturn]] void runChild(const WorkerFunction& function, const WorkerSide& side, pid_t parent,
+                           const DeviceSnapshot& snapshot, const WorkerTask& task) noexcept {
+  // A migration never goes on unseen: a host that is killed takes its worker along. The parent may
+  // have ended before the request was made.
+  prctl(PR_SET_PDEATHSIG, SIGKILL);
+  if (getppid() != parent) {
+    _exit(EXIT_FAILURE);
+  }
+  dup2(STDERR_FILENO, STDOUT_FILENO);
+  function(side, snapshot, task);
+  std::exit(EXIT_SUCCESS);
+}
+
+std::string describe(int status) {
+  if (WIFSIGNALED(status)) {
+    const int signalNumber = WTERMSIG(status);
+    return "ended by signal " + std::to_string(signalNumber) + " (" + strsignal(signalNumber) + ")";
+  }
+  return "ended the process with exit status " + std::to_string(WEXITSTATUS(status));
+}
+
+}  // namespace
+
+WorkerProcess::~WorkerProcess() {
+  end();
+}
+
+void WorkerProcess::end() {
+  // Without the other end it has nothing left to do; one that is done flushes what it printed.
+  socket_.reset();
+  if (child_ > 0) {
+    if (!isDone_ || !stop_.waitForEndOf(*process_, kGrace)) {
+      kill(child_, SIGKILL);
+    }
+    int status = 0;
+    while (waitpid(child_, &status, 0) < 0 && errno == EINTR) {
+    }
+    child_ = -1;
+  }
+}
+
+std::optional<ProgramError> WorkerProcess::start(const DeviceSnapshot& snapshot,
+                                                 const WorkerTask& task) {
+  const int memory = memfd_create("migration", MFD_CLOEXEC | MFD_ALLOW_SEALING);
+  if (memory < 0) {
+    return temporaryFailure("No memory for the migration's result");
+  }
+  memoryFile_.emplace(memory);
+  std::array<int, 2> ends{};
+  if (socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, ends.data()) != 0) {
+    return temporaryFailure("No connection to the plug-in's process");
+  }
+  socket_.emplace(ends[0]);
+  const FileDescriptor theirs(ends[1]);
+  const pid_t parent = getpid();
+  child_ = fork();
+  if (child_ == 0) {
+    socket_.reset();
+    runChild(function_, {theirs, *memoryFile_}, parent, snapshot, task);
+  }
+  if (child_ < 0) {
+    return temporaryFailure("No process for the plug-in");
+  }
+  const int process = static_cast<int>(syscall(SYS_pidfd_open, child_, 0));
+  if (process < 0) {
+    return temporaryFailure("The plug-in's process cannot be watched");
+  }
+  process_.emplace(process);
+  return std::nullopt;
+}
+
+std::optional<ProgramError> WorkerProcess::waitForIt() {
+  // Both: a process that the plug-in left behind may hold the socket open.
+  if (stop_.waitForEither(*process_, *socket_)) {
+    return std::nullopt;
+  }
+  const bool endedByItself =
+      grace_ == StopGrace::ForAPluginOnTheDevice && stop_.waitForEndOf(*process_, kGrace);
+  if (endedByItself) {
+    return std::nullopt;
+  }
+  end();
+  return ProgramError{ExitStatus::TemporaryFailure,
+                      std::string(kStopped) + " before the plug-in was done"};
+}
+
+ProgramError WorkerProcess::describeEnd() {
+  int status = 0;
+  while (waitpid(child_, &status, 0) < 0 && errno == EINTR) {
+  }
+  child_ = -1;
+  return ProgramError{ExitStatus::PluginEnded, "The plug-in " + describe(status)};
+}
+
+std::variant<HandedOver, ProgramError> WorkerProcess::work(const DeviceSnapshot& snapshot,
+                                                           const WorkerTask& task) {
+  if (auto error = start(snapshot, task)) {
+    return *std::move(error);
+  }
+  for (;;) {
+    if (auto error = waitForIt()) {
+      return *std::move(error);
+    }
+    pollfd readable = {socket_->number(), POLLIN, 0};
+    std::optional<Frame> frame = poll(&readable, 1, 0) > 0 && (readable.revents & POLLIN) != 0
+                                     ? receiveFrame(*socket_)
+                                     : std::nullopt;
+    if (!frame) {
+      return describeEnd();
+    }
+    switch (frame->kind) {
+      case FrameKind::Announcements:
+        announcements_ = std::move(frame->bytes);
+        break;
+      case FrameKind::Fault:
+        return ProgramError{ExitStatus::PluginEnded, std::move(frame->bytes)};
+      case FrameKind::Proposal: {
+        // From here on nobody changes what the list speaks of.
+        struct stat status = {};
+        const int seals = F_SEAL_SHRINK | F_SEAL_GROW | F_SEAL_WRITE | F_SEAL_SEAL;
+        if (fcntl(memoryFile_->number(), F_ADD_SEALS, seals) != 0 ||
+            fstat(memoryFile_->number(), &status) != 0) {
+          return temporaryFailure("The migration's result cannot be sealed");
+        }
+        return HandedOver{std::move(frame->bytes), static_cast<std::uint64_t>(status.st_size)};
+      }
+      default:
+        return ProgramError{ExitStatus::PluginEnded, "The plug-in's process sent something else"};
+    }
+  }
+}
+
+std::unique_ptr<ReadableBytes> WorkerProcess::contentsOf(const ProposedChange& change) {
+  return std::make_unique<PartOfOpenedBytes>(*memoryFile_, change.offset, change.length,
+                                             "the migration's result");
+}
+
+std::optional<std::vector<std::string>> WorkerProcess::ask(FrameKind kind, std::string_view bytes,
+                                                           const std::vector<FrameKind>& answers) {
+  if (child_ <= 0 || !socket_ || !sendFrame(*socket_, kind, bytes)) {
+    return std::nullopt;
+  }
+  std::vector<std::string> received;
+  for (const FrameKind expected : answers) {
+    // A stop signal counts no more: the run is over, and only what is said of it is missing.
+    std::optional<Frame> frame = receiveFrame(*socket_);
+    if (!frame || frame->kind != expected) {
+      return std::nullopt;
+    }
+    isDone_ = expected == FrameKind::Result;
+    received.push_back(std::move(frame->bytes));
+  }
+  return received;
+}
+
+}  // namespace accounts

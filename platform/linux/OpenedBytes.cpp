@@ -1,0 +1,46 @@
+#include "platform/linux/OpenedBytes.h"
+
+#include <unistd.h>
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+
+#include "platform/linux/FileContents.h"
+#include "platform/linux/PlaceFailures.h"
+
+namespace accounts {
+namespace {
+
+constexpr std::size_t kBlockSize = std::size_t{128} << 10;
+
+}  // namespace
+
+std::optional<PlaceFailure> OpenedBytes::giveTo(const Taker& take) const {
+  // A file that grows is read as far as no reader would take it.
+  return PartOfOpenedBytes(file_, 0, kLargestFileSize + 1, path_).giveTo(take);
+}
+
+std::optional<PlaceFailure> PartOfOpenedBytes::giveTo(const Taker& take) const {
+  std::string block(static_cast<std::size_t>(std::min<std::uint64_t>(kBlockSize, length_)), '\0');
+  for (std::uint64_t done = 0; done < length_;) {
+    const std::size_t wanted =
+        static_cast<std::size_t>(std::min<std::uint64_t>(block.size(), length_ - done));
+    const ssize_t count =
+        ::pread(file_.number(), block.data(), wanted, static_cast<off_t>(offset_ + done));
+    if (count < 0 && errno == EINTR) {
+      continue;
+    }
+    if (count < 0) {
+      return placeFailure("read", path_, errno);
+    }
+    const auto given = static_cast<std::size_t>(count);
+    if (count == 0 || !take(std::string_view(block.data(), given))) {
+      break;
+    }
+    done += given;
+  }
+  return std::nullopt;
+}
+
+}  // namespace accounts

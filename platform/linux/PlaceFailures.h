@@ -1,0 +1,44 @@
+#pragma once
+
+#include <sys/stat.h>
+
+#include <string_view>
+
+#include "platform/DeviceSnapshot.h"
+#include "platform/linux/PathError.h"
+
+namespace accounts {
+
+/// The failure of a place that an error on its path stands for.
+inline PlaceFailure placeFailure(const PathError& error) {
+  return {error.number, error.text};
+}
+
+/// The failure "Cannot OPERATION PATH: REASON" for a system error number.
+inline PlaceFailure placeFailure(std::string_view operation, std::string_view path, int number) {
+  return placeFailure(pathError(operation, path, number));
+}
+
+inline EntryKind kindOfMode(mode_t mode) {
+  switch (mode & S_IFMT) {
+    case S_IFREG:
+      return EntryKind::RegularFile;
+    case S_IFDIR:
+      return EntryKind::Directory;
+    default:
+      return EntryKind::Other;
+  }
+}
+
+/// What stat gave for an entry, as its identity.
+inline FileIdentity identityOf(const struct stat& status) {
+  return {.kind = kindOfMode(status.st_mode),
+          .device = status.st_dev,
+          .inode = status.st_ino,
+          .size = static_cast<std::uint64_t>(status.st_size),
+          .mode = status.st_mode,
+          .modified = {status.st_mtim.tv_sec, status.st_mtim.tv_nsec},
+          .changed = {status.st_ctim.tv_sec, status.st_ctim.tv_nsec}};
+}
+
+}  // namespace accounts

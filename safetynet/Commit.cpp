@@ -1,0 +1,349 @@
+#include "safetynet/Commit.h"
+
+#include <array>
+#include <utility>
+
+#include "safetynet/PlaceErrors.h"
+
+namespace accounts {
+namespace {
+
+using Action = ProposedChange::Action;
+
+/// What is kept: all that a migration may change or remove, but for the sentinel, with which the
+/// next migration would remove the legacy stores unconverted, and for what only grows.
+constexpr std::array kKeptPlaces = {
+    DevicePlace::Settings,        DevicePlace::LegacyExchange,
+    DevicePlace::LegacyMail,      DevicePlace::LegacyExchangeOriginal,
+    DevicePlace::CopyAside,       DevicePlace::LegacyMailOriginal,
+    DevicePlace::AutoFetchEnabled};
+
+/// The legacy stores, in the order in which they are removed.
+constexpr std::array kRemovedStores = {DevicePlace::LegacyExchange, DevicePlace::LegacyMail};
+
+/// The copies that go with them.
+constexpr std::array kOriginals = {DevicePlace::LegacyExchangeOriginal,
+                                   DevicePlace::LegacyMailOriginal};
+
+/// Text as bytes to read.
+class TextBytes final : public ReadableBytes {
+ public:
+  explicit TextBytes(std::string_view text) : text_(text) {}
+  std::optional<PlaceFailure> giveTo(const Taker& take) const override {
+    static_cast<void>(take(text_));
+    return std::nullopt;
+  }
+
+ private:
+  std::string_view text_;
+};
+
+CommitOutcome failed(ProgramError error) {
+  return {.kind = CommitOutcome::Kind::Failed, .error = std::move(error)};
+}
+
+CommitOutcome disturbed() {
+  return {.kind = CommitOutcome::Kind::Disturbed};
+}
+
+/// What a step that was not done means before anything is changed.
+CommitOutcome refused(std::string_view operation, const PlaceOutcome& outcome) {
+  return outcome.kind == PlaceOutcome::Kind::Disturbed
+             ? disturbed()
+             : failed(writingError(operation, outcome.failure));
+}
+
+std::string reasonOf(const PlaceOutcome& outcome) {
+  return outcome.kind == PlaceOutcome::Kind::Disturbed ? "Another program wrote it meanwhile"
+                                                       : outcome.failure.text;
+}
+
+}  // namespace
+
+Commit::Commit(DevicePlaces& places, KeptFolders& folders, const DeviceSnapshot& snapshot,
+               const Proposal& proposal, ContentsOf contentsOf, std::string time)
+    : places_(places),
+      folders_(folders),
+      snapshot_(snapshot),
+      proposal_(proposal),
+      contentsOf_(std::move(contentsOf)),
+      time_(std::move(time)) {}
+
+CommitOutcome Commit::run() {
+  if (auto refusal = replaceSettings()) {
+    return *std::move(refusal);
+  }
+  removeStores();
+  makeCopyAside();
+  if (removes(DevicePlace::AutoFetchEnabled)) {
+    removeOrWarn(DevicePlace::AutoFetchEnabled);
+  }
+  writeInformation();
+  endRecord();
+  return std::move(outcome_);
+}
+
+bool Commit::removes(DevicePlace place) const {
+  const ProposedChange* const change = proposal_.changeOf(place);
+  return change != nullptr && change->action == Action::Remove;
+}
+
+std::optional<CommitOutcome> Commit::replaceSettings() {
+  const ProposedChange* const change = proposal_.changeOf(DevicePlace::Settings);
+  std::unique_ptr<StagedFile> staged;
+  if (change != nullptr) {
+    auto made = stage(*change);
+    if (const auto* failure = std::get_if<PlaceFailure>(&made)) {
+      return failed(writingError("The settings file cannot be written", *failure));
+    }
+    staged = std::move(std::get<std::unique_ptr<StagedFile>>(made));
+  }
+  std::optional<CommitOutcome> refusal = keepFiles();
+  if (!refusal) {
+    refusal = writeRecord();
+  }
+  if (!refusal) {
+    refusal = whyNotUndisturbed();
+  }
+  if (!refusal && staged != nullptr) {
+    const PlaceOutcome put =
+        places_.put(DevicePlace::Settings, *staged, identity(DevicePlace::Settings));
+    if (!put.isDone()) {
+      refusal = refused("The settings file cannot be replaced", put);
+    } else {
+      flushOrWarn(DevicePlace::Settings);
+    }
+  }
+  if (refusal) {
+    undo();
+  }
+  return refusal;
+}
+
+std::optional<CommitOutcome> Commit::whyNotUndisturbed() {
+  for (const ListedPlace& each : kDevicePlaces) {
+    if (each.place == DevicePlace::CommitRecord && record_.exists()) {
+      continue;
+    }
+    const auto now = places_.identityAt(each.place);
+    if (const auto* failure = std::get_if<PlaceFailure>(&now)) {
+      const PlaceState& state = snapshot_.at(each.place);
+      if (!state.identity.exists() && state.whyNotReplaced) {
+        // Nothing could be told of it before either, and nothing is done there.
+        continue;
+      }
+      return failed(readingError(*failure));
+    }
+    // A directory's own times tell of other files; and a second name moves the time of a change.
+    const auto& standing = std::get<FileIdentity>(now);
+    const FileIdentity& before = identity(each.place);
+    const bool isSame = before.kind == EntryKind::Directory ? standing.kind == before.kind
+                        : outcome_.keptFolder               ? standing.isSameFileAs(before)
+                                                            : standing == before;
+    if (!isSame) {
+      return disturbed();
+    }
+  }
+  return std::nullopt;
+}
+
+std::optional<CommitOutcome> Commit::keepFiles() {
+  if (!proposal_.keepsFiles) {
+    return std::nullopt;
+  }
+  std::vector<PlaceToKeep> kept;
+  for (const DevicePlace place : kKeptPlaces) {
+    kept.push_back({place, identity(place)});
+  }
+  std::string folder;
+  const PlaceOutcome outcome = folders_.keep(
+      kept, proposal_.hasLosses ? KeptFor::MigrationWithLosses : KeptFor::Migration, time_, folder);
+  if (!outcome.isDone()) {
+    return refused("The files cannot be kept", outcome);
+  }
+  outcome_.keptFolder = std::move(folder);
+  return std::nullopt;
+}
+
+std::optional<CommitOutcome> Commit::writeRecord() {
+  const ProposedChange* const change = proposal_.changeOf(DevicePlace::CommitRecord);
+  const bool isWritten = change != nullptr && change->action == Action::Write;
+  if (!isWritten && !identity(DevicePlace::CommitRecord).exists()) {
+    return std::nullopt;
+  }
+  constexpr std::string_view kOperation = "The commit record cannot be written";
+  if (const Result made = folders_.makeDirectory(); !made) {
+    return failed(writingError(kOperation, placeFailureOf(made)));
+  }
+  if (!isWritten) {
+    // That of an earlier run, which may have been killed before it was on the medium.
+    const auto failure = places_.flush(DevicePlace::CommitRecord);
+    return failure ? std::optional(failed(writingError(kOperation, *failure))) : std::nullopt;
+  }
+  auto made = stage(*change);
+  if (const auto* failure = std::get_if<PlaceFailure>(&made)) {
+    return failed(writingError(kOperation, *failure));
+  }
+  const PlaceOutcome put =
+      places_.put(DevicePlace::CommitRecord, *std::get<std::unique_ptr<StagedFile>>(made),
+                  identity(DevicePlace::CommitRecord));
+  if (!put.isDone()) {
+    return refused(kOperation, put);
+  }
+  const auto written = places_.identityAt(DevicePlace::CommitRecord);
+  if (const auto* failure = std::get_if<PlaceFailure>(&written)) {
+    return failed(readingError(*failure));
+  }
+  record_ = std::get<FileIdentity>(written);
+  if (const auto failure = places_.flush(DevicePlace::CommitRecord)) {
+    return failed(writingError(kOperation, *failure));
+  }
+  return std::nullopt;
+}
+
+std::variant<std::unique_ptr<StagedFile>, PlaceFailure> Commit::stage(
+    const ProposedChange& change) {
+  const std::unique_ptr<ReadableBytes> contents = contentsOf_(change);
+  return places_.stage(change.place, {.contents = contents.get(), .owner = change.owner});
+}
+
+void Commit::undo() {
+  if (record_.exists() && !identity(DevicePlace::CommitRecord).exists()) {
+    // One that stays says nothing wrong: the settings file is the one before.
+    static_cast<void>(places_.remove(DevicePlace::CommitRecord, record_));
+  }
+  if (outcome_.keptFolder) {
+    static_cast<void>(folders_.discard(*outcome_.keptFolder));
+  }
+  folders_.removeDirectoryIfMade();
+}
+
+void Commit::removeStores() {
+  bool isAny = false;
+  for (const DevicePlace place : kRemovedStores) {
+    isAny = isAny || removes(place);
+  }
+  const FileIdentity& before = identity(DevicePlace::RemovalSentinel);
+  FileIdentity sentinel = before;
+  if (isAny && !before.exists()) {
+    const TextBytes contents(kRemovalSentinelContents);
+    auto made = places_.stage(DevicePlace::RemovalSentinel, {.contents = &contents});
+    if (auto* staged = std::get_if<std::unique_ptr<StagedFile>>(&made)) {
+      static_cast<void>(places_.put(DevicePlace::RemovalSentinel, **staged, before));
+    }
+    // Without it the removal goes on: the record protects it as well.
+    auto now = places_.identityAt(DevicePlace::RemovalSentinel);
+    if (auto* identity = std::get_if<FileIdentity>(&now)) {
+      sentinel = *identity;
+    } else {
+      keepRecord("The removal sentinel may stay: " + std::get<PlaceFailure>(now).text);
+    }
+    flushOrWarn(DevicePlace::RemovalSentinel);
+  }
+  // What an interrupted run removed may not be on the medium yet.
+  const bool followsAnotherRun = before.exists() || identity(DevicePlace::CommitRecord).exists();
+  bool storesAreGone = true;
+  for (std::size_t index = 0; index < kRemovedStores.size(); ++index) {
+    const DevicePlace store = kRemovedStores[index];
+    const DevicePlace original = kOriginals[index];
+    if (storesAreGone && removes(store)) {
+      // Like the migration's own removal, this ends at the first store that stays.
+      storesAreGone = removeOrWarn(store);
+      recordMayEnd_ = recordMayEnd_ && storesAreGone;
+    }
+    if (removes(original)) {
+      recordMayEnd_ = removeOrWarn(original) && recordMayEnd_;
+    }
+    if (removes(store) || removes(original) || followsAnotherRun) {
+      recordMayEnd_ = flushOrWarn(store) && recordMayEnd_;
+    }
+  }
+  const bool endsSentinel = removes(DevicePlace::RemovalSentinel) || (isAny && !before.exists());
+  if (endsSentinel && sentinel.exists()) {
+    const PlaceOutcome removed = places_.remove(DevicePlace::RemovalSentinel, sentinel);
+    if (!removed.isDone()) {
+      keepRecord("The removal sentinel stays: " + reasonOf(removed));
+    }
+    recordMayEnd_ = flushOrWarn(DevicePlace::RemovalSentinel) && recordMayEnd_;
+  }
+}
+
+void Commit::keepRecord(std::string sentence) {
+  warn(std::move(sentence));
+  recordMayEnd_ = false;
+}
+
+bool Commit::removeOrWarn(DevicePlace place) {
+  const PlaceOutcome removed = places_.remove(place, identity(place));
+  if (!removed.isDone()) {
+    warn(snapshot_.at(place).path + " stays: " + reasonOf(removed));
+  }
+  return removed.isDone();
+}
+
+void Commit::makeCopyAside() {
+  const ProposedChange* const change = proposal_.changeOf(DevicePlace::CopyAside);
+  const PlaceState& settings = snapshot_.at(DevicePlace::Settings);
+  if (change == nullptr) {
+    return;
+  }
+  if (change->action == Action::Remove) {
+    removeOrWarn(DevicePlace::CopyAside);
+    return;
+  }
+  if (settings.contents == nullptr) {
+    return;
+  }
+  auto made = places_.stage(DevicePlace::CopyAside, {.contents = settings.contents.get(),
+                                                     .permissions = settings.permissions});
+  PlaceOutcome outcome;
+  if (auto* failure = std::get_if<PlaceFailure>(&made)) {
+    outcome = PlaceOutcome::failed(std::move(*failure));
+  } else {
+    outcome = places_.put(DevicePlace::CopyAside, *std::get<std::unique_ptr<StagedFile>>(made),
+                          identity(DevicePlace::CopyAside));
+  }
+  if (!outcome.isDone()) {
+    warn("The settings file was not copied aside: " + reasonOf(outcome));
+  }
+}
+
+void Commit::writeInformation() {
+  const ProposedChange* const change = proposal_.changeOf(DevicePlace::InformationDirectory);
+  if (change == nullptr) {
+    return;
+  }
+  if (change->action == Action::MakeDirectory) {
+    if (const auto failure = places_.makeInformationDirectory()) {
+      warn("The migration-information directory was not made: " + failure->text);
+    }
+    return;
+  }
+  const std::unique_ptr<ReadableBytes> contents = contentsOf_(*change);
+  if (const auto failure = places_.writeInformationFile(proposal_.informationFileName, *contents)) {
+    warn("The migration-information file was not written: " + failure->text);
+  }
+}
+
+void Commit::endRecord() {
+  const FileIdentity record = record_.exists() ? record_ : identity(DevicePlace::CommitRecord);
+  const bool isToGo = record_.exists() || removes(DevicePlace::CommitRecord);
+  if (!record.exists() || !isToGo || !recordMayEnd_ || proposal_.recordStays) {
+    return;
+  }
+  const PlaceOutcome removed = places_.remove(DevicePlace::CommitRecord, record);
+  if (!removed.isDone()) {
+    warn("The commit record stays: " + reasonOf(removed));
+  }
+  folders_.removeDirectoryIfMade();
+}
+
+bool Commit::flushOrWarn(DevicePlace place) {
+  const auto failure = places_.flush(place);
+  if (failure) {
+    warn("A change may not outlive a loss of power: " + failure->text);
+  }
+  return !failure;
+}
+
+}  // namespace accounts

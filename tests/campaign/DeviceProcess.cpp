@@ -1,0 +1,71 @@
+#include "tests/campaign/DeviceProcess.h"
+
+#include <array>
+#include <cstdio>
+#include <stdexcept>
+#include <utility>
+
+#include "accountsettings/AccountVocabulary.h"
+#include "tests/campaign/AllocationFailures.h"
+#include "tests/campaign/SimulatedKernel.h"
+
+namespace accounts {
+
+namespace {
+
+DeviceRoot openDevice() {
+  PathError error;
+  std::optional<DeviceRoot> root =
+      DeviceRoot::openRoot(std::string(SimulatedKernel::kDeviceDirectory), error);
+  if (!root) {
+    throw std::logic_error(error.text);
+  }
+  return std::move(*root);
+}
+
+/// The bundle's resources, read once: every run needs them.
+const FakeBundleResources& resources() {
+  static const FakeBundleResources read = [] {
+    FakeBundleResources bundle;
+    for (const char* name :
+         {"AccountTypesProperties", "DataclassesProperties", "AccountCreators", "MailServices"}) {
+      bundle.replaced[name] = bundle.readPropertyList(name);
+    }
+    return bundle;
+  }();
+  return read;
+}
+
+}  // namespace
+
+Result ObservedPropertyLists::serializeBinary(const PropertyValue& value,
+                                              SerializedPropertyList& serialized) {
+  Result result = real_.serializeBinary(value, serialized);
+  const AllocationsSucceed whileObserving;
+  const PropertyDictionary* root = value.asDictionary();
+  if (result && root != nullptr && root->contains(kPlistAccountsKey)) {
+    settingsWritten.push_back(bytesOf(serialized));
+  }
+  return result;
+}
+
+std::optional<std::string> CountingUUIDs::randomUUID() {
+  std::array<char, 37> text{};
+  std::snprintf(text.data(), text.size(), "%08X-0000-4000-8000-%012X", run_, ++count_);
+  return std::string(text.data());
+}
+
+DeviceProcess::DeviceProcess(const DeviceDescription& description, unsigned run)
+    : root(openDevice()),
+      cloudAccountService(description),
+      deviceInfoService(description),
+      externalSyncSources(description),
+      pairingValueStore(description),
+      profileRestrictions(description),
+      uuidGenerator(run),
+      bundleResources(resources()) {
+  consoleLog.alsoStandardError = false;
+  logSystem.channel.enabled = false;
+}
+
+}  // namespace accounts

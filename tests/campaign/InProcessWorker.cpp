@@ -1,0 +1,152 @@
+#include "tests/campaign/InProcessWorker.h"
+
+#include <sys/socket.h>
+
+#include <array>
+#include <new>
+#include <stdexcept>
+#include <utility>
+
+#include "accountsettings/Process.h"
+#include "host/WorkerChannel.h"
+#include "migrator/AccountsDataMigrator.h"
+#include "platform/ReplacedParts.h"
+#include "safetynet/MigrationInMemory.h"
+#include "tests/campaign/AllocationFailures.h"
+#include "transaction/TransactionFileSystem.h"
+#include "transaction/TransactionPropertyLists.h"
+
+namespace accounts {
+
+namespace {
+
+ProgramError ended() {
+  return {ExitStatus::PluginEnded, "The plug-in ended"};
+}
+
+/// Part of a text that must outlive this.
+class PartOfText final : public ReadableBytes {
+ public:
+  explicit PartOfText(std::string_view text) : text_(text) {}
+  std::optional<PlaceFailure> giveTo(const Taker& take) const override {
+    static_cast<void>(take(text_));
+    return std::nullopt;
+  }
+
+ private:
+  std::string_view text_;
+};
+
+/// What arrives at the host of a frame whose sender ends after so many bytes of it.
+std::optional<Frame> received(std::string_view bytes, std::size_t most) {
+  const AllocationsSucceed whileInTheKernel;
+  std::array<int, 2> whole{};
+  std::array<int, 2> cut{};
+  if (::socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, whole.data()) != 0 ||
+      ::socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, cut.data()) != 0) {
+    throw std::runtime_error("no sockets");
+  }
+  const FileDescriptor host(cut[0]);
+  FileDescriptor worker(cut[1]);
+  const FileDescriptor reader(whole[0]);
+  {
+    const FileDescriptor writer(whole[1]);
+    if (!sendFrame(writer, FrameKind::Proposal, bytes)) {
+      throw std::runtime_error("the socket takes too little");
+    }
+  }
+  std::string sent(bytes.size() + 64, '\0');
+  const ssize_t count = ::recv(reader.number(), sent.data(), sent.size(), MSG_WAITALL);
+  most = std::min(most, static_cast<std::size_t>(std::max(count, ssize_t{0})));
+  if (::send(worker.number(), sent.data(), most, MSG_NOSIGNAL) != static_cast<ssize_t>(most)) {
+    throw std::runtime_error("the socket takes too little");
+  }
+  { const FileDescriptor closed = std::move(worker); }
+  return receiveFrame(host);
+}
+
+}  // namespace
+
+std::variant<HandedOver, ProgramError> InProcessWorker::work(const DeviceSnapshot& snapshot,
+                                                             const WorkerTask& task) {
+  ++handover_.attempts;
+  try {
+    return handOver(migrate(snapshot, task));
+  } catch (const std::bad_alloc&) {
+    handover_.ranOutOfMemory = true;
+    return ended();
+  }
+}
+
+Proposal InProcessWorker::migrate(const DeviceSnapshot& snapshot, const WorkerTask& task) {
+  MigrationInMemory migration(snapshot, kHome);
+  KernelOwnershipRule ownership(device_.root);
+  TransactionFileSystem files(migration.transaction(), ownership, [](std::string_view path) {
+    throw std::logic_error("a path that no migration has: " + std::string(path));
+  });
+  TransactionPropertyLists propertyLists(migration.transaction(), device_.propertyLists);
+  LinuxPreferenceDomain preferences(propertyLists, device_.homeDirectory);
+  TransactionSharedResources sharedResources(device_.sharedResources, task.lock);
+  Platform platform = platformWith(device_.platform, {.fileSystem = &files,
+                                                      .preferenceDomain = &preferences,
+                                                      .propertyLists = &propertyLists,
+                                                      .sharedResources = &sharedResources});
+  if (task.purpose == RunPurpose::FinishingAlone) {
+    migration.verify(PluginResult::NotAsked);
+  } else {
+    // Each attempt is made by a new process.
+    const Process process(platform);
+    const bool result = AccountsDataMigrator().performMigration();
+    migration.verify(result ? PluginResult::GaveTrue : PluginResult::GaveFalse);
+  }
+  {
+    const AllocationsSucceed whileObserving;
+    handover_.error = migration.error() ? migration.error()->message : "";
+    handover_.warnings = migration.warnings();
+  }
+  return migration
+      .proposal(task.keep,
+                [this](std::string_view bytes) {
+                  memoryFile_.append(bytes);
+                  return true;
+                })
+      .value();
+}
+
+std::variant<HandedOver, ProgramError> InProcessWorker::handOver(const Proposal& proposal) {
+  const std::string list = bytesOf(proposal);
+  const AllocationsSucceed whileObserving;
+  handover_.memoryFileSize = memoryFile_.size();
+  handover_.listSize = list.size();
+  if (const ProposedChange* const settings = proposal.changeOf(DevicePlace::Settings)) {
+    handover_.settings.push_back(memoryFile_.substr(settings->offset, settings->length));
+  }
+  if (!handover_.limit) {
+    return HandedOver{list, memoryFile_.size()};
+  }
+  const auto [cut, bytes] = *handover_.limit;
+  switch (cut) {
+    case Handover::Cut::WorkerEnds: {
+      if (bytes < memoryFile_.size()) {
+        return ended();
+      }
+      const std::optional<Frame> frame = received(list, bytes - memoryFile_.size());
+      return frame ? std::variant<HandedOver, ProgramError>(
+                         HandedOver{frame->bytes, memoryFile_.size()})
+                   : ended();
+    }
+    case Handover::Cut::ListIsShort:
+      return HandedOver{list.substr(0, bytes), memoryFile_.size()};
+    case Handover::Cut::MemoryFileIsShort:
+      break;
+  }
+  memoryFile_.resize(std::min(bytes, memoryFile_.size()));
+  return HandedOver{list, memoryFile_.size()};
+}
+
+std::unique_ptr<ReadableBytes> InProcessWorker::contentsOf(const ProposedChange& change) {
+  return std::make_unique<PartOfText>(
+      std::string_view(memoryFile_).substr(change.offset, change.length));
+}
+
+}  // namespace accounts
