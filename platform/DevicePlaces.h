@@ -22,9 +22,13 @@ struct PlaceOutcome {
   Kind kind = Kind::Done;
   /// Of a failure.
   PlaceFailure failure = {};
+  /// Of somebody else's file that was met: whether the new file stood at the place for a moment, so
+  /// that what stands there now may come from it.
+  bool hasStood = false;
 
   static PlaceOutcome done() { return {}; }
   static PlaceOutcome disturbed() { return {.kind = Kind::Disturbed}; }
+  static PlaceOutcome overtaken() { return {.kind = Kind::Disturbed, .hasStood = true}; }
   static PlaceOutcome failed(PlaceFailure failure) {
     return {.kind = Kind::Failed, .failure = std::move(failure)};
   }

@@ -110,6 +110,9 @@ std::optional<CommitOutcome> Commit::replaceSettings() {
         places_.put(DevicePlace::Settings, *staged, identity(DevicePlace::Settings));
     if (!put.isDone()) {
       refusal = refused("The settings file cannot be replaced", put);
+      // With the record the next attempt tells whether what stands there now comes from the new
+      // file.
+      recordMayEnd_ = !put.hasStood;
     } else {
       flushOrWarn(DevicePlace::Settings);
     }
@@ -208,7 +211,7 @@ std::variant<std::unique_ptr<StagedFile>, PlaceFailure> Commit::stage(
 }
 
 void Commit::undo() {
-  if (record_.exists() && !identity(DevicePlace::CommitRecord).exists()) {
+  if (recordMayEnd_ && record_.exists() && !identity(DevicePlace::CommitRecord).exists()) {
     // One that stays says nothing wrong: the settings file is the one before.
     static_cast<void>(places_.remove(DevicePlace::CommitRecord, record_));
   }

@@ -12,8 +12,7 @@ namespace {
 
 constexpr std::string_view kFirstLine = "accounts-migration commit record 1\n";
 constexpr std::string_view kLastLine = "end\n";
-constexpr std::string_view kNothing = "none";
-constexpr std::string_view kEarlierRun = "earlier";
+constexpr std::string_view kAnySettings = "any";
 constexpr std::array kLegacyStores = {DevicePlace::LegacyExchange, DevicePlace::LegacyMail};
 
 /// The copy of a legacy store that goes with it.
@@ -22,14 +21,50 @@ DevicePlace originalOf(DevicePlace store) {
                                           : DevicePlace::LegacyExchangeOriginal;
 }
 
+void append(std::string& text, std::string_view word) {
+  text.append(" ").append(word);
+}
+
 void append(std::string& text, const CommitRecord::Trace& trace) {
-  if (!trace.exists) {
-    text.append(" ").append(kNothing);
-    return;
+  append(text, std::to_string(trace.size));
+  append(text, std::to_string(trace.modified.seconds));
+  append(text, std::to_string(trace.modified.nanoseconds));
+}
+
+/// A word that says a text, whatever is in it: two digits for each byte.
+std::string hexadecimal(std::string_view text) {
+  constexpr std::string_view kDigits = "0123456789abcdef";
+  std::string word = "=";
+  for (const char each : text) {
+    const auto byte = static_cast<unsigned char>(each);
+    word += kDigits[byte >> 4];
+    word += kDigits[byte & 0x0f];
   }
-  text.append(" ").append(std::to_string(trace.size));
-  text.append(" ").append(std::to_string(trace.modified.seconds));
-  text.append(" ").append(std::to_string(trace.modified.nanoseconds));
+  return word;
+}
+
+std::optional<std::string> textOf(std::string_view word) {
+  if (!word.starts_with('=') || word.size() % 2 == 0) {
+    return std::nullopt;
+  }
+  std::string text;
+  for (std::size_t index = 1; index < word.size(); index += 2) {
+    unsigned byte = 0;
+    const char* const end = word.data() + index + 2;
+    const auto [stop, error] = std::from_chars(word.data() + index, end, byte, 16);
+    if (error != std::errc() || stop != end) {
+      return std::nullopt;
+    }
+    text += static_cast<char>(byte);
+  }
+  return text;
+}
+
+void append(std::string& text, const std::optional<CommitRecord::Proof>& proof) {
+  append(text, proof ? std::to_string(proof->settingsSize) : std::string(kAnySettings));
+  for (const std::string& each : proof ? proof->accounts : std::vector<std::string>()) {
+    append(text, hexadecimal(each));
+  }
 }
 
 /// Takes words from a line.
@@ -48,19 +83,27 @@ class Words {
     return isNumber(next(), number);
   }
   bool nextTrace(CommitRecord::Trace& trace) {
-    const std::string_view word = next();
-    if (word == kNothing) {
-      return true;
-    }
     trace.exists = true;
-    return isNumber(word, trace.size) && nextNumber(trace.modified.seconds) &&
+    return nextNumber(trace.size) && nextNumber(trace.modified.seconds) &&
            nextNumber(trace.modified.nanoseconds);
   }
-  /// Takes the rest if it is this word.
-  bool isLast(std::string_view word) {
-    const bool isIt = rest_ == word;
-    rest_ = isIt ? std::string_view() : rest_;
-    return isIt;
+  bool nextProof(std::optional<CommitRecord::Proof>& proof) {
+    const std::string_view word = next();
+    if (word == kAnySettings) {
+      return true;
+    }
+    proof = CommitRecord::Proof{};
+    if (!isNumber(word, proof->settingsSize)) {
+      return false;
+    }
+    while (!isAtEnd()) {
+      const auto account = textOf(next());
+      if (!account) {
+        return false;
+      }
+      proof->accounts.push_back(*account);
+    }
+    return true;
   }
   [[nodiscard]] bool isAtEnd() const { return rest_.empty(); }
 
@@ -79,11 +122,7 @@ std::optional<CommitRecord::Store> storeFrom(std::string_view line) {
   CommitRecord::Store store;
   const auto place = placeNamed(words.next());
   if (!place || std::ranges::find(kLegacyStores, *place) == kLegacyStores.end() ||
-      !words.nextTrace(store.store)) {
-    return std::nullopt;
-  }
-  store.isOfEarlierRun = words.isLast(kEarlierRun);
-  if (!store.isOfEarlierRun && (!words.nextTrace(store.settingsBefore) || !words.isAtEnd())) {
+      !words.nextTrace(store.store) || !words.nextProof(store.proof) || !words.isAtEnd()) {
     return std::nullopt;
   }
   store.place = *place;
@@ -97,11 +136,7 @@ std::string CommitRecord::text() const {
   for (const Store& each : stores) {
     text.append(listed(each.place).name);
     append(text, each.store);
-    if (each.isOfEarlierRun) {
-      text.append(" ").append(kEarlierRun);
-    } else {
-      append(text, each.settingsBefore);
-    }
+    append(text, each.proof);
     text.append("\n");
   }
   return text.append(kLastLine);
@@ -140,25 +175,22 @@ CommitRecord finishInterruptedCommit(Transaction& transaction) {
   const auto traceAt = [&](DevicePlace place) {
     return CommitRecord::traceOf(transaction.snapshot().at(place).identity);
   };
-  const CommitRecord::Trace settings = traceAt(DevicePlace::Settings);
-  const std::optional<PropertyDictionary> accounts =
+  const std::uint64_t size = transaction.snapshot().at(DevicePlace::Settings).identity.size;
+  const std::optional<PropertyDictionary> settings =
       transaction.dictionaryBefore(DevicePlace::Settings);
   for (const CommitRecord::Store& each : record.stores) {
-    // Another settings file than before need not be the one with the store's accounts: the run may
-    // have been killed before the exchange and another program may have written since.
-    const bool isCarriedOver =
-        isMigrated(accounts) &&
-        (each.isOfEarlierRun ||
-         (settings != each.settingsBefore &&
-          mayHoldAccountsOf(*accounts, each.place, transaction.dictionaryBefore(each.place))));
+    const bool isProved = !each.proof || (each.proof->accounts.empty()
+                                              ? each.proof->settingsSize == size
+                                              : hasAnyAccount(settings, each.proof->accounts));
+    const bool isCarriedOver = isMigrated(settings) && isProved;
     if (isCarriedOver && transaction.exists(originalOf(each.place))) {
       transaction.put(originalOf(each.place), Transaction::Removed{});
     }
     const CommitRecord::Trace standing = traceAt(each.place);
-    if (isCarriedOver && each.store.exists && standing == each.store) {
+    if (isCarriedOver && standing == each.store) {
       transaction.put(each.place, Transaction::Removed{});
       needed.stores.push_back(each);
-    } else if (isCarriedOver && each.store.exists && !standing.exists) {
+    } else if (isCarriedOver && !standing.exists) {
       // It may come back until its end is on the medium.
       needed.stores.push_back(each);
     }

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <cstdint>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -9,9 +11,10 @@
 
 namespace accounts {
 
-/// What a commit leaves while it removes legacy stores: which stores it carried over, and what the
-/// settings file was before. The next run knows by it that a store that is still there, or that
-/// came back, was converted already.
+/// What a commit leaves while it removes legacy stores: which stores it carried over, and what
+/// shows that a settings file has their accounts. The next run knows by it that a store that is
+/// still there, or that came back, was converted already; and, since another program may write the
+/// settings file at any time, that one that was to be converted was not.
 struct CommitRecord {
   /// As much of a file as another program that only copies it keeps.
   struct Trace {
@@ -20,14 +23,20 @@ struct CommitRecord {
     FileTime modified;
     bool operator==(const Trace&) const = default;
   };
+  /// What shows that a settings file comes from the one that the commit put in place.
+  struct Proof {
+    /// The size of the latter, which counts where there are no such accounts.
+    std::uint64_t settingsSize = 0;
+    /// The identifiers of some accounts that only the migration brought: any of them will do.
+    std::vector<std::string> accounts = {};
+    bool operator==(const Proof&) const = default;
+  };
   struct Store {
     DevicePlace place = DevicePlace::LegacyMail;
     Trace store;
-    /// The settings file that did not have the store's accounts yet.
-    Trace settingsBefore;
-    /// Whether the store was carried over by an earlier run, as a removal sentinel said: then the
-    /// settings file tells nothing.
-    bool isOfEarlierRun = false;
+    /// None when the settings file had the store's accounts before, so that any one counts.
+    std::optional<Proof> proof;
+    bool operator==(const Store&) const = default;
   };
   std::vector<Store> stores;
 

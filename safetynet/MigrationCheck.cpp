@@ -122,19 +122,25 @@ bool isMigrated(const std::optional<PropertyDictionary>& settings) {
   return version != nullptr && version->integerValue() == kMigratedVersion;
 }
 
-bool mayHoldAccountsOf(const PropertyDictionary& settings, DevicePlace place,
-                       const std::optional<PropertyDictionary>& store) {
-  if (!store) {
-    return true;
+std::vector<std::string> accountsBrought(const std::optional<PropertyDictionary>& before,
+                                         const std::optional<PropertyDictionary>& after,
+                                         std::size_t most) {
+  Identifiers known = identifiersOf(before.value_or(PropertyDictionary()));
+  known.emplace(kDeviceLocalIdentifier);
+  std::vector<std::string> brought;
+  for (const std::string& each : identifiersOf(after.value_or(PropertyDictionary()))) {
+    if (!known.contains(each) && brought.size() < most) {
+      brought.push_back(each);
+    }
   }
-  const LegacyLayout& layout = place == DevicePlace::LegacyMail ? kMailLayout : kExchangeLayout;
-  Identifiers named;
-  for (const std::string_view key : layout.arrays) {
-    addIdentifiers(named, arrayIn(*store, key), layout.identifier);
-  }
-  const Identifiers held = identifiersOf(settings);
-  return named.empty() ||
-         std::ranges::any_of(named, [&](const auto& each) { return held.contains(each); });
+  return brought;
+}
+
+bool hasAnyAccount(const std::optional<PropertyDictionary>& settings,
+                   const std::vector<std::string>& identifiers) {
+  const Identifiers held = identifiersOf(settings.value_or(PropertyDictionary()));
+  return std::ranges::any_of(identifiers,
+                             [&](const std::string& each) { return held.contains(each); });
 }
 
 std::optional<std::string> whyNotMigrated(Transaction& transaction) {

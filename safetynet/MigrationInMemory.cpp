@@ -13,6 +13,9 @@ namespace {
 constexpr std::array kInputs = {DevicePlace::LegacyMail, DevicePlace::LegacyExchange,
                                 DevicePlace::Settings};
 
+/// So many accounts of all that a migration brought are named in a commit record.
+constexpr std::size_t kMostProvingAccounts = 16;
+
 }  // namespace
 
 MigrationInMemory::MigrationInMemory(const DeviceSnapshot& snapshot, std::string_view home)
@@ -64,23 +67,35 @@ void MigrationInMemory::verify(PluginResult result) {
   }
 }
 
-CommitRecord MigrationInMemory::recordOfThisRun() const {
+CommitRecord MigrationInMemory::recordOfThisRun() {
   CommitRecord record = carriedOver_;
+  std::optional<CommitRecord::Proof> proof;
   // Without a save this was the end of an interrupted removal: what the stores held was in the
   // settings file before.
-  const bool isSaved = transaction_.lastSave() == LastSave::Written;
+  if (transaction_.lastSave() == LastSave::Written) {
+    proof = CommitRecord::Proof{
+        .accounts = accountsBrought(transaction_.dictionaryBefore(DevicePlace::Settings),
+                                    transaction_.dictionaryAt(DevicePlace::Settings),
+                                    kMostProvingAccounts)};
+  }
   for (const DevicePlace place : inputs_) {
-    const DeviceSnapshot& snapshot = transaction_.snapshot();
+    const PlaceState& state = transaction_.snapshot().at(place);
     // What is no file holds no accounts that could be converted twice.
-    if (place != DevicePlace::Settings && snapshot.at(place).contents != nullptr) {
-      record.stores.push_back(
-          {.place = place,
-           .store = CommitRecord::traceOf(snapshot.at(place).identity),
-           .settingsBefore = CommitRecord::traceOf(snapshot.at(DevicePlace::Settings).identity),
-           .isOfEarlierRun = !isSaved});
+    if (place != DevicePlace::Settings && state.contents != nullptr) {
+      record.stores.push_back({place, CommitRecord::traceOf(state.identity), proof});
     }
   }
   return record;
+}
+
+std::string MigrationInMemory::recordText(std::uint64_t settingsSize) const {
+  CommitRecord record = record_;
+  for (std::size_t index = carriedOver_.stores.size(); index < record.stores.size(); ++index) {
+    if (auto& proof = record.stores[index].proof) {
+      proof->settingsSize = settingsSize;
+    }
+  }
+  return record.text();
 }
 
 std::optional<Proposal> MigrationInMemory::proposal(KeepFiles keep, const TakeBytes& take) const {
@@ -125,7 +140,10 @@ std::optional<Proposal> MigrationInMemory::proposal(KeepFiles keep, const TakeBy
     }
     proposal.changes.push_back(change);
   }
-  const std::string text = record_.text();
+  const ProposedChange* const settings = proposal.changeOf(DevicePlace::Settings);
+  const std::string text = recordText(
+      settings != nullptr ? settings->length
+                          : transaction_.snapshot().at(DevicePlace::Settings).identity.size);
   // One that says the same already stays until the end.
   if (!record_.stores.empty() && text != recordBefore_) {
     std::erase_if(proposal.changes, [](const ProposedChange& each) {

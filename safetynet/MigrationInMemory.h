@@ -49,7 +49,9 @@ class MigrationInMemory {
 
  private:
   /// The legacy stores that must not be converted by another run, as far as they were there.
-  [[nodiscard]] CommitRecord recordOfThisRun() const;
+  [[nodiscard]] CommitRecord recordOfThisRun();
+  /// The record for a settings file of a size.
+  [[nodiscard]] std::string recordText(std::uint64_t settingsSize) const;
 
   Transaction transaction_;
   /// The stores that an earlier run carried over.

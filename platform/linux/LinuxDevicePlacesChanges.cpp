@@ -21,6 +21,15 @@ namespace {
 // Each turn of the loop below means that another program wrote in between.
 constexpr int kMostExchanges = 1000;
 
+/// The same for a random name that nobody else has, so that nothing is replaced in any case.
+int renameAside(int directory, const char* from, const char* aside) {
+  if (::renameat2(directory, from, directory, aside, RENAME_NOREPLACE) == 0 ||
+      (cannotExchange(errno) && ::renameat(directory, from, directory, aside) == 0)) {
+    return 0;
+  }
+  return errno;
+}
+
 /// What stands under a name; none where that cannot be told.
 std::optional<FileIdentity> entryIn(int directory, const char* name) {
   struct stat status = {};
@@ -58,7 +67,7 @@ class StagedEntry final : public StagedFile {
     if (!name) {
       return errno;
     }
-    const int number = renameToNothing(entry.directory(), entry.name(), name->c_str());
+    const int number = renameAside(entry.directory(), entry.name(), name->c_str());
     if (number == 0) {
       entry = entry.withName(*name);
     }
@@ -89,7 +98,8 @@ void handBack(int directory, const char* own, const char* name, FileIdentity las
       // The next run tells by the number whose it is.
       return;
     }
-    if (out->device == lastPut.device && out->inode == lastPut.inode) {
+    // Our own, too, once another program has written into it.
+    if (out->isSameFileAs(lastPut)) {
       (void)::unlinkat(directory, own, 0);
       return;
     }
@@ -187,7 +197,7 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
     }
     staged.isThere = false;
     const std::optional<FileIdentity> in = entryIn(directory, name.c_str());
-    return !in || isInode(*in, staged.status) ? PlaceOutcome::done() : PlaceOutcome::disturbed();
+    return !in || isInode(*in, staged.status) ? PlaceOutcome::done() : PlaceOutcome::overtaken();
   }
   if (::renameat2(directory, own, directory, name.c_str(), RENAME_EXCHANGE) != 0) {
     if (errno == ENOENT) {
@@ -197,8 +207,8 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
       return PlaceOutcome::failed(placeFailure("exchange a file with", path, errno));
     }
     // The window that is left: what another program puts there from here on is replaced.
-    if (!identityIn(directory, name.c_str()).isSameFileAs(expected) ||
-        !isInode(identityIn(directory, own), staged.status)) {
+    if (!isInode(identityIn(directory, own), staged.status) ||
+        !identityIn(directory, name.c_str()).isSameFileAs(expected)) {
       return PlaceOutcome::disturbed();
     }
     if (::renameat(directory, own, directory, name.c_str()) != 0) {
@@ -215,7 +225,7 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
   }
   if (!out->isSameFileAs(expected)) {
     handBack(directory, own, name.c_str(), identityOf(staged.status), *out);
-    return PlaceOutcome::disturbed();
+    return PlaceOutcome::overtaken();
   }
   const std::optional<FileIdentity> in = entryIn(directory, name.c_str());
   if (in && !isInode(*in, staged.status)) {
@@ -228,7 +238,7 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
         ::renameat2(directory, own, directory, name.c_str(), RENAME_EXCHANGE) == 0) {
       (void)::unlinkat(directory, own, 0);
     }
-    return PlaceOutcome::disturbed();
+    return PlaceOutcome::overtaken();
   }
   (void)::unlinkat(directory, own, 0);
   return PlaceOutcome::done();
@@ -250,7 +260,7 @@ PlaceOutcome LinuxDevicePlaces::remove(DevicePlace place, const FileIdentity& ex
   if (expected.kind == EntryKind::Directory) {
     return PlaceOutcome::failed(placeFailure("remove", path, EISDIR));
   }
-  if (const int number = renameToNothing(directory, name.c_str(), aside->c_str()); number != 0) {
+  if (const int number = renameAside(directory, name.c_str(), aside->c_str()); number != 0) {
     return number == ENOENT ? PlaceOutcome::disturbed()
                             : PlaceOutcome::failed(placeFailure("remove", path, number));
   }

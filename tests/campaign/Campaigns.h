@@ -19,6 +19,15 @@ bool runKillCampaign(const std::vector<Scenario>& scenarios, const Selection& se
 /// disk may then hold (PowerLoss.h); then the action is run again to its end.
 bool runPowerLossCampaign(const std::vector<Scenario>& scenarios, const Selection& selection);
 
+/// The process is killed before each system call of each scenario; then something happens on the
+/// device (a file comes back from a backup, another program writes, and so on), and the action is
+/// run again, killed again at each of its calls, and run to its end.
+bool runInterludeCampaign(const std::vector<Scenario>& scenarios, const Selection& selection);
+
+/// The worker ends after each byte that it hands over in each scenario, or hands over less than it
+/// says.
+bool runHandoverCampaign(const std::vector<Scenario>& scenarios, const Selection& selection);
+
 /// Each allocation of the codecs and of each scenario fails; then the action is run again to its
 /// end.
 bool runAllocationCampaign(const std::vector<Scenario>& scenarios, const Selection& selection);

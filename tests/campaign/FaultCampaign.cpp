@@ -9,7 +9,7 @@ namespace accounts {
 
 namespace {
 
-constexpr std::size_t kFewestFaults = 50'000;
+constexpr std::size_t kFewestFaults = 100'000;
 
 struct NamedFault {
   std::string_view name;
@@ -21,13 +21,30 @@ constexpr auto kOnce = Fault::Duration::Once;
 constexpr auto kFromThenOn = Fault::Duration::FromThenOn;
 
 constexpr NamedFault kFaults[] = {
-    {"EIO-once", EIO, kOnce},       {"EIO-from-then-on", EIO, kFromThenOn},
-    {"ENOSPC-once", ENOSPC, kOnce}, {"ENOSPC-from-then-on", ENOSPC, kFromThenOn},
-    {"EDQUOT-once", EDQUOT, kOnce}, {"EDQUOT-from-then-on", EDQUOT, kFromThenOn},
-    {"EACCES-once", EACCES, kOnce}, {"EACCES-from-then-on", EACCES, kFromThenOn},
-    {"EROFS-once", EROFS, kOnce},   {"EROFS-from-then-on", EROFS, kFromThenOn},
-    {"EMFILE-once", EMFILE, kOnce}, {"EMFILE-from-then-on", EMFILE, kFromThenOn},
-    {"short-write-once", 0, kOnce}, {"short-write-from-then-on", 0, kFromThenOn},
+    {"EIO-once", EIO, kOnce},
+    {"EIO-from-then-on", EIO, kFromThenOn},
+    {"ENOSPC-once", ENOSPC, kOnce},
+    {"ENOSPC-from-then-on", ENOSPC, kFromThenOn},
+    {"EDQUOT-once", EDQUOT, kOnce},
+    {"EDQUOT-from-then-on", EDQUOT, kFromThenOn},
+    {"EACCES-once", EACCES, kOnce},
+    {"EACCES-from-then-on", EACCES, kFromThenOn},
+    {"EPERM-from-then-on", EPERM, kFromThenOn},
+    {"EROFS-once", EROFS, kOnce},
+    {"EROFS-from-then-on", EROFS, kFromThenOn},
+    {"EMFILE-once", EMFILE, kOnce},
+    {"EMFILE-from-then-on", EMFILE, kFromThenOn},
+    {"ENFILE-once", ENFILE, kOnce},
+    {"ENFILE-from-then-on", ENFILE, kFromThenOn},
+    {"ENOMEM-once", ENOMEM, kOnce},
+    {"ENOMEM-from-then-on", ENOMEM, kFromThenOn},
+    {"ESTALE-once", ESTALE, kOnce},
+    {"ESTALE-from-then-on", ESTALE, kFromThenOn},
+    {"EINTR-once", EINTR, kOnce},
+    {"EINVAL-once", EINVAL, kOnce},
+    {"EINVAL-from-then-on", EINVAL, kFromThenOn},
+    {"short-write-once", 0, kOnce},
+    {"short-write-from-then-on", 0, kFromThenOn},
 };
 
 void tryFaultsIn(const Scenario& scenario, Report& report) {

@@ -37,32 +37,42 @@ class PartOfText final : public ReadableBytes {
   std::string_view text_;
 };
 
-/// What arrives at the host of a frame whose sender ends after so many bytes of it.
-std::optional<Frame> received(std::string_view bytes, std::size_t most) {
-  const AllocationsSucceed whileInTheKernel;
-  std::array<int, 2> whole{};
-  std::array<int, 2> cut{};
-  if (::socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, whole.data()) != 0 ||
-      ::socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, cut.data()) != 0) {
-    throw std::runtime_error("no sockets");
-  }
-  const FileDescriptor host(cut[0]);
-  FileDescriptor worker(cut[1]);
-  const FileDescriptor reader(whole[0]);
-  {
-    const FileDescriptor writer(whole[1]);
-    if (!sendFrame(writer, FrameKind::Proposal, bytes)) {
-      throw std::runtime_error("the socket takes too little");
+/// The two ends of a connection between a host and its worker.
+struct Connection {
+  Connection() : host(-1), worker(-1) {
+    std::array<int, 2> ends{};
+    if (::socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, ends.data()) != 0) {
+      throw std::runtime_error("no sockets");
     }
+    host = FileDescriptor(ends[0]);
+    worker = FileDescriptor(ends[1]);
   }
-  std::string sent(bytes.size() + 64, '\0');
-  const ssize_t count = ::recv(reader.number(), sent.data(), sent.size(), MSG_WAITALL);
-  most = std::min(most, static_cast<std::size_t>(std::max(count, ssize_t{0})));
-  if (::send(worker.number(), sent.data(), most, MSG_NOSIGNAL) != static_cast<ssize_t>(most)) {
+  FileDescriptor host;
+  FileDescriptor worker;
+};
+
+/// A frame as it is sent.
+std::string frameOf(std::string_view bytes) {
+  Connection connection;
+  if (!sendFrame(connection.worker, FrameKind::Proposal, bytes)) {
     throw std::runtime_error("the socket takes too little");
   }
-  { const FileDescriptor closed = std::move(worker); }
-  return receiveFrame(host);
+  connection.worker = FileDescriptor(-1);
+  std::string frame(bytes.size() + 64, '\0');
+  const ssize_t count = ::recv(connection.host.number(), frame.data(), frame.size(), MSG_WAITALL);
+  frame.resize(static_cast<std::size_t>(std::max(count, ssize_t{0})));
+  return frame;
+}
+
+/// What the host takes from a worker that ends after having sent some bytes.
+std::optional<Frame> frameIn(std::string_view sent) {
+  Connection connection;
+  if (::send(connection.worker.number(), sent.data(), sent.size(), MSG_NOSIGNAL) !=
+      static_cast<ssize_t>(sent.size())) {
+    throw std::runtime_error("the socket takes too little");
+  }
+  connection.worker = FileDescriptor(-1);
+  return receiveFrame(connection.host);
 }
 
 }  // namespace
@@ -118,6 +128,7 @@ std::variant<HandedOver, ProgramError> InProcessWorker::handOver(const Proposal&
   const AllocationsSucceed whileObserving;
   handover_.memoryFileSize = memoryFile_.size();
   handover_.listSize = list.size();
+  handover_.frameSize = frameOf("").size() + list.size();
   if (const ProposedChange* const settings = proposal.changeOf(DevicePlace::Settings)) {
     handover_.settings.push_back(memoryFile_.substr(settings->offset, settings->length));
   }
@@ -130,7 +141,8 @@ std::variant<HandedOver, ProgramError> InProcessWorker::handOver(const Proposal&
       if (bytes < memoryFile_.size()) {
         return ended();
       }
-      const std::optional<Frame> frame = received(list, bytes - memoryFile_.size());
+      const std::optional<Frame> frame =
+          frameIn(frameOf(list).substr(0, bytes - memoryFile_.size()));
       return frame ? std::variant<HandedOver, ProgramError>(
                          HandedOver{frame->bytes, memoryFile_.size()})
                    : ended();

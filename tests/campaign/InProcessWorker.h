@@ -35,6 +35,8 @@ struct Handover {
   /// The newest memory file and list.
   std::size_t memoryFileSize = 0;
   std::size_t listSize = 0;
+  /// The list as it is sent, with what says how long it is.
+  std::size_t frameSize = 0;
   std::size_t attempts = 0;
   /// Why the newest may not be committed; empty when it may.
   std::string error = {};

@@ -2,31 +2,13 @@
 #include <string>
 
 #include "tests/campaign/Campaigns.h"
+#include "tests/campaign/KilledDisks.h"
 
 namespace accounts {
 
 namespace {
 
 constexpr std::size_t kFewestKills = 10'000;
-
-/// The disks before each call of a recorded run and after the last one. What a killed process did
-/// before stays done, so each is what it leaves when it is killed there.
-std::vector<SimulatedDisk> disksOf(const SimulatedDisk& before, const Run& run) {
-  std::vector<SimulatedDisk> disks;
-  SimulatedDisk disk = before;
-  std::size_t applied = 0;
-  const auto applyUpTo = [&](std::size_t count) {
-    for (; applied < count; ++applied) {
-      disk.apply(run.changes[applied]);
-    }
-    disks.push_back(disk);
-  };
-  for (const SimulatedKernel::Call& call : run.calls) {
-    applyUpTo(call.changesBefore);
-  }
-  applyUpTo(run.changes.size());
-  return disks;
-}
 
 class KilledScenario {
  public:

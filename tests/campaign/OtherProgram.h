@@ -22,6 +22,9 @@ class OtherProgram {
   OtherProgram(const OtherProgram&) = delete;
   OtherProgram& operator=(const OtherProgram&) = delete;
 
+  /// What it sees.
+  [[nodiscard]] const SimulatedDisk& disk() const { return disk_; }
+
   /// Writes a file in place, and makes it if it is missing.
   void writeInPlace(std::string_view path, std::string contents);
   /// Puts a new file in the place of what is there.

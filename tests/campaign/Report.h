@@ -40,6 +40,11 @@ class Report {
     return takes(scenario) && (selection_.fault.empty() || selection_.fault == fault);
   }
 
+  /// Whether the operation with a number is selected. Does not count.
+  [[nodiscard]] bool mayTake(std::size_t operation) const {
+    return !selection_.operation || selection_.operation == operation;
+  }
+
   /// Keeps a complaint about the case that was taken last. `call` says what the operation is.
   void judge(const Complaint& complaint, std::string_view call);
 

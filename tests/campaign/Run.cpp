@@ -159,6 +159,9 @@ Run runOn(const SimulatedDisk& disk, const Scenario& scenario, const RunOptions&
     if (options.intrusion) {
       kernel.intrude(*options.intrusion);
     }
+    if (options.otherLock) {
+      kernel.lockByAnother(*options.otherLock);
+    }
     const AllocationFailure allocations(options.failingAllocation);
     try {
       act(device, scenario, options, run);

@@ -26,6 +26,8 @@ struct RunOptions {
   std::optional<Handover::Limit> handover = {};
   /// What another program does, and when.
   std::optional<Intrusion> intrusion = {};
+  /// A lock that another process has for a while.
+  std::optional<OtherLock> otherLock = {};
   /// Who runs the plug-in; none for the scenario's own.
   std::optional<Scenario::Host> host = {};
 };

@@ -134,6 +134,11 @@ class SimulatedDisk {
     inodes_[find(path).value()].isImmutable = isImmutable;
   }
 
+  /// Takes the disk out and puts it in again: what stands on it stays, but for the number that the
+  /// system calls the disk by.
+  void remount() { ++device_; }
+  [[nodiscard]] std::uint64_t device() const { return device_; }
+
   /// Whether no two inodes that have names have one number. So it is on every disk that there is.
   [[nodiscard]] bool hasDistinctNumbers() const;
   /// The same for two disks whose trees hold the same files under the same names: with the same
@@ -148,6 +153,7 @@ class SimulatedDisk {
   void applyToInode(const DiskChange& change);
 
   std::vector<SimulatedInode> inodes_;
+  std::uint64_t device_ = 0xacc;
   /// 2024 begins, so that nobody takes a time for none.
   std::uint64_t clock_ = 1'704'067'200'000'000'000;
 };

@@ -188,26 +188,21 @@ int SimulatedKernel::close(int descriptor) {
   return 0;
 }
 
-void SimulatedKernel::lockByAnother(std::string_view path, std::size_t count,
-                                    std::function<void(OtherProgram&)> act) {
-  otherLocks_.push_back({disk_.find(path).value(), count, 0, std::move(act)});
-}
-
 int SimulatedKernel::lock(int descriptor, int operation) {
   OpenFile& locked = file(descriptor);
   if ((operation & LOCK_UN) != 0) {
     locked.isLocked = false;
     return 0;
   }
-  const auto another = std::ranges::find(otherLocks_, locked.inode, &OtherLock::inode);
+  const auto another = std::ranges::find(otherLocks_, locked.inode, &HeldLock::inode);
   if (another != otherLocks_.end()) {
     if (another->asked == kMostAsked) {
       throw std::logic_error("the process waits for ever for the lock of " + locked.path);
     }
-    if (another->asked++ < another->count) {
+    if (another->asked++ < another->lock.count) {
       return (operation & LOCK_NB) != 0 ? -EWOULDBLOCK : -EINTR;
     }
-    another->act(otherProgram_);
+    another->lock.act(otherProgram_);
     otherLocks_.erase(another);
   }
   const bool isHeld = std::ranges::any_of(files_, [&](const OpenFile& other) {

@@ -46,6 +46,14 @@ struct Intrusion {
   std::function<void(OtherProgram&)> act;
 };
 
+/// A lock of a file or directory that another process has. `count` calls that ask for it are in
+/// vain: those that would wait are interrupted. The last thing that it does with the lock is `act`.
+struct OtherLock {
+  std::string path;
+  std::size_t count = 0;
+  std::function<void(OtherProgram&)> act = [](OtherProgram&) {};
+};
+
 /// The system calls of the Linux platform over a simulated disk. While one of these is alive, the
 /// program's own file operations (see SystemCalls.cpp) on kDeviceDirectory and beneath it arrive
 /// here instead of at the real system. Only one may be alive at a time. The calls give what the
@@ -93,12 +101,10 @@ class SimulatedKernel {
   /// Lets another program act. Its changes are recorded, too.
   void intrude(Intrusion intrusion) { intrusion_ = std::move(intrusion); }
 
-  /// Another process has the lock of a file or directory. `count` calls that ask for it are in
-  /// vain: those that would wait are interrupted. The last thing that it does with the lock is
-  /// `act`.
-  void lockByAnother(
-      std::string_view path, std::size_t count,
-      std::function<void(OtherProgram&)> act = [](OtherProgram&) {});
+  /// Another process has a lock.
+  void lockByAnother(const OtherLock& lock) {
+    otherLocks_.push_back({disk_.find(lock.path).value(), 0, lock});
+  }
   /// A number of calls after which nobody gives a lock back. A process that asks that often would
   /// wait for ever: that throws.
   static constexpr std::size_t kNever = std::numeric_limits<std::size_t>::max();
@@ -195,13 +201,12 @@ class SimulatedKernel {
   FileSystemAbilities abilities_;
   OtherProgram otherProgram_;
   std::optional<Intrusion> intrusion_;
-  struct OtherLock {
+  struct HeldLock {
     std::size_t inode = 0;
-    std::size_t count = 0;
     std::size_t asked = 0;
-    std::function<void(OtherProgram&)> act;
+    OtherLock lock;
   };
-  std::vector<OtherLock> otherLocks_;
+  std::vector<HeldLock> otherLocks_;
 };
 
 }  // namespace accounts

@@ -13,7 +13,6 @@ namespace accounts {
 
 namespace {
 
-constexpr dev_t kDevice = 0xacc;
 constexpr std::uint64_t kNanoseconds = 1'000'000'000;
 
 using Kind = DiskChange::Kind;
@@ -33,7 +32,7 @@ std::uint64_t nanosecondsOf(const timespec& time) {
 struct stat SimulatedKernel::statusOf(std::size_t number) const {
   const SimulatedInode& inode = disk_.inode(number);
   struct stat status = {};
-  status.st_dev = kDevice;
+  status.st_dev = disk_.device();
   status.st_ino = inode.number;
   status.st_mode = (inode.isDirectory ? S_IFDIR : S_IFREG) | inode.permissions;
   status.st_nlink = inode.links;

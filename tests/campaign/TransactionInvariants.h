@@ -7,19 +7,10 @@
 #include <utility>
 #include <vector>
 
-#include "propertylist/PropertyValue.h"
+#include "tests/campaign/Ending.h"
 #include "tests/campaign/Invariants.h"
-#include "vocabulary/DevicePlaces.h"
 
 namespace accounts {
-
-/// How a device ends: what its settings file holds, with names for the identifiers that a migration
-/// makes up, and at which of the other places of a migration something stands.
-struct Ending {
-  std::optional<PropertyValue> settings;
-  std::set<DevicePlace> places;
-  ExitStatus exitStatus = ExitStatus::Success;
-};
 
 /// What holds of a run that is one transaction: at every moment the device is as it was, or
 /// migrated, or migrated with a record with which the next run finishes it; the next run ends as an
@@ -43,7 +34,9 @@ class TransactionInvariants final : public Invariants {
   Complaint ofNextRun(const SimulatedDisk& disk, const Ending& expected);
   /// How a device ends after an undisturbed run on a disk.
   [[nodiscard]] Ending endingAfterRun(const SimulatedDisk& disk) const;
-  [[nodiscard]] Ending endingOf(const SimulatedDisk& disk, ExitStatus exitStatus) const;
+  [[nodiscard]] Ending endingOf(const SimulatedDisk& disk, ExitStatus exitStatus) const {
+    return accounts::endingOf(disk, exitStatus, textsBefore_);
+  }
   [[nodiscard]] const Ending& ending() const { return ending_; }
   /// Whether the settings file is the very one that was there before.
   [[nodiscard]] bool hasOldSettings(const SimulatedDisk& disk) const;

@@ -23,6 +23,8 @@ constexpr std::array kCampaigns = {
     NamedCampaign{"kills", accounts::runKillCampaign},
     NamedCampaign{"power-loss", accounts::runPowerLossCampaign},
     NamedCampaign{"allocations", accounts::runAllocationCampaign},
+    NamedCampaign{"interludes", accounts::runInterludeCampaign},
+    NamedCampaign{"handover", accounts::runHandoverCampaign},
 };
 
 int runSelected(const std::string& campaign, const Selection& selection) {
@@ -42,7 +44,9 @@ int main(int argumentCount, char** arguments) {
   CLI::App application("Tries everything that can go wrong on a device, case by case.");
   std::string campaign;
   Selection selection;
-  application.add_option("campaign", campaign, "faults, kills, power-loss or allocations")
+  application
+      .add_option("campaign", campaign,
+                  "faults, kills, power-loss, allocations, interludes or handover")
       ->required();
   bool isBare = false;
   application.add_flag("--bare", isBare, "the plug-in alone on the device");

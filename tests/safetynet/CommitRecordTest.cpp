@@ -15,41 +15,40 @@ namespace {
 using Trace = CommitRecord::Trace;
 
 const Trace kStoreTrace = {.exists = true, .size = 70, .modified = {1'700'000'000, 999'999'999}};
-const Trace kSettingsTrace = {.exists = true, .size = 0, .modified = {-1, 0}};
+/// What shows that a settings file has the store's accounts.
+using Proof = std::optional<CommitRecord::Proof>;
+const Proof kProof = CommitRecord::Proof{.settingsSize = 512, .accounts = {"M", "with a blank"}};
 
-CommitRecord recordOf(DevicePlace place, Trace store, Trace settings = {}) {
+CommitRecord recordOf(DevicePlace place, Trace store, Proof proof = kProof) {
   CommitRecord record;
-  record.stores.push_back({place, store, settings});
+  record.stores.push_back({place, store, std::move(proof)});
   return record;
-}
-
-void expectSame(const CommitRecord& read, const CommitRecord& written) {
-  ASSERT_EQ(read.stores.size(), written.stores.size());
-  for (std::size_t index = 0; index < read.stores.size(); ++index) {
-    EXPECT_EQ(read.stores[index].place, written.stores[index].place);
-    EXPECT_EQ(read.stores[index].store, written.stores[index].store);
-    EXPECT_EQ(read.stores[index].settingsBefore, written.stores[index].settingsBefore);
-  }
 }
 
 TEST(CommitRecordTest, ATextSaysWhatItWasMadeOf) {
   constexpr std::int64_t kLeast = std::numeric_limits<std::int64_t>::min();
-  CommitRecord record = recordOf(DevicePlace::LegacyMail, kStoreTrace, kSettingsTrace);
+  CommitRecord record = recordOf(DevicePlace::LegacyMail, kStoreTrace);
   record.stores.push_back({DevicePlace::LegacyExchange,
                            {true, std::numeric_limits<std::uint64_t>::max(), {kLeast, 1}},
-                           Trace()});
-  expectSame(CommitRecord::parse(record.text()), record);
+                           std::nullopt});
+  record.stores.push_back({DevicePlace::LegacyExchange, kStoreTrace,
+                           CommitRecord::Proof{.accounts = {"", std::string("\n\0\xff end", 7)}}});
+  EXPECT_EQ(CommitRecord::parse(record.text()).stores, record.stores);
 }
 
 TEST(CommitRecordTest, TheTextIsOneThatAPersonCanRead) {
-  EXPECT_EQ(recordOf(DevicePlace::LegacyMail, kStoreTrace).text(),
+  EXPECT_EQ(recordOf(DevicePlace::LegacyMail, kStoreTrace).text() +
+                recordOf(DevicePlace::LegacyExchange, kStoreTrace, std::nullopt).text(),
             "accounts-migration commit record 1\n"
-            "LegacyMail 70 1700000000 999999999 none\n"
+            "LegacyMail 70 1700000000 999999999 512 =4d =77697468206120626c616e6b\n"
+            "end\n"
+            "accounts-migration commit record 1\n"
+            "LegacyExchange 70 1700000000 999999999 any\n"
             "end\n");
 }
 
 TEST(CommitRecordTest, APartOfATextIsNoRecord) {
-  const std::string text = recordOf(DevicePlace::LegacyMail, kStoreTrace, kSettingsTrace).text();
+  const std::string text = recordOf(DevicePlace::LegacyMail, kStoreTrace).text();
   for (std::size_t size = 0; size < text.size(); ++size) {
     EXPECT_TRUE(CommitRecord::parse(text.substr(0, size)).stores.empty()) << size;
   }
@@ -58,16 +57,30 @@ TEST(CommitRecordTest, APartOfATextIsNoRecord) {
 
 TEST(CommitRecordTest, HostileTextsAreNoRecords) {
   const std::string first = "accounts-migration commit record 1\n";
-  const std::string good = "LegacyMail 70 1 2 none\n";
+  const std::string good = "LegacyMail 70 1 2 any\n";
   ASSERT_EQ(CommitRecord::parse(first + good + "end\n").stores.size(), 1u);
-  for (const std::string& lines :
-       {std::string("Settings 70 1 2 none\n"), std::string("CommitRecord none none\n"),
-        std::string("Nothing 70 1 2 none\n"), std::string("\n"), std::string("LegacyMail\n"),
-        std::string("LegacyMail 70 1\n"), std::string("LegacyMail 70 1 2\n"),
-        std::string("LegacyMail 70 1 2 none none\n"), std::string("LegacyMail -70 1 2 none\n"),
-        std::string("LegacyMail 70 1 2x none\n"), std::string("LegacyMail  70 1 2 none\n"),
-        std::string("LegacyMail 99999999999999999999 1 2 none\n"), std::string("end\n"),
-        good + "end\n", good + std::string("Legacy\0Mail 70 1 2 none\n", 23)}) {
+  for (const std::string& lines : {std::string("Settings 70 1 2 any\n"),
+                                   std::string("CommitRecord none any\n"),
+                                   std::string("Nothing 70 1 2 any\n"),
+                                   std::string("\n"),
+                                   std::string("LegacyMail\n"),
+                                   std::string("LegacyMail 70 1\n"),
+                                   std::string("LegacyMail 70 1 2\n"),
+                                   std::string("LegacyMail 70 1 2 any any\n"),
+                                   std::string("LegacyMail 70 1 2 any =4d\n"),
+                                   std::string("LegacyMail 70 1 2 none\n"),
+                                   std::string("LegacyMail -70 1 2 any\n"),
+                                   std::string("LegacyMail 70 1 2x any\n"),
+                                   std::string("LegacyMail  70 1 2 any\n"),
+                                   std::string("LegacyMail 99999999999999999999 1 2 any\n"),
+                                   std::string("LegacyMail 70 1 2 512 4d\n"),
+                                   std::string("LegacyMail 70 1 2 512 =4\n"),
+                                   std::string("LegacyMail 70 1 2 512 =4x\n"),
+                                   std::string("LegacyMail 70 1 2 512  =4d\n"),
+                                   std::string("LegacyMail 70 1 2 =4d\n"),
+                                   std::string("end\n"),
+                                   good + "end\n",
+                                   good + std::string("Legacy\0Mail 70 1 2 any\n", 22)}) {
     EXPECT_TRUE(CommitRecord::parse(first + lines + "end\n").stores.empty()) << lines;
   }
   EXPECT_TRUE(
@@ -93,14 +106,21 @@ TEST(CommitRecordTest, ACopyWithTheSameSizeAndTimeHasTheSameTrace) {
   EXPECT_NE(CommitRecord::traceOf(one), CommitRecord::traceOf(other));
 }
 
-/// A device with migrated settings, a store and a record that says it was carried over from older
-/// settings.
+/// A device with a migrated settings file with one account, a store, and a record that names the
+/// account.
 class InterruptedCommitTest : public testing::Test {
  protected:
   InterruptedCommitTest() {
-    snapshot.addPropertyList(DevicePlace::Settings, PropertyDictionary{{"Version", 12}});
+    setSettings(12, "M");
     snapshot.addFile(DevicePlace::LegacyMail, "store");
     snapshot.addFile(DevicePlace::RemovalSentinel, "removing");
+  }
+  void setSettings(int version, const char* identifier) {
+    snapshot.addPropertyList(
+        DevicePlace::Settings,
+        PropertyDictionary{
+            {"Version", version},
+            {"Accounts", PropertyArray{PropertyDictionary{{"Identifier", identifier}}}}});
   }
   [[nodiscard]] Trace traceAt(DevicePlace place) const {
     return CommitRecord::traceOf(snapshot.at(place).identity);
@@ -109,7 +129,7 @@ class InterruptedCommitTest : public testing::Test {
     snapshot.addFile(DevicePlace::CommitRecord, record.text());
   }
   void addRecord() {
-    addRecord(recordOf(DevicePlace::LegacyMail, traceAt(DevicePlace::LegacyMail), kStoreTrace));
+    addRecord(recordOf(DevicePlace::LegacyMail, traceAt(DevicePlace::LegacyMail)));
   }
   void expectStoreCounts(bool isCarriedOver) {
     Transaction transaction(snapshot, "/var/mobile");
@@ -147,7 +167,7 @@ TEST_F(InterruptedCommitTest, AStoreThatCameBackFromABackupStillCounts) {
 }
 
 TEST_F(InterruptedCommitTest, AnotherStoreIsConverted) {
-  addRecord(recordOf(DevicePlace::LegacyExchange, traceAt(DevicePlace::LegacyMail), kStoreTrace));
+  addRecord(recordOf(DevicePlace::LegacyExchange, traceAt(DevicePlace::LegacyMail)));
   Transaction transaction(snapshot, "/var/mobile");
   const CommitRecord needed = finishInterruptedCommit(transaction);
   EXPECT_TRUE(transaction.exists(DevicePlace::LegacyMail));
@@ -155,23 +175,26 @@ TEST_F(InterruptedCommitTest, AnotherStoreIsConverted) {
   EXPECT_EQ(needed.stores[0].place, DevicePlace::LegacyExchange);
 }
 
-TEST_F(InterruptedCommitTest, AStoreOfWhichTheSettingsFileHasNoAccountIsConverted) {
-  const auto namedMail = [](const char* identifierKey, const char* arrayKey) {
-    return PropertyDictionary{{"Version", 12},
-                              {arrayKey, PropertyArray{PropertyDictionary{{identifierKey, "M"}}}}};
-  };
-  snapshot.addPropertyList(DevicePlace::LegacyMail, namedMail("uniqueId", "MailAccounts"));
+TEST_F(InterruptedCommitTest, WithoutAnyOfTheRecordsAccountsTheStoreIsConverted) {
   addRecord();
-  // Another program may have written the settings file after a run that was killed too early.
+  // That of before, or one that another program wrote after a run that was killed too early.
+  setSettings(12, "another");
   expectStoreCounts(false);
-  snapshot.addPropertyList(DevicePlace::Settings, namedMail("Identifier", "Accounts"));
-  expectStoreCounts(true);
 }
 
-TEST_F(InterruptedCommitTest, WithTheOldSettingsFileTheStoreIsConverted) {
-  addRecord(recordOf(DevicePlace::LegacyMail, traceAt(DevicePlace::LegacyMail),
-                     traceAt(DevicePlace::Settings)));
-  expectStoreCounts(false);
+TEST_F(InterruptedCommitTest, WithoutAccountsInTheRecordTheSizeOfTheSettingsFileCounts) {
+  const std::uint64_t size = snapshot.at(DevicePlace::Settings).identity.size;
+  for (const std::uint64_t recorded : {size, size + 1}) {
+    addRecord(recordOf(DevicePlace::LegacyMail, traceAt(DevicePlace::LegacyMail),
+                       CommitRecord::Proof{.settingsSize = recorded}));
+    expectStoreCounts(recorded == size);
+  }
+}
+
+TEST_F(InterruptedCommitTest, AStoreThatWasCarriedOverBeforeTheRecordNeedsNoProof) {
+  addRecord(recordOf(DevicePlace::LegacyMail, traceAt(DevicePlace::LegacyMail), std::nullopt));
+  setSettings(12, "another");
+  expectStoreCounts(true);
 }
 
 TEST_F(InterruptedCommitTest, WithoutASettingsFileTheStoreIsConverted) {
@@ -182,7 +205,7 @@ TEST_F(InterruptedCommitTest, WithoutASettingsFileTheStoreIsConverted) {
 
 TEST_F(InterruptedCommitTest, WithASettingsFileOfAnotherVersionTheStoreIsConverted) {
   addRecord();
-  snapshot.addPropertyList(DevicePlace::Settings, PropertyDictionary{{"Version", 11}});
+  setSettings(11, "M");
   expectStoreCounts(false);
 }
 
@@ -195,13 +218,6 @@ TEST_F(InterruptedCommitTest, WithASettingsFileThatIsNoPropertyListTheStoreIsCon
 TEST_F(InterruptedCommitTest, AMalformedRecordVouchesForNothingAndGoes) {
   snapshot.addFile(DevicePlace::CommitRecord, "malformed");
   expectStoreCounts(false);
-}
-
-TEST_F(InterruptedCommitTest, ARecordWithAnAbsentStoreVouchesForNothing) {
-  addRecord(recordOf(DevicePlace::LegacyMail, Trace(), kStoreTrace));
-  snapshot.places[indexOf(DevicePlace::LegacyMail)] = FakeSnapshot().at(DevicePlace::LegacyMail);
-  Transaction transaction(snapshot, "/var/mobile");
-  EXPECT_TRUE(finishInterruptedCommit(transaction).stores.empty());
 }
 
 TEST_F(InterruptedCommitTest, ARecordThatCannotBeReadIsAFailureAndNotAMissingOne) {

@@ -35,7 +35,7 @@ class MigrationInMemoryTest : public MigrationTest {
     CommitRecord record;
     record.stores.push_back({DevicePlace::LegacyMail,
                              CommitRecord::traceOf(snapshot.at(DevicePlace::LegacyMail).identity),
-                             CommitRecord::Trace()});
+                             CommitRecord::Proof{.accounts = {"mail"}}});
     snapshot.addFile(DevicePlace::CommitRecord, record.text());
   }
 };
@@ -141,15 +141,16 @@ TEST_F(MigrationInMemoryTest, FilesAreKeptWhereThatIsAskedFor) {
   EXPECT_TRUE(proposal(KeepFiles::Always).keepsFiles);
 }
 
-TEST_F(MigrationInMemoryTest, TheRecordNamesEachStoreAndTheSettingsFileBefore) {
+TEST_F(MigrationInMemoryTest, TheRecordNamesEachStoreAndTheAccountsThatTheSettingsFileGot) {
   migrate();
   const CommitRecord record = proposedRecord();
   ASSERT_EQ(record.stores.size(), 1u);
   EXPECT_EQ(record.stores[0].place, DevicePlace::LegacyMail);
   EXPECT_EQ(record.stores[0].store,
             CommitRecord::traceOf(snapshot.at(DevicePlace::LegacyMail).identity));
-  EXPECT_EQ(record.stores[0].settingsBefore,
-            CommitRecord::traceOf(snapshot.at(DevicePlace::Settings).identity));
+  const CommitRecord::Proof proof = record.stores[0].proof.value();
+  EXPECT_THAT(proof.accounts, ElementsAre("mail"));
+  EXPECT_EQ(proof.settingsSize, contentsOf(proposal().changeOf(DevicePlace::Settings)).size());
 }
 
 TEST_F(MigrationInMemoryTest, WithoutStoresThereIsNoRecord) {
@@ -167,7 +168,7 @@ TEST_F(MigrationInMemoryTest, ARemovalWithoutASaveVouchesForWhatAnEarlierRunCarr
   remove(DevicePlace::RemovalSentinel);
   migration.verify(PluginResult::GaveTrue);
   ASSERT_EQ(proposedRecord().stores.size(), 1u);
-  EXPECT_TRUE(proposedRecord().stores[0].isOfEarlierRun);
+  EXPECT_FALSE(proposedRecord().stores[0].proof);
 }
 
 TEST_F(MigrationInMemoryTest, AStoreThatThePluginCouldNotRemoveIsForeseenAndTheRecordStays) {

@@ -256,8 +256,8 @@ TEST_F(SimulatedKernelTest, WhatIsOpenForReadingIsNotWritten) {
 
 TEST_F(SimulatedKernelTest, AnotherProcessGivesALockBackAfterSoManyCalls) {
   const int file = open("one");
-  kernel.lockByAnother("/home/one", 2,
-                       [](OtherProgram& program) { program.replace("/home/other", "third"); });
+  kernel.lockByAnother(
+      {"/home/one", 2, [](OtherProgram& program) { program.replace("/home/other", "third"); }});
 
   EXPECT_EQ(kernel.lock(file, LOCK_EX | LOCK_NB), -EWOULDBLOCK);
   EXPECT_EQ(kernel.lock(file, LOCK_EX), -EINTR);
@@ -268,7 +268,7 @@ TEST_F(SimulatedKernelTest, AnotherProcessGivesALockBackAfterSoManyCalls) {
 
 TEST_F(SimulatedKernelTest, WhoWaitsForEverIsToldSo) {
   const int file = open("one");
-  kernel.lockByAnother("/home/one", SimulatedKernel::kNever);
+  kernel.lockByAnother({.path = "/home/one", .count = SimulatedKernel::kNever});
 
   const auto wait = [&] {
     while (kernel.lock(file, LOCK_EX) != 0) {
