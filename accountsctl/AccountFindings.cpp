@@ -3,7 +3,7 @@
 #include <fmt/format.h>
 
 #include "accountsettings/AccountsManager.h"
-#include "propertylist/Description.h"
+#include "propertylist/value/Description.h"
 
 namespace accounts {
 namespace {

@@ -6,8 +6,8 @@
 #include "accountsctl/PropertyListInput.h"
 #include "commandline/ReplacedFile.h"
 #include "platform/linux/FileContents.h"
-#include "propertylist/BinaryPropertyList.h"
-#include "propertylist/XMLPropertyList.h"
+#include "propertylist/binary/BinaryPropertyList.h"
+#include "propertylist/xml/XMLPropertyList.h"
 
 namespace accounts {
 

@@ -1,7 +1,7 @@
 #include <fmt/format.h>
 
 #include "accountsctl/AccountFindings.h"
-#include "propertylist/Description.h"
+#include "propertylist/value/Description.h"
 
 namespace accounts {
 namespace {

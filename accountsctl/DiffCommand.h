@@ -4,7 +4,7 @@
 
 #include "accountsctl/CommandResult.h"
 #include "commandline/Terminal.h"
-#include "propertylist/SecretKeys.h"
+#include "propertylist/value/SecretKeys.h"
 
 namespace accounts {
 

@@ -5,9 +5,9 @@
 #include <functional>
 
 #include "accountsctl/AccountFindings.h"
-#include "accountsettings/AccountVocabulary.h"
 #include "migrator/LegacyDescriptions.h"
-#include "migrator/LegacyStoreKeys.h"
+#include "vocabulary/AccountVocabulary.h"
+#include "vocabulary/LegacyStoreKeys.h"
 
 namespace accounts {
 namespace {

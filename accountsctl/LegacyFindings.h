@@ -3,7 +3,7 @@
 #include <vector>
 
 #include "accountsctl/Finding.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

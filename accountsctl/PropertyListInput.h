@@ -4,7 +4,7 @@
 #include <variant>
 
 #include "commandline/ExitStatus.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

@@ -3,8 +3,8 @@
 #include "accountsctl/JSONText.h"
 #include "accountsctl/PropertyListInput.h"
 #include "inspection/StoreLayout.h"
-#include "propertylist/HiddenSecrets.h"
-#include "propertylist/XMLPropertyList.h"
+#include "propertylist/value/HiddenSecrets.h"
+#include "propertylist/xml/XMLPropertyList.h"
 
 namespace accounts {
 namespace {

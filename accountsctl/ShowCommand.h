@@ -5,8 +5,8 @@
 #include "accountsctl/CommandResult.h"
 #include "accountsctl/TextTable.h"
 #include "commandline/Terminal.h"
-#include "propertylist/PropertyValue.h"
-#include "propertylist/SecretKeys.h"
+#include "propertylist/value/PropertyValue.h"
+#include "propertylist/value/SecretKeys.h"
 
 namespace accounts {
 

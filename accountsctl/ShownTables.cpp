@@ -5,7 +5,7 @@
 #include "accountsettings/AccountsManager.h"
 #include "inspection/ListedAccount.h"
 #include "inspection/StoreLayout.h"
-#include "propertylist/Description.h"
+#include "propertylist/value/Description.h"
 
 namespace accounts {
 namespace {

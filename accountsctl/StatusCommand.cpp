@@ -10,7 +10,7 @@
 #include "accountsctl/TextTable.h"
 #include "accountsettings/AccountsManager.h"
 #include "commandline/BundleLocation.h"
-#include "propertylist/Description.h"
+#include "propertylist/value/Description.h"
 
 namespace accounts {
 namespace {

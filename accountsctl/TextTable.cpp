@@ -4,8 +4,8 @@
 
 #include <algorithm>
 
-#include "propertylist/Description.h"
-#include "propertylist/GeneralisedUTF8.h"
+#include "propertylist/value/Description.h"
+#include "propertylist/value/GeneralisedUTF8.h"
 
 namespace accounts {
 namespace {

@@ -4,7 +4,7 @@
 #include <string_view>
 
 #include "platform/AccountFramework.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

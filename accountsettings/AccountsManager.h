@@ -13,7 +13,7 @@
 #include "accountsettings/OrderedAccounts.h"
 #include "accountsettings/RuntimeFixer.h"
 #include "platform/SharedResources.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 extern "C" {
 /// The device path of the legacy Exchange account file.

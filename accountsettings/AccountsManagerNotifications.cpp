@@ -4,13 +4,13 @@
 #include "accountsettings/AccountsManager.h"
 #include "accountsettings/Log.h"
 #include "accountsettings/Process.h"
+#include "vocabulary/AccountClasses.h"
 
 namespace accounts {
 
 namespace {
 
 constexpr std::string_view kNotifierCreator = "NotifierAccount";
-constexpr std::string_view kIsActiveKey = "IsActive";
 
 constexpr std::string_view kNotifierClassNamesOperation =
     "+[AccountsManager _notifierClassNamesForAccountType:dataclass:]";

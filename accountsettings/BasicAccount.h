@@ -7,9 +7,9 @@
 #include <string_view>
 #include <vector>
 
-#include "accountsettings/AccountVocabulary.h"
 #include "platform/AccountFramework.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
+#include "vocabulary/AccountVocabulary.h"
 
 namespace accounts {
 

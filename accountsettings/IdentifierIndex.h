@@ -5,8 +5,8 @@
 #include <utility>
 #include <vector>
 
-#include "propertylist/ContentTable.h"
-#include "propertylist/Text.h"
+#include "propertylist/value/ContentTable.h"
+#include "propertylist/value/Text.h"
 
 namespace accounts {
 

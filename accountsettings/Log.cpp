@@ -4,8 +4,8 @@
 #include <cstdlib>
 
 #include "accountsettings/Process.h"
-#include "propertylist/Description.h"
-#include "propertylist/HiddenSecrets.h"
+#include "propertylist/value/Description.h"
+#include "propertylist/value/HiddenSecrets.h"
 
 namespace {
 

@@ -11,7 +11,7 @@
 #include <variant>
 
 #include "platform/LogSystem.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 extern "C" {
 /// The process-wide log channel of the account settings (subsystem "com.quarx.accountsettings",

@@ -11,7 +11,7 @@
 #include "accountsettings/IdentifierIndex.h"
 #include "accountsettings/OrderedAccounts.h"
 #include "accountsettings/RuntimeFixer.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

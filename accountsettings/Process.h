@@ -8,7 +8,7 @@
 #include "accountsettings/MailDirectoryMarkers.h"
 #include "accountsettings/MailServices.h"
 #include "platform/Platform.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

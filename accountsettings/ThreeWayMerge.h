@@ -1,6 +1,6 @@
 #pragma once
 
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

@@ -6,9 +6,9 @@
 #include <utility>
 #include <vector>
 
-#include "accountsettings/AccountVocabulary.h"
 #include "bench/AccountKinds.h"
 #include "bench/NumberSequence.h"
+#include "vocabulary/AccountVocabulary.h"
 
 namespace accounts {
 

@@ -3,7 +3,7 @@
 #include <cstddef>
 #include <cstdint>
 
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

@@ -2,7 +2,7 @@
 
 #include <array>
 
-#include "accountsettings/AccountVocabulary.h"
+#include "vocabulary/AccountVocabulary.h"
 
 namespace accounts {
 

@@ -9,7 +9,7 @@
 #include <system_error>
 
 #include "bench/AccountGenerator.h"
-#include "propertylist/BinaryPropertyList.h"
+#include "propertylist/binary/BinaryPropertyList.h"
 
 namespace accounts {
 

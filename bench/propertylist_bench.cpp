@@ -11,9 +11,9 @@
 #include <vector>
 
 #include "AccountsCorpus.h"
-#include "propertylist/BinaryPropertyList.h"
-#include "propertylist/BinaryPropertyListSerializer.h"
-#include "propertylist/XMLPropertyList.h"
+#include "propertylist/binary/BinaryPropertyList.h"
+#include "propertylist/binary/BinaryPropertyListSerializer.h"
+#include "propertylist/xml/XMLPropertyList.h"
 
 namespace accounts::bench {
 namespace {

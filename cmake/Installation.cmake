@@ -43,16 +43,16 @@ install(EXPORT AccountsFrameworkTargets NAMESPACE accounts::
   DESTINATION ${package_directory} COMPONENT ${development_component})
 foreach(header
     platform/AccountFramework.h
-    propertylist/Description.h
-    propertylist/PropertyArray.h
-    propertylist/PropertyContent.h
-    propertylist/PropertyDictionary.h
-    propertylist/PropertyKeys.h
-    propertylist/PropertyScalars.h
-    propertylist/PropertyValue.h
-    propertylist/SharedNode.h
-    propertylist/SharedRun.h
-    propertylist/Text.h)
+    propertylist/value/Description.h
+    propertylist/value/PropertyArray.h
+    propertylist/value/PropertyContent.h
+    propertylist/value/PropertyDictionary.h
+    propertylist/value/PropertyKeys.h
+    propertylist/value/PropertyScalars.h
+    propertylist/value/PropertyValue.h
+    propertylist/value/SharedNode.h
+    propertylist/value/SharedRun.h
+    propertylist/value/Text.h)
   cmake_path(GET header PARENT_PATH folder)
   install(FILES ${PROJECT_SOURCE_DIR}/${header}
     DESTINATION include/accounts/${folder} COMPONENT ${development_component})

@@ -8,7 +8,7 @@
 #include <iostream>
 
 #include "platform/linux/FileContents.h"
-#include "propertylist/Description.h"
+#include "propertylist/value/Description.h"
 
 namespace accounts {
 namespace {

@@ -3,8 +3,8 @@
 #include <array>
 #include <span>
 
-#include "accountsettings/AccountVocabulary.h"
 #include "fuzz/AnyValue.h"
+#include "vocabulary/AccountVocabulary.h"
 
 namespace accounts {
 

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "fuzz/FuzzInput.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

@@ -1,6 +1,6 @@
 #include "fuzz/FuzzTarget.h"
-#include "propertylist/BinaryPropertyList.h"
 #include "propertylist/PropertyListFile.h"
+#include "propertylist/binary/BinaryPropertyList.h"
 
 namespace accounts {
 

@@ -1,8 +1,8 @@
 #include <string>
 
 #include "fuzz/FuzzTarget.h"
-#include "propertylist/BinaryPropertyList.h"
 #include "propertylist/PropertyListFile.h"
+#include "propertylist/binary/BinaryPropertyList.h"
 
 namespace accounts {
 

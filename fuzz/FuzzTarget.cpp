@@ -5,7 +5,7 @@
 #include <cstdlib>
 #include <iostream>
 
-#include "propertylist/Description.h"
+#include "propertylist/value/Description.h"
 
 namespace accounts {
 

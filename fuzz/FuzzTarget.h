@@ -2,7 +2,7 @@
 
 #include <string_view>
 
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

@@ -1,6 +1,6 @@
 #include "fuzz/FuzzTarget.h"
-#include "propertylist/BinaryPropertyList.h"
-#include "propertylist/XMLPropertyList.h"
+#include "propertylist/binary/BinaryPropertyList.h"
+#include "propertylist/xml/XMLPropertyList.h"
 
 namespace accounts {
 

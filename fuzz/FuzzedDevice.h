@@ -4,7 +4,7 @@
 #include <string_view>
 
 #include "fuzz/FuzzInput.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 #include "tests/fakes/FakePlatform.h"
 
 namespace accounts {

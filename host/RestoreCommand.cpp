@@ -13,7 +13,7 @@
 #include "platform/linux/LinuxFileSystem.h"
 #include "platform/linux/LinuxHostLocks.h"
 #include "platform/linux/LinuxPlatform.h"
-#include "propertylist/Description.h"
+#include "propertylist/value/Description.h"
 #include "safetynet/MigrationRun.h"
 
 namespace accounts {

@@ -6,7 +6,7 @@
 #include "commandline/Terminal.h"
 #include "host/DeviceOptions.h"
 #include "host/ReportFiles.h"
-#include "propertylist/SecretKeys.h"
+#include "propertylist/value/SecretKeys.h"
 #include "safetynet/MigrationRun.h"
 
 namespace accounts {

@@ -1,7 +1,7 @@
 #include "host/RunReport.h"
 
 #include "inspection/PropertyListJSON.h"
-#include "propertylist/Description.h"
+#include "propertylist/value/Description.h"
 
 namespace accounts {
 namespace {

@@ -4,9 +4,9 @@
 #include <utility>
 #include <vector>
 
-#include "accountsettings/AccountVocabulary.h"
 #include "inspection/ListedAccount.h"
-#include "propertylist/HiddenSecrets.h"
+#include "propertylist/value/HiddenSecrets.h"
+#include "vocabulary/AccountVocabulary.h"
 
 namespace accounts {
 namespace {

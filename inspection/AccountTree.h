@@ -2,7 +2,7 @@
 
 #include "inspection/PropertyListJSON.h"
 #include "inspection/StoreLayout.h"
-#include "propertylist/SecretKeys.h"
+#include "propertylist/value/SecretKeys.h"
 
 namespace accounts {
 

@@ -2,7 +2,7 @@
 
 #include <fmt/format.h>
 
-#include "propertylist/Description.h"
+#include "propertylist/value/Description.h"
 
 namespace accounts {
 namespace {

@@ -1,7 +1,7 @@
 #include "inspection/ListedAccount.h"
 
-#include "propertylist/Description.h"
-#include "propertylist/HiddenSecrets.h"
+#include "propertylist/value/Description.h"
+#include "propertylist/value/HiddenSecrets.h"
 
 namespace accounts {
 namespace {

@@ -6,7 +6,7 @@
 #include <vector>
 
 #include "inspection/StoreLayout.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

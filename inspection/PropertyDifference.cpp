@@ -1,6 +1,6 @@
 #include "inspection/PropertyDifference.h"
 
-#include "propertylist/HiddenSecrets.h"
+#include "propertylist/value/HiddenSecrets.h"
 
 namespace accounts {
 namespace {

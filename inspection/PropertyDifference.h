@@ -4,8 +4,8 @@
 #include <string>
 #include <vector>
 
-#include "propertylist/PropertyValue.h"
-#include "propertylist/SecretKeys.h"
+#include "propertylist/value/PropertyValue.h"
+#include "propertylist/value/SecretKeys.h"
 
 namespace accounts {
 

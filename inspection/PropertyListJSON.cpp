@@ -2,7 +2,7 @@
 
 #include <cmath>
 
-#include "propertylist/Description.h"
+#include "propertylist/value/Description.h"
 
 namespace accounts {
 namespace {

@@ -4,7 +4,7 @@
 #include <optional>
 #include <string>
 
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

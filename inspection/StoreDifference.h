@@ -7,8 +7,8 @@
 #include "inspection/ListedAccount.h"
 #include "inspection/PropertyDifference.h"
 #include "inspection/StoreLayout.h"
-#include "propertylist/PropertyValue.h"
-#include "propertylist/SecretKeys.h"
+#include "propertylist/value/PropertyValue.h"
+#include "propertylist/value/SecretKeys.h"
 
 namespace accounts {
 

@@ -3,9 +3,9 @@
 #include <algorithm>
 #include <iterator>
 
-#include "accountsettings/AccountVocabulary.h"
-#include "migrator/LegacyStoreKeys.h"
 #include "platform/linux/DeviceDescription.h"
+#include "vocabulary/AccountVocabulary.h"
+#include "vocabulary/LegacyStoreKeys.h"
 
 namespace accounts {
 namespace {

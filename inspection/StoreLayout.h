@@ -5,7 +5,7 @@
 #include <string_view>
 #include <vector>
 
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

@@ -10,7 +10,7 @@
 #include "accountsettings/AccountsManager.h"
 #include "accountsettings/BasicAccount.h"
 #include "platform/MigrationPluginBase.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 extern "C" {
 /// Whether this device's region calls the Gmail service "Google Mail"; asked of the device once per

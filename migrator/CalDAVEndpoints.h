@@ -8,7 +8,7 @@
 #include <string_view>
 #include <vector>
 
-#include "propertylist/Text.h"
+#include "propertylist/value/Text.h"
 
 namespace accounts {
 

@@ -5,7 +5,7 @@
 
 #include "accountsettings/MailServices.h"
 #include "migrator/AccountsDataMigrator.h"
-#include "migrator/MailAccountClasses.h"
+#include "migrator/HasClass.h"
 #include "migrator/URLEscaping.h"
 
 namespace accounts {
@@ -21,8 +21,8 @@ struct CalendarService {
 };
 
 constexpr std::array<CalendarService, 2> calendarServices = {{
-    {gmailAccountClass, &MailServices::googleCalDAVHost, "/calendar/dav/", "/user"},
-    {yahooAccountClass, &MailServices::yahooCalDAVHost, "/principals/users/", ""},
+    {kGmailAccountClass, &MailServices::googleCalDAVHost, "/calendar/dav/", "/user"},
+    {kYahooAccountClass, &MailServices::yahooCalDAVHost, "/principals/users/", ""},
 }};
 
 /// The calendar service of an account's class, null for none.

@@ -3,7 +3,7 @@
 #include "accountsettings/Log.h"
 #include "accountsettings/Process.h"
 #include "migrator/AccountsDataMigrator.h"
-#include "migrator/MailAccountClasses.h"
+#include "migrator/HasClass.h"
 
 namespace accounts {
 
@@ -140,7 +140,7 @@ bool AccountsDataMigrator::_migrateAccountsFrom9A182(AccountsManager& store) {
   bool primaryFound = false;
   for (const BasicAccountReference& account : store.allBasicSyncableAccounts()) {
     addReminders(*account);
-    if (!hasClass(*account, cloudAccountClass)) {
+    if (!hasClass(*account, kCloudAccountClass)) {
       continue;
     }
     if (hasStatus(*account, CloudStatus::StandsForHostedService)) {
@@ -169,7 +169,7 @@ bool AccountsDataMigrator::_migrateAccountsFrom9A334(AccountsManager& store) {
   for (const BasicAccountReference& account :
        store.basicAccountsWithTypes({kQuarxAccountType, kVelmoraAccountType})) {
     fixSecondaryAccount(*account);
-    if (!hasClass(*account, cloudAccountClass)) {
+    if (!hasClass(*account, kCloudAccountClass)) {
       continue;
     }
     if (hasStatus(*account, CloudStatus::StandsForHostedService) &&

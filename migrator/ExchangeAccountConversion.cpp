@@ -4,7 +4,7 @@
 #include "accountsettings/Process.h"
 #include "migrator/AccountsDataMigrator.h"
 #include "migrator/LegacyDescriptions.h"
-#include "migrator/LegacyStoreKeys.h"
+#include "vocabulary/LegacyStoreKeys.h"
 
 namespace accounts {
 

@@ -4,7 +4,7 @@
 #include "accountsettings/Log.h"
 #include "accountsettings/Process.h"
 #include "migrator/AccountsDataMigrator.h"
-#include "migrator/MailAccountClasses.h"
+#include "migrator/HasClass.h"
 
 // The steps of 7A149 to 7A241. That of 7A242 has a file of its own.
 

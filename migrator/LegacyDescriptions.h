@@ -7,7 +7,7 @@
 
 #include "accountsettings/AccountsManager.h"
 #include "accountsettings/Log.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

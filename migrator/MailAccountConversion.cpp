@@ -5,9 +5,9 @@
 #include "accountsettings/Log.h"
 #include "accountsettings/Process.h"
 #include "migrator/AccountsDataMigrator.h"
+#include "migrator/HasClass.h"
 #include "migrator/LegacyDescriptions.h"
-#include "migrator/LegacyStoreKeys.h"
-#include "migrator/MailAccountClasses.h"
+#include "vocabulary/LegacyStoreKeys.h"
 
 bool _UseGoogleMail() {
   accounts::Process& process = accounts::Process::current();
@@ -39,15 +39,15 @@ struct MailAccountKind {
 };
 
 const std::array<MailAccountKind, 8> mailAccountKinds = {{
-    {gmailAccountClass, kGmailAccountType, "Gmail"},
-    {marrowAccountClass, kVelmoraAccountType, "Velmora"},
-    {velmoraAccountClass, kVelmoraAccountType, "Velmora"},
-    {tolvaneIMAPAccountClass, kTolvaneIMAPAccountType, "Stratix"},
+    {kGmailAccountClass, kGmailAccountType, "Gmail"},
+    {kMarrowAccountClass, kVelmoraAccountType, "Velmora"},
+    {kVelmoraAccountClass, kVelmoraAccountType, "Velmora"},
+    {kTolvaneIMAPAccountClass, kTolvaneIMAPAccountType, "Stratix"},
     // The service's name ends with the left-to-right mark U+200E.
-    {yahooAccountClass, kYahooAccountType, "Yahoo!\xE2\x80\x8E"},
-    {dataAccessMailAccountClass, kExchangeAccountType, "Exchange ActiveSync"},
-    {deliveryAccountClass, kSMTPAccountType, "Account"},
-    {smtpAccountClass, kSMTPAccountType, "Account"},
+    {kYahooAccountClass, kYahooAccountType, "Yahoo!\xE2\x80\x8E"},
+    {kDataAccessMailAccountClass, kExchangeAccountType, "Exchange ActiveSync"},
+    {kDeliveryAccountClass, kSMTPAccountType, "Account"},
+    {kSMTPAccountClass, kSMTPAccountType, "Account"},
 }};
 const MailAccountKind anyOtherMailAccountKind = {{}, kMailAccountType, "Account"};
 constexpr std::string_view gmailTypeStringInGoogleMailRegions = "Google Mail";
@@ -76,7 +76,7 @@ PropertyDictionary accountPropertiesOfMailDescription(const PropertyDictionary& 
 
   std::optional<Text> accountClass = properties.textForKey(kAccountClass);
   if (!accountClass && type == kSMTPAccountType) {
-    accountClass = smtpAccountClass;
+    accountClass = kSMTPAccountClass;
     properties.set(kAccountClass, *accountClass);
   }
   if (accountClass) {
@@ -151,7 +151,7 @@ BasicAccountReference AccountsDataMigrator::_convertMailAccountDescription_type(
   if (syncIdentifier) {
     record->setAccountProperty_forKey(*syncIdentifier, kAccountSyncIdentifier);
   }
-  if (record->accountClass() == genericMailAccountClass) {
+  if (record->accountClass() == kGenericMailAccountClass) {
     reportMailAccountClassFound();
   }
   return record;
@@ -169,7 +169,7 @@ std::string_view AccountsDataMigrator::_accountTypeStringForMailAccountClass(
 
 std::string_view AccountsDataMigrator::_accountShortTypeStringForMailAccountClass(
     std::string_view accountClass) {
-  if (accountClass == gmailAccountClass && _UseGoogleMail()) {
+  if (accountClass == kGmailAccountClass && _UseGoogleMail()) {
     return gmailTypeStringInGoogleMailRegions;
   }
   return kindOfMailAccountClass(accountClass).typeString;

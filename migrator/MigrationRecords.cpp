@@ -2,7 +2,7 @@
 #include "accountsettings/Paths.h"
 #include "accountsettings/Process.h"
 #include "migrator/AccountsDataMigrator.h"
-#include "migrator/LegacyStoreKeys.h"
+#include "vocabulary/LegacyStoreKeys.h"
 
 namespace accounts {
 

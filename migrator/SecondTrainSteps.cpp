@@ -3,15 +3,15 @@
 #include "accountsettings/MailServices.h"
 #include "accountsettings/Process.h"
 #include "migrator/AccountsDataMigrator.h"
-#include "migrator/MailAccountClasses.h"
+#include "migrator/HasClass.h"
 
 namespace accounts {
 
 namespace {
 
-constexpr std::array hostedServiceClasses = {velmoraAccountClass, marrowAccountClass};
-constexpr std::array mailOnlyClasses = {imapAccountClass, gmailAccountClass, yahooAccountClass,
-                                        aolAccountClass, popAccountClass};
+constexpr std::array hostedServiceClasses = {kVelmoraAccountClass, kMarrowAccountClass};
+constexpr std::array mailOnlyClasses = {kIMAPAccountClass, kGmailAccountClass, kYahooAccountClass,
+                                        kAOLAccountClass, kPOPAccountClass};
 
 constexpr std::string_view calDAVEnabledKey = "CalDAVEnabled";
 constexpr std::string_view exoSubscribedCalendarsKey = "DAExoSubscribedCalendarInfos";
@@ -32,8 +32,8 @@ std::string hostedServiceAddress(std::string_view username, std::string_view acc
   if (username.find('@') == std::string_view::npos) {
     const MailServices& services = MailServices::current();
     address += '@';
-    address += accountClass == marrowAccountClass ? services.earliestHostedDomain
-                                                  : services.laterHostedDomain;
+    address += accountClass == kMarrowAccountClass ? services.earliestHostedDomain
+                                                   : services.laterHostedDomain;
   }
   return address;
 }
@@ -80,7 +80,7 @@ void wrapHostedServiceAccount(AccountsManager& store, const BasicAccountReferenc
   // Kept on purpose: an account that does not say whether it is active counts as inactive here,
   // while the steps of 7A242 and 8C136 count it as active.
   constexpr bool activeIfAbsent = false;
-  if (hosted->booleanPropertyForKey(isActiveKey).value_or(activeIfAbsent)) {
+  if (hosted->booleanPropertyForKey(kIsActiveKey).value_or(activeIfAbsent)) {
     parent->setEnabled_forDataclass(true, kAccountDataclassMail);
   }
   for (const std::string_view key : movedKeys) {
@@ -151,12 +151,12 @@ bool AccountsDataMigrator::_migrateAccountsFrom8B117(AccountsManager& store) {
 
 bool AccountsDataMigrator::_migrateAccountsFrom8C136(AccountsManager& store) {
   for (const BasicAccountReference& account : store.allBasicAccounts()) {
-    if (hasClass(*account, cloudAccountClass)) {
+    if (hasClass(*account, kCloudAccountClass)) {
       removeHostedServiceDisplayNames(*account);
     }
     constexpr bool activeIfAbsent = true;
     if (hasClassAmong(*account, mailOnlyClasses) &&
-        account->booleanPropertyForKey(isActiveKey).value_or(activeIfAbsent)) {
+        account->booleanPropertyForKey(kIsActiveKey).value_or(activeIfAbsent)) {
       account->setEnabled_forDataclass(true, kAccountDataclassMail);
     }
   }

@@ -3,8 +3,8 @@
 #include <algorithm>
 
 #include "accountsettings/Process.h"
-#include "migrator/LegacyStoreKeys.h"
 #include "migrator/MigrationStage.h"
+#include "vocabulary/LegacyStoreKeys.h"
 
 namespace accounts {
 

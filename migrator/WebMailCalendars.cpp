@@ -3,7 +3,7 @@
 
 #include "migrator/AccountsDataMigrator.h"
 #include "migrator/CalDAVMatching.h"
-#include "migrator/MailAccountClasses.h"
+#include "migrator/HasClass.h"
 
 // The step of 7A242: mail and notes for web-mail accounts, and their calendars folded into them.
 
@@ -11,8 +11,8 @@ namespace accounts {
 
 namespace {
 
-constexpr std::array webMailClasses = {imapAccountClass, gmailAccountClass, yahooAccountClass,
-                                       aolAccountClass, velmoraAccountClass};
+constexpr std::array webMailClasses = {kIMAPAccountClass, kGmailAccountClass, kYahooAccountClass,
+                                       kAOLAccountClass, kVelmoraAccountClass};
 
 /// A mail service whose accounts take stand-alone CalDAV accounts in, and the type that its
 /// accounts get.
@@ -22,8 +22,8 @@ struct UmbrellaService {
 };
 
 const std::array<UmbrellaService, 2> umbrellaServices = {{
-    {gmailAccountClass, kGmailAccountType},
-    {yahooAccountClass, kYahooAccountType},
+    {kGmailAccountClass, kGmailAccountType},
+    {kYahooAccountClass, kYahooAccountType},
 }};
 
 /// The stand-alone CalDAV accounts of a store, in order, and those of them that umbrella accounts
@@ -61,7 +61,7 @@ class CalDAVAccounts {
   static AccountsManager::Accounts amongAll(const AccountsManager::Accounts& all) {
     AccountsManager::Accounts calDAVAccounts;
     for (const BasicAccountReference& account : all) {
-      if (hasClass(*account, calDAVAccountClass)) {
+      if (hasClass(*account, kCalDAVAccountClass)) {
         calDAVAccounts.push_back(account);
       }
     }
@@ -85,7 +85,7 @@ class CalDAVAccounts {
 void enableMailAndNotes(BasicAccount& account) {
   constexpr bool activeIfAbsent = true;
   if (hasClassAmong(account, webMailClasses) &&
-      account.booleanPropertyForKey(isActiveKey).value_or(activeIfAbsent)) {
+      account.booleanPropertyForKey(kIsActiveKey).value_or(activeIfAbsent)) {
     account.setEnabled_forDataclass(true, kAccountDataclassMail);
     account.setEnabled_forDataclass(true, kAccountDataclassNotes);
   }

@@ -6,7 +6,7 @@
 #include <string>
 #include <string_view>
 
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

@@ -3,7 +3,7 @@
 #include <optional>
 #include <string_view>
 
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

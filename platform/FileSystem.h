@@ -7,7 +7,7 @@
 #include <vector>
 
 #include "platform/Result.h"
-#include "propertylist/SerializedPropertyList.h"
+#include "propertylist/value/SerializedPropertyList.h"
 
 namespace accounts {
 

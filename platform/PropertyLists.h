@@ -4,8 +4,8 @@
 #include <string_view>
 
 #include "platform/Result.h"
-#include "propertylist/PropertyValue.h"
-#include "propertylist/SerializedPropertyList.h"
+#include "propertylist/value/PropertyValue.h"
+#include "propertylist/value/SerializedPropertyList.h"
 
 namespace accounts {
 

@@ -1,7 +1,7 @@
 #include "propertylist/PropertyListFile.h"
 
-#include "propertylist/BinaryPropertyList.h"
-#include "propertylist/XMLPropertyList.h"
+#include "propertylist/binary/BinaryPropertyList.h"
+#include "propertylist/xml/XMLPropertyList.h"
 
 namespace accounts {
 

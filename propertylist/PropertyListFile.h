@@ -4,7 +4,7 @@
 #include <string_view>
 
 #include "propertylist/PropertyListError.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

@@ -2,10 +2,10 @@
 
 #include <utility>
 
-#include "accountsettings/AccountVocabulary.h"
 #include "inspection/AccountTree.h"
 #include "inspection/DifferenceJSON.h"
 #include "report/RecordedEvents.h"
+#include "vocabulary/AccountVocabulary.h"
 
 namespace accounts {
 namespace {

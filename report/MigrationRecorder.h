@@ -12,7 +12,7 @@
 #include "inspection/PropertyListJSON.h"
 #include "inspection/StoreLayout.h"
 #include "platform/MigrationObserver.h"
-#include "propertylist/SecretKeys.h"
+#include "propertylist/value/SecretKeys.h"
 
 namespace accounts {
 

@@ -10,8 +10,8 @@
 #include <vector>
 
 #include "platform/DeviceSnapshot.h"
-#include "propertylist/PropertyValue.h"
-#include "propertylist/SerializedPropertyList.h"
+#include "propertylist/value/PropertyValue.h"
+#include "propertylist/value/SerializedPropertyList.h"
 
 namespace accounts {
 

@@ -6,7 +6,7 @@
 #include <utility>
 
 #include "platform/AccountFramework.h"
-#include "propertylist/Description.h"
+#include "propertylist/value/Description.h"
 
 // What the example frameworks share. A real framework has its protocols in the place of these
 // classes.

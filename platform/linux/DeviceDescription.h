@@ -9,7 +9,7 @@
 #include "platform/ProfileRestrictions.h"
 #include "platform/linux/DeviceRoot.h"
 #include "platform/linux/PathError.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

@@ -7,7 +7,7 @@
 #include "platform/linux/DeviceRoot.h"
 #include "platform/linux/FileContents.h"
 #include "platform/linux/PathError.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

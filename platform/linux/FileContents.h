@@ -9,7 +9,7 @@
 #include "platform/linux/FileDescriptor.h"
 #include "platform/linux/PathError.h"
 #include "propertylist/PropertyListLimits.h"
-#include "propertylist/SerializedPropertyList.h"
+#include "propertylist/value/SerializedPropertyList.h"
 
 namespace accounts {
 

@@ -6,7 +6,7 @@
 #include "platform/PropertyLists.h"
 #include "platform/linux/DeviceRoot.h"
 #include "platform/linux/PathError.h"
-#include "propertylist/BinaryPropertyListSerializer.h"
+#include "propertylist/binary/BinaryPropertyListSerializer.h"
 
 namespace accounts {
 

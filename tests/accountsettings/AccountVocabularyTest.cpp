@@ -1,4 +1,4 @@
-#include "accountsettings/AccountVocabulary.h"
+#include "vocabulary/AccountVocabulary.h"
 
 #include <gtest/gtest.h>
 

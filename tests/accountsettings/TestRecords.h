@@ -5,7 +5,7 @@
 #include <string_view>
 
 #include "accountsettings/BasicAccount.h"
-#include "propertylist/Description.h"
+#include "propertylist/value/Description.h"
 #include "tests/fakes/FakePlatform.h"
 
 namespace accounts {

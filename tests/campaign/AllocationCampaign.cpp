@@ -2,8 +2,8 @@
 #include <new>
 #include <string>
 
-#include "propertylist/BinaryPropertyList.h"
-#include "propertylist/XMLPropertyList.h"
+#include "propertylist/binary/BinaryPropertyList.h"
+#include "propertylist/xml/XMLPropertyList.h"
 #include "tests/campaign/AllocationFailures.h"
 #include "tests/campaign/Campaigns.h"
 

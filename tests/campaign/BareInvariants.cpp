@@ -3,10 +3,10 @@
 #include <algorithm>
 #include <array>
 
-#include "accountsettings/AccountVocabulary.h"
 #include "accountsettings/AccountsManager.h"
 #include "tests/campaign/SettingsContents.h"
 #include "tests/program/StoredVersionsComparison.h"
+#include "vocabulary/AccountVocabulary.h"
 
 namespace accounts {
 

@@ -6,7 +6,7 @@
 #include <unordered_map>
 #include <vector>
 
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 #include "tests/campaign/Invariants.h"
 
 namespace accounts {

@@ -5,9 +5,9 @@
 #include <stdexcept>
 #include <utility>
 
-#include "accountsettings/AccountVocabulary.h"
 #include "tests/campaign/AllocationFailures.h"
 #include "tests/campaign/SimulatedKernel.h"
+#include "vocabulary/AccountVocabulary.h"
 
 namespace accounts {
 

@@ -5,7 +5,7 @@
 #include <string>
 
 #include "commandline/ExitStatus.h"
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 #include "tests/campaign/SimulatedDisk.h"
 #include "vocabulary/DevicePlaces.h"
 

@@ -3,11 +3,11 @@
 #include <iterator>
 #include <stdexcept>
 
-#include "accountsettings/AccountVocabulary.h"
-#include "propertylist/BinaryPropertyList.h"
 #include "propertylist/PropertyListFile.h"
+#include "propertylist/binary/BinaryPropertyList.h"
 #include "tests/campaign/Run.h"
 #include "tests/campaign/Scenario.h"
+#include "vocabulary/AccountVocabulary.h"
 
 namespace accounts {
 

@@ -4,11 +4,11 @@
 #include <array>
 #include <iterator>
 
-#include "accountsettings/AccountVocabulary.h"
 #include "accountsettings/AccountsManager.h"
-#include "propertylist/BinaryPropertyList.h"
 #include "propertylist/PropertyListFile.h"
+#include "propertylist/binary/BinaryPropertyList.h"
 #include "tests/program/StoredVersionsComparison.h"
+#include "vocabulary/AccountVocabulary.h"
 
 namespace accounts {
 

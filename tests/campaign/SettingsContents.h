@@ -5,7 +5,7 @@
 #include <string>
 #include <string_view>
 
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 #include "tests/campaign/SimulatedDisk.h"
 
 namespace accounts {

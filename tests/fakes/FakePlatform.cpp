@@ -1,7 +1,7 @@
 #include "tests/fakes/FakePlatform.h"
 
-#include "propertylist/BinaryPropertyList.h"
 #include "propertylist/PropertyListFile.h"
+#include "propertylist/binary/BinaryPropertyList.h"
 
 namespace accounts {
 

@@ -5,8 +5,8 @@
 #include <iostream>
 #include <iterator>
 
-#include "propertylist/BinaryPropertyList.h"
 #include "propertylist/PropertyListFile.h"
+#include "propertylist/binary/BinaryPropertyList.h"
 
 namespace accounts {
 

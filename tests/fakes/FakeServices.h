@@ -10,7 +10,7 @@
 #include <vector>
 
 #include "platform/Platform.h"
-#include "propertylist/BinaryPropertyListSerializer.h"
+#include "propertylist/binary/BinaryPropertyListSerializer.h"
 #include "tests/fakes/FakeFileSystem.h"
 #include "tests/fakes/FakeFrameworkLoader.h"
 

@@ -9,7 +9,7 @@
 #include <utility>
 
 #include "platform/DeviceSnapshot.h"
-#include "propertylist/BinaryPropertyList.h"
+#include "propertylist/binary/BinaryPropertyList.h"
 
 namespace accounts {
 

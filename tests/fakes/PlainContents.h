@@ -2,7 +2,7 @@
 
 #include <string_view>
 
-#include "propertylist/SerializedPropertyList.h"
+#include "propertylist/value/SerializedPropertyList.h"
 
 namespace accounts {
 

@@ -6,8 +6,8 @@
 #include <fstream>
 #include <sstream>
 
-#include "propertylist/BinaryPropertyList.h"
 #include "propertylist/PropertyListFile.h"
+#include "propertylist/binary/BinaryPropertyList.h"
 #include "tests/program/DeviceRootFixture.h"
 #include "tests/program/Programs.h"
 

@@ -1,4 +1,4 @@
-#include "migrator/MailAccountClasses.h"
+#include "migrator/HasClass.h"
 
 #include "tests/migrator/MigratorFixture.h"
 

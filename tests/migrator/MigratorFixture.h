@@ -13,7 +13,7 @@
 
 #include "accountsettings/AccountsManager.h"
 #include "migrator/AccountsDataMigrator.h"
-#include "propertylist/Description.h"
+#include "propertylist/value/Description.h"
 #include "tests/fakes/FakePlatform.h"
 
 namespace accounts {

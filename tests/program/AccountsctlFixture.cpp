@@ -7,8 +7,8 @@
 #include <optional>
 #include <sstream>
 
-#include "propertylist/BinaryPropertyList.h"
 #include "propertylist/PropertyListFile.h"
+#include "propertylist/binary/BinaryPropertyList.h"
 #include "tests/program/Programs.h"
 
 namespace accounts {

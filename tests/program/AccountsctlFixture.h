@@ -7,7 +7,7 @@
 #include <string_view>
 #include <vector>
 
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 #include "tests/program/DeviceRootFixture.h"
 #include "tests/program/ExitStatuses.h"
 #include "tests/program/RunProgram.h"

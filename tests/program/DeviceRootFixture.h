@@ -10,7 +10,7 @@
 #include <string_view>
 #include <vector>
 
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 #include "tests/program/RunProgram.h"
 
 namespace accounts {

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 #include "tests/program/Choices.h"
 
 namespace accounts {

@@ -9,10 +9,10 @@
 #include <iomanip>
 #include <sstream>
 
-#include "propertylist/BinaryPropertyList.h"
-#include "propertylist/Description.h"
 #include "propertylist/PropertyListFile.h"
-#include "propertylist/XMLPropertyList.h"
+#include "propertylist/binary/BinaryPropertyList.h"
+#include "propertylist/value/Description.h"
+#include "propertylist/xml/XMLPropertyList.h"
 #include "tests/program/DeviceRootFixture.h"
 #include "tests/program/GeneratedAccounts.h"
 

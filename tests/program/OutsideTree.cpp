@@ -11,7 +11,7 @@
 #include <sstream>
 #include <vector>
 
-#include "propertylist/BinaryPropertyList.h"
+#include "propertylist/binary/BinaryPropertyList.h"
 #include "tests/program/DeviceRootFixture.h"
 
 namespace accounts {

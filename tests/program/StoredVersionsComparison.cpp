@@ -5,7 +5,7 @@
 #include <map>
 #include <optional>
 
-#include "propertylist/Description.h"
+#include "propertylist/value/Description.h"
 
 namespace accounts {
 namespace {

@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "propertylist/PropertyValue.h"
+#include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 

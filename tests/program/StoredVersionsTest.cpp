@@ -11,8 +11,8 @@
 #include <regex>
 #include <sstream>
 
-#include "propertylist/BinaryPropertyList.h"
 #include "propertylist/PropertyListFile.h"
+#include "propertylist/binary/BinaryPropertyList.h"
 #include "tests/program/DeviceRootFixture.h"
 #include "tests/program/StoredVersionsComparison.h"
 

@@ -6,7 +6,7 @@
 #include <fstream>
 #include <string>
 
-#include "PropertyListTesting.h"
+#include "tests/propertylist/PropertyListTesting.h"
 
 namespace accounts {
 namespace {

@@ -2,7 +2,7 @@
 
 #include <gtest/gtest.h>
 
-#include "PropertyListTesting.h"
+#include "tests/propertylist/PropertyListTesting.h"
 
 namespace accounts {
 namespace {

@@ -1,4 +1,4 @@
-#include "PropertyListTesting.h"
+#include "tests/propertylist/PropertyListTesting.h"
 
 #include <bit>
 #include <limits>

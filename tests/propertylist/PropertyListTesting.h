@@ -8,9 +8,9 @@
 #include <string_view>
 #include <vector>
 
-#include "propertylist/BinaryPropertyList.h"
-#include "propertylist/SerializedPropertyList.h"
-#include "propertylist/XMLPropertyList.h"
+#include "propertylist/binary/BinaryPropertyList.h"
+#include "propertylist/value/SerializedPropertyList.h"
+#include "propertylist/xml/XMLPropertyList.h"
 
 namespace accounts::testing {
 

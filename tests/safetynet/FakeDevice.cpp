@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "propertylist/BinaryPropertyList.h"
+#include "propertylist/binary/BinaryPropertyList.h"
 
 namespace accounts {
 namespace {

@@ -7,7 +7,7 @@
 #include <string_view>
 #include <vector>
 
-#include "propertylist/BinaryPropertyListSerializer.h"
+#include "propertylist/binary/BinaryPropertyListSerializer.h"
 #include "safetynet/MigrationInMemory.h"
 #include "tests/fakes/FakeSnapshot.h"
 

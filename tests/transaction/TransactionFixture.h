@@ -8,7 +8,7 @@
 #include <variant>
 #include <vector>
 
-#include "propertylist/BinaryPropertyListSerializer.h"
+#include "propertylist/binary/BinaryPropertyListSerializer.h"
 #include "tests/fakes/FakeSnapshot.h"
 #include "transaction/TransactionFileSystem.h"
 

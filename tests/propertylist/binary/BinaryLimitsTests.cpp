@@ -1,0 +1,176 @@
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+#include "propertylist/PropertyListLimits.h"
+#include "tests/propertylist/PropertyListTesting.h"
+
+// Each limit of the reader at its bound: the last file that it accepts and the first that it
+// refuses.
+
+namespace accounts {
+namespace {
+
+using testing::BinaryFile;
+using testing::contains;
+using testing::errorOfReadingBinary;
+using testing::kArrayOfOne;
+using testing::kArrayOfTwo;
+using testing::kDictionaryOfOne;
+using testing::readBinary;
+
+/// Adds arrays of two, each twice in the next, and returns the number of the last. It stands for
+/// 2^depth - 1 values.
+std::size_t addDoublingArrays(BinaryFile& file, std::size_t depth) {
+  std::size_t array = file.add("\xA0");
+  for (std::size_t level = 1; level < depth; ++level) {
+    array = file.addContainer(kArrayOfTwo, {array, array});
+  }
+  return array;
+}
+
+constexpr std::size_t kDepthOfNearlyAllValues = 24;
+static_assert(kMaximumExpandedValueCount == std::uint64_t{1} << kDepthOfNearlyAllValues);
+
+TEST(BinaryLimits, AContainerMayStandForAsManyValuesAsTheLimit) {
+  BinaryFile file;
+  const std::size_t nearlyAll = addDoublingArrays(file, kDepthOfNearlyAllValues);
+  file.addContainer(kArrayOfOne, {nearlyAll});
+
+  EXPECT_EQ(readBinary(file.build()).kind(), PropertyKind::Array);
+}
+
+TEST(BinaryLimits, OneValueMoreThanTheLimitIsRefused) {
+  BinaryFile file;
+  const std::size_t scalar = file.add("\x08");
+  const std::size_t nearlyAll = addDoublingArrays(file, kDepthOfNearlyAllValues);
+  file.addContainer(kArrayOfTwo, {nearlyAll, scalar});
+
+  EXPECT_TRUE(contains(errorOfReadingBinary(file.build()),
+                       "a container that stands for more values than the limit"));
+}
+
+/// A text of some length below 256 as it stands in a file.
+std::string encodedText(std::size_t length, char character) {
+  using namespace std::string_literals;
+  return "\x5F\x10"s + static_cast<char>(length) + std::string(length, character);
+}
+
+/// A dictionary that stands for as many values as the limit but for what its key counts.
+std::string fileAtTheLimitWithKeyOf(std::size_t length) {
+  BinaryFile file;
+  const std::size_t key = file.add(encodedText(length, 'k'));
+  const std::size_t nearlyAll = addDoublingArrays(file, kDepthOfNearlyAllValues);
+  file.addContainer(kDictionaryOfOne, {key, nearlyAll});
+  return file.build();
+}
+
+TEST(BinaryLimits, AKeyCountsForEveryWholePieceOfItsBytesOnly) {
+  EXPECT_EQ(readBinary(fileAtTheLimitWithKeyOf(kBytesPerExpandedValue - 1)).kind(),
+            PropertyKind::Dictionary);
+  EXPECT_TRUE(contains(errorOfReadingBinary(fileAtTheLimitWithKeyOf(kBytesPerExpandedValue)),
+                       "a container that stands for more values than the limit"));
+}
+
+TEST(BinaryLimits, EveryKeyOfADictionaryCounts) {
+  const auto fileWithKeysOf = [](std::size_t firstLength, std::size_t secondLength) {
+    BinaryFile file;
+    const std::size_t first = file.add(encodedText(firstLength, 'k'));
+    const std::size_t second = file.add(encodedText(secondLength, 'l'));
+    // Twice half of the limit less one, and the dictionary: room for one more.
+    const std::size_t half = addDoublingArrays(file, kDepthOfNearlyAllValues - 1);
+    file.addContainer('\xD2', {first, second, half, half});
+    return file.build();
+  };
+  constexpr std::size_t kPiece = kBytesPerExpandedValue;
+  EXPECT_EQ(readBinary(fileWithKeysOf(kPiece, 1)).kind(), PropertyKind::Dictionary);
+  EXPECT_EQ(readBinary(fileWithKeysOf(1, kPiece)).kind(), PropertyKind::Dictionary);
+  EXPECT_TRUE(contains(errorOfReadingBinary(fileWithKeysOf(kPiece, kPiece)),
+                       "a container that stands for more values than the limit"));
+}
+
+/// Arrays in each other as deep as `height`, of which the lower half is read first, as the child of
+/// the outermost array.
+std::string fileWithSharedLowerHalf(std::size_t height) {
+  BinaryFile file;
+  file.setReferenceSize(2);
+  const auto addArray = [&](const std::vector<std::size_t>& children) {
+    std::string array(1, static_cast<char>(0xA0 + children.size()));
+    for (const std::size_t child : children) {
+      BinaryFile::appendNumber(array, child, 2);
+    }
+    file.add(array);
+  };
+  addArray({height / 2, 1});
+  for (std::size_t object = 1; object + 1 < height; ++object) {
+    addArray({object + 1});
+  }
+  addArray({});
+  file.setTopObject(0);
+  return file.build();
+}
+
+TEST(BinaryLimits, ASharedChildMayReachAsDeepAsTheLimit) {
+  EXPECT_EQ(readBinary(fileWithSharedLowerHalf(kMaximumNestingDepth)).kind(), PropertyKind::Array);
+}
+
+TEST(BinaryLimits, ASharedChildThatReachesOneLevelDeeperIsRefused) {
+  EXPECT_TRUE(contains(errorOfReadingBinary(fileWithSharedLowerHalf(kMaximumNestingDepth + 1)),
+                       "containers nested deeper than the limit"));
+}
+
+/// An array of two that says that its objects are the text "xy", and the last byte of that text or
+/// the one behind it.
+std::string fileWithOverlapOf(std::size_t byteCount) {
+  BinaryFile file;
+  file.addContainer(kArrayOfTwo, {1, 2});
+  const std::size_t text = file.add("\x52x\x08");
+  const std::size_t behind = file.add(byteCount == 0 ? "\x09" : "");
+  // The header, the array and the text.
+  file.setOffset(behind, 8 + 3 + 3 - byteCount);
+  EXPECT_EQ(text, 1U);
+  file.setTopObject(0);
+  return file.build();
+}
+
+TEST(BinaryLimits, ObjectsMayFillTheFile) {
+  EXPECT_EQ(readBinary(fileWithOverlapOf(0)), PropertyValue(PropertyArray{"x\x08", true}));
+}
+
+TEST(BinaryLimits, AnOverlapOfOneByteIsRefused) {
+  EXPECT_TRUE(
+      contains(errorOfReadingBinary(fileWithOverlapOf(1)), "an object that overlaps others"));
+}
+
+/// A dictionary at the end of the objects whose head says three entries, and that has so many
+/// references. Behind it comes the offset table, whose zeros could pass for references.
+std::string fileWithReferencesOfThreeEntries(std::size_t referenceCount) {
+  BinaryFile file;
+  const std::string unused(30, 'u');
+  file.add("\x51k" + unused);
+  file.add("\x51l");
+  file.add("\x51m");
+  std::string dictionary = "\xD3";
+  for (std::size_t reference = 0; reference < referenceCount; ++reference) {
+    dictionary += static_cast<char>(reference % 3);
+  }
+  file.add(dictionary);
+  return file.build();
+}
+
+TEST(BinaryLimits, ADictionarysReferencesMayEndWithTheObjects) {
+  EXPECT_EQ(readBinary(fileWithReferencesOfThreeEntries(6)),
+            PropertyValue(PropertyDictionary{{"k", "k"}, {"l", "l"}, {"m", "m"}}));
+}
+
+TEST(BinaryLimits, ADictionaryWithAnyReferenceBeyondTheObjectsIsRefused) {
+  for (std::size_t count = 0; count < 6; ++count) {
+    EXPECT_TRUE(contains(errorOfReadingBinary(fileWithReferencesOfThreeEntries(count)),
+                         "a container that ends beyond the objects"))
+        << count;
+  }
+}
+
+}  // namespace
+}  // namespace accounts
