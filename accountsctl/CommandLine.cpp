@@ -25,6 +25,7 @@ std::string requireForm(const std::string& value) {
 /// The lists of images that a summary can give in its place.
 constexpr std::pair<std::string_view, ListedImages> kLists[] = {{"retry", {Remedy::Retry}},
                                                                 {"attention", {Remedy::Attention}},
+                                                                {"losses", {Remedy::Losses}},
                                                                 {"migrated", {Remedy::None}},
                                                                 {"missing", {std::nullopt}}};
 

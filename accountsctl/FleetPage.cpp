@@ -116,7 +116,7 @@ std::string fleetPage(const FleetSummary& summary, const std::string& directory)
   html +=
       "<h2>Images</h2>\n<table>\n<tr><th>Image</th><th>Outcome</th><th>What to know</th>"
       "<th class=\"number\">Took</th></tr>\n";
-  for (const Remedy remedy : {Remedy::Attention, Remedy::Retry, Remedy::None}) {
+  for (const Remedy remedy : {Remedy::Attention, Remedy::Losses, Remedy::Retry, Remedy::None}) {
     std::vector<const RunResult*> results = summary.resultsWith(remedy);
     std::stable_partition(results.begin(), results.end(),
                           [](const RunResult* result) { return !result->warnings.empty(); });

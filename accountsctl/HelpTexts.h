@@ -93,6 +93,7 @@ inline constexpr const char* kSummarizeExamples =
     "  accountsctl summarize --roots roots.txt --html images.html results/reports\n"
     "  accountsctl summarize results.jsonl --list retry > again.txt\n"
     "  accountsctl summarize results.jsonl --list attention --reasons\n"
+    "  accountsctl summarize results.jsonl --list losses --reasons\n"
     "  parallel migration-host run --json --root {} :::: roots.txt | tee results.jsonl |\n"
     "    accountsctl summarize --expected 5000 -\n";
 

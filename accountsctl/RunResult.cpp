@@ -15,7 +15,8 @@ constexpr std::string_view kAnyRoot = "ROOT";
 constexpr Outcome kOutcomes[] = {
     {0, "migrated", "migrated", Remedy::None},
     {1, "failed", "the plug-in reported failure", Remedy::Attention},
-    {2, "notVerified", "not verified, inputs put back", Remedy::Attention},
+    {2, "notVerified", "not verified, nothing changed", Remedy::Attention},
+    {3, "notAllCarriedOver", "migrated, but something was not carried over", Remedy::Losses},
     {EX_USAGE, "unusableArguments", "unusable arguments", Remedy::Attention},
     {EX_DATAERR, "malformedInput", "malformed input", Remedy::Attention},
     {EX_NOINPUT, "missingInput", "no such root, description or bundle", Remedy::Attention},
@@ -98,6 +99,11 @@ std::optional<RunResult> runResultFrom(std::string_view line) {
     result.error = withoutRoot(*std::move(error), result.root);
   }
   result.warnings = textsIn(object, "warnings");
+  if (const auto ledger = object.find("ledger"); ledger != object.end() && ledger->is_object()) {
+    for (std::string& loss : textsIn(*ledger, "losses")) {
+      result.losses.push_back(withoutRoot(std::move(loss), result.root));
+    }
+  }
   result.seconds = secondsIn(object);
   return result;
 }

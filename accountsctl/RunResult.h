@@ -19,6 +19,8 @@ struct RunResult {
   /// one error; none when nothing did.
   std::optional<std::string> error;
   std::vector<std::string> warnings;
+  /// What was not carried over, "ROOT" standing for the root's name.
+  std::vector<std::string> losses;
   /// How long its stages took together; none where the line is no report, which alone tells.
   std::optional<double> seconds;
   /// The page of its report, a file of this machine; none where none is known.
@@ -33,6 +35,8 @@ std::optional<RunResult> runResultFrom(std::string_view line);
 enum class Remedy {
   /// Nothing: the image is migrated.
   None,
+  /// A person looks at what was not carried over; the image is migrated.
+  Losses,
   /// To run it again may help.
   Retry,
   /// To run it again helps only after something was changed.

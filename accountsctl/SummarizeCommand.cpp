@@ -128,8 +128,13 @@ std::string reasonsText(const std::vector<const RunResult*>& results, const Term
   TextTable table({"", ""});
   table.keepWhole(0);
   for (const RunResult* result : results) {
-    table.addRow(
-        {*result->root, result->error.value_or(std::string(outcomeOf(result->exitStatus).words))});
+    for (const std::string& loss : result->losses) {
+      table.addRow({*result->root, loss});
+    }
+    if (result->losses.empty()) {
+      table.addRow({*result->root,
+                    result->error.value_or(std::string(outcomeOf(result->exitStatus).words))});
+    }
   }
   return table.text(terminal);
 }
@@ -181,6 +186,8 @@ std::string remarksText(const FleetSummary& summary) {
   };
   const Remark remarks[] = {
       {summary.warningCount(), "migrated with warnings", "migrated with warnings"},
+      {summary.countOf(Remedy::Losses), "migrated, but not everything: --list losses --reasons",
+       "migrated, but not everything: --list losses --reasons"},
       {summary.countOf(Remedy::Retry), "to run again: --list retry", "to run again: --list retry"},
       {summary.countOf(Remedy::Attention), "to look at before it is run again: --list attention",
        "to look at before they are run again: --list attention"},
@@ -226,6 +233,11 @@ std::string objectLine(const SummarizeOptions& options, const FleetSummary& summ
   object["unreadableLines"] = summary.unreadableLineCount();
   object["retry"] = summary.rootsWith(Remedy::Retry);
   object["attention"] = summary.rootsWith(Remedy::Attention);
+  JSON losses = JSON::array();
+  for (const RunResult* result : summary.resultsWith(Remedy::Losses)) {
+    losses.push_back({{"root", *result->root}, {"losses", result->losses}});
+  }
+  object["losses"] = std::move(losses);
   object["missing"] = options.rootsFile ? JSON(summary.missingRoots()) : JSON(nullptr);
   return lineOf(std::move(object), exitStatus);
 }

@@ -20,6 +20,10 @@ BasicAccountReference recordOf(const PropertyValue& element) {
   return properties != nullptr ? BasicAccount::initWithProperties(*properties) : nullptr;
 }
 
+AccountOrigin elementOfFile(std::size_t index) {
+  return {AccountOrigin::Kind::Settings, static_cast<std::uint32_t>(index)};
+}
+
 }  // namespace
 
 std::string AccountsManager::fullPathToAccountSettingsPlist() {
@@ -40,8 +44,8 @@ std::unique_ptr<AccountsManager> AccountsManager::initInsideOfMigration() {
       Process::current()
           .platform.propertyLists.readDictionary(fullPathToAccountSettingsPlist())
           .value_or(PropertyDictionary());
-  std::unique_ptr<AccountsManager> store =
-      _initWithAccountsInfo(root.arrayForKey(kPlistAccountsKey));
+  std::unique_ptr<AccountsManager> store = _initWithAccountsInfo(
+      root.arrayForKey(kPlistAccountsKey), Process::current().platform.migrationObserver);
   if (const PropertyValue* version = root.find(kPlistVersionKey)) {
     store->_dataVersion = static_cast<std::uint64_t>(version->integerValue().value_or(0));
   }
@@ -50,26 +54,33 @@ std::unique_ptr<AccountsManager> AccountsManager::initInsideOfMigration() {
 
 std::unique_ptr<AccountsManager> AccountsManager::initWithAccounsInfoArray(
     const PropertyArray& accounts) {
-  return _initWithAccountsInfo(accounts);
+  return _initWithAccountsInfo(accounts, nullptr);
 }
 
 std::unique_ptr<AccountsManager> AccountsManager::_initWithAccountsInfo(
-    const std::optional<PropertyArray>& accounts) {
+    const std::optional<PropertyArray>& accounts, MigrationObserver* observer) {
   std::unique_ptr<AccountsManager> store(new AccountsManager());
+  store->_observer = observer;
   store->_runtimeFixers = _createRuntimeFixers();
   bool fixersChangedAccounts = false;
+  std::size_t index = 0;
   for (const PropertyValue& element : accounts.value_or(PropertyArray())) {
+    const AccountOrigin origin = elementOfFile(index++);
     const BasicAccountReference account = recordOf(element);
     if (!account) {
       logToChannel("-[AccountsManager _initWithAccountsInfo:]",
                    "ERROR: Failed to create a BasicAccount from %@",
                    [&] { return logArguments(element); });
+      store->_tell({origin, ToldFate::Refused, {}, BasicAccount::whyRefused(element)});
       continue;
     }
+    account->setOrigin(origin);
     const FixResult result = store->_fixAccount(*account, "loading accounts");
     fixersChangedAccounts |= result != FixResult::Unchanged;
     if (result != FixResult::CannotBeKept) {
       store->_takeIn(account);
+    } else {
+      store->_tell({origin, ToldFate::Refused, {}, "nothing tells the class of the mail account"});
     }
   }
   if (fixersChangedAccounts) {

@@ -12,6 +12,7 @@
 #include "accountsettings/IdentifierIndex.h"
 #include "accountsettings/OrderedAccounts.h"
 #include "accountsettings/RuntimeFixer.h"
+#include "platform/MigrationObserver.h"
 #include "platform/SharedResources.h"
 #include "propertylist/value/PropertyValue.h"
 
@@ -191,7 +192,13 @@ class AccountsManager {
 
   // Loading
   static std::unique_ptr<AccountsManager> _initWithAccountsInfo(
-      const std::optional<PropertyArray>& accounts);
+      const std::optional<PropertyArray>& accounts, MigrationObserver* observer);
+  /// Tells whoever observes the migration of this store what becomes of an account.
+  void _tell(const AccountEvent& event) const {
+    if (_observer != nullptr) {
+      _observer->accountFared(event);
+    }
+  }
   /// Puts a record at the end of the top-level accounts and indexes it and its children.
   void _takeIn(const BasicAccountReference& account);
   /// Runs every fixer on a record; the gravest result.
@@ -226,6 +233,8 @@ class AccountsManager {
   IdentifierIndex<BasicAccountReference> _childAccountsByID;
   IdentifierIndex<Text> _childAccountIDToParentAccountID;
   IdentifierIndex<PropertyDictionary> _originalAccountsByID;
+  /// Null for a store that nobody observes, such as one that a save makes.
+  MigrationObserver* _observer = nullptr;
   std::uint64_t _dataVersion = 0;
   std::vector<std::unique_ptr<RuntimeFixer>> _runtimeFixers;
 

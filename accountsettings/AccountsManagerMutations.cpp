@@ -61,7 +61,9 @@ void AccountsManager::deleteAccount(const BasicAccountReference& account) {
   if (identifier) {
     _removeChildrenForAccountWithIdentifier(identifier);
     _topLevelAccountsByID.remove(*identifier);
-    _orderedTopLevelAccounts.removeLast(*identifier);
+    if (const auto removed = _orderedTopLevelAccounts.removeLast(*identifier)) {
+      _tell({removed->origin(), ToldFate::RemovedByDeletion});
+    }
   }
 }
 

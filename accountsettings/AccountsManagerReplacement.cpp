@@ -45,6 +45,9 @@ void AccountsManager::_keepOrReplaceAccounts(const Types& types, const Accounts&
         identifier ? newAccountsByID.find(*identifier) : nullptr;
     const std::optional<Text> type = account->type();
     if (newAccount != nullptr) {
+      if (*newAccount != account) {
+        _tell({account->origin(), ToldFate::Overwritten, (*newAccount)->origin()});
+      }
       kept.push_back(*newAccount);
       replacement.placed.insert(newAccount->get());
       // Again in each place that the account takes: the lines about its children say so.
@@ -52,6 +55,7 @@ void AccountsManager::_keepOrReplaceAccounts(const Types& types, const Accounts&
     } else if (!type || std::find(types.begin(), types.end(), type->view()) == types.end()) {
       kept.push_back(account);
     } else {
+      _tell({account->origin(), ToldFate::RemovedByReplacement});
       _removeChildrenForAccountWithIdentifier(identifier);
     }
   }

@@ -52,6 +52,18 @@ bool BasicAccount::acceptProperties(const PropertyDictionary& properties) {
   return true;
 }
 
+std::string_view BasicAccount::whyRefused(const PropertyValue& element) {
+  const PropertyDictionary* const properties = element.asDictionary();
+  if (properties == nullptr) {
+    return "it is no dictionary";
+  }
+  const std::optional<Text> type = properties->textForKey(kAccountType);
+  if (_isValidAccountType(type)) {
+    return "it has no class";
+  }
+  return type ? "its type is unknown" : "it has no type";
+}
+
 BasicAccountReference BasicAccount::_initWithType_class(
     std::optional<std::string_view> type, std::optional<std::string_view> accountClass) {
   static constexpr std::string_view operation = "-[BasicAccount _initWithType:class:]";

@@ -7,6 +7,7 @@
 #include <string_view>
 #include <vector>
 
+#include "platform/AccountFate.h"
 #include "platform/AccountFramework.h"
 #include "propertylist/value/PropertyValue.h"
 #include "vocabulary/AccountVocabulary.h"
@@ -37,6 +38,9 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   /// fatal assertion.
   static BasicAccountReference _initWithType_class(std::optional<std::string_view> type,
                                                    std::optional<std::string_view> accountClass);
+  /// Why initWithProperties() makes no record of an element of a file, as a clause such as "it has
+  /// no class". Only for an element that it makes none of.
+  static std::string_view whyRefused(const PropertyValue& element);
   /// Forbidden: a fatal assertion.
   [[noreturn]] static BasicAccountReference init();
   static BasicAccountReference accountWithType_class(std::optional<std::string_view> type,
@@ -147,6 +151,10 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   /// The parent's identifier; none without a parent.
   [[nodiscard]] std::optional<Text> parentAccountIdentifier() const;
 
+  /// Which account this is for whoever observes a migration.
+  [[nodiscard]] AccountOrigin origin() const { return _origin; }
+  void setOrigin(AccountOrigin origin) { _origin = origin; }
+
   // Dataclasses of this account, in canonical order (BasicAccountDataclasses.cpp)
 
   /// What the account's type supports; empty for an unknown type.
@@ -234,6 +242,7 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   Text _ownType;
   Text _ownClass;
   Text _ownIdentifier;
+  AccountOrigin _origin;
   bool _hasValidOwnType = false;
   bool _wouldBeLoadedAsSaved = false;
   FullAccountReference _fullAccount;

@@ -114,20 +114,20 @@ bool OrderedAccounts::replaceFirst(const BasicAccountReference& oldAccount,
   return true;
 }
 
-bool OrderedAccounts::removeLast(std::string_view identifier) {
+BasicAccountReference OrderedAccounts::removeLast(std::string_view identifier) {
   bringIndexesUpToDate();
   const PlaceNumbers* places = placesByIdentifier_.find(identifier);
   if (places == nullptr) {
-    return false;
+    return nullptr;
   }
-  const BasicAccountReference account = accounts_[positionOf(places->last())];
+  BasicAccountReference account = accounts_[positionOf(places->last())];
   for (const PlaceNumber number : placesByRecord_.at(account.get()).all()) {
     remove(number);
   }
   if (removedCount_ * 2 > accounts_.size()) {
     dropRemovedPlaces();
   }
-  return true;
+  return account;
 }
 
 std::size_t OrderedAccounts::positionOf(PlaceNumber number) const {

@@ -37,9 +37,9 @@ class OrderedAccounts {
   /// Puts a record in the first place of another one. False when that is not in the list.
   bool replaceFirst(const BasicAccountReference& oldAccount,
                     const BasicAccountReference& newAccount);
-  /// Removes the last record with the identifier from every place that it has. False when there is
-  /// none.
-  bool removeLast(std::string_view identifier);
+  /// Removes the last record with the identifier from every place that it has. Gives the record;
+  /// null when there is none.
+  BasicAccountReference removeLast(std::string_view identifier);
 
  private:
   // A place keeps its number as long as it exists, so that the indexes outlive the removal of other

@@ -59,6 +59,9 @@ class Process {
   /// While true, a successful save sends no change notifications.
   bool shouldSkipNotifications = false;
 
+  /// How many accounts that are told of this process made.
+  std::uint32_t madeAccounts = 0;
+
   /// Counts the changes of account identifiers, so that an index by identifier knows when it is out
   /// of date.
   std::uint64_t identifierChanges = 0;

@@ -13,8 +13,10 @@ enum class ExitStatus : int {
   Attention = 1,
   /// The plug-in ran and reported failure.
   MigrationFailed = 1,
-  /// The plug-in reported success, but that could not be verified; its inputs were put back.
+  /// The plug-in reported success, but that could not be verified; nothing is changed.
   NotVerified = 2,
+  /// Migrated, but not everything was carried over; what was not is kept.
+  NotAllCarriedOver = 3,
   /// The arguments cannot be used; nothing was done.
   UnusableArguments = EX_USAGE,
   /// The input is there but is not what it has to be.

@@ -21,13 +21,16 @@ inline constexpr const char* kRun =
     "Run the account-settings migration on one device root.\n\n"
     "The plug-in works in memory. What came of it is verified and then put on the device in one\n"
     "step; until then nothing beneath the root is changed, whatever fails. The files as they were\n"
-    "are kept when something may not have been carried over. Standard error carries the plug-in's\n"
+    "are kept when something was not carried over. Standard error carries the plug-in's\n"
     "console lines, standard output a short summary or, with --json, one object on one line.\n"
     "With --bare the plug-in works on the device itself, and its result is reported as it stands.";
 inline constexpr const char* kRunStatuses =
-    "  0   the plug-in reported success, which was verified unless --bare is given\n"
+    "  0   migrated, and every account is accounted for; with --bare: the plug-in reported "
+    "success\n"
     "  1   the plug-in reported failure; without --bare nothing is changed\n"
-    "  2   the plug-in reported success, which was not verified: nothing is changed\n";
+    "  2   the plug-in reported success, which was not verified: nothing is changed\n"
+    "  3   migrated, but something was not carried over: it is named, and the files as they were\n"
+    "      are kept\n";
 inline constexpr const char* kRunErrors =
     "  70  the plug-in ended by an assertion or a signal\n"
     "  73  a file of the host's own cannot be created\n"

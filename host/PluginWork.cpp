@@ -15,7 +15,6 @@
 #include "host/Announcements.h"
 #include "host/KernelOwnershipRule.h"
 #include "host/ReportFiles.h"
-#include "host/StageNames.h"
 #include "host/ToldResult.h"
 #include "platform/ReplacedParts.h"
 #include "platform/linux/FileContents.h"
@@ -38,9 +37,9 @@ struct PluginOutcome {
 };
 
 /// Loads the plug-in and lets it migrate.
-RunReport runPlugin(const PluginBundle& bundle, const Platform& platform) {
-  StageNames stages(platform.migrationObserver);
-  Platform observed = platformWith(platform, {.migrationObserver = &stages});
+RunReport runPlugin(const PluginBundle& bundle, const Platform& platform, ToldFates& told) {
+  told.passOnTo(platform.migrationObserver);
+  Platform observed = platformWith(platform, {.migrationObserver = &told});
   RunReport report;
   std::variant<std::unique_ptr<MigrationPluginBase>, ProgramError> made =
       bundle.makePlugin(observed);
@@ -52,7 +51,8 @@ RunReport runPlugin(const PluginBundle& bundle, const Platform& platform) {
   report.dataClassName = plugin->dataClassName();
   report.result = plugin->performMigration();
   plugin.reset();
-  report.steps = stages.names();
+  told.passOnTo(nullptr);
+  report.steps = told.stages();
   return report;
 }
 
@@ -88,9 +88,9 @@ RecordedMigration recordedSoFar(const PluginWork& work) {
   return RecordedMigration::fromLines(lines);
 }
 
-PluginOutcome runRecordedPlugin(const PluginWork& work, const Platform& platform) {
+PluginOutcome runRecordedPlugin(const PluginWork& work, const Platform& platform, ToldFates& told) {
   if (!work.options.recorded) {
-    return {runPlugin(work.device.bundle, platform), {}};
+    return {runPlugin(work.device.bundle, platform, told), {}};
   }
   // A line that does not arrive is missed by people alone.
   MigrationRecorder recorder(
@@ -100,7 +100,7 @@ PluginOutcome runRecordedPlugin(const PluginWork& work, const Platform& platform
       *work.options.recorded);
   RecordedPlatform recorded(platform, recorder);
   recorder.recordBefore(storesOf(platform.propertyLists, work.home));
-  PluginOutcome outcome = {runPlugin(work.device.bundle, recorded.platform()), {}};
+  PluginOutcome outcome = {runPlugin(work.device.bundle, recorded.platform(), told), {}};
   recorder.recordAfter(
       platform.propertyLists.readDictionary(pathOfPlace(DevicePlace::Settings, work.home)));
   outcome.recorded = recordedSoFar(work);
@@ -180,15 +180,15 @@ void finishReport(RunReport& report, const RunConclusion& conclusion, MigrationI
     report.cloudTabAnnouncements = 0;
     return;
   }
-  for (const std::string& loss : migration.losses()) {
-    std::string warning = loss;
-    if (conclusion.keptFolder) {
-      warning += "; the files as they were are kept in " + *conclusion.keptFolder + ", and \"" +
-                 restoreCommand(options.device, *conclusion.keptFolder) + "\" puts them back";
-    } else if (isPlan) {
-      warning += "; a run would keep the files as they were";
-    }
-    report.warnings.push_back(std::move(warning));
+  report.ledger = migration.ledger();
+  if (!report.ledger->isClean()) {
+    report.exitStatus = ExitStatus::NotAllCarriedOver;
+    report.warnings.push_back(
+        lossesWithTheFirst(*report.ledger) +
+        (isPlan
+             ? std::string("; a run would keep the files as they were")
+             : "; the files as they were are kept in " + *conclusion.keptFolder + ", and \"" +
+                   restoreCommand(options.device, *conclusion.keptFolder) + "\" puts them back"));
   }
   report.warnings.insert(report.warnings.end(), migration.warnings().begin(),
                          migration.warnings().end());
@@ -218,11 +218,12 @@ void workInMemory(const PluginWork& work, const WorkerSide& side, const DeviceSn
   PluginOutcome outcome;
   Proposal proposal;
   if (task.purpose == RunPurpose::FinishingAlone) {
-    migration.verify(PluginResult::NotAsked);
+    migration.verify(PluginResult::NotAsked, {});
   } else {
-    outcome = runRecordedPlugin(work, platform);
+    outcome = runRecordedPlugin(work, platform, migration.told());
     noteAnnouncements(work, outcome.report);
-    migration.verify(outcome.report.result ? PluginResult::GaveTrue : PluginResult::GaveFalse);
+    migration.verify(outcome.report.result ? PluginResult::GaveTrue : PluginResult::GaveFalse,
+                     factsOf(platform));
   }
   RunReport& report = outcome.report;
   if (report.error) {
@@ -259,7 +260,8 @@ void tellOfEndedWorker(const PluginWork& work, const WorkerSide& side) {
 
 void workOnDevice(const PluginWork& work, const WorkerSide& side) {
   work.leaveHost();
-  PluginOutcome outcome = runRecordedPlugin(work, work.device.platform->platform());
+  ToldFates told;
+  PluginOutcome outcome = runRecordedPlugin(work, work.device.platform->platform(), told);
   RunReport& report = outcome.report;
   noteAnnouncements(work, report);
   if (!report.error && !report.result) {

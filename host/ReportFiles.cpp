@@ -8,7 +8,7 @@ namespace accounts {
 JSON fullReport(std::string_view command, const RunReport& report,
                 const RecordedMigration& recorded) {
   JSON object = {{"command", command}, {"time", currentTimeForReports()}};
-  object.update(objectOf(report));
+  object.update(objectOf(report, LedgerDetail::EveryAccount));
   object["versions"] = recorded.versions;
   object["stages"] = recorded.stages;
   object["accountsBefore"] = recorded.accountsBefore;

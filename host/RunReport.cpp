@@ -18,6 +18,8 @@ constexpr const char* kSettingsSavesKey = "settingsSaves";
 constexpr const char* kLastWrittenKey = "lastWritten";
 constexpr const char* kReplacedFileKey = "replacedFile";
 constexpr const char* kKeptInputsKey = "keptInputs";
+constexpr const char* kOutcomeKey = "outcome";
+constexpr const char* kLedgerKey = "ledger";
 constexpr const char* kWarningsKey = "warnings";
 constexpr const char* kExitStatusKey = "exitStatus";
 constexpr const char* kErrorKey = "error";
@@ -39,14 +41,22 @@ void setError(RunReport& report, const ProgramError& error) {
 }
 
 void noteReportError(RunReport& report, const ProgramError& error) {
-  if (report.error) {
+  if (report.error || report.exitStatus != ExitStatus::Success) {
     report.warnings.push_back(error.message);
   } else {
     setError(report, error);
   }
 }
 
-JSON objectOf(const RunReport& report) {
+std::string outcomeOf(const RunReport& report) {
+  if (report.error) {
+    return *report.error;
+  }
+  const std::string losses = report.ledger ? lossesWithTheFirst(*report.ledger) : "";
+  return losses.empty() ? "Migrated" : "Migrated, but " + losses;
+}
+
+JSON objectOf(const RunReport& report, LedgerDetail detail) {
   JSON broadcasts = JSON::array();
   for (const PreferencesChange& broadcast : report.broadcasts) {
     broadcasts.push_back(
@@ -60,6 +70,8 @@ JSON objectOf(const RunReport& report) {
                  {kCloudTabAnnouncementsKey, report.cloudTabAnnouncements},
                  {kSettingsSavesKey, jsonOf(report.settingsSaves)},
                  {kKeptInputsKey, report.keptInputs},
+                 {kOutcomeKey, outcomeOf(report)},
+                 {kLedgerKey, report.ledger ? ledgerObject(*report.ledger, detail) : JSON(nullptr)},
                  {kWarningsKey, report.warnings},
                  {kExitStatusKey, static_cast<int>(report.exitStatus)}};
   if (report.error) {
@@ -69,7 +81,7 @@ JSON objectOf(const RunReport& report) {
 }
 
 std::string jsonText(const RunReport& report) {
-  return lineOf(objectOf(report));
+  return lineOf(objectOf(report, LedgerDetail::LossesAlone));
 }
 
 std::string summaryText(const RunReport& report) {
@@ -78,7 +90,16 @@ std::string summaryText(const RunReport& report) {
   }
   std::string summary =
       (report.result && !report.error ? "Migrated the " : "Failed to migrate the ") +
-      escapedText(*report.dataClassName) + " of " + escapedText(report.root.value_or("")) + ".\n";
+      escapedText(*report.dataClassName) + " of " + escapedText(report.root.value_or(""));
+  if (const std::string losses = report.ledger ? lossesInWords(*report.ledger) : "";
+      losses.empty()) {
+    summary += ".\n";
+  } else {
+    summary += ", but " + losses + ":\n";
+    for (const std::string& loss : report.ledger->losses()) {
+      summary += "  Not carried over: " + escapedText(loss) + ".\n";
+    }
+  }
   for (const PreferencesChange& broadcast : report.broadcasts) {
     summary += "  Told " + escapedText(broadcast.application) + " that its " +
                escapedText(broadcast.key) + " changed.\n";

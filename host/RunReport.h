@@ -8,6 +8,8 @@
 #include "commandline/ExitStatus.h"
 #include "inspection/PropertyListJSON.h"
 #include "platform/linux/RecordingPreferencesBroadcast.h"
+#include "report/LedgerJSON.h"
+#include "safetynet/AccountLedger.h"
 #include "transaction/Transaction.h"
 
 namespace accounts {
@@ -36,6 +38,8 @@ struct RunReport {
   std::optional<std::string> keptFolder;
   /// The folders of kept files that are there after the run, device paths, oldest first.
   std::vector<std::string> keptInputs;
+  /// What became of every account; none where nothing was changed, or nobody looked.
+  std::optional<AccountLedger> ledger;
   /// What a person should know, one sentence each.
   std::vector<std::string> warnings;
   ExitStatus exitStatus = ExitStatus::Success;
@@ -50,8 +54,12 @@ void setError(RunReport& report, const ProgramError& error);
 /// else a warning.
 void noteReportError(RunReport& report, const ProgramError& error);
 
+/// What the run came to, in one line without a full stop: the cause of a failure, or what was
+/// migrated.
+std::string outcomeOf(const RunReport& report);
+
 /// A report as a JSON object.
-JSON objectOf(const RunReport& report);
+JSON objectOf(const RunReport& report, LedgerDetail detail);
 /// A report as one JSON object on one line, without a line end. Bytes that are no UTF-8 are
 /// replaced.
 std::string jsonText(const RunReport& report);

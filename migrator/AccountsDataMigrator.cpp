@@ -6,6 +6,7 @@
 #include "accountsettings/Paths.h"
 #include "accountsettings/Process.h"
 #include "migrator/MigrationStage.h"
+#include "vocabulary/MigrationStages.h"
 
 namespace accounts {
 
@@ -77,6 +78,7 @@ bool AccountsDataMigrator::executeMigrationSteps() {
   MigrationStage saving("saveAllAccounts", "Save the accounts");
   store->setDataVersion(AccountsManager::currentVersion());
   store->saveAllAccounts();
+  tellSavedAccounts(*store);
   saving.end(true, store.get());
   store.reset();
 
@@ -98,11 +100,11 @@ bool AccountsDataMigrator::runMigrations(AccountsManager& store, const Needs& ne
   // upgrade chain's result alone decides; combining the results would keep a device with one broken
   // legacy description from ever finishing.
   if (needs.oldDAAccounts) {
-    static_cast<void>(runStage("_migrateDAAccounts:", "Convert the legacy Exchange accounts", store,
-                               [&] { return _migrateDAAccounts(store); }));
+    static_cast<void>(runStage(kExchangeConversionStage, "Convert the legacy Exchange accounts",
+                               store, [&] { return _migrateDAAccounts(store); }));
   }
   if (needs.oldMailAccounts) {
-    static_cast<void>(runStage("_migrateMailAccounts:", "Convert the legacy mail accounts", store,
+    static_cast<void>(runStage(kMailConversionStage, "Convert the legacy mail accounts", store,
                                [&] { return _migrateMailAccounts(store); }));
   }
   return _migrateNewAccountsInfo(store);

@@ -27,10 +27,10 @@ struct DataclassSwitch {
 };
 
 const std::array<DataclassSwitch, 4> dataclassSwitches = {{
-    {"DAAccountEnabledForCalendar", kAccountDataclassCalendars},
-    {"DAAccountEnabledForContacts", kAccountDataclassContacts},
-    {"DAAccountEnabledForEmail", kAccountDataclassMail},
-    {"DAAccountEnabledForContactsSearch", kAccountDataclassContactsSearch},
+    {kLegacyExchangeSwitches[0], kAccountDataclassCalendars},
+    {kLegacyExchangeSwitches[1], kAccountDataclassContacts},
+    {kLegacyExchangeSwitches[2], kAccountDataclassMail},
+    {kLegacyExchangeSwitches[3], kAccountDataclassContactsSearch},
 }};
 
 /// Takes the legacy switches out of a description. A dataclass is on unless its switch says no.
@@ -68,6 +68,7 @@ bool AccountsDataMigrator::_migrateDAAccounts(AccountsManager& store) {
   collect(kInformationOldExchangeAccounts, file);
 
   const std::optional<AccountsManager::Accounts> converted = convertDescriptions(
+      AccountOrigin::Kind::Exchange,
       legacyAccounts.arrayForKey(kLegacyExchangeAccounts).value_or(PropertyArray()),
       exchangeConversionOperation,
       "%s. Could not convert the description for the Exchange account %@",

@@ -5,6 +5,7 @@
 #include "accountsettings/Process.h"
 #include "migrator/AccountsDataMigrator.h"
 #include "migrator/HasClass.h"
+#include "migrator/MigrationStage.h"
 
 // The steps of 7A149 to 7A241. That of 7A242 has a file of its own.
 
@@ -112,6 +113,7 @@ bool AccountsDataMigrator::_migrateAccountsFrom7A153(AccountsManager& store) {
       }
     }
     onDevice->setEnabledForDataclasses(dataclasses);
+    nameMadeAccount(*onDevice);
     store.replaceAccountsWithTypes_withAccounts({kOnMyDeviceAccountType}, {onDevice});
   }
   store.setDataVersion(3);

@@ -7,6 +7,7 @@
 
 #include "accountsettings/AccountsManager.h"
 #include "accountsettings/Log.h"
+#include "migrator/MigrationStage.h"
 #include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
@@ -34,11 +35,18 @@ PropertyDictionary accountPropertiesOfExchangeDescription(const PropertyDictiona
 /// ".original". Failures are ignored.
 void removeOriginalBeside(std::string_view legacyPath);
 
+/// Tells that the descriptions of a legacy array stay out, one of their store having been refused.
+/// `refused` is the index of that one, if it is among them.
+void tellOutWithItsStore(AccountOrigin::Kind array, std::size_t count,
+                         std::optional<std::size_t> refused);
+
 /// Converts the descriptions of a legacy array in order. None at the first one that `convert` gives
 /// no record for or that is no dictionary, after a console line made of `failureLine`, `operation`
-/// and the description. `convert` takes a dictionary and gives a record or null.
+/// and the description; whoever observes the migration is told, too. `convert` takes a dictionary
+/// and gives a record or null.
 template <class Convert>
-std::optional<AccountsManager::Accounts> convertDescriptions(const PropertyArray& descriptions,
+std::optional<AccountsManager::Accounts> convertDescriptions(AccountOrigin::Kind array,
+                                                             const PropertyArray& descriptions,
                                                              std::string_view operation,
                                                              std::string_view failureLine,
                                                              Convert&& convert) {
@@ -49,8 +57,14 @@ std::optional<AccountsManager::Accounts> convertDescriptions(const PropertyArray
     BasicAccountReference record = dictionary != nullptr ? convert(*dictionary) : nullptr;
     if (record == nullptr) {
       logToConsole(failureLine, {operation, description});
+      tellOutWithItsStore(array, descriptions.size(), records.size());
+      tellFate({{array, static_cast<std::uint32_t>(records.size())},
+                ToldFate::Refused,
+                {},
+                dictionary == nullptr ? "it is no dictionary" : "it has no class"});
       return std::nullopt;
     }
+    record->setOrigin({array, static_cast<std::uint32_t>(records.size())});
     records.push_back(std::move(record));
   }
   return records;

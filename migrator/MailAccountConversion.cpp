@@ -110,24 +110,29 @@ bool AccountsDataMigrator::_migrateMailAccounts(AccountsManager& store) {
 
 bool AccountsDataMigrator::replaceMailAccounts(AccountsManager& store,
                                                const PropertyDictionary& legacyAccounts) {
-  const auto converted = [&](std::string_view key, std::string_view type,
-                             std::string_view failureLine) {
-    return convertDescriptions(legacyAccounts.arrayForKey(key).value_or(PropertyArray()),
-                               mailConversionOperation, failureLine,
+  const PropertyArray outgoingDescriptions =
+      legacyAccounts.arrayForKey(kLegacyOutgoingAccounts).value_or(PropertyArray());
+  const PropertyArray incomingDescriptions =
+      legacyAccounts.arrayForKey(kLegacyIncomingAccounts).value_or(PropertyArray());
+  const auto converted = [&](AccountOrigin::Kind array, const PropertyArray& descriptions,
+                             std::string_view type, std::string_view failureLine) {
+    return convertDescriptions(array, descriptions, mailConversionOperation, failureLine,
                                [&](const PropertyDictionary& description) {
                                  return _convertMailAccountDescription_type(description, type);
                                });
   };
   const std::optional<AccountsManager::Accounts> outgoing =
-      converted(kLegacyOutgoingAccounts, kSMTPAccountType,
+      converted(AccountOrigin::Kind::OutgoingMail, outgoingDescriptions, kSMTPAccountType,
                 "%s. Could not convert the description for the delivery account %@");
   if (!outgoing) {
+    tellOutWithItsStore(AccountOrigin::Kind::IncomingMail, incomingDescriptions.size(), {});
     return false;
   }
   const std::optional<AccountsManager::Accounts> incoming =
-      converted(kLegacyIncomingAccounts, kMailAccountType,
+      converted(AccountOrigin::Kind::IncomingMail, incomingDescriptions, kMailAccountType,
                 "%s. Could not convert the description for the incoming account %@");
   if (!incoming) {
+    tellOutWithItsStore(AccountOrigin::Kind::OutgoingMail, outgoingDescriptions.size(), {});
     return false;
   }
   store.replaceAccountsWithTypes_withAccounts({kSMTPAccountType}, *outgoing);

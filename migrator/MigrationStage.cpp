@@ -26,6 +26,29 @@ PropertyDictionary accountSettings(const AccountsManager& store) {
 
 }  // namespace
 
+void tellFate(const AccountEvent& event) {
+  if (MigrationObserver* const told = observer()) {
+    told->accountFared(event);
+  }
+}
+
+void tellSavedAccounts(const AccountsManager& store) {
+  MigrationObserver* const told = observer();
+  if (told == nullptr) {
+    return;
+  }
+  std::vector<AccountOrigin> origins;
+  origins.reserve(store.allBasicAccounts().size());
+  for (const BasicAccountReference& account : store.allBasicAccounts()) {
+    origins.push_back(account->origin());
+  }
+  told->accountsSaved(origins);
+}
+
+void nameMadeAccount(BasicAccount& account) {
+  account.setOrigin({AccountOrigin::Kind::Made, ++Process::current().madeAccounts});
+}
+
 MigrationStage::MigrationStage(std::string_view operation, std::string_view purpose) {
   if (MigrationObserver* const told = observer()) {
     told->stageBegan(operation, purpose);

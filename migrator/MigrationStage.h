@@ -7,6 +7,15 @@
 
 namespace accounts {
 
+/// Tells whoever observes the migration what became of an account.
+void tellFate(const AccountEvent& event);
+
+/// Tells which accounts a store that was saved for the last time has, and in which order.
+void tellSavedAccounts(const AccountsManager& store);
+
+/// Names an account that the migration makes, for what is told of it.
+void nameMadeAccount(BasicAccount& account);
+
 /// A stage of the migration that runs, from here until end(), for whoever observes it. Costs
 /// nothing when nobody does.
 class MigrationStage {

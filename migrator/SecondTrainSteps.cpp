@@ -4,6 +4,7 @@
 #include "accountsettings/Process.h"
 #include "migrator/AccountsDataMigrator.h"
 #include "migrator/HasClass.h"
+#include "migrator/MigrationStage.h"
 
 namespace accounts {
 
@@ -14,13 +15,12 @@ constexpr std::array mailOnlyClasses = {kIMAPAccountClass, kGmailAccountClass, k
                                         kAOLAccountClass, kPOPAccountClass};
 
 constexpr std::string_view calDAVEnabledKey = "CalDAVEnabled";
-constexpr std::string_view exoSubscribedCalendarsKey = "DAExoSubscribedCalendarInfos";
 
 /// What a parent account copies from the hosted-service account, and what it takes away from it.
 const std::array<std::string_view, 2> copiedKeys = {kAccountDisplayName, calDAVEnabledKey};
 const std::array<std::string_view, 4> movedKeys = {
     kAccountEnabledDataclasses, kAccountChildAccounts, kCalendarsAccountSubscribedCalendars,
-    exoSubscribedCalendarsKey};
+    kExoSubscribedCalendarsKey};
 
 bool isHostedServiceAccount(const BasicAccount& account) {
   return hasClassAmong(account, hostedServiceClasses);
@@ -86,6 +86,8 @@ void wrapHostedServiceAccount(AccountsManager& store, const BasicAccountReferenc
   for (const std::string_view key : movedKeys) {
     hosted->removeAccountPropertyForKey(key);
   }
+  nameMadeAccount(*parent);
+  tellFate({hosted->origin(), ToldFate::MovedBelow, parent->origin()});
   store.replaceAccount_withAccount(hosted, parent);
   hosted->setParentAccount(parent);
   store.addChild_toAccount(hosted, parent);
@@ -120,8 +122,8 @@ void removeHostedServiceDisplayNames(BasicAccount& cloudAccount) {
 
 bool AccountsDataMigrator::_migrateAccountsFrom8A293(AccountsManager& store) {
   const std::optional<PropertyValue> architecture =
-      Process::current().platform.deviceInfoService.copyAnswer("CPUArchitecture");
-  if (architecture == PropertyValue("armv6")) {
+      Process::current().platform.deviceInfoService.copyAnswer(kArchitectureQuestion);
+  if (architecture == PropertyValue(kOldestArchitecture)) {
     for (const BasicAccountReference& account : store.allBasicAccounts()) {
       // Forced, because on this processor an account's type may not list notes.
       if (account->type() == kOnMyDeviceAccountType) {

@@ -4,6 +4,7 @@
 #include "migrator/AccountsDataMigrator.h"
 #include "migrator/CalDAVMatching.h"
 #include "migrator/HasClass.h"
+#include "migrator/MigrationStage.h"
 
 // The step of 7A242: mail and notes for web-mail accounts, and their calendars folded into them.
 
@@ -40,7 +41,7 @@ class CalDAVAccounts {
     if (index_.matches(expected).empty()) {
       return false;
     }
-    matchedExpectations_.push_back(std::move(expected));
+    matches_.push_back({std::move(expected), umbrellaAccount.origin()});
     return true;
   }
 
@@ -49,9 +50,10 @@ class CalDAVAccounts {
   /// Deletes from the store the accounts that each umbrella account matched, umbrella account by
   /// umbrella account: each account as often as it was matched.
   void deleteMatchedAccounts(AccountsManager& store) const {
-    for (const ExpectedCalDAV& expected : matchedExpectations_) {
+    for (const Match& match : matches_) {
       // Looked up again: a list of all matches would be as long as there are pairs.
-      for (const std::size_t position : index_.matches(expected)) {
+      for (const std::size_t position : index_.matches(match.expected)) {
+        tellFate({accounts_[position]->origin(), ToldFate::Joined, match.umbrella});
         store.deleteAccount(accounts_[position]);
       }
     }
@@ -79,7 +81,11 @@ class CalDAVAccounts {
 
   AccountsManager::Accounts accounts_;
   CalDAVIndex index_;
-  std::vector<ExpectedCalDAV> matchedExpectations_;
+  struct Match {
+    ExpectedCalDAV expected;
+    AccountOrigin umbrella;
+  };
+  std::vector<Match> matches_;
 };
 
 void enableMailAndNotes(BasicAccount& account) {

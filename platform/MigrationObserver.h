@@ -2,7 +2,9 @@
 
 #include <optional>
 #include <string_view>
+#include <vector>
 
+#include "platform/AccountFate.h"
 #include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
@@ -25,6 +27,15 @@ class MigrationObserver {
   /// wanted.
   virtual void stageEnded(bool succeeded,
                           const std::optional<PropertyDictionary>& accountSettings) = 0;
+
+  /// An account of the store that is migrated, not of one that a save makes to look at the file,
+  /// met a fate.
+  virtual void accountFared(const AccountEvent& event) { static_cast<void>(event); }
+
+  /// The store was saved for the last time: its top-level accounts, in the order of the file.
+  virtual void accountsSaved(const std::vector<AccountOrigin>& accounts) {
+    static_cast<void>(accounts);
+  }
 };
 
 }  // namespace accounts

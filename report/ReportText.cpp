@@ -30,11 +30,26 @@ std::size_t countAccounts(const JSON& accounts) {
 
 std::string heading(const JSON& report) {
   const bool isPlan = textIn(report, "command") == "plan";
-  const bool isGood = report["exitStatus"] == 0;
+  // Something is migrated with the status of losses, too.
+  const bool isGood = report["exitStatus"] == 0 || report["exitStatus"] == 3;
   const std::string root = textIn(report, "root");
   std::string what = isPlan ? (isGood ? "Would migrate " : "Would fail to migrate ")
                             : (isGood ? "Migrated " : "Failed to migrate ");
   return what + root;
+}
+
+/// What was, or would be, not carried over; empty for nothing.
+std::string lossesText(const JSON& report, const Terminal& terminal) {
+  const auto ledger = report.find("ledger");
+  std::string text;
+  if (ledger != report.end() && ledger->is_object()) {
+    for (const JSON& loss : (*ledger)["losses"]) {
+      text += emphasized(terminal, Emphasis::Warning,
+                         "Not carried over: " + escapedText(loss.get<std::string>())) +
+              "\n";
+    }
+  }
+  return text;
 }
 
 std::string fileLine(const JSON& file) {
@@ -82,6 +97,7 @@ std::string reportText(const JSON& report, const Terminal& terminal) {
       fmt::format("{}version {} to {}, {} accounts to {}\n", kIndentation,
                   versionIn(report["versions"], "before"), versionIn(report["versions"], "after"),
                   countAccounts(report["accountsBefore"]), countAccounts(report["accountsAfter"]));
+  text += lossesText(report, terminal);
   for (const JSON& stage : report["stages"]) {
     text += stageText(stage, terminal);
   }

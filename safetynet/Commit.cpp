@@ -159,8 +159,11 @@ std::optional<CommitOutcome> Commit::keepFiles() {
     kept.push_back({place, identity(place)});
   }
   std::string folder;
-  const PlaceOutcome outcome = folders_.keep(
-      kept, proposal_.hasLosses ? KeptFor::MigrationWithLosses : KeptFor::Migration, time_, folder);
+  const PlaceOutcome outcome =
+      folders_.keep(kept,
+                    proposal_.status == ExitStatus::NotAllCarriedOver ? KeptFor::MigrationWithLosses
+                                                                      : KeptFor::Migration,
+                    time_, folder);
   if (!outcome.isDone()) {
     return refused("The files cannot be kept", outcome);
   }

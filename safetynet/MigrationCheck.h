@@ -25,12 +25,4 @@ bool hasAnyAccount(const std::optional<PropertyDictionary>& settings,
 /// and the file is a property list of the current version.
 std::optional<std::string> whyNotMigrated(Transaction& transaction);
 
-/// What a verified migration may not have carried over, one sentence each without a full stop, in
-/// order: an input that is no property list; a legacy store with an account that is not in the
-/// settings file; a settings file that had accounts and has none of them. `inputs` are the legacy
-/// stores and the settings file, as far as the migration found them, the settings file last. None
-/// of these is an error of the migration, whose rules drop what they cannot read.
-std::vector<std::string> whatMayBeMissing(Transaction& transaction,
-                                          const std::vector<DevicePlace>& inputs);
-
 }  // namespace accounts

@@ -4,6 +4,7 @@
 #include <array>
 #include <utility>
 
+#include "safetynet/LedgerMaking.h"
 #include "safetynet/MigrationCheck.h"
 #include "safetynet/PlaceErrors.h"
 
@@ -29,21 +30,25 @@ MigrationInMemory::MigrationInMemory(const DeviceSnapshot& snapshot, std::string
   }
 }
 
-void MigrationInMemory::verify(PluginResult result) {
+void MigrationInMemory::verify(PluginResult result, const DeviceFacts& facts) {
   if (result == PluginResult::GaveFalse) {
     error_ = ProgramError{ExitStatus::MigrationFailed, "The plug-in reported that it failed"};
   } else if (result == PluginResult::GaveTrue) {
     if (const auto reason = whyNotMigrated(transaction_)) {
       error_ = ProgramError{ExitStatus::NotVerified,
                             "The plug-in reported success but " + *reason + "; nothing is changed"};
-    } else {
-      losses_ = whatMayBeMissing(transaction_, inputs_);
     }
+  }
+  if (!error_) {
+    // Where the plug-in was not asked the files that it would have found are left as they are.
+    ledger_ = makeLedger(transaction_,
+                         result == PluginResult::NotAsked ? std::vector<DevicePlace>() : inputs_,
+                         carriedOver_, told_, facts);
   }
   // Last, since the check may be the first to read a file.
   if (transaction_.readFailure()) {
     error_ = readingError(*transaction_.readFailure());
-    losses_.clear();
+    ledger_ = {};
   }
   if (error_) {
     return;
@@ -104,8 +109,10 @@ std::optional<Proposal> MigrationInMemory::proposal(KeepFiles keep, const TakeBy
     proposal.status = error_->exitStatus;
     return proposal;
   }
-  proposal.hasLosses = !losses_.empty();
-  proposal.keepsFiles = proposal.hasLosses || keep == KeepFiles::Always;
+  if (!ledger_.isClean()) {
+    proposal.status = ExitStatus::NotAllCarriedOver;
+  }
+  proposal.keepsFiles = !ledger_.isClean() || keep == KeepFiles::Always;
   proposal.recordStays = recordStays_;
   std::uint64_t position = 0;
   const auto takeCounted = [&](std::string_view bytes) {

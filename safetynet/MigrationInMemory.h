@@ -7,8 +7,11 @@
 #include <vector>
 
 #include "commandline/ExitStatus.h"
+#include "safetynet/AccountLedger.h"
+#include "safetynet/ChangedKeys.h"
 #include "safetynet/CommitRecord.h"
 #include "safetynet/Proposal.h"
+#include "safetynet/ToldFates.h"
 #include "transaction/Transaction.h"
 
 namespace accounts {
@@ -33,12 +36,15 @@ class MigrationInMemory {
 
   [[nodiscard]] Transaction& transaction() { return transaction_; }
 
+  /// Is to observe the plug-in.
+  [[nodiscard]] ToldFates& told() { return told_; }
+
   /// Verifies what the plug-in did; before proposal().
-  void verify(PluginResult result);
+  void verify(PluginResult result, const DeviceFacts& facts);
   /// Why nothing of it may be committed; none when all may.
   [[nodiscard]] const std::optional<ProgramError>& error() const { return error_; }
-  /// What may not have been carried over, as whatMayBeMissing() says.
-  [[nodiscard]] const std::vector<std::string>& losses() const { return losses_; }
+  /// What became of every account; empty when nothing may be committed.
+  [[nodiscard]] const AccountLedger& ledger() const { return ledger_; }
   /// What is foreseen to stay although it was to be removed, one sentence each.
   [[nodiscard]] const std::vector<std::string>& warnings() const { return warnings_; }
 
@@ -54,6 +60,7 @@ class MigrationInMemory {
   [[nodiscard]] std::string recordText(std::uint64_t settingsSize) const;
 
   Transaction transaction_;
+  ToldFates told_;
   /// The stores that an earlier run carried over.
   CommitRecord carriedOver_;
   /// The bytes of an earlier run's record.
@@ -61,7 +68,7 @@ class MigrationInMemory {
   /// What the plug-in finds, the settings file last.
   std::vector<DevicePlace> inputs_;
   std::optional<ProgramError> error_;
-  std::vector<std::string> losses_;
+  AccountLedger ledger_;
   std::vector<std::string> warnings_;
   CommitRecord record_;
   bool recordStays_ = false;

@@ -90,7 +90,7 @@ MigrationRun::Attempt MigrationRun::attempt(RunPurpose purpose, KeepFiles keep) 
                  "The plug-in reported that it failed: no migration lock can be made: " +
                      means_.locks.reason()});
   }
-  if (proposal->status != ExitStatus::Success || purpose == RunPurpose::Plan) {
+  if (!proposal->isToBeCommitted() || purpose == RunPurpose::Plan) {
     return Attempt::Over;
   }
   return means_.isStopped() ? fail({ExitStatus::TemporaryFailure,

@@ -1,6 +1,7 @@
 #include "safetynet/Proposal.h"
 
 #include <algorithm>
+#include <array>
 
 #include "safetynet/FlatBytes.h"
 
@@ -66,6 +67,19 @@ ProposedChange takeChange(FlatReader& reader, std::uint64_t memoryFileSize) {
   return change;
 }
 
+/// A status that a migration may end with.
+ExitStatus takeStatus(FlatReader& reader) {
+  constexpr std::array statuses = {
+      ExitStatus::Success,           ExitStatus::MigrationFailed,  ExitStatus::NotVerified,
+      ExitStatus::NotAllCarriedOver, ExitStatus::MissingInput,     ExitStatus::PluginEnded,
+      ExitStatus::InputOutputError,  ExitStatus::TemporaryFailure, ExitStatus::CannotCreate};
+  const auto status = static_cast<ExitStatus>(reader.take<std::uint8_t>());
+  if (std::ranges::find(statuses, status) == statuses.end()) {
+    reader.refuse();
+  }
+  return status;
+}
+
 }  // namespace
 
 const ProposedChange* Proposal::changeOf(DevicePlace place) const {
@@ -78,7 +92,6 @@ std::string bytesOf(const Proposal& proposal) {
   writer.add(kFirstMark);
   writer.add(static_cast<std::uint8_t>(proposal.status));
   writer.add(static_cast<std::uint8_t>(proposal.keepsFiles));
-  writer.add(static_cast<std::uint8_t>(proposal.hasLosses));
   writer.add(static_cast<std::uint8_t>(proposal.recordStays));
   writer.addText(proposal.informationFileName);
   writer.add(static_cast<std::uint8_t>(proposal.changes.size()));
@@ -103,9 +116,8 @@ std::optional<Proposal> proposalFrom(std::string_view bytes, std::uint64_t memor
   if (reader.take<std::uint32_t>() != kFirstMark) {
     reader.refuse();
   }
-  proposal.status = static_cast<ExitStatus>(reader.take<std::uint8_t>());
+  proposal.status = takeStatus(reader);
   proposal.keepsFiles = reader.takeBoolean();
-  proposal.hasLosses = reader.takeBoolean();
   proposal.recordStays = reader.takeBoolean();
   proposal.informationFileName = reader.takeText(kLongestName);
   const auto count = reader.take<std::uint8_t>();

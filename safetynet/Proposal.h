@@ -36,11 +36,11 @@ struct ProposedChange {
 /// What a migration in memory came to, for the process that commits it: a flat list that it reads
 /// without looking into any file.
 struct Proposal {
-  /// What the run ends with if all goes well; with anything but success nothing is changed.
+  /// What the run ends with if all goes well. Only with success, or when not everything was carried
+  /// over, is anything changed.
   ExitStatus status = ExitStatus::Success;
-  /// Whether the files are to be kept as they were, and whether because of losses.
+  /// Whether the files are to be kept as they were.
   bool keepsFiles = false;
-  bool hasLosses = false;
   /// Whether the commit record stays, since a store that was carried over cannot be removed.
   bool recordStays = false;
   /// At most one for each place.
@@ -50,6 +50,10 @@ struct Proposal {
 
   bool operator==(const Proposal&) const = default;
 
+  /// Whether anything is to be changed.
+  [[nodiscard]] bool isToBeCommitted() const {
+    return status == ExitStatus::Success || status == ExitStatus::NotAllCarriedOver;
+  }
   /// The change of a place; null for none.
   [[nodiscard]] const ProposedChange* changeOf(DevicePlace place) const;
 };

@@ -26,4 +26,10 @@ inline constexpr std::string_view kCalDAVAccountClass = "MobileCalDAVAccount";
 /// Boolean of a mail account. What its absence means differs from step to step.
 inline constexpr std::string_view kIsActiveKey = "IsActive";
 
+/// What a device answers about its processor, and the answer of the oldest ones.
+inline constexpr std::string_view kArchitectureQuestion = "CPUArchitecture";
+inline constexpr std::string_view kOldestArchitecture = "armv6";
+/// The hosted mail service's records of subscribed calendars.
+inline constexpr std::string_view kExoSubscribedCalendarsKey = "DAExoSubscribedCalendarInfos";
+
 }  // namespace accounts

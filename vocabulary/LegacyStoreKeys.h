@@ -1,5 +1,6 @@
 #pragma once
 
+#include <array>
 #include <string_view>
 
 namespace accounts {
@@ -22,6 +23,11 @@ inline constexpr std::string_view kLegacyExchangeAccounts = "DAAccountsKey";
 inline constexpr std::string_view kLegacyExchangeClass = "DAAccountConfigurationClass";
 inline constexpr std::string_view kLegacyExchangeDisplayName = "DAAccountDescription";
 inline constexpr std::string_view kLegacyExchangeIdentifier = "DAAccountConfigurationAccountID";
+
+/// Booleans that switch dataclasses: calendars, contacts, mail, contacts search.
+inline constexpr std::array<std::string_view, 4> kLegacyExchangeSwitches = {
+    "DAAccountEnabledForCalendar", "DAAccountEnabledForContacts", "DAAccountEnabledForEmail",
+    "DAAccountEnabledForContactsSearch"};
 
 // The migration-information file: the files as they were and as they are.
 inline constexpr std::string_view kInformationOldMailAccounts = "OldMailAccounts";

@@ -5,12 +5,14 @@ const kSentences = {
   run: {
     migrated: "The accounts were migrated%.",
     unchanged: "The migration succeeded and changed no account.",
-    unverified: "The result could not be verified, so the inputs were put back.",
+    losses: "The accounts were migrated%, but not everything was carried over.",
+    unverified: "The result could not be verified, so nothing was changed.",
     failed: "The migration failed.",
   },
   plan: {
     migrated: "A migration would bring the accounts up to date%.",
     unchanged: "A migration would change no account.",
+    losses: "A migration would bring the accounts up to date%, but not carry everything over.",
     unverified: "The result of a migration could not be verified.",
     failed: "A migration would fail.",
   },
@@ -22,7 +24,7 @@ function outcomeOf(report, counts) {
     return "failed";
   }
   if ((report.exitStatus ?? 0) !== 0) {
-    return report.exitStatus === 2 ? "unverified" : "failed";
+    return { 2: "unverified", 3: "losses" }[report.exitStatus] ?? "failed";
   }
   const { before, after } = report.versions ?? {};
   const isChanged = Object.keys(kMarks).some((mark) => counts[mark] > 0);
@@ -88,12 +90,13 @@ function overview(report, accounts) {
   return [
     make("p", { class: "kind" }, report.command === "plan" ? "Plan of a migration" : "Report of a migration"),
     make("h1", { class: outcome }, make("span", { class: "sign", "aria-hidden": "true" },
-      outcome === "failed" || outcome === "unverified" ? "✕" : "✓"), sentence),
+      { failed: "✕", unverified: "✕", losses: "!" }[outcome] ?? "✓"), sentence),
     make("p", { class: "counts" }, marks.map((mark) => [make("span", { class: `badge ${mark}` },
       `${counts[mark].toLocaleString("en")} ${kMarkNames[mark] ?? mark}`), " "]),
       counts.unchanged > 0 ? make("span", { class: "badge" }, `${counts.unchanged.toLocaleString("en")} unchanged`) : null),
     overviewFacts(report),
     notice("error", "Error", report.error ? [report.error] : []),
+    notice("warning", "Not carried over", report.ledger?.losses ?? []),
     notice("warning", (report.warnings ?? []).length === 1 ? "Warning" : "Warnings", report.warnings ?? []),
     notice("kept", "Kept inputs", kept),
   ];

@@ -69,8 +69,8 @@ TEST_F(OrderedAccountsTest, ARecordIsReplacedByIdentityAndNotByIdentifier) {
 TEST_F(OrderedAccountsTest, AReplacementIsFoundUnderItsOwnIdentifier) {
   const BasicAccountReference account = append("A");
   list.replaceFirst(account, mail("Q").record());
-  EXPECT_FALSE(list.removeLast("A"));
-  EXPECT_TRUE(list.removeLast("Q"));
+  EXPECT_EQ(list.removeLast("A"), nullptr);
+  EXPECT_NE(list.removeLast("Q"), nullptr);
   EXPECT_EQ(list.size(), 0u);
 }
 
@@ -84,7 +84,7 @@ TEST_F(OrderedAccountsTest, OnlyTheLastRecordOfAnIdentifierIsRemoved) {
   const BasicAccountReference first = append("A");
   append("B");
   append("A");
-  EXPECT_TRUE(list.removeLast("A"));
+  EXPECT_NE(list.removeLast("A"), nullptr);
   EXPECT_EQ(identifiers(), "A B");
   EXPECT_EQ(list.accounts().front(), first);
 }
@@ -93,14 +93,14 @@ TEST_F(OrderedAccountsTest, ARecordIsRemovedFromEveryPlaceThatItHas) {
   const BasicAccountReference account = append("A");
   append("B");
   list.append(account);
-  EXPECT_TRUE(list.removeLast("A"));
+  EXPECT_NE(list.removeLast("A"), nullptr);
   EXPECT_EQ(identifiers(), "B");
   EXPECT_EQ(list.size(), 1u);
 }
 
 TEST_F(OrderedAccountsTest, RemovingAnUnknownIdentifierChangesNothing) {
   append("A");
-  EXPECT_FALSE(list.removeLast("B"));
+  EXPECT_EQ(list.removeLast("B"), nullptr);
   EXPECT_EQ(identifiers(), "A");
 }
 
@@ -108,22 +108,22 @@ TEST_F(OrderedAccountsTest, AnAccountIsFoundUnderTheIdentifierThatItHasNow) {
   const BasicAccountReference account = append("A");
   list.removeLast("nothing, but the list is indexed now");
   account->setAccountProperty_forKey("B", kAccountIdentifier);
-  EXPECT_FALSE(list.removeLast("A"));
-  EXPECT_TRUE(list.removeLast("B"));
+  EXPECT_EQ(list.removeLast("A"), nullptr);
+  EXPECT_NE(list.removeLast("B"), nullptr);
 }
 
 TEST_F(OrderedAccountsTest, AnAccountWithoutAnIdentifierStaysInItsPlace) {
   append("A")->removeAccountPropertyForKey(kAccountIdentifier);
   append("B");
-  EXPECT_FALSE(list.removeLast(""));
+  EXPECT_EQ(list.removeLast(""), nullptr);
   EXPECT_EQ(identifiers(), "- B");
 }
 
 TEST_F(OrderedAccountsTest, AssigningPutsOtherAccountsInThePlaceOfAll) {
   append("A");
   list.assign({mail("B").record(), mail("C").record()});
-  EXPECT_FALSE(list.removeLast("A"));
-  EXPECT_TRUE(list.removeLast("B"));
+  EXPECT_EQ(list.removeLast("A"), nullptr);
+  EXPECT_NE(list.removeLast("B"), nullptr);
   EXPECT_EQ(identifiers(), "C");
 }
 

@@ -102,12 +102,13 @@ Proposal InProcessWorker::migrate(const DeviceSnapshot& snapshot, const WorkerTa
                                                       .propertyLists = &propertyLists,
                                                       .sharedResources = &sharedResources});
   if (task.purpose == RunPurpose::FinishingAlone) {
-    migration.verify(PluginResult::NotAsked);
+    migration.verify(PluginResult::NotAsked, {});
   } else {
     // Each attempt is made by a new process.
+    platform.migrationObserver = &migration.told();
     const Process process(platform);
     const bool result = AccountsDataMigrator().performMigration();
-    migration.verify(result ? PluginResult::GaveTrue : PluginResult::GaveFalse);
+    migration.verify(result ? PluginResult::GaveTrue : PluginResult::GaveFalse, factsOf(platform));
   }
   {
     const AllocationsSucceed whileObserving;

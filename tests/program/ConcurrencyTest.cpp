@@ -12,12 +12,12 @@
 #include <set>
 #include <thread>
 
+#include "tests/fakes/Sanitizers.h"
 #include "tests/program/AttributedLog.h"
 #include "tests/program/ExitStatuses.h"
 #include "tests/program/InterruptedDevice.h"
 #include "tests/program/ListedLocks.h"
 #include "tests/program/Programs.h"
-#include "tests/program/Sanitizers.h"
 #include "tests/program/TracedProgram.h"
 
 // Many processes on one device at once, some of them killed, and another program that looks on.

@@ -7,6 +7,7 @@
 #include <thread>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/ExitStatuses.h"
 #include "tests/program/ListedLocks.h"
 
 namespace accounts {
@@ -131,7 +132,7 @@ TEST_F(DriverResult, AFailedConversionIsNotTheResultOfTheMigration) {
 
   const ProgramResult result = migrate();
 
-  EXPECT_EQ(result.exitStatus, 0);
+  EXPECT_EQ(result.exitStatus, kNotAllCarriedOver);
   EXPECT_NE(result.errors.find("Could not convert the description for the Exchange account"),
             std::string::npos)
       << result.errors;

@@ -8,6 +8,8 @@ namespace accounts {
 inline constexpr int kAttention = 1;
 inline constexpr int kMigrationFailed = 1;
 inline constexpr int kVerificationFailed = 2;
+/// Migrated, but not everything was carried over.
+inline constexpr int kNotAllCarriedOver = 3;
 inline constexpr int kUnusableArguments = 64;
 inline constexpr int kMalformedInput = 65;
 inline constexpr int kMissingInput = 66;

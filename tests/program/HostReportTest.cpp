@@ -25,6 +25,11 @@ TEST_F(HostReport, TheObjectTellsEverythingInTheAgreedKeys) {
       {"cloudTabAnnouncements", 0},
       {"settingsSaves", {{"lastWritten", true}, {"replacedFile", true}}},
       {"keptInputs", nlohmann::json::array()},
+      {"outcome", "Migrated"},
+      {"ledger",
+       {{"counts", object["ledger"]["counts"]},
+        {"losses", nlohmann::json::array()},
+        {"leftBehind", nlohmann::json::array()}}},
       {"warnings", nlohmann::json::array()},
       {"exitStatus", 0}};
   EXPECT_EQ(object, expected);

@@ -1,7 +1,7 @@
 #include <iostream>
 
+#include "tests/fakes/Sanitizers.h"
 #include "tests/program/InterruptedDevice.h"
-#include "tests/program/Sanitizers.h"
 #include "tests/program/TracedProgram.h"
 
 // The real program and its child, killed before and after every single system call with which they

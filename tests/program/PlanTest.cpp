@@ -7,6 +7,7 @@
 #include <map>
 
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/ExitStatuses.h"
 #include "tests/program/Programs.h"
 #include "tests/program/SmallDisk.h"
 
@@ -65,7 +66,7 @@ TEST_F(Plan, ChangesNothingBeneathTheRoot) {
   write(kLegacyMailPath, PropertyDictionary{{"MailAccounts", PropertyArray{}}});
   const auto before = tree();
 
-  EXPECT_EQ(plan().exitStatus, 0);
+  EXPECT_EQ(plan().exitStatus, kNotAllCarriedOver);
 
   EXPECT_EQ(tree(), before);
 }
@@ -178,11 +179,18 @@ TEST_F(Plan, ForeseesThatAnAccountWouldNotBeCarriedOver) {
 
   const nlohmann::json report = planned();
 
-  EXPECT_EQ(report["exitStatus"], 0);
+  EXPECT_EQ(report["exitStatus"], kNotAllCarriedOver);
+  EXPECT_EQ(report["outcome"],
+            "Migrated, but 1 account was not carried over: MailAccounts[0] \"No class\" "
+            "(identifier M) of " +
+                std::string(kLegacyMailPath) + ": it has no class");
+  EXPECT_EQ(report["ledger"]["losses"],
+            nlohmann::json::array({"MailAccounts[0] \"No class\" (identifier M) of " +
+                                   std::string(kLegacyMailPath) + ": it has no class"}));
   EXPECT_EQ(report["warnings"],
-            (nlohmann::json{"Not every account of " + std::string(kLegacyMailPath) +
-                            " was found in the settings file; a run would keep the files as they "
-                            "were"}));
+            nlohmann::json::array({"1 account was not carried over: " +
+                                   report["ledger"]["losses"][0].get<std::string>() +
+                                   "; a run would keep the files as they were"}));
   EXPECT_EQ(stageNamed(report, "_migrateMailAccounts:")["succeeded"], false);
 }
 

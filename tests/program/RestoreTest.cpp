@@ -1,5 +1,6 @@
 #include <filesystem>
 
+#include "tests/program/ExitStatuses.h"
 #include "tests/program/Programs.h"
 #include "tests/program/SafetyNetFixture.h"
 
@@ -11,7 +12,7 @@ class Restore : public SafetyNetFixture {
  protected:
   void SetUp() override {
     writeText(kSettingsPath, "refused");
-    ASSERT_EQ(migrate().exitStatus, 0);
+    ASSERT_EQ(migrate().exitStatus, kNotAllCarriedOver);
     folder = onlyKeptFolder();
     name = std::filesystem::path(folder).filename();
     migrated = readText(kSettingsPath);

@@ -14,6 +14,8 @@
 #include "propertylist/PropertyListFile.h"
 #include "propertylist/binary/BinaryPropertyList.h"
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/ExitStatuses.h"
+#include "tests/program/SafetyNetFixture.h"
 #include "tests/program/StoredVersionsComparison.h"
 
 namespace accounts {
@@ -91,6 +93,12 @@ class StoredVersions : public DeviceRootFixture, public testing::WithParamInterf
     return runProgram(migrationCallInEnglish({"--json"}));
   }
 
+  /// On the devices of version 12 something is lost: an account that other software damaged, and
+  /// accounts that legacy ones replace.
+  [[nodiscard]] static int expectedStatus() {
+    return std::string_view(GetParam()).starts_with("12") ? kNotAllCarriedOver : 0;
+  }
+
   /// A part of a report as text, without what differs from run to run: how long the stages took,
   /// and identifiers that the migration made up, which are numbered.
   [[nodiscard]] std::string comparable(nlohmann::json part) const {
@@ -130,7 +138,7 @@ class StoredVersions : public DeviceRootFixture, public testing::WithParamInterf
 TEST_P(StoredVersions, EndWithTheAccountsThatAPersonDerived) {
   const ProgramResult result = migrateInEnglish();
 
-  ASSERT_EQ(result.exitStatus, 0) << result.errors;
+  ASSERT_EQ(result.exitStatus, expectedStatus()) << result.errors;
   const std::vector<std::string> found = differences(expectedSettings(GetParam()), settingsFound());
   EXPECT_TRUE(found.empty()) << joined(found);
 }
@@ -141,7 +149,8 @@ TEST_P(StoredVersions, ArePlannedAsTheyAreThenMigrated) {
   const nlohmann::json planned = onlyObject(runProgram(call));
   const std::string reportFile = onThisMachine("/report.json").string();
 
-  ASSERT_EQ(runProgram(migrationCallInEnglish({"--report", reportFile})).exitStatus, 0);
+  ASSERT_EQ(runProgram(migrationCallInEnglish({"--report", reportFile})).exitStatus,
+            expectedStatus());
 
   const nlohmann::json done = nlohmann::json::parse(readText("/report.json"));
   EXPECT_EQ(comparable(planned["stages"]), comparable(done["stages"]));
@@ -178,7 +187,7 @@ TEST_P(StoredVersions, ReportTheAnnouncementsThatWereMade) {
 }
 
 TEST_P(StoredVersions, EndWithABinaryFileOfTheCurrentVersion) {
-  ASSERT_EQ(migrateInEnglish().exitStatus, 0);
+  ASSERT_EQ(migrateInEnglish().exitStatus, expectedStatus());
 
   EXPECT_TRUE(isBinaryPropertyList(readText(kSettingsPath)));
   const PropertyDictionary settings = readDictionary(kSettingsPath);
@@ -195,16 +204,20 @@ TEST_P(StoredVersions, LeaveNoLegacyStoreNoSentinelAndNothingTemporary) {
   }
   std::ranges::sort(expected);
 
-  ASSERT_EQ(migrateInEnglish().exitStatus, 0);
+  ASSERT_EQ(migrateInEnglish().exitStatus, expectedStatus());
 
-  EXPECT_EQ(files(), expected);
+  std::vector<std::string> found = files();
+  std::erase_if(found, [](const std::string& path) {
+    return expectedStatus() == kNotAllCarriedOver && path.starts_with(kAccountMigration);
+  });
+  EXPECT_EQ(found, expected);
 }
 
 TEST_P(StoredVersions, KeepACopyOfTheFileAsItWas) {
   const bool hasSettings = exists(kSettingsPath);
   const std::string before = hasSettings ? readText(kSettingsPath) : "";
 
-  ASSERT_EQ(migrateInEnglish().exitStatus, 0);
+  ASSERT_EQ(migrateInEnglish().exitStatus, expectedStatus());
 
   ASSERT_EQ(exists(kSettingsCopyPath), hasSettings);
   if (hasSettings) {
@@ -213,13 +226,15 @@ TEST_P(StoredVersions, KeepACopyOfTheFileAsItWas) {
 }
 
 TEST_P(StoredVersions, StayByteForByteInASecondMigration) {
-  ASSERT_EQ(migrateInEnglish().exitStatus, 0);
+  ASSERT_EQ(migrateInEnglish().exitStatus, expectedStatus());
   const std::string afterFirst = readText(kSettingsPath);
 
   const ProgramResult second = migrateInEnglish();
 
   EXPECT_EQ(second.exitStatus, 0);
-  EXPECT_EQ(second.errors, "") << "nothing needs migrating any more";
+  if (expectedStatus() == 0) {
+    EXPECT_EQ(second.errors, "") << "nothing needs migrating any more";
+  }
   EXPECT_EQ(readText(kSettingsPath), afterFirst);
 }
 

@@ -57,7 +57,7 @@ TEST(OverviewTest, OneSentenceSaysWhatCameOfARunOrAPlan) {
                   "The accounts were migrated to version 12.",
                   "The migration succeeded and changed no account.",
                   "The accounts were migrated; their version stays 12.",
-                  "The result could not be verified, so the inputs were put back.",
+                  "The result could not be verified, so nothing was changed.",
                   "The migration failed.", "The migration failed.",
                   "A migration would bring the accounts up to date from version 3 to 12.",
                   "A migration would change no account.", "A migration would fail.",

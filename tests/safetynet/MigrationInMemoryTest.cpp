@@ -23,7 +23,7 @@ class MigrationInMemoryTest : public MigrationTest {
     MigrationInMemory& migration = begin();
     save(settingsWith(12, {"one", "mail"}));
     remove(DevicePlace::LegacyMail);
-    migration.verify(PluginResult::GaveTrue);
+    migration.verify(PluginResult::GaveTrue, {});
     return migration;
   }
   [[nodiscard]] CommitRecord proposedRecord() {
@@ -43,7 +43,7 @@ class MigrationInMemoryTest : public MigrationTest {
 TEST_F(MigrationInMemoryTest, AMigrationThatLostNothingMayBeCommitted) {
   const MigrationInMemory& migration = migrate();
   EXPECT_FALSE(migration.error());
-  EXPECT_THAT(migration.losses(), IsEmpty());
+  EXPECT_THAT(migration.ledger().losses(), IsEmpty());
   EXPECT_THAT(migration.warnings(), IsEmpty());
   EXPECT_EQ(proposal().status, ExitStatus::Success);
   EXPECT_FALSE(proposal().keepsFiles);
@@ -87,7 +87,7 @@ TEST_F(MigrationInMemoryTest, AMemoryFileThatTakesNoMoreMeansNoProposal) {
 TEST_F(MigrationInMemoryTest, APluginThatFailedChangesNothing) {
   MigrationInMemory& migration = begin();
   save(settingsWith(12, {"one", "mail"}));
-  migration.verify(PluginResult::GaveFalse);
+  migration.verify(PluginResult::GaveFalse, {});
   ASSERT_TRUE(migration.error());
   EXPECT_EQ(migration.error()->exitStatus, ExitStatus::MigrationFailed);
   EXPECT_EQ(proposal().status, ExitStatus::MigrationFailed);
@@ -97,7 +97,7 @@ TEST_F(MigrationInMemoryTest, APluginThatFailedChangesNothing) {
 TEST_F(MigrationInMemoryTest, AResultThatCannotBeVerifiedChangesNothing) {
   MigrationInMemory& migration = begin();
   save(settingsWith(11, {"one"}));
-  migration.verify(PluginResult::GaveTrue);
+  migration.verify(PluginResult::GaveTrue, {});
   ASSERT_TRUE(migration.error());
   EXPECT_EQ(migration.error()->exitStatus, ExitStatus::NotVerified);
   EXPECT_EQ(migration.error()->message,
@@ -111,7 +111,7 @@ TEST_F(MigrationInMemoryTest, AFileThatCannotBeReadChangesNothing) {
   MigrationInMemory& migration = begin();
   static_cast<void>(transaction().dictionaryAt(DevicePlace::LegacyMail));
   save(settingsWith(12, {"one"}));
-  migration.verify(PluginResult::GaveTrue);
+  migration.verify(PluginResult::GaveTrue, {});
   ASSERT_TRUE(migration.error());
   EXPECT_EQ(migration.error()->exitStatus, ExitStatus::InputOutputError);
   EXPECT_THAT(migration.error()->message, HasSubstr("Cannot read "));
@@ -122,7 +122,7 @@ TEST_F(MigrationInMemoryTest, AStoreThatIsReadForTheCheckAloneCannotFailUnseen) 
   snapshot.addFailingFile(DevicePlace::LegacyMail);
   MigrationInMemory& migration = begin();
   save(settingsWith(12, {"one"}));
-  migration.verify(PluginResult::GaveTrue);
+  migration.verify(PluginResult::GaveTrue, {});
   EXPECT_TRUE(migration.error());
 }
 
@@ -130,9 +130,9 @@ TEST_F(MigrationInMemoryTest, ALossIsToldAndTheFilesAreKept) {
   MigrationInMemory& migration = begin();
   save(settingsWith(12, {"one"}));
   remove(DevicePlace::LegacyMail);
-  migration.verify(PluginResult::GaveTrue);
+  migration.verify(PluginResult::GaveTrue, {});
   EXPECT_FALSE(migration.error());
-  EXPECT_EQ(migration.losses().size(), 1u);
+  EXPECT_EQ(migration.ledger().losses().size(), 1u);
   EXPECT_TRUE(proposal().keepsFiles);
 }
 
@@ -166,7 +166,7 @@ TEST_F(MigrationInMemoryTest, ARemovalWithoutASaveVouchesForWhatAnEarlierRunCarr
   MigrationInMemory& migration = begin();
   remove(DevicePlace::LegacyMail);
   remove(DevicePlace::RemovalSentinel);
-  migration.verify(PluginResult::GaveTrue);
+  migration.verify(PluginResult::GaveTrue, {});
   ASSERT_EQ(proposedRecord().stores.size(), 1u);
   EXPECT_FALSE(proposedRecord().stores[0].proof);
 }
@@ -175,7 +175,7 @@ TEST_F(MigrationInMemoryTest, AStoreThatThePluginCouldNotRemoveIsForeseenAndTheR
   snapshot[DevicePlace::LegacyMail].whyNotRemoved = PlaceFailure{EPERM, "Cannot remove it: why"};
   MigrationInMemory& migration = begin();
   save(settingsWith(12, {"one", "mail"}));
-  migration.verify(PluginResult::GaveTrue);
+  migration.verify(PluginResult::GaveTrue, {});
   EXPECT_THAT(migration.warnings(),
               ElementsAre(snapshot.pathOf(DevicePlace::LegacyMail) +
                           " stays, although it is carried over; a later run removes it: Cannot "
@@ -192,7 +192,7 @@ TEST_F(MigrationInMemoryTest, AnInterruptedCommitIsFinishedBeforeThePluginSeesTh
 TEST_F(MigrationInMemoryTest, AnInterruptedCommitIsFinishedWithoutThePlugin) {
   addInterruptedCommit();
   MigrationInMemory& migration = begin();
-  migration.verify(PluginResult::NotAsked);
+  migration.verify(PluginResult::NotAsked, {});
   EXPECT_FALSE(migration.error());
   const Proposal proposed = proposal();
   EXPECT_EQ(proposed.changeOf(DevicePlace::LegacyMail)->action, Action::Remove);
@@ -205,9 +205,9 @@ TEST_F(MigrationInMemoryTest, AStoreThatWasCarriedOverBeforeIsVouchedForAgain) {
   addInterruptedCommit();
   snapshot[DevicePlace::LegacyMail].whyNotRemoved = PlaceFailure{EPERM, "Cannot remove it: why"};
   MigrationInMemory& migration = begin();
-  migration.verify(PluginResult::GaveTrue);
+  migration.verify(PluginResult::GaveTrue, {});
   EXPECT_FALSE(migration.error());
-  EXPECT_THAT(migration.losses(), IsEmpty());
+  EXPECT_THAT(migration.ledger().losses(), IsEmpty());
   EXPECT_EQ(migration.warnings().size(), 1u);
   EXPECT_NE(proposal().changeOf(DevicePlace::CommitRecord)->action, Action::Write)
       << "since it says the same";
@@ -219,7 +219,7 @@ TEST_F(MigrationInMemoryTest, AStaleRecordEndsWithThisRun) {
   snapshot.places[indexOf(DevicePlace::LegacyMail)] = FakeSnapshot().at(DevicePlace::LegacyMail);
   MigrationInMemory& migration = begin();
   save(settingsWith(12, {"one"}));
-  migration.verify(PluginResult::GaveTrue);
+  migration.verify(PluginResult::GaveTrue, {});
   EXPECT_EQ(proposal().changeOf(DevicePlace::CommitRecord)->action, Action::Remove);
 }
 

@@ -57,7 +57,8 @@ class FakeWorker final : public Worker {
       runPlugin(migration.transaction());
     }
     migration.verify(task.purpose == RunPurpose::FinishingAlone ? PluginResult::NotAsked
-                                                                : PluginResult::GaveTrue);
+                                                                : PluginResult::GaveTrue,
+                     {});
     memoryFile.clear();
     const auto proposal = migration.proposal(task.keep, [this](std::string_view bytes) {
       memoryFile.append(bytes);

@@ -1,0 +1,40 @@
+#include "safetynet/ToldFates.h"
+
+#include <algorithm>
+
+namespace accounts {
+
+void ToldFates::stageBegan(std::string_view operation, std::string_view purpose) {
+  stages_.emplace_back(operation);
+  if (next_ != nullptr) {
+    next_->stageBegan(operation, purpose);
+  }
+}
+
+void ToldFates::stageEnded(bool succeeded,
+                           const std::optional<PropertyDictionary>& accountSettings) {
+  if (next_ != nullptr) {
+    next_->stageEnded(succeeded, accountSettings);
+  }
+}
+
+void ToldFates::accountFared(const AccountEvent& event) {
+  events_.push_back({event.account, event.fate, event.other, std::string(event.reason),
+                     stages_.empty() ? std::string() : stages_.back()});
+  if (next_ != nullptr) {
+    next_->accountFared(event);
+  }
+}
+
+void ToldFates::accountsSaved(const std::vector<AccountOrigin>& accounts) {
+  saved_ = accounts;
+  if (next_ != nullptr) {
+    next_->accountsSaved(accounts);
+  }
+}
+
+bool ToldFates::hasRun(std::string_view stage) const {
+  return std::ranges::find(stages_, stage) != stages_.end();
+}
+
+}  // namespace accounts

@@ -1,0 +1,111 @@
+// What becomes of accounts that are carried over.
+
+#include "tests/ledger/LedgerFixture.h"
+
+namespace accounts {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+PropertyDictionary hosted(std::string_view identifier) {
+  return anAccount(identifier, kVelmoraAccountType, kVelmoraAccountClass);
+}
+
+TEST(Fates, AnAccountThatNoRuleTouchesIsKept) {
+  const MigratedInMemory migrated(
+      {.settings = settings(12, {anAccount("A", kLDAPAccountType, "LDAPAccount")})});
+  EXPECT_THAT(migrated.fates(), ElementsAre("Accounts[0] kept"));
+}
+
+TEST(Fates, AnAccountWithoutAnIdentifierIsGivenAFreshOneAndIsChanged) {
+  const MigratedInMemory migrated(
+      {.settings = settings(
+           12, {without(anAccount("A", kLDAPAccountType, "LDAPAccount"), kAccountIdentifier)})});
+  EXPECT_THAT(migrated.fates(), ElementsAre("Accounts[0] changed"));
+}
+
+TEST(Fates, AnAccountWithAUniqueIdIsRenamed) {
+  const MigratedInMemory migrated(
+      {.settings = settings(1, {with(anAccount("A", kMailAccountType, kIMAPAccountClass),
+                                     kLegacyMailIdentifier, "B")})});
+  EXPECT_THAT(migrated.fates(), ElementsAre("Accounts[0] renamed"));
+  EXPECT_THAT(migrated.losses(), IsEmpty());
+}
+
+TEST(Fates, DescriptionsAreConverted) {
+  const MigratedInMemory migrated({.mail = mailStore({mailDescription("A", kIMAPAccountClass)},
+                                                     {mailDescription("B", kSMTPAccountClass)}),
+                                   .exchange = exchangeStore({exchangeDescription("C")})});
+  EXPECT_THAT(migrated.fates(),
+              ElementsAre("DeliveryAccounts[0] converted", "MailAccounts[0] converted",
+                          "DAAccountsKey[0] converted"));
+}
+
+TEST(Fates, DescriptionsWithoutIdentifiersAreConverted) {
+  const MigratedInMemory migrated(
+      {.mail = mailStore({without(mailDescription("A", kIMAPAccountClass), kLegacyMailIdentifier)}),
+       .exchange = exchangeStore({without(exchangeDescription("C"), kLegacyExchangeIdentifier)})});
+  EXPECT_THAT(migrated.losses(), IsEmpty());
+}
+
+TEST(Fates, AHostedAccountMovesBelowAParentWithItsChildrenAtTheParentsSide) {
+  const PropertyDictionary child = anAccount("K", kCalDAVAccountType, "CalDAVAccount");
+  const MigratedInMemory migrated(
+      {.settings = settings(6, {with(hosted("A"), kAccountChildAccounts, PropertyArray{child})})});
+  EXPECT_THAT(migrated.fates(), ElementsAre("Accounts[0] movedBelow",
+                                            "Accounts[0].ChildAccounts[0] movedToOtherParent"));
+  EXPECT_THAT(migrated.losses(), IsEmpty());
+}
+
+TEST(Fates, ACalendarAccountIsJoinedIntoItsMailAccount) {
+  const PropertyDictionary gmail =
+      with(anAccount("G", kMailAccountType, kGmailAccountClass), kAccountUsername, "jo");
+  const PropertyDictionary calendars = with(
+      with(anAccount("K", kCalDAVAccountType, kCalDAVAccountClass), "CalDAVPrincipalConfiguration",
+           PropertyDictionary{{"Login_Key", "jo"}, {"CalDAV_Server_Key", "www.google.com"}}),
+      "CalDAVAccountConfiguration",
+      PropertyDictionary{{"CalDAV_PrincipalPath_Key", "/calendar/dav/jo/user"}});
+  const MigratedInMemory migrated({.settings = settings(4, {gmail, calendars})});
+  EXPECT_THAT(migrated.fates(), ElementsAre("Accounts[0] changed", "Accounts[1] joined"));
+}
+
+TEST(Fates, TheOnDeviceAccountIsMadeAnew) {
+  const MigratedInMemory migrated(
+      {.settings = settings(
+           2, {anAccount("DeviceLocalAccount", kOnMyDeviceAccountType, "DeviceLocalAccount")})});
+  EXPECT_THAT(migrated.fates(), ElementsAre("Accounts[0] rebuilt"));
+}
+
+TEST(Fates, WhatAnEarlierRunCarriedOverIsFoundByIdentifierChildrenIncluded) {
+  const MigratedInMemory migrated(
+      {.settings = settings(12, {with(anAccount("Q", kQuarxAccountType, "X"), kAccountChildAccounts,
+                                      PropertyArray{hosted("A")})}),
+       .mail = mailStore({mailDescription("A", kVelmoraAccountClass)}),
+       .hasSentinel = true});
+  EXPECT_THAT(migrated.fates(),
+              ElementsAre("MailAccounts[0] carriedOverEarlier", "Accounts[0] kept",
+                          "Accounts[0].ChildAccounts[0] kept"));
+}
+
+TEST(Fates, WhatAnEarlierRunCarriedOverWithoutAnIdentifierIsFoundByItsValues) {
+  const PropertyDictionary account =
+      with(anAccount("fresh", kMailAccountType, kIMAPAccountClass), "Password", "of A");
+  const MigratedInMemory migrated(
+      {.settings = settings(12, {without(account, "Hostname")}),
+       .mail = mailStore({without(mailDescription("A", kIMAPAccountClass), kLegacyMailIdentifier)}),
+       .hasSentinel = true});
+  EXPECT_THAT(migrated.losses(), IsEmpty());
+}
+
+TEST(Fates, OtherContentsAreListedAsLeftBehind) {
+  PropertyDictionary file = settings(12, {});
+  file.set("Other", 1);
+  const MigratedInMemory migrated({.settings = file});
+  EXPECT_THAT(migrated.losses(), IsEmpty());
+  ASSERT_EQ(migrated.ledger().leftBehind.size(), 1u);
+  EXPECT_EQ(migrated.ledger().leftBehind.front().key, "Other");
+}
+
+}  // namespace
+}  // namespace accounts

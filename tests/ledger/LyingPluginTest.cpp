@@ -1,0 +1,185 @@
+// A plug-in that says what is not so, or does what it does not say: the ledger believes values
+// alone.
+
+#include "tests/ledger/LedgerFixture.h"
+
+namespace accounts {
+namespace {
+
+using testing::Contains;
+using testing::ElementsAre;
+using testing::EndsWith;
+using testing::HasSubstr;
+using testing::IsEmpty;
+
+PropertyDictionary ldap(std::string_view identifier) {
+  return anAccount(identifier, kLDAPAccountType, "LDAPAccount");
+}
+const DeviceFiles kTwoAccounts = {.settings = settings(12, {ldap("A"), ldap("B")})};
+
+/// Says another fate of every account that it is told of.
+class OtherFates final : public Liar {
+ public:
+  explicit OtherFates(std::function<void(AccountEvent&)> change) : change_(std::move(change)) {}
+  void accountFared(const AccountEvent& event) override {
+    AccountEvent told = event;
+    change_(told);
+    Liar::accountFared(told);
+  }
+
+ private:
+  std::function<void(AccountEvent&)> change_;
+};
+
+/// Says another order of the saved accounts.
+class OtherOrder final : public Liar {
+ public:
+  explicit OtherOrder(std::function<void(std::vector<AccountOrigin>&)> change)
+      : change_(std::move(change)) {}
+  void accountsSaved(const std::vector<AccountOrigin>& accounts) override {
+    std::vector<AccountOrigin> told = accounts;
+    change_(told);
+    Liar::accountsSaved(told);
+  }
+
+ private:
+  std::function<void(std::vector<AccountOrigin>&)> change_;
+};
+
+TEST(LyingPlugin, AccountsThatAreSaidToStandInEachOthersPlacesAreLost) {
+  OtherOrder liar([](auto& accounts) { std::swap(accounts[0], accounts[1]); });
+  EXPECT_THAT(MigratedInMemory(kTwoAccounts, &liar).lost(),
+              ElementsAre("Accounts[0]", "Accounts[1]"));
+}
+
+TEST(LyingPlugin, AnOrderThatIsTooShortSaysNothing) {
+  OtherOrder liar([](auto& accounts) { accounts.pop_back(); });
+  EXPECT_THAT(MigratedInMemory(kTwoAccounts, &liar).losses(),
+              ElementsAre(EndsWith("nothing says what became of it"),
+                          EndsWith("nothing says what became of it")));
+}
+
+TEST(LyingPlugin, AnAccountThatIsSaidToComeFromNowhereIsNamed) {
+  OtherOrder liar([](auto& accounts) { accounts[0] = {}; });
+  EXPECT_THAT(MigratedInMemory(kTwoAccounts, &liar).losses(),
+              Contains(HasSubstr("nothing says where it comes from")));
+}
+
+TEST(LyingPlugin, AnAccountThatIsSaidToComeFromAPlaceThatTheFileHasNotIsNamed) {
+  OtherOrder liar([](auto& accounts) { accounts[0].number = 77; });
+  EXPECT_THAT(MigratedInMemory(kTwoAccounts, &liar).losses(),
+              Contains(HasSubstr("nothing says where it comes from")));
+}
+
+TEST(LyingPlugin, ARefusalThatIsNotToldIsALossAllTheSame) {
+  OtherFates liar([](AccountEvent& event) { event.account.number = 5; });
+  EXPECT_THAT(
+      MigratedInMemory({.settings = settings(12, {with(ldap("A"), kAccountType, "No")})}, &liar)
+          .losses(),
+      ElementsAre(EndsWith("nothing says what became of it")));
+}
+
+TEST(LyingPlugin, AnAccountIsNotJoinedIntoOneWithoutCalendars) {
+  OtherFates liar([](AccountEvent& event) {
+    event.fate = ToldFate::Joined;
+    event.other = {AccountOrigin::Kind::Settings, 1};
+  });
+  EXPECT_THAT(
+      MigratedInMemory({.settings = settings(4, {with(ldap("A"), kAccountType, "No"), ldap("B")})},
+                       &liar)
+          .losses(),
+      ElementsAre(EndsWith("it was deleted, and the account that it was joined into has no "
+                           "calendars")));
+}
+
+TEST(LyingPlugin, AnAccountIsNotBelowAParentThatHasItNot) {
+  OtherFates liar([](AccountEvent& event) {
+    event.fate = ToldFate::MovedBelow;
+    event.other = {AccountOrigin::Kind::Settings, 1};
+  });
+  EXPECT_THAT(
+      MigratedInMemory({.settings = settings(12, {with(ldap("A"), kAccountType, "No"), ldap("B")})},
+                       &liar)
+          .losses(),
+      ElementsAre(EndsWith("it is not below the parent account that was made from it")));
+}
+
+TEST(LyingPlugin, AnAccountIsNotMadeAnewAsOneWithOtherValues) {
+  OtherFates liar([](AccountEvent& event) {
+    event.fate = ToldFate::Overwritten;
+    event.other = {AccountOrigin::Kind::Settings, 1};
+  });
+  EXPECT_THAT(
+      MigratedInMemory({.settings = settings(12, {with(ldap("A"), kAccountType, "No"), ldap("B")})},
+                       &liar)
+          .lost(),
+      ElementsAre("Accounts[0]"));
+}
+
+TEST(LyingPlugin, AccountsThatAreSaidToOverwriteEachOtherInACircleAreLost) {
+  OtherFates liar([](AccountEvent& event) {
+    event.fate = ToldFate::Overwritten;
+    event.other = {AccountOrigin::Kind::Settings, 1 - event.account.number};
+  });
+  const PropertyDictionary refused = with(ldap("A"), kAccountType, "No");
+  EXPECT_THAT(MigratedInMemory({.settings = settings(12, {refused, refused})}, &liar).lost(),
+              ElementsAre("Accounts[0]", "Accounts[1]"));
+}
+
+TEST(LyingPlugin, AValueThatIsGoneIsALoss) {
+  const MigratedInMemory migrated(kTwoAccounts, nullptr, [](PropertyArray& accounts) {
+    accounts.replace(0, without(*accounts.at(0).asDictionary(), "Hostname"));
+  });
+  EXPECT_THAT(migrated.losses(), ElementsAre(EndsWith("its \"Hostname\" is gone")));
+}
+
+TEST(LyingPlugin, AnotherValueIsALoss) {
+  const MigratedInMemory migrated(kTwoAccounts, nullptr, [](PropertyArray& accounts) {
+    accounts.replace(1, with(*accounts.at(1).asDictionary(), "Hostname", "other"));
+  });
+  EXPECT_THAT(migrated.losses(),
+              ElementsAre(EndsWith("its \"Hostname\" gave way to another value")));
+}
+
+TEST(LyingPlugin, AValueThatNobodyGaveIsALoss) {
+  const MigratedInMemory migrated(kTwoAccounts, nullptr, [](PropertyArray& accounts) {
+    accounts.replace(1, with(*accounts.at(1).asDictionary(), "New", 1));
+  });
+  EXPECT_THAT(migrated.losses(), ElementsAre(EndsWith("it has a \"New\" that it did not have")));
+}
+
+TEST(LyingPlugin, AKeyOfAStepMayDifferOnlyWhereTheStepRan) {
+  const auto tamper = [](PropertyArray& accounts) {
+    accounts.replace(0, with(*accounts.at(0).asDictionary(), kAccountEnabledDataclasses,
+                             PropertyArray{kAccountDataclassMail}));
+  };
+  EXPECT_THAT(MigratedInMemory(kTwoAccounts, nullptr, tamper).lost(), ElementsAre("Accounts[0]"));
+  EXPECT_THAT(MigratedInMemory({.settings = settings(9, {ldap("A")})}, nullptr, tamper).lost(),
+              IsEmpty());
+}
+
+TEST(LyingPlugin, AKeyOfAStepMayDifferOnlyInAccountsOfItsTypeOrClass) {
+  const auto tamper = [](PropertyArray& accounts) {
+    accounts.replace(0, with(*accounts.at(0).asDictionary(), "status", 7));
+  };
+  const PropertyDictionary cloud = anAccount("Q", kQuarxAccountType, kCloudAccountClass);
+  EXPECT_THAT(MigratedInMemory({.settings = settings(9, {ldap("A")})}, nullptr, tamper).lost(),
+              ElementsAre("Accounts[0]"));
+  EXPECT_THAT(MigratedInMemory({.settings = settings(9, {cloud})}, nullptr, tamper).lost(),
+              IsEmpty());
+}
+
+TEST(LyingPlugin, AChildThatIsGoneIsALoss) {
+  const PropertyDictionary parent = with(anAccount("Q", kQuarxAccountType, kCloudAccountClass),
+                                         kAccountChildAccounts, PropertyArray{ldap("K")});
+  const MigratedInMemory migrated(
+      {.settings = settings(12, {parent})}, nullptr, [](PropertyArray& accounts) {
+        accounts.replace(
+            0, with(*accounts.at(0).asDictionary(), kAccountChildAccounts, PropertyArray()));
+      });
+  EXPECT_THAT(migrated.losses(),
+              ElementsAre(EndsWith("it is not among the children of its parent any more")));
+}
+
+}  // namespace
+}  // namespace accounts
