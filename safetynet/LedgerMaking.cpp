@@ -4,9 +4,9 @@
 #include <unordered_map>
 #include <utility>
 
+#include "safetynet/AccountComparison.h"
 #include "safetynet/ConvertedDescription.h"
 #include "safetynet/EarlierRun.h"
-#include "safetynet/PropertyComparison.h"
 #include "safetynet/SharedIdentifiers.h"
 #include "vocabulary/AccountClasses.h"
 #include "vocabulary/AccountVocabulary.h"
@@ -19,11 +19,6 @@ using Kind = AccountOrigin::Kind;
 
 constexpr std::array kInputKinds = {Kind::Exchange, Kind::OutgoingMail, Kind::IncomingMail,
                                     Kind::Settings};
-
-/// What a hosted mail account gives to the parent that is made from it.
-const std::array kMovedToParent = {kAccountEnabledDataclasses, kAccountChildAccounts,
-                                   kCalendarsAccountSubscribedCalendars,
-                                   std::string_view(kExoSubscribedCalendarsKey)};
 
 std::uint64_t keyOf(AccountOrigin origin) {
   return (static_cast<std::uint64_t>(origin.kind) << 32U) | origin.number;
@@ -160,8 +155,8 @@ class LedgerMaker {
   void takeArray(DevicePlace place, const PropertyDictionary& contents, Kind kind) {
     const PropertyValue* const value = contents.find(arrayKeyOf(kind));
     if (value != nullptr && value->asArray() == nullptr) {
-      ledger_.lostFiles.push_back({place, "holds accounts in an unknown form: its " +
-                                              quotedKey(arrayKeyOf(kind)) + " is no array"});
+      ledger_.lostFiles.push_back({place, "holds accounts in an unknown form: its \"" +
+                                              std::string(arrayKeyOf(kind)) + "\" is no array"});
     }
     ledger_.inputs[static_cast<std::size_t>(kind)] =
         contents.arrayForKey(arrayKeyOf(kind)).value_or(PropertyArray());
@@ -221,12 +216,12 @@ class LedgerMaker {
     if (kind != Kind::Settings) {
       const ConvertedDescription converted = convertedDescription(account, kind);
       entry.reason = converted.loss;
-      compareTo(entry, converted.account, *after, children);
+      comparison_.compare(entry, converted.account, *after, isAfterConversion(), children);
       if (entry.reason.empty()) {
         entry.fate = AccountFate::Converted;
       }
     } else {
-      compareTo(entry, account, *after, children);
+      comparison_.compare(entry, account, *after, isAfterConversion(), children);
     }
     if (!entry.reason.empty()) {
       entry.fate = AccountFate::NotCarriedOver;
@@ -243,83 +238,6 @@ class LedgerMaker {
     if (!successor_ && identifier && identifiers_->isShared(*identifier)) {
       entry.reason += "; another account has its identifier";
     }
-  }
-
-  void compareTo(LedgerEntry& entry, const PropertyDictionary& before,
-                 const PropertyDictionary& after, std::vector<LedgerEntry>& children) {
-    if (before.isSameAs(after)) {
-      entry.fate = AccountFate::Kept;
-      keepChildren(entry, childrenOf(before), children);
-      return;
-    }
-    const Kind kind = entry.account.kind;
-    const bool hasChildren = before.arrayForKey(kAccountChildAccounts).has_value() &&
-                             after.arrayForKey(kAccountChildAccounts).has_value();
-    const Difference difference = differenceBetween(before, after, [&](std::string_view key) {
-      return (hasChildren && key == kAccountChildAccounts) ||
-             changedKeys_.mayDiffer(key, kind, before, after) ||
-             // What a conversion sets afterwards holds in the account that it took the place of.
-             (key == kAccountSyncIdentifier && successor_ && successor_->kind != Kind::Settings);
-    });
-    if (entry.reason.empty()) {
-      entry.reason = difference.loss;
-    }
-    const auto identifier = before.textForKey(kAccountIdentifier);
-    entry.fate = !difference.isChanged ? AccountFate::Kept
-                 : identifier && identifier != after.textForKey(kAccountIdentifier)
-                     ? AccountFate::Renamed
-                     : AccountFate::Changed;
-    if (hasChildren) {
-      compareChildren(entry, before, after, children);
-    }
-  }
-
-  void keepChildren(const LedgerEntry& parent, const PropertyArray& accounts,
-                    std::vector<LedgerEntry>& children) {
-    for (std::uint32_t child = 0; child < accounts.size(); ++child) {
-      children.push_back({.account = parent.account,
-                          .child = child,
-                          .fate = AccountFate::Kept,
-                          .now = {{parent.now.front().index, child}}});
-    }
-  }
-
-  /// The children of an account that is at a place, among the children there.
-  void compareChildren(LedgerEntry& parent, const PropertyDictionary& before,
-                       const PropertyDictionary& after, std::vector<LedgerEntry>& children) {
-    const PropertyArray old = childrenOf(before);
-    const PropertyArray now = childrenOf(after);
-    if (now.size() > old.size() && parent.reason.empty()) {
-      parent.reason = "it has children that it did not have";
-    }
-    for (std::uint32_t index = 0; index < old.size(); ++index) {
-      LedgerEntry entry = {.account = parent.account, .child = index};
-      if (index >= now.size()) {
-        entry.reason = "it is not among the children of its parent any more";
-      } else {
-        entry.now.push_back({parent.now.front().index, index});
-        compareChild(entry, before, old.at(index), now.at(index));
-      }
-      children.push_back(std::move(entry));
-    }
-  }
-
-  void compareChild(LedgerEntry& entry, const PropertyDictionary& parent, const PropertyValue& old,
-                    const PropertyValue& now) {
-    const PropertyDictionary* const before = old.asDictionary();
-    const PropertyDictionary* const after = now.asDictionary();
-    if (before == nullptr || after == nullptr) {
-      entry.fate = old == now ? AccountFate::Kept : AccountFate::NotCarriedOver;
-      entry.reason = old == now ? "" : "something else stands in its place";
-      return;
-    }
-    const Difference difference = differenceBetween(*before, *after, [&](std::string_view key) {
-      return changedKeys_.mayDifferInChild(key, parent, *before);
-    });
-    entry.reason = difference.loss;
-    entry.fate = !entry.reason.empty()  ? AccountFate::NotCarriedOver
-                 : difference.isChanged ? AccountFate::Changed
-                                        : AccountFate::Kept;
   }
 
   /// An account that is at no place of its own any more.
@@ -414,7 +332,7 @@ class LedgerMaker {
       }
       entry.now = {{*place, static_cast<std::uint32_t>(siblings.size() - 1)}};
       entry.reason = converted.loss;
-      compareMoved(entry, converted.account, *parent, *now, children);
+      comparison_.compareMoved(entry, converted.account, *parent, *now, children);
       if (entry.reason.empty()) {
         entry.fate = AccountFate::MovedBelow;
         return;
@@ -422,51 +340,14 @@ class LedgerMaker {
     }
   }
 
-  void compareMoved(LedgerEntry& entry, const PropertyDictionary& before,
-                    const PropertyDictionary& parent, const PropertyDictionary& now,
-                    std::vector<LedgerEntry>& children) {
-    const Kind kind = entry.account.kind;
-    PropertyDictionary staying = before;
-    for (const std::string_view key : kMovedToParent) {
-      const std::optional<PropertyValue> value = staying.take(key);
-      const PropertyValue* const moved = parent.find(key);
-      const bool isArrayOfChildren = key == kAccountChildAccounts && value && value->asArray();
-      if (value && !isArrayOfChildren && entry.reason.empty() &&
-          (moved == nullptr || !(*moved == *value)) &&
-          !changedKeys_.mayDiffer(key, kind, before, now) &&
-          !(key == kAccountEnabledDataclasses && mayEnableOnParent(parent))) {
-        entry.reason = "its " + quotedKey(key) + " did not go to the parent account made from it";
-      }
-    }
-    const Difference difference = differenceBetween(staying, now, [&](std::string_view key) {
-      return changedKeys_.mayDiffer(key, kind, before, now);
-    });
-    if (entry.reason.empty()) {
-      entry.reason = difference.loss;
-    }
-    const PropertyArray old = childrenOf(before);
-    const PropertyArray siblings = childrenOf(parent);
-    children.clear();
-    for (std::uint32_t index = 0; index < old.size(); ++index) {
-      LedgerEntry child = {.account = entry.account, .child = index};
-      if (index + 1 < siblings.size() && old.at(index) == siblings.at(index)) {
-        child.fate = AccountFate::MovedToOtherParent;
-        child.now.push_back({entry.now.front().index, index});
-      } else {
-        child.reason = "it did not go to the parent account that was made from its own";
-      }
-      children.push_back(std::move(child));
-    }
-  }
-
-  /// The new parent is active, so mail is switched on in it.
-  [[nodiscard]] static bool mayEnableOnParent(const PropertyDictionary& parent) {
-    return parent.textForKey(kAccountType) == std::optional<Text>(kQuarxAccountType);
+  [[nodiscard]] bool isAfterConversion() const {
+    return successor_ && successor_->kind != Kind::Settings && successor_->kind != Kind::Made;
   }
 
   Transaction& transaction_;
   const ToldFates& told_;
-  ChangedKeys changedKeys_;
+  const ChangedKeys changedKeys_;
+  const AccountComparison comparison_{changedKeys_};
   AccountLedger ledger_;
   /// What took the place of the account that is compared.
   std::optional<AccountOrigin> successor_;
