@@ -297,12 +297,9 @@ std::variant<FileIdentity, PlaceFailure> LinuxDevicePlaces::identityAt(DevicePla
                                    : placeFailure(error);
   }
   const std::string name(splitPath(path).name);
-  struct stat status = {};
-  if (::fstatat(directory->descriptor->number(), name.c_str(), &status, AT_SYMLINK_NOFOLLOW) == 0) {
-    return identityOf(status);
-  }
-  return errno == ENOENT ? std::variant<FileIdentity, PlaceFailure>(FileIdentity())
-                         : placeFailure("examine", path, errno);
+  const auto found = entryIn(directory->descriptor->number(), name.c_str());
+  return found ? std::variant<FileIdentity, PlaceFailure>(*found)
+               : placeFailure("examine", path, errno);
 }
 
 }  // namespace accounts

@@ -30,18 +30,20 @@ int renameAside(int directory, const char* from, const char* aside) {
   return errno;
 }
 
-/// What stands under a name; none where that cannot be told.
-std::optional<FileIdentity> entryIn(int directory, const char* name) {
-  struct stat status = {};
-  if (::fstatat(directory, name, &status, AT_SYMLINK_NOFOLLOW) == 0) {
-    return identityOf(status);
-  }
-  return errno == ENOENT ? std::optional(FileIdentity()) : std::nullopt;
-}
-
-/// The same; nothing also where that cannot be told.
+/// What stands under a name; nothing also where that cannot be told.
 FileIdentity identityIn(int directory, const char* name) {
   return entryIn(directory, name).value_or(FileIdentity());
+}
+
+/// Gives what an entry is the name that says what is to become of it, and the entry that name.
+/// Returns 0 or the error number.
+int renameTo(const StagedName& staged, DirectoryEntry& entry) {
+  const auto name = staged.text();
+  const int number = name ? renameAside(entry.directory(), entry.name(), name->c_str()) : errno;
+  if (number == 0) {
+    entry = entry.withName(*name);
+  }
+  return number;
 }
 
 bool isInode(const FileIdentity& identity, const struct stat& file) {
@@ -61,19 +63,6 @@ class StagedEntry final : public StagedFile {
     }
   }
 
-  /// Takes a name that says what is to be replaced. Returns 0 or the error number.
-  int rename(DevicePlace place, std::uint64_t replaced) {
-    const auto name = StagedName{place, status.st_ino, replaced}.text();
-    if (!name) {
-      return errno;
-    }
-    const int number = renameAside(entry.directory(), entry.name(), name->c_str());
-    if (number == 0) {
-      entry = entry.withName(*name);
-    }
-    return number;
-  }
-
   DirectoryEntry entry;
   /// Open, and so locked as a temporary file is.
   FileDescriptor file;
@@ -81,26 +70,29 @@ class StagedEntry final : public StagedFile {
   bool isThere = true;
 };
 
-/// Exchanges what two names of a directory have until what comes out under `own` is what was put
-/// in place of it before: `lastPut` was, and `inHand`, which another program wrote, came out. What
-/// is newest stands under `name` afterwards, and `own` is free. Whoever writes again and again
-/// without end keeps its file under `own`.
-void handBack(int directory, const char* own, const char* name, FileIdentity lastPut,
+/// Exchanges what the name of a place and `own` beside it have until what comes out is what was put
+/// in the place before: `lastPut` was, and `inHand`, which another program wrote, came out. What
+/// is newest stands at the place afterwards, and `own` is free. Whoever writes again and again
+/// without end keeps its file there.
+void handBack(DevicePlace place, DirectoryEntry& own, const char* name, FileIdentity lastPut,
               FileIdentity inHand) {
+  const int directory = own.directory();
   for (int turn = 0; turn < kMostExchanges; ++turn) {
-    if (::renameat2(directory, own, directory, name, RENAME_EXCHANGE) != 0) {
+    // Under its old name it is only harder to tell what to do with it when this process is killed.
+    (void)renameTo({place, markOf(lastPut), 0, markOf(inHand)}, own);
+    if (::renameat2(directory, own.name(), directory, name, RENAME_EXCHANGE) != 0) {
       // Gone meanwhile: then nothing is in the way.
-      (void)renameToNothing(directory, own, name);
+      (void)renameToNothing(directory, own.name(), name);
       return;
     }
-    const std::optional<FileIdentity> out = entryIn(directory, own);
+    const std::optional<FileIdentity> out = entryIn(directory, own.name());
     if (!out) {
-      // The next run tells by the number whose it is.
+      // The next run tells by the mark whose it is.
       return;
     }
     // Our own, too, once another program has written into it.
     if (out->isSameFileAs(lastPut)) {
-      (void)::unlinkat(directory, own, 0);
+      (void)own.remove();
       return;
     }
     lastPut = inHand;
@@ -182,7 +174,9 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
     // It could be exchanged, but not be removed afterwards.
     return PlaceOutcome::failed(placeFailure("replace", path, EISDIR));
   }
-  if (const int number = staged.rename(place, expected.inode); number != 0) {
+  const FileIdentity made = identityOf(staged.status);
+  if (const int number = renameTo({place, markOf(made), markOf(expected)}, staged.entry);
+      number != 0) {
     return PlaceOutcome::failed(placeFailure("rename a file to", path, number));
   }
   const int directory = staged.entry.directory();
@@ -220,11 +214,11 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
   staged.isThere = false;
   const std::optional<FileIdentity> out = entryIn(directory, own);
   if (!out) {
-    // The file has its place. Whose came out, the next run tells by its number.
+    // The file has its place. Whose came out, the next run tells by its mark.
     return PlaceOutcome::done();
   }
   if (!out->isSameFileAs(expected)) {
-    handBack(directory, own, name.c_str(), identityOf(staged.status), *out);
+    handBack(place, staged.entry, name.c_str(), made, *out);
     return PlaceOutcome::overtaken();
   }
   const std::optional<FileIdentity> in = entryIn(directory, name.c_str());
@@ -251,29 +245,25 @@ PlaceOutcome LinuxDevicePlaces::remove(DevicePlace place, const FileIdentity& ex
   if (opened == nullptr) {
     return PlaceOutcome::failed(placeFailure(error));
   }
-  const int directory = opened->descriptor->number();
-  const std::string name(splitPath(path).name);
-  const auto aside = StagedName{place, 0, expected.inode}.text();
-  if (!aside) {
-    return PlaceOutcome::failed(placeFailure("make a temporary name in", path, errno));
-  }
   if (expected.kind == EntryKind::Directory) {
     return PlaceOutcome::failed(placeFailure("remove", path, EISDIR));
   }
-  if (const int number = renameAside(directory, name.c_str(), aside->c_str()); number != 0) {
-    return number == ENOENT ? PlaceOutcome::disturbed()
-                            : PlaceOutcome::failed(placeFailure("remove", path, number));
+  const std::string name(splitPath(path).name);
+  DirectoryEntry aside(opened->descriptor, name, path);
+  int number = renameTo({place, 0, markOf(expected)}, aside);
+  if (number == ENOENT) {
+    return PlaceOutcome::disturbed();
   }
-  if (!identityIn(directory, aside->c_str()).isSameFileAs(expected)) {
+  if (number == 0 && !identityIn(aside.directory(), aside.name()).isSameFileAs(expected)) {
     // Where another one stands there by now, that is newer and this one was replaced by it.
-    if (renameToNothing(directory, aside->c_str(), name.c_str()) == EEXIST) {
-      (void)::unlinkat(directory, aside->c_str(), 0);
+    if (renameToNothing(aside.directory(), aside.name(), name.c_str()) == EEXIST) {
+      (void)aside.remove();
     }
     return PlaceOutcome::disturbed();
   }
-  const bool isRemoved = ::unlinkat(directory, aside->c_str(), 0) == 0;
-  return isRemoved ? PlaceOutcome::done()
-                   : PlaceOutcome::failed(placeFailure("remove", path, errno));
+  number = number == 0 ? aside.remove() : number;
+  return number == 0 ? PlaceOutcome::done()
+                     : PlaceOutcome::failed(placeFailure("remove", path, number));
 }
 
 PlaceOutcome LinuxDevicePlaces::keep(DevicePlace place, std::string_view keptPath,

@@ -15,31 +15,29 @@
 namespace accounts {
 namespace {
 
-bool isThere(int directory, const std::string& name, struct stat& status) {
-  return ::fstatat(directory, name.c_str(), &status, AT_SYMLINK_NOFOLLOW) == 0;
-}
-
 /// What keeps a file under a staged name from being dealt with; 0 for nothing.
-int settle(int directory, const StagedName& staged, const std::string& own,
-           const std::string& name) {
-  struct stat status = {};
-  if (!isThere(directory, own, status)) {
-    return errno == ENOENT ? 0 : errno;
+int settle(int directory, const StagedName& staged, const char* own, const char* name) {
+  const auto found = entryIn(directory, own);
+  const auto standing = found ? entryIn(directory, name) : std::nullopt;
+  if (!standing) {
+    return errno;
   }
-  bool isForeign = status.st_ino != staged.made && status.st_ino != staged.replaced;
-  struct stat standing = {};
-  if (isForeign && !isThere(directory, name, standing)) {
-    return renameToNothing(directory, own.c_str(), name.c_str());
-  }
-  if (isForeign && standing.st_ino == staged.made) {
-    // The run was killed between taking it out and handing it back.
-    if (::renameat2(directory, own.c_str(), directory, name.c_str(), RENAME_EXCHANGE) != 0) {
+  const std::uint64_t mark = markOf(*found);
+  if (mark != staged.made && mark != staged.replaced) {
+    const std::uint64_t other = markOf(*standing);
+    if (other == 0) {
+      return renameToNothing(directory, own, name);
+    }
+    if (other != staged.made && other != staged.returned) {
+      // Another program wrote after this one. Whether it had read it, a person must find out.
+      return EEXIST;
+    }
+    // The run was killed between taking it out and giving it its place back.
+    if (::renameat2(directory, own, directory, name, RENAME_EXCHANGE) != 0) {
       return errno;
     }
-    isForeign = false;
   }
-  // A newer one has taken its place: whose it is must be found out by a person.
-  return isForeign ? EEXIST : ::unlinkat(directory, own.c_str(), 0) == 0 ? 0 : errno;
+  return ::unlinkat(directory, own, 0) == 0 ? 0 : errno;
 }
 
 }  // namespace
@@ -61,10 +59,10 @@ std::vector<std::string> LinuxDevicePlaces::settleLeftovers() {
         continue;
       }
       PathError error;
+      const std::string name(splitPath(standing).name);
       const auto entry = root_.locate(joinedPath(directory, own), error);
       const int number =
-          entry ? settle(entry->directory(), *staged, own, std::string(splitPath(standing).name))
-                : error.number;
+          entry ? settle(entry->directory(), *staged, own.c_str(), name.c_str()) : error.number;
       if (number != 0) {
         sentences.push_back(
             pathError("settle what an interrupted run left at", joinedPath(directory, own), number)

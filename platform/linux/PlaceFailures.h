@@ -1,7 +1,10 @@
 #pragma once
 
+#include <fcntl.h>
 #include <sys/stat.h>
 
+#include <cerrno>
+#include <optional>
 #include <string_view>
 
 #include "platform/DeviceSnapshot.h"
@@ -39,6 +42,16 @@ inline FileIdentity identityOf(const struct stat& status) {
           .mode = status.st_mode,
           .modified = {status.st_mtim.tv_sec, status.st_mtim.tv_nsec},
           .changed = {status.st_ctim.tv_sec, status.st_ctim.tv_nsec}};
+}
+
+/// What stands under a name of a directory, links not followed; none, with errno set, where that
+/// cannot be told.
+inline std::optional<FileIdentity> entryIn(int directory, const char* name) {
+  struct stat status = {};
+  if (::fstatat(directory, name, &status, AT_SYMLINK_NOFOLLOW) == 0) {
+    return identityOf(status);
+  }
+  return errno == ENOENT ? std::optional(FileIdentity()) : std::nullopt;
 }
 
 }  // namespace accounts

@@ -34,6 +34,22 @@ std::optional<std::uint64_t> takeNumber(std::string_view& rest) {
 
 }  // namespace
 
+std::uint64_t markOf(const FileIdentity& file) {
+  if (!file.exists()) {
+    return 0;
+  }
+  // FNV-1a, which every build of this program computes alike.
+  std::uint64_t mark = 0xcbf29ce484222325U;
+  for (std::uint64_t number : {file.inode, file.size, std::uint64_t{file.mode},
+                               static_cast<std::uint64_t>(file.modified.seconds),
+                               static_cast<std::uint64_t>(file.modified.nanoseconds)}) {
+    for (int byte = 0; byte < 8; ++byte, number >>= 8U) {
+      mark = (mark ^ (number & 0xffU)) * 0x100000001b3U;
+    }
+  }
+  return mark;
+}
+
 std::optional<std::string> StagedName::text() const {
   const auto random = randomDigits();
   if (!random) {
@@ -43,6 +59,7 @@ std::optional<std::string> StagedName::text() const {
   name.append(listed(place).name).append(1, kSeparator);
   name.append(std::to_string(made)).append(1, kSeparator);
   name.append(std::to_string(replaced)).append(1, kSeparator);
+  name.append(std::to_string(returned)).append(1, kSeparator);
   return name.append(*random);
 }
 
@@ -55,7 +72,8 @@ std::optional<StagedName> StagedName::parse(std::string_view name) {
   const auto place = placeName ? placeNamed(*placeName) : std::nullopt;
   const auto made = place ? takeNumber(name) : std::nullopt;
   const auto replaced = made ? takeNumber(name) : std::nullopt;
-  return replaced ? std::optional(StagedName{*place, *made, *replaced}) : std::nullopt;
+  const auto returned = replaced ? takeNumber(name) : std::nullopt;
+  return returned ? std::optional(StagedName{*place, *made, *replaced, *returned}) : std::nullopt;
 }
 
 }  // namespace accounts

@@ -24,6 +24,10 @@ bool runPowerLossCampaign(const std::vector<Scenario>& scenarios, const Selectio
 /// run again, killed again at each of its calls, and run to its end.
 bool runInterludeCampaign(const std::vector<Scenario>& scenarios, const Selection& selection);
 
+/// Another program writes, replaces, removes or brings back a file of the migration before each
+/// system call of each scenario, once or again and again.
+bool runOtherProgramsCampaign(const std::vector<Scenario>& scenarios, const Selection& selection);
+
 /// The worker ends after each byte that it hands over in each scenario, or hands over less than it
 /// says.
 bool runHandoverCampaign(const std::vector<Scenario>& scenarios, const Selection& selection);

@@ -2,20 +2,19 @@
 
 namespace accounts {
 
-std::vector<SimulatedDisk> disksOf(const SimulatedDisk& before, const Run& run) {
+std::vector<SimulatedDisk> disksOf(const SimulatedDisk& before, const Run& run, std::size_t first,
+                                   std::size_t most) {
   std::vector<SimulatedDisk> disks;
   SimulatedDisk disk = before;
   std::size_t applied = 0;
-  const auto applyUpTo = [&](std::size_t count) {
+  for (std::size_t call = first; call <= run.calls.size() && disks.size() < most; ++call) {
+    const std::size_t count =
+        call < run.calls.size() ? run.calls[call].changesBefore : run.changes.size();
     for (; applied < count; ++applied) {
       disk.apply(run.changes[applied]);
     }
     disks.push_back(disk);
-  };
-  for (const SimulatedKernel::Call& call : run.calls) {
-    applyUpTo(call.changesBefore);
   }
-  applyUpTo(run.changes.size());
   return disks;
 }
 

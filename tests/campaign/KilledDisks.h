@@ -1,5 +1,7 @@
 #pragma once
 
+#include <cstddef>
+#include <limits>
 #include <vector>
 
 #include "tests/campaign/Run.h"
@@ -7,8 +9,11 @@
 
 namespace accounts {
 
-/// The disks before each call of a recorded run and after the last one. What a killed process did
-/// before stays done, so each is what it leaves when it is killed there.
-std::vector<SimulatedDisk> disksOf(const SimulatedDisk& before, const Run& run);
+/// The disks before calls of a recorded run, from the `first` on, and after the last one: so many
+/// at the most. What a killed process did before stays done, so each is what it leaves when it is
+/// killed there.
+std::vector<SimulatedDisk> disksOf(const SimulatedDisk& before, const Run& run,
+                                   std::size_t first = 0,
+                                   std::size_t most = std::numeric_limits<std::size_t>::max());
 
 }  // namespace accounts

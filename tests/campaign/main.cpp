@@ -24,6 +24,7 @@ constexpr std::array kCampaigns = {
     NamedCampaign{"power-loss", accounts::runPowerLossCampaign},
     NamedCampaign{"allocations", accounts::runAllocationCampaign},
     NamedCampaign{"interludes", accounts::runInterludeCampaign},
+    NamedCampaign{"other-programs", accounts::runOtherProgramsCampaign},
     NamedCampaign{"handover", accounts::runHandoverCampaign},
 };
 
@@ -46,7 +47,8 @@ int main(int argumentCount, char** arguments) {
   Selection selection;
   application
       .add_option("campaign", campaign,
-                  "faults, kills, power-loss, allocations, interludes or handover")
+                  "faults, kills, power-loss, allocations, interludes, other-programs "
+                  "or handover")
       ->required();
   bool isBare = false;
   application.add_flag("--bare", isBare, "the plug-in alone on the device");

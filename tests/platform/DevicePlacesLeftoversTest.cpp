@@ -2,6 +2,7 @@
 
 #include <cstdlib>
 
+#include "platform/linux/PlaceFailures.h"
 #include "platform/linux/StagedName.h"
 #include "platform/linux/TemporaryFile.h"
 #include "tests/platform/DevicePlacesFixture.h"
@@ -17,29 +18,25 @@ constexpr DevicePlace kLeftStore = DevicePlace::LegacyMail;
 /// A device on which a run was killed.
 class DevicePlacesLeftoversTest : public DevicePlacesTest {
  protected:
-  /// A file beside a place under the name that a commit gives it. Whatever is no inode number here
-  /// is that of another file.
-  fs::path leave(DevicePlace place, std::string_view text, std::uint64_t made,
-                 std::uint64_t replaced) const {
-    const fs::path own = hostPath(place).parent_path() / "own";
+  /// A file beside a place under the name that a commit gives it.
+  fs::path leave(std::string_view text, const StagedName& staged) const {
+    const fs::path own = hostPath(staged.place).parent_path() / "own";
     makeHostFile(own, text);
-    return rename(own, place, made, replaced);
+    return rename(own, staged);
   }
-  static fs::path rename(const fs::path& own, DevicePlace place, std::uint64_t made,
-                         std::uint64_t replaced) {
-    const fs::path name =
-        own.parent_path() /
-        StagedName{.place = place, .made = made, .replaced = replaced}.text().value();
+  static fs::path rename(const fs::path& own, const StagedName& staged) {
+    const fs::path name = own.parent_path() / staged.text().value();
     fs::rename(own, name);
     return name;
   }
-  static std::uint64_t inodeOf(const fs::path& path) {
+  static std::uint64_t markOfFile(const fs::path& path) {
     struct stat status = {};
     EXPECT_EQ(::lstat(path.c_str(), &status), 0) << path;
-    return status.st_ino;
+    return markOf(identityOf(status));
   }
   void expectSettledQuietly() { EXPECT_EQ(places.settleLeftovers(), std::vector<std::string>()); }
 
+  /// The mark of a file that is none of a test's.
   static constexpr std::uint64_t kOther = 1;
 };
 
@@ -47,7 +44,7 @@ TEST_F(DevicePlacesLeftoversTest, AFileThatWasStagedAndNotPutGoes) {
   makeFile(path(kSettings), "old");
   const fs::path own = onHost(kPreferences) / "own";
   makeHostFile(own, "new");
-  rename(own, kSettings, inodeOf(own), inodeOf(hostPath(kSettings)));
+  rename(own, {kSettings, markOfFile(own), markOfFile(hostPath(kSettings))});
 
   expectSettledQuietly();
 
@@ -59,7 +56,7 @@ TEST_F(DevicePlacesLeftoversTest, AFileThatWasReplacedGoes) {
   makeFile(path(kSettings), "new");
   const fs::path own = onHost(kPreferences) / "own";
   makeHostFile(own, "old");
-  rename(own, kSettings, inodeOf(hostPath(kSettings)), inodeOf(own));
+  rename(own, {kSettings, markOfFile(hostPath(kSettings)), markOfFile(own)});
 
   expectSettledQuietly();
 
@@ -70,13 +67,13 @@ TEST_F(DevicePlacesLeftoversTest, AFileThatWasReplacedGoes) {
 TEST_F(DevicePlacesLeftoversTest, AFileThatWasMovedAwayToBeRemovedGoes) {
   const fs::path own = onHost(kMail) / "own";
   makeHostFile(own, "store");
-  rename(own, kLeftStore, 0, inodeOf(own));
+  rename(own, {kLeftStore, 0, markOfFile(own)});
   expectSettledQuietly();
   EXPECT_TRUE(namesIn(kMail).empty());
 }
 
 TEST_F(DevicePlacesLeftoversTest, AnotherProgramsFileThatWasMovedAwayComesBack) {
-  leave(kLeftStore, "of another program", 0, kOther);
+  leave("of another program", {kLeftStore, 0, kOther});
   expectSettledQuietly();
   EXPECT_EQ(contentsOf(path(kLeftStore)), "of another program");
   EXPECT_EQ(namesIn(kMail).size(), 1u);
@@ -84,7 +81,7 @@ TEST_F(DevicePlacesLeftoversTest, AnotherProgramsFileThatWasMovedAwayComesBack) 
 
 TEST_F(DevicePlacesLeftoversTest, AnotherProgramsFileThatWasExchangedComesBack) {
   makeFile(path(kSettings), "new");
-  leave(kSettings, "of another program", inodeOf(hostPath(kSettings)), kOther);
+  leave("of another program", {kSettings, markOfFile(hostPath(kSettings)), kOther});
   expectSettledQuietly();
   EXPECT_EQ(contentsOf(path(kSettings)), "of another program");
   EXPECT_EQ(namesIn(kPreferences).size(), 1u);
@@ -92,7 +89,7 @@ TEST_F(DevicePlacesLeftoversTest, AnotherProgramsFileThatWasExchangedComesBack) 
 
 TEST_F(DevicePlacesLeftoversTest, BesideAFileThatIsNewerAnotherProgramsFileStaysAndIsTold) {
   makeFile(path(kSettings), "newer");
-  const fs::path own = leave(kSettings, "of another program", kOther, kOther);
+  const fs::path own = leave("of another program", {kSettings, kOther, kOther});
 
   EXPECT_EQ(places.settleLeftovers(),
             std::vector<std::string>{"Cannot settle what an interrupted run left at " +
@@ -101,6 +98,45 @@ TEST_F(DevicePlacesLeftoversTest, BesideAFileThatIsNewerAnotherProgramsFileStays
 
   EXPECT_EQ(contentsOf(path(kSettings)), "newer");
   EXPECT_EQ(hostFileContents(own), "of another program");
+}
+
+TEST_F(DevicePlacesLeftoversTest, AFileThatAnotherProgramWroteInPlaceComesBack) {
+  makeHostFile(onHost(kMail) / "own", "store");
+  const std::uint64_t store = markOfFile(onHost(kMail) / "own");
+  makeHostFile(rename(onHost(kMail) / "own", {kLeftStore, 0, store}), "store, and more");
+  makeFile(path(kSettings), "new");
+  makeHostFile(onHost(kPreferences) / "own", "old");
+  const std::uint64_t old = markOfFile(onHost(kPreferences) / "own");
+  makeHostFile(
+      rename(onHost(kPreferences) / "own", {kSettings, markOfFile(hostPath(kSettings)), old}),
+      "old, and more");
+
+  expectSettledQuietly();
+
+  EXPECT_EQ(contentsOf(path(kLeftStore)), "store, and more");
+  EXPECT_EQ(contentsOf(path(kSettings)), "old, and more");
+  EXPECT_EQ(namesIn(kMail).size(), 1u);
+  EXPECT_EQ(namesIn(kPreferences).size(), 1u);
+}
+
+TEST_F(DevicePlacesLeftoversTest, AFileThatWasToGetItsPlaceBackGetsIt) {
+  makeFile(path(kSettings), "new");
+  const fs::path own = onHost(kPreferences) / "own";
+  makeHostFile(own, "of another program");
+  rename(
+      own,
+      {.place = kSettings, .made = markOfFile(hostPath(kSettings)), .returned = markOfFile(own)});
+  expectSettledQuietly();
+  EXPECT_EQ(contentsOf(path(kSettings)), "of another program");
+  EXPECT_EQ(namesIn(kPreferences).size(), 1u);
+}
+
+TEST_F(DevicePlacesLeftoversTest, AFileThatCameOutForOneThatGotItsPlaceBackIsTheNewerOne) {
+  makeFile(path(kSettings), "of another program");
+  leave("newer", {.place = kSettings, .made = kOther, .returned = markOfFile(hostPath(kSettings))});
+  expectSettledQuietly();
+  EXPECT_EQ(contentsOf(path(kSettings)), "newer");
+  EXPECT_EQ(namesIn(kPreferences).size(), 1u);
 }
 
 TEST_F(DevicePlacesLeftoversTest, AnAbandonedTemporaryFileGoes) {
@@ -124,10 +160,10 @@ TEST_F(DevicePlacesLeftoversTest, ATemporaryFileThatIsInUseStays) {
 }
 
 TEST_F(DevicePlacesLeftoversTest, AllThatIsLeftIsDealtWith) {
-  leave(kSettings, "settings", 0, kOther);
-  leave(DevicePlace::LegacyExchange, "store", 0, kOther);
-  leave(DevicePlace::CommitRecord, "record", 0, kOther);
-  leave(DevicePlace::CopyAside, "copy", 0, kOther);
+  leave("settings", {kSettings, 0, kOther});
+  leave("store", {DevicePlace::LegacyExchange, 0, kOther});
+  leave("record", {DevicePlace::CommitRecord, 0, kOther});
+  leave("copy", {DevicePlace::CopyAside, 0, kOther});
   expectSettledQuietly();
   EXPECT_EQ(contentsOf(path(kSettings)), "settings");
   EXPECT_EQ(contentsOf(path(DevicePlace::LegacyExchange)), "store");
@@ -155,7 +191,7 @@ TEST_F(DevicePlacesLeftoversTest, MissingDirectoriesHaveNoLeftovers) {
 TEST_F(DevicePlacesLeftoversTest, WhatMayNotBeRemovedIsTold) {
   const fs::path own = onHost(kMail) / "own";
   makeHostFile(own, "store");
-  rename(own, kLeftStore, 0, inodeOf(own));
+  rename(own, {kLeftStore, 0, markOfFile(own)});
   fs::permissions(onHost(kMail), fs::perms(0555));
   const WithoutPrivileges everyone;
   const std::vector<std::string> sentences = places.settleLeftovers();
@@ -250,7 +286,7 @@ TEST_F(DevicePlacesWithoutExchangeDeathTest, AFileIsRemovedAndAnotherProgramsCom
 }
 
 TEST_F(DevicePlacesWithoutExchangeDeathTest, WhatAKilledRunMovedAwayComesBack) {
-  leave(kLeftStore, "of another program", 0, kOther);
+  leave("of another program", {kLeftStore, 0, kOther});
   const auto settle = [&] {
     makeSystemCallFail(SYS_renameat2, EINVAL);
     std::string told;
