@@ -10,6 +10,7 @@
 
 #include "accountsettings/BasicAccount.h"
 #include "accountsettings/IdentifierIndex.h"
+#include "accountsettings/LastSave.h"
 #include "accountsettings/OrderedAccounts.h"
 #include "accountsettings/RuntimeFixer.h"
 #include "platform/MigrationObserver.h"
@@ -224,9 +225,8 @@ class AccountsManager {
   FixResult _fixAccountsBeforeSaving();
   /// Tells every notifier class, in one call each, what changed since the baseline was taken.
   void _sendNotificationsForChangedAccounts() const;
-  /// The contents of the file to write: all top-level accounts, merged with the file as it is now.
-  /// The fixers' gravest result is needed.
-  [[nodiscard]] PropertyDictionary _mergedRoot(FixResult fixing) const;
+  /// What is to be written: all top-level accounts, merged with the file as it is now.
+  [[nodiscard]] PropertyArray _mergedAccounts() const;
 
   IdentifierIndex<BasicAccountReference> _topLevelAccountsByID;
   OrderedAccounts _orderedTopLevelAccounts;
@@ -237,6 +237,7 @@ class AccountsManager {
   MigrationObserver* _observer = nullptr;
   std::uint64_t _dataVersion = 0;
   std::vector<std::unique_ptr<RuntimeFixer>> _runtimeFixers;
+  LastSave _lastSave;
 
   // The children that were indexed under each parent since its children were last removed; some may
   // have gone to another parent since. Spares a walk through all children for each parent.

@@ -91,11 +91,16 @@ PropertyDictionary AccountsManager::mergeInMemoryProperties_originalProperties_o
 void AccountsManager::saveAllAccounts() {
   logToChannel(saveOperation, "Saving all accounts");
   const FixResult fixing = _fixAccountsBeforeSaving();
-  const bool isSaved = writeSettingsFile(_mergedRoot(fixing));
+  const PropertyArray merged = _mergedAccounts();
+  // Kept on purpose: the version of this code, whatever dataVersion() says, since what is written
+  // has this code's layout.
+  const bool isSaved =
+      writeSettingsFile({{kPlistAccountsKey, merged}, {kPlistVersionKey, currentVersion()}});
   if (isSaved) {
     for (const BasicAccountReference& account : _orderedTopLevelAccounts.accounts()) {
-      account->noteSaved(fixing != FixResult::CannotBeKept);
+      account->setOriginalProperties(account->propertiesToSave());
     }
+    _lastSave.note(merged, _orderedTopLevelAccounts, fixing);
   }
   if (fixing != FixResult::Unchanged) {
     // Kept on purpose: also after a failed save. What matters to the fixers is that an attempt was
@@ -129,19 +134,13 @@ FixResult AccountsManager::_fixAccountsBeforeSaving() {
   return gravest;
 }
 
-PropertyDictionary AccountsManager::_mergedRoot(FixResult fixing) const {
-  OnDiskAccounts onDisk(accountsOnDisk(), _orderedTopLevelAccounts,
-                        fixing != FixResult::CannotBeKept ? OnDiskAccounts::InMemory::AllCanBeKept
-                                                          : OnDiskAccounts::InMemory::Unknown);
+PropertyArray AccountsManager::_mergedAccounts() const {
+  const OnDiskAccounts onDisk(accountsOnDisk(), _lastSave, _orderedTopLevelAccounts);
   const Accounts& accounts = _orderedTopLevelAccounts.accounts();
   std::vector<PropertyValue> mergedAccounts;
   mergedAccounts.reserve(accounts.size());
   for (std::size_t index = 0; index < accounts.size(); ++index) {
     const BasicAccount& account = *accounts[index];
-    if (onDisk.isAsMemoryKnowsIt(index)) {
-      mergedAccounts.emplace_back(account.propertiesToSave());
-      continue;
-    }
     PropertyDictionary merged = mergeInMemoryProperties_originalProperties_onDiskProperties(
         account.propertiesToSave(), account.originalProperties(),
         onDisk.propertiesForAccountAt(index));
@@ -150,10 +149,7 @@ PropertyDictionary AccountsManager::_mergedRoot(FixResult fixing) const {
         [&] { return logArguments(account.type(), merged, account.enabledDataclasses()); });
     mergedAccounts.emplace_back(std::move(merged));
   }
-  // Kept on purpose: the version of this code, whatever dataVersion() says, since what is written
-  // has this code's layout.
-  return {{kPlistAccountsKey, PropertyArray(std::move(mergedAccounts))},
-          {kPlistVersionKey, currentVersion()}};
+  return PropertyArray(std::move(mergedAccounts));
 }
 
 }  // namespace accounts

@@ -20,6 +20,11 @@ BasicAccountReference BasicAccount::initWithProperties(const PropertyDictionary&
   return account->acceptProperties(properties) ? account : nullptr;
 }
 
+bool BasicAccount::accepts(const PropertyDictionary& properties) {
+  return _isValidAccountType(properties.textForKey(kAccountType)) &&
+         !properties.textForKey(kAccountClass).value_or(Text()).empty();
+}
+
 bool BasicAccount::acceptProperties(const PropertyDictionary& properties) {
   static constexpr std::string_view operation = "-[BasicAccount initWithProperties:]";
   const std::optional<Text> type = properties.textForKey(kAccountType);
@@ -38,7 +43,6 @@ bool BasicAccount::acceptProperties(const PropertyDictionary& properties) {
   _originalProperties = properties;
   _properties = properties;
   _ownType = *type;
-  _hasValidOwnType = true;
   _ownClass = *accountClass;
   if (const std::optional<Text> own = properties.textForKey(kAccountIdentifier)) {
     _ownIdentifier = *own;

@@ -34,6 +34,8 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   /// without a text under "Identifier" gets a fresh one. Null, with a channel line, for an unknown
   /// account type or a missing class.
   static BasicAccountReference initWithProperties(const PropertyDictionary& properties);
+  /// Whether that makes a record.
+  static bool accepts(const PropertyDictionary& properties);
   /// A record of a type and a class with a fresh identifier. An unknown type or an empty class is a
   /// fatal assertion.
   static BasicAccountReference _initWithType_class(std::optional<std::string_view> type,
@@ -112,18 +114,8 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   [[nodiscard]] const std::optional<PropertyDictionary>& originalProperties() const {
     return _originalProperties;
   }
-  /// Whether initWithProperties() would make a record of properties().
-  [[nodiscard]] bool hasAcceptableProperties() const {
-    return _hasValidOwnType && !_ownClass.empty();
-  }
   /// Takes a new snapshot.
   void setOriginalProperties(std::optional<PropertyDictionary> properties);
-  /// Takes what the store has just written as the new snapshot. `canBeKept` says whether a store
-  /// that is made of it would keep the account.
-  void noteSaved(bool canBeKept);
-  /// Whether the snapshot is the one that noteSaved() took, of properties that initWithProperties()
-  /// makes a record of without adding to them, which a store would keep.
-  [[nodiscard]] bool wouldBeLoadedAsSaved() const { return _wouldBeLoadedAsSaved; }
 
   /// The texts under "Type", "Identifier", "Sync Identifier", "Class", "DisplayName", "Type String"
   /// and "Short Type String", own or inherited; none when there is no text.
@@ -131,10 +123,6 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   [[nodiscard]] std::optional<Text> identifier() const override;
   /// The text under "Identifier", whatever a record of another class answers above.
   [[nodiscard]] std::optional<Text> identifierProperty() const;
-  /// Whether properties() has a text under "Identifier".
-  [[nodiscard]] bool hasOwnIdentifier() const {
-    return !_ownIdentifier.empty() || _properties.textForKey(kAccountIdentifier);
-  }
   [[nodiscard]] virtual std::optional<Text> syncStoreIdentifier() const;
   [[nodiscard]] std::optional<Text> accountClass() const;
   [[nodiscard]] virtual std::optional<Text> displayName() const;
@@ -243,8 +231,6 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   Text _ownClass;
   Text _ownIdentifier;
   AccountOrigin _origin;
-  bool _hasValidOwnType = false;
-  bool _wouldBeLoadedAsSaved = false;
   FullAccountReference _fullAccount;
   SyncAccountReference _syncAccount;
   BasicAccountReference _parentAccount;

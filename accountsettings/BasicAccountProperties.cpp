@@ -81,9 +81,7 @@ void BasicAccount::noteChangeOfKey(std::string_view key) {
   } else if (key == kAccountSyncIdentifier) {
     ++Process::current().syncIdentifierChanges;
   } else if (key == kAccountType) {
-    const std::optional<Text> type = _properties.textForKey(key);
-    _hasValidOwnType = _isValidAccountType(type);
-    _ownType = type.value_or(Text());
+    _ownType = _properties.textForKey(key).value_or(Text());
   } else if (key == kAccountClass) {
     _ownClass = _properties.textForKey(key).value_or(Text());
   }
@@ -91,16 +89,6 @@ void BasicAccount::noteChangeOfKey(std::string_view key) {
 
 void BasicAccount::setOriginalProperties(std::optional<PropertyDictionary> properties) {
   _originalProperties = std::move(properties);
-  _wouldBeLoadedAsSaved = false;
-}
-
-void BasicAccount::noteSaved(bool canBeKept) {
-  const PropertyDictionary& saved = propertiesToSave();
-  _wouldBeLoadedAsSaved =
-      canBeKept && hasAcceptableProperties() && hasOwnIdentifier() && saved.isSameAs(_properties);
-  if (!_originalProperties || !_originalProperties->isSameAs(saved)) {
-    _originalProperties = saved;
-  }
 }
 
 std::optional<Text> BasicAccount::ownTextOrProperty(const Text& own, std::string_view key) const {

@@ -56,21 +56,7 @@ const std::vector<BasicAccountReference>& OrderedAccounts::accounts() const {
   return accounts_;
 }
 
-bool OrderedAccounts::haveDifferentIdentifiers() const {
-  const IdentifierStamp now = {Process::current().identifierChanges, listChanges_};
-  if (identifierStamp_ != now) {
-    IdentifierIndex<bool> identifiers;
-    identifiersDiffer_ = std::ranges::all_of(accounts(), [&](const auto& account) {
-      const std::optional<Text> identifier = account->identifier();
-      return identifier && !std::exchange(identifiers[*identifier], true);
-    });
-    identifierStamp_ = now;
-  }
-  return identifiersDiffer_;
-}
-
 void OrderedAccounts::append(BasicAccountReference account) {
-  ++listChanges_;
   accounts_.push_back(std::move(account));
   addPlace();
   if (hasIndexes_) {
@@ -79,7 +65,6 @@ void OrderedAccounts::append(BasicAccountReference account) {
 }
 
 void OrderedAccounts::assign(std::vector<BasicAccountReference> accounts) {
-  ++listChanges_;
   hasIndexes_ = false;
   accounts_ = std::move(accounts);
   places_.clear();
@@ -144,7 +129,6 @@ void OrderedAccounts::addPlace() {
 void OrderedAccounts::replaceAt(PlaceNumber number, const BasicAccountReference& account) {
   BasicAccountReference& occupant = accounts_[positionOf(number)];
   if (occupant != account) {
-    ++listChanges_;
     takeFromIndexes(number, *occupant);
     occupant = account;
     enterInIndexes(number, *occupant);
@@ -155,7 +139,6 @@ void OrderedAccounts::remove(PlaceNumber number) {
   const std::size_t position = positionOf(number);
   takeFromIndexes(number, *accounts_[position]);
   places_[position].isRemoved = true;
-  ++listChanges_;
   ++removedCount_;
 }
 

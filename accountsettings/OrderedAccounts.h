@@ -3,7 +3,6 @@
 #include <cstddef>
 #include <cstdint>
 #include <memory>
-#include <optional>
 #include <set>
 #include <string_view>
 #include <unordered_map>
@@ -25,9 +24,6 @@ class OrderedAccounts {
   [[nodiscard]] const std::vector<BasicAccountReference>& accounts() const;
   /// The number of accounts; O(1).
   [[nodiscard]] std::size_t size() const { return accounts_.size() - removedCount_; }
-  /// Whether each account has an identifier and no two have the same. O(n) when the list or an
-  /// identifier has changed since the last call.
-  [[nodiscard]] bool haveDifferentIdentifiers() const;
 
   void append(BasicAccountReference account);
   /// Puts other accounts in the place of all.
@@ -67,12 +63,6 @@ class OrderedAccounts {
     bool isRemoved;
   };
 
-  struct IdentifierStamp {
-    std::uint64_t identifierChanges;
-    std::uint64_t listChanges;
-    bool operator==(const IdentifierStamp&) const = default;
-  };
-
   [[nodiscard]] std::size_t positionOf(PlaceNumber number) const;
   void addPlace();
   void replaceAt(PlaceNumber number, const BasicAccountReference& account);
@@ -88,11 +78,6 @@ class OrderedAccounts {
   mutable std::vector<Place> places_;
   mutable std::size_t removedCount_ = 0;
   PlaceNumber nextNumber_ = 0;
-  std::uint64_t listChanges_ = 0;
-
-  // What was last found out about the identifiers, and when.
-  mutable std::optional<IdentifierStamp> identifierStamp_;
-  mutable bool identifiersDiffer_ = false;
 
   // Made when first needed, and again when a record's identifier has changed since.
   bool hasIndexes_ = false;

@@ -26,10 +26,8 @@ TEST(AccountProperties, AnOwnEmptyTextHidesTheParents) {
   child->_forcedSetAccountProperty_forKey("", kAccountClass);
 
   EXPECT_EQ(child->identifier(), "");
-  EXPECT_TRUE(child->hasOwnIdentifier());
   EXPECT_EQ(child->type(), "");
   EXPECT_EQ(child->accountClass(), "");
-  EXPECT_FALSE(child->hasAcceptableProperties());
 }
 
 TEST(AccountProperties, AMissingValueIsTheParents) {

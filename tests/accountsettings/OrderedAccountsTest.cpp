@@ -138,34 +138,6 @@ TEST_F(OrderedAccountsTest, AssignedAccountsAreFoundInTheirOwnPlaces) {
   EXPECT_EQ(list.replaceAll("A", replacement), 0u);
 }
 
-TEST_F(OrderedAccountsTest, IdentifiersDifferWhenEachAccountHasOneOfItsOwn) {
-  append("A");
-  append("B");
-  EXPECT_TRUE(list.haveDifferentIdentifiers());
-  append("A");
-  EXPECT_FALSE(list.haveDifferentIdentifiers());
-  list.removeLast("A");
-  EXPECT_TRUE(list.haveDifferentIdentifiers());
-}
-
-TEST_F(OrderedAccountsTest, AChangedOrMissingIdentifierIsSeen) {
-  append("A");
-  const BasicAccountReference account = append("B");
-  EXPECT_TRUE(list.haveDifferentIdentifiers());
-  account->setAccountProperty_forKey("A", kAccountIdentifier);
-  EXPECT_FALSE(list.haveDifferentIdentifiers());
-  account->removeAccountPropertyForKey(kAccountIdentifier);
-  EXPECT_FALSE(list.haveDifferentIdentifiers());
-}
-
-TEST_F(OrderedAccountsTest, AReplacedAccountsIdentifierCountsNoMore) {
-  const BasicAccountReference first = append("A");
-  append("A");
-  EXPECT_FALSE(list.haveDifferentIdentifiers());
-  list.replaceFirst(first, mail("B").record());
-  EXPECT_TRUE(list.haveDifferentIdentifiers());
-}
-
 TEST_F(OrderedAccountsTest, TheReferenceToTheAccountsStaysValid) {
   const std::vector<BasicAccountReference>& accounts = list.accounts();
   append("A");
