@@ -15,6 +15,7 @@
 #include "accountsettings/RuntimeFixer.h"
 #include "platform/SharedResources.h"
 #include "propertylist/value/PropertyValue.h"
+#include "vocabulary/DevicePlaces.h"
 
 extern "C" {
 /// The device path of the legacy Exchange account file.
@@ -43,7 +44,7 @@ class AccountsManager {
   // Loading (AccountsManager.cpp)
 
   /// The data version that this code writes.
-  static constexpr std::uint64_t currentVersion() { return 12; }
+  static constexpr std::uint64_t currentVersion() { return kMigratedVersion; }
   /// The device path of the account settings file, computed on every call.
   static std::string fullPathToAccountSettingsPlist();
   /// Switches the sending of change notifications off or on for the whole process.

@@ -4,6 +4,7 @@
 #include "accountsettings/Process.h"
 #include "migrator/AccountsDataMigrator.h"
 #include "migrator/HasClass.h"
+#include "vocabulary/DeviceServices.h"
 
 namespace accounts {
 
@@ -120,8 +121,8 @@ void removeHostedServiceDisplayNames(BasicAccount& cloudAccount) {
 
 bool AccountsDataMigrator::_migrateAccountsFrom8A293(AccountsManager& store) {
   const std::optional<PropertyValue> architecture =
-      Process::current().platform.deviceInfoService.copyAnswer("CPUArchitecture");
-  if (architecture == PropertyValue("armv6")) {
+      Process::current().platform.deviceInfoService.copyAnswer(kArchitectureQuestion);
+  if (architecture == PropertyValue(kArchitectureWithoutMultitasking)) {
     for (const BasicAccountReference& account : store.allBasicAccounts()) {
       // Forced, because on this processor an account's type may not list notes.
       if (account->type() == kOnMyDeviceAccountType) {

@@ -4,23 +4,24 @@
 #include <cstddef>
 #include <set>
 
+#include "vocabulary/AccountClasses.h"
+#include "vocabulary/AccountVocabulary.h"
+#include "vocabulary/LegacyStoreKeys.h"
+
 namespace accounts {
 namespace {
 
-constexpr std::string_view kVersion = "Version";
-constexpr std::string_view kAccounts = "Accounts";
-constexpr std::string_view kChildAccounts = "ChildAccounts";
-constexpr std::string_view kIdentifier = "Identifier";
 /// The identifier of the device's own account, which a migration makes anew where it is missing.
-constexpr std::string_view kDeviceLocalIdentifier = "DeviceLocalAccount";
+constexpr std::string_view kDeviceLocalIdentifier = kDeviceLocalAccountClass;
 
 /// The arrays of a legacy store, and the key of an account's identifier in them.
 struct LegacyLayout {
   std::vector<std::string_view> arrays;
   std::string_view identifier;
 };
-const LegacyLayout kMailLayout = {{"DeliveryAccounts", "MailAccounts"}, "uniqueId"};
-const LegacyLayout kExchangeLayout = {{"DAAccountsKey"}, "DAAccountConfigurationAccountID"};
+const LegacyLayout kMailLayout = {{kLegacyOutgoingAccounts, kLegacyIncomingAccounts},
+                                  kLegacyMailIdentifier};
+const LegacyLayout kExchangeLayout = {{kLegacyExchangeAccounts}, kLegacyExchangeIdentifier};
 
 using Identifiers = std::set<std::string, std::less<>>;
 
@@ -35,7 +36,7 @@ std::optional<std::string> identifierIn(const PropertyValue& account, std::strin
 }
 
 void addIdentifiers(Identifiers& identifiers, const PropertyArray& accounts,
-                    std::string_view key = kIdentifier) {
+                    std::string_view key = kAccountIdentifier) {
   for (const PropertyValue& account : accounts) {
     if (const auto identifier = identifierIn(account, key)) {
       identifiers.insert(*identifier);
@@ -46,11 +47,11 @@ void addIdentifiers(Identifiers& identifiers, const PropertyArray& accounts,
 /// The identifiers of all accounts of a settings file, children included.
 Identifiers identifiersOf(const PropertyDictionary& settings) {
   Identifiers identifiers;
-  const PropertyArray accounts = arrayIn(settings, kAccounts);
+  const PropertyArray accounts = arrayIn(settings, kPlistAccountsKey);
   addIdentifiers(identifiers, accounts);
   for (const PropertyValue& account : accounts) {
     if (account.asDictionary() != nullptr) {
-      addIdentifiers(identifiers, arrayIn(*account.asDictionary(), kChildAccounts));
+      addIdentifiers(identifiers, arrayIn(*account.asDictionary(), kAccountChildAccounts));
     }
   }
   return identifiers;
@@ -60,15 +61,16 @@ Identifiers identifiersOf(const PropertyDictionary& settings) {
 bool hasAccount(const PropertyDictionary& settings, std::string_view identifier) {
   const auto isIt = [&](const PropertyValue& account) {
     const PropertyDictionary* const properties = account.asDictionary();
-    const auto text = properties != nullptr ? properties->textForKey(kIdentifier) : std::nullopt;
+    const auto text =
+        properties != nullptr ? properties->textForKey(kAccountIdentifier) : std::nullopt;
     return text && text->view() == identifier;
   };
-  const PropertyArray accounts = arrayIn(settings, kAccounts);
+  const PropertyArray accounts = arrayIn(settings, kPlistAccountsKey);
   return std::ranges::any_of(accounts, isIt) ||
          std::ranges::any_of(accounts, [&](const PropertyValue& account) {
            const PropertyDictionary* const properties = account.asDictionary();
            return properties != nullptr &&
-                  std::ranges::any_of(arrayIn(*properties, kChildAccounts), isIt);
+                  std::ranges::any_of(arrayIn(*properties, kAccountChildAccounts), isIt);
          });
 }
 
@@ -76,12 +78,12 @@ bool hasAccount(const PropertyDictionary& settings, std::string_view identifier)
 /// read it. Accounts that come from elsewhere, too, do not count: they are there in any case.
 bool hasLostAll(const PropertyDictionary& before, const PropertyDictionary& after,
                 const Identifiers& fromElsewhere) {
-  const PropertyArray accounts = arrayIn(before, kAccounts);
+  const PropertyArray accounts = arrayIn(before, kPlistAccountsKey);
   if (accounts.size() == 0) {
     return false;
   }
   // Hardly ever is the first one not there any more.
-  const auto first = identifierIn(*accounts.begin(), kIdentifier);
+  const auto first = identifierIn(*accounts.begin(), kAccountIdentifier);
   if (first && !fromElsewhere.contains(*first) && hasAccount(after, *first)) {
     return false;
   }
@@ -92,7 +94,7 @@ bool hasLostAll(const PropertyDictionary& before, const PropertyDictionary& afte
   const bool noneIsLeft =
       !identifiers.empty() &&
       std::ranges::none_of(identifiers, [&](const auto& each) { return left.contains(each); });
-  return noneIsLeft || arrayIn(after, kAccounts).size() == 0;
+  return noneIsLeft || arrayIn(after, kPlistAccountsKey).size() == 0;
 }
 
 /// Whether the accounts of a legacy store are among these. One without an identifier is given a
@@ -118,7 +120,7 @@ bool isAmong(const Identifiers& identifiers, const PropertyDictionary& store,
 }  // namespace
 
 bool isMigrated(const std::optional<PropertyDictionary>& settings) {
-  const PropertyValue* const version = settings ? settings->find(kVersion) : nullptr;
+  const PropertyValue* const version = settings ? settings->find(kPlistVersionKey) : nullptr;
   return version != nullptr && version->integerValue() == kMigratedVersion;
 }
 

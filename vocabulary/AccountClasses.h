@@ -15,6 +15,7 @@ inline constexpr std::string_view kSMTPAccountClass = "SMTPAccount";
 inline constexpr std::string_view kDeliveryAccountClass = "DeliveryAccount";
 inline constexpr std::string_view kDataAccessMailAccountClass = "DAMailAccount";
 inline constexpr std::string_view kTolvaneIMAPAccountClass = "TolvaneIMAPAccount";
+inline constexpr std::string_view kLocalMailAccountClass = "LocalAccount";
 /// The hosted mail service under its current and its earliest name.
 inline constexpr std::string_view kVelmoraAccountClass = "VelmoraAccount";
 inline constexpr std::string_view kMarrowAccountClass = "MarrowAccount";
@@ -22,6 +23,8 @@ inline constexpr std::string_view kMarrowAccountClass = "MarrowAccount";
 inline constexpr std::string_view kCloudAccountClass = "ZQAccount";
 /// A stand-alone calendar account.
 inline constexpr std::string_view kCalDAVAccountClass = "MobileCalDAVAccount";
+/// The device's own account; its identifier, too.
+inline constexpr std::string_view kDeviceLocalAccountClass = "DeviceLocalAccount";
 
 /// Boolean of a mail account. What its absence means differs from step to step.
 inline constexpr std::string_view kIsActiveKey = "IsActive";

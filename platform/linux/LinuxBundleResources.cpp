@@ -4,8 +4,8 @@
 
 #include <utility>
 
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/DictionaryFile.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {
