@@ -5,10 +5,10 @@
 
 #include "accountsettings/AccountsManager.h"
 #include "migrator/AccountsDataMigrator.h"
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/LinuxDevicePlaces.h"
 #include "platform/linux/TemporaryFile.h"
 #include "safetynet/KeptFolders.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {

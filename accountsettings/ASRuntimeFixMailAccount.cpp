@@ -4,6 +4,8 @@
 
 #include "accountsettings/Log.h"
 #include "accountsettings/Process.h"
+#include "vocabulary/AccountClasses.h"
+#include "vocabulary/DeviceServices.h"
 
 void reportMailAccountClassFound() {}
 
@@ -13,12 +15,10 @@ namespace {
 
 /// The mail account classes that need no fixing.
 constexpr std::array<std::string_view, 8> _supportedMailClasses = {
-    "MarrowAccount", "VelmoraAccount", "POPAccount",   "IMAPAccount",
-    "AOLAccount",    "LocalAccount",   "GmailAccount", "YahooAccount"};
+    kMarrowAccountClass, kVelmoraAccountClass,   kPOPAccountClass,   kIMAPAccountClass,
+    kAOLAccountClass,    kLocalMailAccountClass, kGmailAccountClass, kYahooAccountClass};
 
-constexpr std::string_view accountPathKey = "AccountPath";
-constexpr std::string_view mailApplication = "com.quarx.mobilemail";
-constexpr std::string_view mailAccountsPreference = "MailAccounts";
+constexpr std::string_view kAccountPathKey = "AccountPath";
 
 template <std::size_t count>
 bool contains(const std::array<std::string_view, count>& texts, const std::optional<Text>& text) {
@@ -44,8 +44,8 @@ FixResult ASRuntimeFixMailAccount::fixBasicAccountIfNeeded_loggingMessage(
 
 void ASRuntimeFixMailAccount::accountsHaveBeenSaved(bool saved) {
   if (_shouldNotifyMobileMail && saved) {
-    Process::current().platform.preferencesBroadcast.announceChange(mailApplication,
-                                                                    mailAccountsPreference);
+    Process::current().platform.preferencesBroadcast.announceChange(kMailApplication,
+                                                                    kMailAccountsPreference);
   }
   _shouldNotifyMobileMail = false;
 }
@@ -53,7 +53,7 @@ void ASRuntimeFixMailAccount::accountsHaveBeenSaved(bool saved) {
 bool ASRuntimeFixMailAccount::_cleanupAccountClass(BasicAccount& account) {
   const MailDirectoryMarkers& markers = Process::current().mailDirectoryMarkers.get(
       [] { return makeMailDirectoryMarkers(MailServices::current()); });
-  const Text path = account.textPropertyForKey(accountPathKey).value_or(Text());
+  const Text path = account.textPropertyForKey(kAccountPathKey).value_or(Text());
   const std::string_view accountClass = mailClassForDirectory(markers, path);
   if (accountClass.empty()) {
     logToChannel("-[ASRuntimeFixMailAccount(Internal) _cleanupAccountClass:]",

@@ -2,8 +2,8 @@
 
 #include "accountsettings/BasicAccount.h"
 #include "accountsettings/Log.h"
-#include "accountsettings/Paths.h"
 #include "accountsettings/Process.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 
@@ -23,8 +23,7 @@ PropertyArray creatorEntriesForType(const std::optional<Text>& type, std::string
 void loadCreatorFramework(std::string_view relativePath, std::string_view operation,
                           std::string_view sourceFile) {
   Platform& platform = Process::current().platform;
-  const std::string path =
-      pathByAppending(platform.sharedResources.systemRootDirectory(), relativePath);
+  const std::string path = joinedPath(platform.sharedResources.systemRootDirectory(), relativePath);
   const Result loaded = platform.frameworkLoader.loadFramework(path);
   if (!loaded) {
     failAssertion(operation, sourceFile,

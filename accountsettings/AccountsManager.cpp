@@ -4,14 +4,13 @@
 
 #include "accountsettings/ASRuntimeFixMailAccount.h"
 #include "accountsettings/Log.h"
-#include "accountsettings/Paths.h"
 #include "accountsettings/Process.h"
+#include "vocabulary/DevicePath.h"
+#include "vocabulary/DevicePlaces.h"
 
 namespace accounts {
 
 namespace {
-
-constexpr std::string_view preferencesDirectory = "/var/mobile/Library/Preferences";
 
 /// The record of an element of an array of account dictionaries; null when the element is no
 /// acceptable account dictionary.
@@ -27,8 +26,8 @@ AccountOrigin elementOfFile(std::size_t index) {
 }  // namespace
 
 std::string AccountsManager::fullPathToAccountSettingsPlist() {
-  return pathByAppending(Process::current().platform.sharedResources.systemRootDirectory(),
-                         pathByAppending(preferencesDirectory, kAccountsFilename));
+  return joinedPath(Process::current().platform.sharedResources.systemRootDirectory(),
+                    listed(DevicePlace::Settings).path);
 }
 
 void AccountsManager::_setShouldSkipNotifications(bool skip) {

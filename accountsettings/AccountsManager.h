@@ -10,12 +10,13 @@
 
 #include "accountsettings/BasicAccount.h"
 #include "accountsettings/IdentifierIndex.h"
-#include "accountsettings/LastSave.h"
+#include "accountsettings/NewestSave.h"
 #include "accountsettings/OrderedAccounts.h"
 #include "accountsettings/RuntimeFixer.h"
 #include "platform/MigrationObserver.h"
 #include "platform/SharedResources.h"
 #include "propertylist/value/PropertyValue.h"
+#include "vocabulary/DevicePlaces.h"
 
 extern "C" {
 /// The device path of the legacy Exchange account file.
@@ -44,7 +45,7 @@ class AccountsManager {
   // Loading (AccountsManager.cpp)
 
   /// The data version that this code writes.
-  static constexpr std::uint64_t currentVersion() { return 12; }
+  static constexpr std::uint64_t currentVersion() { return kMigratedVersion; }
   /// The device path of the account settings file, computed on every call.
   static std::string fullPathToAccountSettingsPlist();
   /// Switches the sending of change notifications off or on for the whole process.
@@ -237,7 +238,7 @@ class AccountsManager {
   MigrationObserver* _observer = nullptr;
   std::uint64_t _dataVersion = 0;
   std::vector<std::unique_ptr<RuntimeFixer>> _runtimeFixers;
-  LastSave _lastSave;
+  NewestSave _newestSave;
 
   // The children that were indexed under each parent since its children were last removed; some may
   // have gone to another parent since. Spares a walk through all children for each parent.

@@ -4,27 +4,23 @@
 
 #include "accountsettings/AccountsManager.h"
 #include "accountsettings/Log.h"
-#include "accountsettings/Paths.h"
 #include "accountsettings/Process.h"
+#include "vocabulary/DevicePlaces.h"
 
 namespace {
 
-std::string pathInHomeDirectory(std::initializer_list<std::string_view> components) {
-  std::string path = accounts::Process::current().platform.homeDirectory.path();
-  for (const std::string_view component : components) {
-    path = accounts::pathByAppending(path, component);
-  }
-  return path;
+std::string pathInHomeDirectory(accounts::DevicePlace place) {
+  return accounts::pathOfPlace(place, accounts::Process::current().platform.homeDirectory.path());
 }
 
 }  // namespace
 
 std::string daAccountPath() {
-  return pathInHomeDirectory({"Library", "Preferences", "com.quarx.DataAccess.plist"});
+  return pathInHomeDirectory(accounts::DevicePlace::LegacyExchange);
 }
 
 std::string mailAccountsPath() {
-  return pathInHomeDirectory({"Library", "Mail", "Accounts.plist"});
+  return pathInHomeDirectory(accounts::DevicePlace::LegacyMail);
 }
 
 std::string accountSettingsAccountsPath() {
@@ -36,8 +32,7 @@ namespace accounts {
 namespace {
 
 std::unique_ptr<NamedLock> makeMigrationLock() {
-  return Process::current().platform.sharedResources.makeLock(
-      lastPathComponent(kAccountMigrationLockFilename));
+  return Process::current().platform.sharedResources.makeLock(kMigrationLockName);
 }
 
 bool fileExists(std::string_view path) {

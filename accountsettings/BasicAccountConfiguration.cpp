@@ -4,16 +4,14 @@
 #include "accountsettings/BasicAccount.h"
 #include "accountsettings/Log.h"
 #include "accountsettings/Process.h"
+#include "vocabulary/DeviceServices.h"
 
 namespace accounts {
 
 namespace {
 
-constexpr std::string_view accountTypesResource = "AccountTypesProperties";
-constexpr std::string_view dataclassesResource = "DataclassesProperties";
-
-constexpr std::string_view architectureQuestion = "CPUArchitecture";
-constexpr std::string_view architectureWithoutMultitasking = "armv6";
+constexpr std::string_view kAccountTypesResource = "AccountTypesProperties";
+constexpr std::string_view kDataclassesResource = "DataclassesProperties";
 
 /// The dataclasses of a type's configured list that this system knows and the device can offer.
 PropertyArray normalisedDataclasses(const PropertyArray& configured, bool isMultitaskingEnabled) {
@@ -32,10 +30,10 @@ PropertyArray normalisedDataclasses(const PropertyArray& configured, bool isMult
 PropertyDictionary loadAccountTypesTable() {
   static constexpr std::string_view operation = "+[BasicAccount initialize]";
   BundleResources& resources = Process::current().platform.bundleResources;
-  if (!resources.hasPropertyList(accountTypesResource)) {
+  if (!resources.hasPropertyList(kAccountTypesResource)) {
     failAssertion(operation, kAccountSourceFile, "Could not find AccountTypesProperties.plist");
   }
-  const std::optional<PropertyDictionary> file = resources.readPropertyList(accountTypesResource);
+  const std::optional<PropertyDictionary> file = resources.readPropertyList(kAccountTypesResource);
   if (!file) {
     // Kept on purpose: the message names the dataclasses although the account types failed; log
     // searches know it so.
@@ -102,8 +100,8 @@ void BasicAccount::initialize() {
 
 bool BasicAccount::isMultitaskingEnabled() {
   const std::optional<PropertyValue> architecture =
-      Process::current().platform.deviceInfoService.copyAnswer(architectureQuestion);
-  return architecture != PropertyValue(architectureWithoutMultitasking);
+      Process::current().platform.deviceInfoService.copyAnswer(kArchitectureQuestion);
+  return architecture != PropertyValue(kArchitectureWithoutMultitasking);
 }
 
 const PropertyArray& BasicAccount::allSupportedDataclasses() {
@@ -178,7 +176,7 @@ bool BasicAccount::_isValidAccountType(std::optional<std::string_view> type) {
 }
 
 std::optional<PropertyDictionary> BasicAccount::_dataclassesProperties() {
-  return Process::current().platform.bundleResources.readPropertyList(dataclassesResource);
+  return Process::current().platform.bundleResources.readPropertyList(kDataclassesResource);
 }
 
 }  // namespace accounts

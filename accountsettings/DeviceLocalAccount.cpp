@@ -4,6 +4,7 @@
 #include <array>
 
 #include "accountsettings/Process.h"
+#include "vocabulary/AccountClasses.h"
 
 namespace accounts {
 
@@ -137,14 +138,14 @@ std::optional<Text> DeviceLocalAccount::displayName() const {
 PropertyDictionary DeviceLocalAccount::basicAccountProperties() {
   const Text nameOfType = typeString();
   return {{kAccountType, kOnMyDeviceAccountType},
-          {kAccountClass, "DeviceLocalAccount"},
+          {kAccountClass, kDeviceLocalAccountClass},
           {kAccountTypeString, nameOfType},
           {kAccountShortTypeString, nameOfType},
           {kAccountIdentifier, _identifier()}};
 }
 
 std::string_view DeviceLocalAccount::_identifier() {
-  return "DeviceLocalAccount";
+  return kDeviceLocalAccountClass;
 }
 
 std::string DeviceLocalAccount::typeString() {

@@ -2,18 +2,20 @@
 
 #include <algorithm>
 
+#include "vocabulary/AccountClasses.h"
+
 namespace accounts {
 
 MailDirectoryMarkers makeMailDirectoryMarkers(const MailServices& services) {
   return {{
-      {"Mail/Dorsa-", "MarrowAccount"},
-      {"Mail/Velmora-", "VelmoraAccount"},
-      {"Mail/AOL-", "AOLAccount"},
-      {"Mail/Mailboxes", "LocalAccount"},
-      {services.gmailUserDomain + "@" + services.gmailIMAPHost, "GmailAccount"},
-      {"@" + services.yahooIMAPHost, "YahooAccount"},
-      {"Mail/POP-", "POPAccount"},
-      {"Mail/IMAP-", "IMAPAccount"},
+      {"Mail/Dorsa-", kMarrowAccountClass},
+      {"Mail/Velmora-", kVelmoraAccountClass},
+      {"Mail/AOL-", kAOLAccountClass},
+      {"Mail/Mailboxes", kLocalMailAccountClass},
+      {services.gmailUserDomain + "@" + services.gmailIMAPHost, kGmailAccountClass},
+      {"@" + services.yahooIMAPHost, kYahooAccountClass},
+      {"Mail/POP-", kPOPAccountClass},
+      {"Mail/IMAP-", kIMAPAccountClass},
   }};
 }
 

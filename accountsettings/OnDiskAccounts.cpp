@@ -6,7 +6,7 @@
 
 namespace accounts {
 
-OnDiskAccounts::OnDiskAccounts(PropertyArray onDisk, const LastSave& lastSave,
+OnDiskAccounts::OnDiskAccounts(PropertyArray onDisk, const NewestSave& lastSave,
                                const OrderedAccounts& inMemory)
     : onDisk_(std::move(onDisk)), inMemory_(inMemory) {
   if (!lastSave.isThere(onDisk_, inMemory_)) {

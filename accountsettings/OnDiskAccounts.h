@@ -4,7 +4,7 @@
 #include <memory>
 #include <optional>
 
-#include "accountsettings/LastSave.h"
+#include "accountsettings/NewestSave.h"
 #include "accountsettings/OrderedAccounts.h"
 #include "propertylist/value/PropertyValue.h"
 
@@ -18,7 +18,7 @@ class OnDiskAccounts {
  public:
   /// Takes the array of account dictionaries in the file, what was saved last, and the accounts in
   /// memory, which must outlive this and stay as they are.
-  OnDiskAccounts(PropertyArray onDisk, const LastSave& lastSave, const OrderedAccounts& inMemory);
+  OnDiskAccounts(PropertyArray onDisk, const NewestSave& lastSave, const OrderedAccounts& inMemory);
   OnDiskAccounts(const OnDiskAccounts&) = delete;
   OnDiskAccounts& operator=(const OnDiskAccounts&) = delete;
   ~OnDiskAccounts();

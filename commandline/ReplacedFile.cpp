@@ -10,11 +10,11 @@
 #include <variant>
 
 #include "commandline/PlatformError.h"
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/DeviceRoot.h"
 #include "platform/linux/FileContents.h"
 #include "platform/linux/LinuxFileSystem.h"
 #include "platform/linux/TemporaryFile.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {

@@ -3,23 +3,22 @@
 #include <utility>
 
 #include "accountsettings/Log.h"
-#include "accountsettings/Paths.h"
 #include "accountsettings/Process.h"
 #include "migrator/MigrationStage.h"
+#include "vocabulary/DevicePath.h"
+#include "vocabulary/DevicePlaces.h"
+#include "vocabulary/DeviceServices.h"
 #include "vocabulary/MigrationStages.h"
 
 namespace accounts {
 
 namespace {
 
-constexpr std::string_view mailApplication = "com.quarx.mobilemail";
-constexpr std::string_view mailAccountsPreference = "MailAccounts";
-
 void tellMailApplication(Platform& platform) {
   // The file is often absent; a failure to remove it has no consequence.
-  static_cast<void>(platform.fileSystem.removeFile(
-      pathByAppending(platform.mailDirectory.path(), "AutoFetchEnabled")));
-  platform.preferencesBroadcast.announceChange(mailApplication, mailAccountsPreference);
+  static_cast<void>(platform.fileSystem.removeFile(joinedPath(
+      platform.mailDirectory.path(), splitPath(listed(DevicePlace::AutoFetchEnabled).path).name)));
+  platform.preferencesBroadcast.announceChange(kMailApplication, kMailAccountsPreference);
 }
 
 }  // namespace

@@ -4,6 +4,7 @@
 #include "accountsettings/Process.h"
 #include "migrator/AccountsDataMigrator.h"
 #include "migrator/HasClass.h"
+#include "vocabulary/DeviceServices.h"
 
 namespace accounts {
 
@@ -15,9 +16,6 @@ enum class CloudStatus : std::int64_t {
   /// The account still stands for the hosted service.
   StandsForHostedService = 2
 };
-
-/// Under this key the cloud account service's primary flag is read back.
-constexpr std::string_view primaryAccountKey = "primaryAccount";
 
 CloudAccountService& cloudAccountService() {
   return Process::current().platform.cloudAccountService;
@@ -34,7 +32,7 @@ void setStatus(BasicAccount& account, CloudStatus status) {
 }
 
 bool isPrimary(const BasicAccount& account) {
-  return account.booleanPropertyForKey(primaryAccountKey).value_or(false);
+  return account.booleanPropertyForKey(kPrimaryAccountKey).value_or(false);
 }
 
 void enableUbiquityAndKeyValue(BasicAccount& account, bool enabled) {

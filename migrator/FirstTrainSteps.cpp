@@ -6,6 +6,7 @@
 #include "migrator/AccountsDataMigrator.h"
 #include "migrator/HasClass.h"
 #include "migrator/MigrationStage.h"
+#include "vocabulary/LegacyStoreKeys.h"
 
 // The steps of 7A149 to 7A241. That of 7A242 has a file of its own.
 
@@ -13,7 +14,6 @@ namespace accounts {
 
 namespace {
 
-constexpr std::string_view uniqueIdKey = "uniqueId";
 constexpr std::string_view denyTetheredSource = "DenyTethered";
 constexpr std::string_view step7A153 =
     "-[AccountsDataMigrator(Internal) _migrateAccountsFrom7A153:]";
@@ -38,10 +38,10 @@ bool isEmpty(const std::optional<Text>& text) {
 /// Gives an account the identifier that the oldest builds kept under "uniqueId", or a fresh one if
 /// it has neither.
 void settleIdentifier(BasicAccount& account) {
-  const std::optional<Text> uniqueId = account.properties().textForKey(uniqueIdKey);
+  const std::optional<Text> uniqueId = account.properties().textForKey(kLegacyMailIdentifier);
   if (!isEmpty(uniqueId)) {
     account.setAccountProperty_forKey(*uniqueId, kAccountIdentifier);
-    account.removeAccountPropertyForKey(uniqueIdKey);
+    account.removeAccountPropertyForKey(kLegacyMailIdentifier);
   } else if (isEmpty(account.textPropertyForKey(kAccountIdentifier))) {
     account.setAccountProperty_forKey(BasicAccount::createNewAccountUID(), kAccountIdentifier);
   }

@@ -1,35 +1,33 @@
 #include "accountsettings/Log.h"
-#include "accountsettings/Paths.h"
 #include "accountsettings/Process.h"
 #include "migrator/AccountsDataMigrator.h"
+#include "vocabulary/DevicePath.h"
+#include "vocabulary/DevicePlaces.h"
 #include "vocabulary/LegacyStoreKeys.h"
 
 namespace accounts {
 
 namespace {
 
-constexpr std::string_view removalOperation =
+constexpr std::string_view kRemovalOperation =
     "-[AccountsDataMigrator(Internal) _removeOldAccountsInfo]";
-constexpr std::string_view loggingPreferences = "com.quarx.accountsettings-logging";
-constexpr std::string_view saveInformationPreference = "ASSaveMigrationInformation";
-constexpr std::string_view sentinelContents = "Old Account Information Removal Sentinel";
-constexpr unsigned informationDirectoryPermissions = 0777;
+constexpr std::string_view kSaveInformationPreference = "ASSaveMigrationInformation";
+constexpr unsigned kInformationDirectoryPermissions = 0777;
 
 // Kept on purpose: the second "M" and the "S" give the month again and tenths of a second where
 // minutes and seconds were meant. Tools that collect these files know the names as they are.
-constexpr std::string_view informationDatePattern = "Y-M-d-H-M-S";
+constexpr std::string_view kInformationDatePattern = "Y-M-d-H-M-S";
 
-std::string pathInHomeLibrary(std::string_view pathInLibrary) {
-  const std::string home = Process::current().platform.homeDirectory.path();
-  return pathByAppending(pathByAppending(home, "Library"), pathInLibrary);
+std::string pathInHomeDirectory(DevicePlace place) {
+  return pathOfPlace(place, Process::current().platform.homeDirectory.path());
 }
 
 std::string informationDirectory() {
-  return pathInHomeLibrary("Logs/CrashReporter/AccountMigration");
+  return pathInHomeDirectory(DevicePlace::InformationDirectory);
 }
 
 void logRemovalFailure(const std::string& path, const Result& removal) {
-  logToConsole("%s. Could not delete %@. Error = %@", {removalOperation, path, removal.error()});
+  logToConsole("%s. Could not delete %@. Error = %@", {kRemovalOperation, path, removal.error()});
 }
 
 /// Sees to it that the directory of migration-information files exists. False, with a console line,
@@ -37,7 +35,7 @@ void logRemovalFailure(const std::string& path, const Result& removal) {
 bool makeInformationDirectory(FileSystem& files, const std::string& directory) {
   if (!files.fileExists(directory)) {
     const Result creation =
-        files.createDirectoryWithIntermediates(directory, informationDirectoryPermissions);
+        files.createDirectoryWithIntermediates(directory, kInformationDirectoryPermissions);
     if (!creation) {
       logToConsole(
           "AccountMigration warning: Could not create the directory to store migration information "
@@ -60,16 +58,17 @@ bool makeInformationDirectory(FileSystem& files, const std::string& directory) {
 void AccountsDataMigrator::removeAbandonedTemporaryFiles() {
   // Beside the default directory, those of the files that are written atomically: the sentinel and
   // the information files.
+  const std::string sentinel = pathInHomeDirectory(DevicePlace::RemovalSentinel);
   Process::current().platform.fileSystem.removeAbandonedTemporaryFiles(
-      {pathInHomeLibrary("Preferences"), informationDirectory()});
+      {std::string(splitPath(sentinel).directory), informationDirectory()});
 }
 
 void AccountsDataMigrator::_copyAsideAccountsPlist() {
   Platform& platform = Process::current().platform;
   const std::string source = AccountsManager::fullPathToAccountSettingsPlist();
-  const std::string directory = pathByAppending(platform.sharedResources.sharedResourcesDirectory(),
-                                                "Library/Logs/CrashReporter");
-  const std::string destination = pathByAppending(directory, lastPathComponent(source));
+  const std::string directory =
+      joinedPath(platform.sharedResources.sharedResourcesDirectory(), "Library/Logs/CrashReporter");
+  const std::string destination = joinedPath(directory, splitPath(source).name);
 
   if (platform.fileSystem.fileExists(destination) && !platform.fileSystem.removeFile(destination)) {
     logToConsole("Couldn't remove existing accountsettings copy at %@", {destination});
@@ -84,9 +83,9 @@ bool AccountsDataMigrator::_saveMigrationInformation() {
   Process& process = Process::current();
   return process.savesMigrationInformation.get([&process] {
     PreferenceDomain& preferences = process.platform.preferenceDomain;
-    preferences.synchronize(loggingPreferences);
+    preferences.synchronize(kLoggingPreferences);
     const std::optional<PropertyValue> value =
-        preferences.copyValue(saveInformationPreference, loggingPreferences);
+        preferences.copyValue(kSaveInformationPreference, kLoggingPreferences);
     return value && value->booleanValue().value_or(false);
   });
 }
@@ -99,7 +98,7 @@ void AccountsDataMigrator::collect(std::string_view key,
 }
 
 std::string AccountsDataMigrator::_absolutePathToOldAccountsInfoRemovalSentinel() {
-  return pathInHomeLibrary("Preferences/.removingOldAccounts");
+  return pathInHomeDirectory(DevicePlace::RemovalSentinel);
 }
 
 bool AccountsDataMigrator::_failedToRemoveOldAccountsInfo() {
@@ -112,7 +111,7 @@ bool AccountsDataMigrator::_removeOldAccountsInfo() {
   const std::string sentinel = _absolutePathToOldAccountsInfoRemovalSentinel();
   if (!files.fileExists(sentinel)) {
     // Without the sentinel the removal is merely not protected against an interruption.
-    static_cast<void>(files.createFile(sentinel, sentinelContents));
+    static_cast<void>(files.createFile(sentinel, kRemovalSentinelContents));
   }
 
   const std::string exchangePath = daAccountPath();
@@ -152,13 +151,14 @@ void AccountsDataMigrator::_saveCollatedMigrationInformation() {
     return;
   }
   // Kept on purpose: ".txt" for a binary property list; the name is what collectors look for.
-  const std::string name = "AccountMigrationInformation-" +
-                           platform.dateFormatter.currentDate(informationDatePattern) + ".txt";
+  const std::string name = std::string(kInformationFilePrefix)
+                               .append(platform.dateFormatter.currentDate(kInformationDatePattern))
+                               .append(kInformationFileSuffix);
   SerializedPropertyList information;
   if (platform.propertyLists.serializeBinary(*_collatedMigrationData, information)) {
     // The file is a help for engineers: a migration never fails for want of it, nor reports it.
     static_cast<void>(
-        platform.fileSystem.writeFileAtomically(pathByAppending(directory, name), information));
+        platform.fileSystem.writeFileAtomically(joinedPath(directory, name), information));
   }
 }
 

@@ -5,6 +5,7 @@
 #include "migrator/AccountsDataMigrator.h"
 #include "migrator/HasClass.h"
 #include "migrator/MigrationStage.h"
+#include "vocabulary/DeviceServices.h"
 
 namespace accounts {
 
@@ -123,7 +124,7 @@ void removeHostedServiceDisplayNames(BasicAccount& cloudAccount) {
 bool AccountsDataMigrator::_migrateAccountsFrom8A293(AccountsManager& store) {
   const std::optional<PropertyValue> architecture =
       Process::current().platform.deviceInfoService.copyAnswer(kArchitectureQuestion);
-  if (architecture == PropertyValue(kOldestArchitecture)) {
+  if (architecture == PropertyValue(kArchitectureWithoutMultitasking)) {
     for (const BasicAccountReference& account : store.allBasicAccounts()) {
       // Forced, because on this processor an account's type may not list notes.
       if (account->type() == kOnMyDeviceAccountType) {

@@ -24,8 +24,8 @@ struct UpgradeStep {
   Operation run;
 };
 
-/// Every upgrade step in its fixed order. To add one: raise AccountsManager::currentVersion() and
-/// append a row.
+/// Every upgrade step in its fixed order. To add one: raise `kMigratedVersion`
+/// (vocabulary/DevicePlaces.h) and append a row.
 inline constexpr std::array<UpgradeStep, 12> upgradeChain = {{
     {0, kStep7A149, "Stamp version 1", &AccountsDataMigrator::_migrateAccountsFrom7A149},
     {1, kStep7A150, "Give accounts their unique identifiers",

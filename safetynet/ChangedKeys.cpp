@@ -6,6 +6,7 @@
 
 #include "vocabulary/AccountClasses.h"
 #include "vocabulary/AccountVocabulary.h"
+#include "vocabulary/DeviceServices.h"
 #include "vocabulary/LegacyStoreKeys.h"
 #include "vocabulary/MigrationStages.h"
 
@@ -15,8 +16,8 @@ namespace {
 using Texts = std::span<const std::string_view>;
 
 // In the place of keys that the device's framework supplies.
-constexpr std::string_view kStatusKey = "<status>";
-constexpr std::string_view kPrimaryAccountKey = "<primary account>";
+constexpr std::string_view kStatusMark = "<status>";
+constexpr std::string_view kPrimaryMark = "<primary account>";
 
 /// Keys that a stage may change in accounts of some types or some classes; of all for an empty
 /// list.
@@ -44,11 +45,12 @@ const std::array kIdentifiers = {kAccountIdentifier, kLegacyMailIdentifier, kAcc
 const std::array kOutgoingIdentifiers = {kAccountIdentifier, kLegacyMailIdentifier};
 const std::array kEnabled = {kAccountEnabledDataclasses};
 const std::array kTypeKey = {kAccountType};
-const std::array kCloudKeys = {std::string_view(kStatusKey), kAccountDisplayName,
+const std::array kCloudKeys = {std::string_view(kStatusMark), kAccountDisplayName,
                                kAccountTypeString, kAccountShortTypeString,
-                               std::string_view(kPrimaryAccountKey)};
-constexpr std::array kPrimaryKey = {kPrimaryAccountKey};
-const std::array kProvisioningKeys = {std::string_view(kStatusKey), kAccountProvisionedDataclasses};
+                               std::string_view(kPrimaryMark)};
+constexpr std::array kPrimaryKey = {kPrimaryMark};
+const std::array kProvisioningKeys = {std::string_view(kStatusMark),
+                                      kAccountProvisionedDataclasses};
 const std::array kDataclassKeys = {kAccountProvisionedDataclasses, kAccountEnabledDataclasses};
 
 const std::array<Row, 14> kRows = {{
@@ -110,14 +112,14 @@ DeviceFacts factsOf(const Platform& platform) {
   return {.cloudStatusKey = platform.cloudAccountService.statusKey(),
           .cloudPrimaryAccountKey = platform.cloudAccountService.primaryAccountKey(),
           .hasOldestProcessor = platform.deviceInfoService.copyAnswer(kArchitectureQuestion) ==
-                                PropertyValue(kOldestArchitecture)};
+                                PropertyValue(kArchitectureWithoutMultitasking)};
 }
 
 std::string_view ChangedKeys::named(std::string_view key) const {
-  if (key == kStatusKey) {
+  if (key == kStatusMark) {
     return facts_.cloudStatusKey;
   }
-  return key == kPrimaryAccountKey ? facts_.cloudPrimaryAccountKey : key;
+  return key == kPrimaryMark ? facts_.cloudPrimaryAccountKey : key;
 }
 
 bool ChangedKeys::mayDiffer(std::string_view key, AccountOrigin::Kind origin,

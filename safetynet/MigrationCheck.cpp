@@ -4,13 +4,14 @@
 #include <cstddef>
 #include <set>
 
+#include "vocabulary/AccountClasses.h"
 #include "vocabulary/AccountVocabulary.h"
 
 namespace accounts {
 namespace {
 
 /// The identifier of the device's own account, which a migration makes anew where it is missing.
-constexpr std::string_view kDeviceLocalIdentifier = "DeviceLocalAccount";
+constexpr std::string_view kDeviceLocalIdentifier = kDeviceLocalAccountClass;
 
 using Identifiers = std::set<std::string, std::less<>>;
 

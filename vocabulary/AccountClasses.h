@@ -15,6 +15,7 @@ inline constexpr std::string_view kSMTPAccountClass = "SMTPAccount";
 inline constexpr std::string_view kDeliveryAccountClass = "DeliveryAccount";
 inline constexpr std::string_view kDataAccessMailAccountClass = "DAMailAccount";
 inline constexpr std::string_view kTolvaneIMAPAccountClass = "TolvaneIMAPAccount";
+inline constexpr std::string_view kLocalMailAccountClass = "LocalAccount";
 /// The hosted mail service under its current and its earliest name.
 inline constexpr std::string_view kVelmoraAccountClass = "VelmoraAccount";
 inline constexpr std::string_view kMarrowAccountClass = "MarrowAccount";
@@ -22,13 +23,12 @@ inline constexpr std::string_view kMarrowAccountClass = "MarrowAccount";
 inline constexpr std::string_view kCloudAccountClass = "ZQAccount";
 /// A stand-alone calendar account.
 inline constexpr std::string_view kCalDAVAccountClass = "MobileCalDAVAccount";
+/// The device's own account; its identifier, too.
+inline constexpr std::string_view kDeviceLocalAccountClass = "DeviceLocalAccount";
 
 /// Boolean of a mail account. What its absence means differs from step to step.
 inline constexpr std::string_view kIsActiveKey = "IsActive";
 
-/// What a device answers about its processor, and the answer of the oldest ones.
-inline constexpr std::string_view kArchitectureQuestion = "CPUArchitecture";
-inline constexpr std::string_view kOldestArchitecture = "armv6";
 /// The hosted mail service's records of subscribed calendars.
 inline constexpr std::string_view kExoSubscribedCalendarsKey = "DAExoSubscribedCalendarInfos";
 

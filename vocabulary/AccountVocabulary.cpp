@@ -1,5 +1,7 @@
 #include "vocabulary/AccountVocabulary.h"
 
+#include "vocabulary/DevicePlaces.h"
+
 // Nothing but definitions: vocabulary/AccountVocabulary.h says what each is for.
 
 constinit const std::string_view kSubscribedCalendarAccountType = "Subscribed Calendar";
@@ -81,4 +83,9 @@ constinit const std::string_view kASChangeAccountOriginallyEnabledDataclassesKey
 constinit const std::string_view kPlistVersionKey = "Version";
 constinit const std::string_view kPlistAccountsKey = "Accounts";
 constinit const std::string_view kAccountsFilename = "com.quarx.accountsettings.plist";
-const char kAccountMigrationLockFilename[] = "/tmp/AccountMigrationInProgress";
+constexpr char kAccountMigrationLockFilename[] = "/tmp/AccountMigrationInProgress";
+
+static_assert(accounts::listed(accounts::DevicePlace::Settings)
+                  .path.ends_with("/com.quarx.accountsettings.plist"));
+static_assert(
+    std::string_view(kAccountMigrationLockFilename).ends_with(accounts::kMigrationLockName));

@@ -7,6 +7,8 @@
 #include <string>
 #include <string_view>
 
+#include "vocabulary/DevicePath.h"
+
 namespace accounts {
 
 /// The places on a device that a migration may read or change: all of them, and nothing else is
@@ -87,14 +89,7 @@ constexpr const ListedPlace& listed(DevicePlace place) {
 /// The device path of a place on a device whose mobile user has this home directory.
 inline std::string pathOfPlace(DevicePlace place, std::string_view home) {
   const ListedPlace& found = listed(place);
-  std::string path;
-  if (found.base == ListedPlace::Base::Home) {
-    while (home.ends_with('/')) {
-      home.remove_suffix(1);
-    }
-    path = home;
-  }
-  return path.append(found.path);
+  return joinedPath(found.base == ListedPlace::Base::Home ? home : "/", found.path);
 }
 
 /// The place that has a name; none when none has it.
@@ -106,6 +101,11 @@ inline std::optional<DevicePlace> placeNamed(std::string_view name) {
   }
   return std::nullopt;
 }
+
+/// The preferences, as other programs call them, at `LoggingPreferences`.
+inline constexpr std::string_view kLoggingPreferences = "com.quarx.accountsettings-logging";
+static_assert(listed(DevicePlace::LoggingPreferences)
+                  .path.ends_with("/com.quarx.accountsettings-logging.plist"));
 
 /// The names of the migration-information files begin and end like this.
 inline constexpr std::string_view kInformationFilePrefix = "AccountMigrationInformation-";
@@ -122,7 +122,7 @@ inline constexpr std::string_view kAccountMigrationDirectory =
 /// The lock that a migration holds.
 inline constexpr std::string_view kMigrationLockName = "AccountMigrationInProgress";
 
-/// The version of the settings file's layout after a migration.
+/// The version of the settings file's layout after a migration: the number of upgrade steps.
 inline constexpr std::int64_t kMigratedVersion = 12;
 
 }  // namespace accounts

@@ -14,6 +14,7 @@ inline constexpr std::string_view kLegacyOutgoingAccounts = "DeliveryAccounts";
 // Of a description.
 inline constexpr std::string_view kLegacyMailClass = "AccountType";
 inline constexpr std::string_view kLegacyMailDisplayName = "AccountName";
+/// The oldest settings files have it as well.
 inline constexpr std::string_view kLegacyMailIdentifier = "uniqueId";
 
 // The Exchange account file.

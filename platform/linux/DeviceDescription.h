@@ -10,6 +10,7 @@
 #include "platform/linux/DeviceRoot.h"
 #include "platform/linux/PathError.h"
 #include "propertylist/value/PropertyValue.h"
+#include "vocabulary/DeviceServices.h"
 
 namespace accounts {
 
@@ -28,7 +29,7 @@ struct DeviceDescription {
   /// By SyncDataType.
   std::array<ExternalSyncSourcesAnswer, kSyncDataTypeCount> externalSyncSources;
   std::string cloudStatusKey = "status";
-  std::string cloudPrimaryAccountKey = "primaryAccount";
+  std::string cloudPrimaryAccountKey = std::string(kPrimaryAccountKey);
   std::string cloudAccountTypeDisplayName = "Stratix";
 };
 

@@ -10,8 +10,8 @@
 #include <cstdint>
 #include <utility>
 
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/FileContents.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {

@@ -1,6 +1,7 @@
 #include "platform/linux/LinuxBundleResources.h"
 
 #include "platform/linux/DictionaryFile.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {

@@ -8,10 +8,10 @@
 #include <cerrno>
 #include <utility>
 
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/FileContents.h"
 #include "platform/linux/OpenedBytes.h"
 #include "platform/linux/PlaceFailures.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {

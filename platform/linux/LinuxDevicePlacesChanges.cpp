@@ -6,7 +6,6 @@
 #include <cstdio>
 #include <utility>
 
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/FileContents.h"
 #include "platform/linux/LinkedOrCopied.h"
 #include "platform/linux/LinuxDevicePlaces.h"
@@ -14,6 +13,7 @@
 #include "platform/linux/RenameToNothing.h"
 #include "platform/linux/StagedName.h"
 #include "platform/linux/TemporaryFile.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {

@@ -6,11 +6,11 @@
 #include <cstdio>
 #include <set>
 
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/LinuxDevicePlaces.h"
 #include "platform/linux/PlaceFailures.h"
 #include "platform/linux/RenameToNothing.h"
 #include "platform/linux/StagedName.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {

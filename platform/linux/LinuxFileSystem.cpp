@@ -8,9 +8,9 @@
 #include <cstdio>
 #include <utility>
 
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/FileContents.h"
 #include "platform/linux/PathResult.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {

@@ -6,10 +6,10 @@
 #include <string>
 #include <utility>
 
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/LinuxFileSystem.h"
 #include "platform/linux/StagedName.h"
 #include "platform/linux/TemporaryFile.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {

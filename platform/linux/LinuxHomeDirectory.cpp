@@ -1,6 +1,6 @@
 #include "platform/linux/LinuxHomeDirectory.h"
 
-#include "platform/linux/DevicePath.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 

@@ -7,8 +7,8 @@
 #include <cerrno>
 #include <csignal>
 
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/LinuxSharedResources.h"
+#include "vocabulary/DevicePath.h"
 #include "vocabulary/DevicePlaces.h"
 
 namespace accounts {

@@ -2,8 +2,8 @@
 
 #include <utility>
 
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/DictionaryFile.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 

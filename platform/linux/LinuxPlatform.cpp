@@ -14,7 +14,6 @@
 #include "platform/linux/DescribedPairingValueStore.h"
 #include "platform/linux/DescribedProfileRestrictions.h"
 #include "platform/linux/DeviceDescription.h"
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/LinuxBundleResources.h"
 #include "platform/linux/LinuxConsoleLog.h"
 #include "platform/linux/LinuxDateFormatter.h"
@@ -27,6 +26,7 @@
 #include "platform/linux/LinuxSharedResources.h"
 #include "platform/linux/LinuxUUIDGenerator.h"
 #include "platform/linux/UserLanguages.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {

@@ -2,7 +2,7 @@
 
 #include <string>
 
-#include "platform/linux/DevicePath.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 

@@ -24,7 +24,6 @@ class LinuxPropertyLists final : public PropertyLists {
 
  private:
   const DeviceRoot& root_;
-  BinaryPropertyListSerializer serializer_;
 };
 
 }  // namespace accounts

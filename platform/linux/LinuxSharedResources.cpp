@@ -10,8 +10,8 @@
 #include <thread>
 #include <utility>
 
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/FileDescriptor.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {

@@ -10,7 +10,7 @@
 #include <cstdint>
 #include <utility>
 
-#include "platform/linux/DevicePath.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {

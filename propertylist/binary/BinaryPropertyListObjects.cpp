@@ -59,56 +59,43 @@ std::string_view asBytes(std::span<const Objects::Reference> references) {
 }  // namespace
 
 void Objects::visit(const PropertyValue& value) {
+  const std::size_t firstPending = pending_.size();
   if (const PropertyDictionary* dictionary = value.asDictionary()) {
-    visitContainer(&dictionary->keys(), dictionary->values());
+    for (const PropertyEntry& entry : *dictionary) {
+      leave(scalarOf(Kind::ASCIIText, entry.key.bytes()));
+    }
+    for (const PropertyEntry& entry : *dictionary) {
+      visit(entry.value);
+    }
+    leaveContainer(/*isDictionary=*/true, firstPending);
   } else if (const PropertyArray* array = value.asArray()) {
-    visitContainer(nullptr, {array->begin(), array->end()});
+    for (const PropertyValue& element : *array) {
+      visit(element);
+    }
+    leaveContainer(/*isDictionary=*/false, firstPending);
   } else {
     leave(scalarOf(value));
   }
 }
 
-/// `keys` are those of a dictionary, null for an array.
-void Objects::visitContainer(const PropertyKeys* keys, std::span<const PropertyValue> children) {
-  const std::size_t firstPending = pending_.size();
-  if (keys != nullptr) {
-    visitKeys(*keys);
-  }
-  for (const PropertyValue& child : children) {
-    visit(child);
-  }
-  const bool isDictionary = keys != nullptr;
-  const std::string_view content = asBytes(std::span(pending_).subspan(firstPending));
+/// Puts a container's number in the place of the pending references from one on, which are its own.
+void Objects::leaveContainer(bool isDictionary, std::size_t firstPending) {
+  const std::span<const Reference> own = std::span(pending_).subspan(firstPending);
   const auto newNumber = static_cast<Reference>(containers_.size());
   const Reference found =
-      containerTable_.findOrAdd(hash_(content), newNumber, [&](Reference candidate) {
+      containerTable_.findOrAdd(hash_(asBytes(own)), newNumber, [&](Reference candidate) {
         const Container& container = containers_[candidate];
         return container.isDictionary == isDictionary &&
-               asBytes(referencesOf(container)) == content;
+               asBytes(referencesOf(container)) == asBytes(own);
       });
   if (found == newNumber) {
-    const Run run = keepPending(firstPending);
     containers_.push_back({.isDictionary = isDictionary,
-                           .firstReference = static_cast<std::uint32_t>(run.first),
-                           .referenceCount = static_cast<std::uint32_t>(run.count)});
+                           .firstReference = static_cast<std::uint32_t>(references_.size()),
+                           .referenceCount = static_cast<std::uint32_t>(own.size())});
+    references_.insert(references_.end(), own.begin(), own.end());
   }
   pending_.resize(firstPending);
   pending_.push_back(found | kContainerBit);
-}
-
-void Objects::visitKeys(const PropertyKeys& keys) {
-  const auto [known, isNew] = knownKeys_.try_emplace(keys.sharedNode());
-  if (!isNew) {
-    const auto references =
-        std::span(references_).subspan(known->second.first, known->second.count);
-    pending_.insert(pending_.end(), references.begin(), references.end());
-    return;
-  }
-  const std::size_t firstPending = pending_.size();
-  for (const Text& key : keys) {
-    leave(scalarOf(Kind::ASCIIText, key.bytes()));
-  }
-  known->second = keepPending(firstPending);
 }
 
 /// Makes a scalar's number the newest pending reference.
@@ -121,14 +108,6 @@ void Objects::leave(const Scalar& scalar) {
     scalars_.push_back(scalar);
   }
   pending_.push_back(found);
-}
-
-/// Keeps a copy of the newest pending references.
-Objects::Run Objects::keepPending(std::size_t first) {
-  const Run run = {.first = references_.size(), .count = pending_.size() - first};
-  references_.insert(references_.end(), pending_.begin() + static_cast<std::ptrdiff_t>(first),
-                     pending_.end());
-  return run;
 }
 
 }  // namespace accounts::binaryplist

@@ -4,7 +4,6 @@
 #include <cstdint>
 #include <span>
 #include <string_view>
-#include <unordered_map>
 #include <vector>
 
 #include "propertylist/binary/BinaryPropertyListFormat.h"
@@ -56,16 +55,9 @@ class Objects {
   }
 
  private:
-  struct Run {
-    std::size_t first;
-    std::size_t count;
-  };
-
   void visit(const PropertyValue& value);
-  void visitContainer(const PropertyKeys* keys, std::span<const PropertyValue> children);
-  void visitKeys(const PropertyKeys& keys);
   void leave(const Scalar& scalar);
-  Run keepPending(std::size_t first);
+  void leaveContainer(bool isDictionary, std::size_t firstPending);
 
   KeyedHash hash_;
   std::vector<Scalar> scalars_;
@@ -75,9 +67,6 @@ class Objects {
   std::vector<Reference> references_;
   /// References of the containers that are being walked, the innermost one's last.
   std::vector<Reference> pending_;
-  /// By the node of keys, where their references are. Most dictionaries share keys with others, and
-  /// looking each key up anew takes a third longer.
-  std::unordered_map<const SharedNodeBase*, Run> knownKeys_;
 };
 
 }  // namespace accounts::binaryplist

@@ -205,15 +205,15 @@ ScalarReader::Value ScalarReader::readBytes(std::size_t offset, const ObjectHead
   const std::string_view bytes = objects_.substr(head.content, head.length * unitSize);
   end = head.content + bytes.size();
   if (head.kind == Kind::Data) {
-    return PropertyData(arena_.make(bytes));
+    return PropertyData(bytes);
   }
   if (head.kind == Kind::UTF16Text) {
-    return Text(arena_.make(textOfUTF16(bytes)));
+    return Text(textOfUTF16(bytes));
   }
   if (!isASCII(bytes)) {
     return fail("an ASCII text with bytes that are not ASCII", offset);
   }
-  return Text(arena_.make(bytes));
+  return Text(bytes);
 }
 
 }  // namespace accounts::binaryplist

@@ -29,7 +29,7 @@ struct ObjectHead {
 bool readHead(std::string_view objects, std::size_t offset, ObjectHead& head,
               PropertyListError& error);
 
-/// Reads scalars. Their texts and data share the memory of one arena.
+/// Reads scalars.
 class ScalarReader {
  public:
   /// `objects` as for `readHead`.
@@ -55,7 +55,6 @@ class ScalarReader {
 
   std::string_view objects_;
   PropertyListError& error_;
-  SharedBytesArena arena_;
 };
 
 }  // namespace accounts::binaryplist

@@ -42,8 +42,6 @@ class PropertyKeys {
   [[nodiscard]] bool isSameAs(const PropertyKeys& other) const {
     return node_.get() == other.node_.get();
   }
-  /// The node, null for no keys: as long as a handle to it lives, its address names the keys.
-  [[nodiscard]] const SharedNodeBase* sharedNode() const { return node_.get(); }
 
   friend bool operator==(const PropertyKeys& left, const PropertyKeys& right);
 

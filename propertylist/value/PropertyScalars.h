@@ -1,7 +1,6 @@
 #pragma once
 
 #include <string_view>
-#include <utility>
 
 #include "propertylist/value/Text.h"
 
@@ -17,7 +16,6 @@ struct PropertyDate {
 struct PropertyData {
   PropertyData() = default;
   explicit PropertyData(std::string_view content) : bytes(content) {}
-  explicit PropertyData(SharedBytes content) : bytes(std::move(content)) {}
   SharedBytes bytes;
 };
 

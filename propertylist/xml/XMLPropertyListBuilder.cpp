@@ -5,7 +5,6 @@
 #include <utility>
 
 #include "propertylist/PropertyListLimits.h"
-#include "propertylist/value/OrderedValues.h"
 
 namespace accounts::xmlplist {
 
@@ -59,33 +58,6 @@ std::optional<PropertyValue> valueOf(Element element, std::string_view character
 }
 
 }  // namespace
-
-std::uint32_t KeyTable::numberOf(std::string_view key) {
-  const auto newNumber = static_cast<std::uint32_t>(keys_.size());
-  const std::uint32_t number = numbers_.findOrAdd(
-      hash_(key), newNumber, [&](std::uint32_t candidate) { return keys_[candidate] == key; });
-  if (number == newNumber) {
-    keys_.emplace_back(key);
-  }
-  return number;
-}
-
-const KeyList& KeyTable::listOf(std::span<const std::uint32_t> numbers) {
-  const std::string_view bytes(reinterpret_cast<const char*>(numbers.data()), numbers.size_bytes());
-  const auto newNumber = static_cast<std::uint32_t>(lists_.size());
-  const std::uint32_t number =
-      listNumbers_.findOrAdd(hash_(bytes), newNumber, [&](std::uint32_t candidate) {
-        return std::ranges::equal(lists_[candidate].numbers, numbers);
-      });
-  if (number == newNumber) {
-    std::vector<Text> keys;
-    for (const std::uint32_t key : numbers) {
-      keys.push_back(keys_[key]);
-    }
-    lists_.push_back({{numbers.begin(), numbers.end()}, KeyList(keys)});
-  }
-  return lists_[number].list;
-}
 
 bool ValueBuilder::fail(std::string_view what) {
   problem_ = what;
@@ -172,7 +144,7 @@ bool ValueBuilder::endScalar(Element element) {
   }
   const bool holdsBytes = element == Element::String || element == Element::Data;
   std::optional<PropertyValue> value =
-      element == Element::String ? Text(arena_.make(characters_)) : valueOf(element, characters_);
+      element == Element::String ? Text(characters_) : valueOf(element, characters_);
   if (!value) {
     return fail("a content that does not fit its element", element);
   }
@@ -193,28 +165,21 @@ bool ValueBuilder::endContainer() {
 }
 
 PropertyDictionary ValueBuilder::takeDictionary(const Container& container) {
-  const KeyList& list = keyTable_.listOf(std::span(keys_).subspan(container.firstKey));
-  const std::span<PropertyValue> values = std::span(values_).subspan(container.firstValue);
-  PropertyDictionary dictionary;
-  if (list.isOrdered()) {
-    OrderedValues ordered(list.keys());
-    for (PropertyValue& value : values) {
-      ordered.append(std::move(value));
-    }
-    dictionary = ordered.take();
-  } else {
-    dictionary = list.dictionaryOf(values);
+  std::vector<KeyedValue> entries;
+  entries.reserve(values_.size() - container.firstValue);
+  for (std::size_t index = 0; container.firstValue + index < values_.size(); ++index) {
+    entries.push_back({std::move(keys_[container.firstKey + index]),
+                       std::move(values_[container.firstValue + index])});
   }
   keys_.resize(container.firstKey);
   dropValuesFrom(container.firstValue);
-  return dictionary;
+  return PropertyDictionary(std::move(entries));
 }
 
 PropertyArray ValueBuilder::takeArray(const Container& container) {
-  PropertyArray array = PropertyArray::withRoomFor(values_.size() - container.firstValue);
-  for (std::size_t value = container.firstValue; value < values_.size(); ++value) {
-    array.append(std::move(values_[value]));
-  }
+  const auto first = values_.begin() + static_cast<std::ptrdiff_t>(container.firstValue);
+  PropertyArray array(std::vector<PropertyValue>(std::make_move_iterator(first),
+                                                 std::make_move_iterator(values_.end())));
   dropValuesFrom(container.firstValue);
   return array;
 }
@@ -224,7 +189,7 @@ void ValueBuilder::dropValuesFrom(std::size_t first) {
 }
 
 bool ValueBuilder::addKey() {
-  keys_.push_back(keyTable_.numberOf(characters_));
+  keys_.push_back(knownKeys_.try_emplace(characters_, characters_).first->second);
   return count(expandedCountOfBytes(characters_.size()));
 }
 

@@ -1,16 +1,13 @@
 #pragma once
 
 #include <cstdint>
-#include <deque>
+#include <map>
 #include <optional>
-#include <span>
 #include <string>
 #include <string_view>
 #include <vector>
 
 #include "propertylist/PropertyListLimits.h"
-#include "propertylist/value/ContentTable.h"
-#include "propertylist/value/KeyList.h"
 #include "propertylist/value/PropertyValue.h"
 #include "propertylist/xml/XMLPropertyListScalars.h"
 
@@ -29,26 +26,6 @@ enum class Element : std::uint8_t {
   False,
   Date,
   Data
-};
-
-/// The keys of a document, numbered, and the lists of them that its dictionaries have: records
-/// repeat the same few.
-class KeyTable {
- public:
-  std::uint32_t numberOf(std::string_view key);
-  /// The list of keys with these numbers; valid as long as the table.
-  const KeyList& listOf(std::span<const std::uint32_t> numbers);
-
- private:
-  struct NumberedList {
-    std::vector<std::uint32_t> numbers;
-    KeyList list;
-  };
-  KeyedHash hash_;
-  ContentTable numbers_;
-  std::vector<Text> keys_;
-  ContentTable listNumbers_;
-  std::deque<NumberedList> lists_;
 };
 
 /// Builds a value from the events of an XML document in their order. The document must be
@@ -100,13 +77,12 @@ class ValueBuilder {
 
   std::vector<Container> containers_;
   std::vector<PropertyValue> values_;
-  /// Their numbers.
-  std::vector<std::uint32_t> keys_;
-  KeyTable keyTable_;
+  std::vector<Text> keys_;
+  /// Those met so far: records repeat the same few.
+  std::map<std::string, Text> knownKeys_;
   /// The element that is open and holds characters, with what it holds so far.
   std::optional<Element> scalar_;
   std::string characters_;
-  SharedBytesArena arena_;
   bool isInPropertyList_ = false;
   std::uint64_t maximumExpandedCount_;
   std::uint64_t expandedCount_ = 0;

@@ -1,4 +1,4 @@
-#include "accountsettings/LastSave.h"
+#include "accountsettings/NewestSave.h"
 
 #include "tests/accountsettings/StoreFixture.h"
 
@@ -31,7 +31,7 @@ class LastSaveTest : public StoreFixture {
   }
 
   OrderedAccounts memory;
-  LastSave lastSave;
+  NewestSave lastSave;
 };
 
 TEST_F(LastSaveTest, WhatWasWrittenIsThereWhateverMemoryHasNow) {

@@ -8,7 +8,7 @@
 namespace accounts {
 namespace {
 
-const LastSave kNeverSaved;
+const NewestSave kNeverSaved;
 
 class OnDiskAccountsTest : public StoreFixture {
  protected:
@@ -90,7 +90,7 @@ TEST_F(OnDiskAccountsTest, WhateverWasSavedTheAnswersAreThoseOfAStoreMadeFromThe
   };
   int unloadedCount = 0;
   for (int round = 0; round < 5000; ++round) {
-    LastSave lastSave;
+    NewestSave lastSave;
     OrderedAccounts memory;
     std::vector<PropertyValue> elements;
     FixResult fixing = FixResult::Unchanged;

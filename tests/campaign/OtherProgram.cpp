@@ -3,7 +3,7 @@
 #include <optional>
 #include <utility>
 
-#include "platform/linux/DevicePath.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 

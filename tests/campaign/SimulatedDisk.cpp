@@ -4,7 +4,7 @@
 #include <functional>
 #include <utility>
 
-#include "platform/linux/DevicePath.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 

@@ -215,7 +215,6 @@ class FakePropertyLists : public PropertyLists {
 
  private:
   FakeFileSystem& fileSystem_;
-  BinaryPropertyListSerializer serializer_;
 };
 
 class FakeSharedResources : public SharedResources {

@@ -1,8 +1,8 @@
 #include <gtest/gtest.h>
 
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/LinuxHomeDirectory.h"
 #include "platform/linux/LinuxMailDirectory.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {

@@ -4,9 +4,9 @@
 #include <thread>
 
 #include "accountsettings/AccountsManager.h"
-#include "accountsettings/Paths.h"
 #include "accountsettings/Process.h"
 #include "platform/linux/LinuxPlatform.h"
+#include "vocabulary/DevicePath.h"
 
 // Waits for migrations to finish, again and again, and writes what the device holds then: the
 // version of the settings, the number of their accounts, and how many legacy stores there are.

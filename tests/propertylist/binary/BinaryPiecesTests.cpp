@@ -34,7 +34,7 @@ PropertyValue largeValue() {
 
 SerializedPropertyList serialized(const PropertyValue& value) {
   PropertyListError error;
-  return BinaryPropertyListSerializer().serialize(value, error);
+  return serializeBinaryPropertyList(value, error);
 }
 
 TEST(BinaryPieces, ASmallFileIsOnePiece) {

@@ -75,7 +75,7 @@ TEST(XMLStructure, OfTheSameKeyTwiceTheLastOneHolds) {
             PropertyValue(PropertyDictionary{{"k", 2}}));
 }
 
-TEST(XMLStructure, DictionariesThatListTheSameKeysShareThemInMemory) {
+TEST(XMLStructure, DictionariesWithTheSameKeyShareItsTextInMemory) {
   for (const char* keys : {"<dict><key>a</key><true/><key>b</key><true/></dict>",
                            "<dict><key>b</key><true/><key>a</key><true/></dict>"}) {
     const PropertyValue value =
@@ -84,8 +84,8 @@ TEST(XMLStructure, DictionariesThatListTheSameKeysShareThemInMemory) {
     const PropertyArray& dictionaries = *value.asArray();
     ASSERT_EQ(dictionaries.size(), 3U);
     EXPECT_EQ(dictionaries.at(0), PropertyValue(PropertyDictionary{{"a", true}, {"b", true}}));
-    EXPECT_TRUE(dictionaries.at(0).asDictionary()->keys().isSameAs(
-        dictionaries.at(1).asDictionary()->keys()));
+    EXPECT_TRUE(dictionaries.at(0).asDictionary()->keys().begin()->bytes().isSameAs(
+        dictionaries.at(1).asDictionary()->keys().begin()->bytes()));
     EXPECT_EQ(dictionaries.at(2), PropertyValue(PropertyDictionary()));
   }
 }

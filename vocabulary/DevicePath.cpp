@@ -1,4 +1,4 @@
-#include "platform/linux/DevicePath.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 
@@ -13,6 +13,9 @@ std::string joinedPath(std::string_view path, std::string_view component) {
   std::string joined(withoutTrailingSeparators(path));
   if (!joined.ends_with('/')) {
     joined += '/';
+  }
+  while (component.starts_with('/')) {
+    component.remove_prefix(1);
   }
   return joined.append(component);
 }

@@ -8,7 +8,8 @@ namespace accounts {
 /// A path without the separators at its end; the path of the root itself keeps its one.
 std::string_view withoutTrailingSeparators(std::string_view path);
 
-/// A path with a component appended, joined by exactly one separator.
+/// A path with a component appended, joined by exactly one separator. An empty path gives an
+/// absolute one.
 std::string joinedPath(std::string_view path, std::string_view component);
 
 /// A path taken apart at its last separator, separators at its end disregarded.

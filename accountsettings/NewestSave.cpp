@@ -1,4 +1,4 @@
-#include "accountsettings/LastSave.h"
+#include "accountsettings/NewestSave.h"
 
 #include <algorithm>
 #include <utility>
@@ -37,8 +37,8 @@ bool needsFixing(const PropertyDictionary& properties) {
 
 }  // namespace
 
-void LastSave::note(const PropertyArray& written, const OrderedAccounts& inMemory,
-                    FixResult fixing) {
+void NewestSave::note(const PropertyArray& written, const OrderedAccounts& inMemory,
+                      FixResult fixing) {
   const PropertyArray before = std::exchange(written_, PropertyArray());
   identifiers_.clear();
   if (fixing == FixResult::CannotBeKept) {
@@ -67,7 +67,7 @@ void LastSave::note(const PropertyArray& written, const OrderedAccounts& inMemor
   written_ = written;
 }
 
-bool LastSave::isThere(const PropertyArray& onDisk, const OrderedAccounts& inMemory) const {
+bool NewestSave::isThere(const PropertyArray& onDisk, const OrderedAccounts& inMemory) const {
   return onDisk.isSameAs(written_) &&
          std::ranges::equal(identifiers_, inMemory.accounts(),
                             [](const Text& identifier, const BasicAccountReference& account) {

@@ -10,7 +10,7 @@ namespace accounts {
 
 /// What a store wrote last, as long as another store that is made of it would hold the same
 /// dictionaries and write no line. Then nobody needs to make one to know what is on disk.
-class LastSave {
+class NewestSave {
  public:
   /// Takes the array that was just written, the accounts that it was merged from, in the same
   /// order, and the gravest of what the runtime fixers did with these before.
