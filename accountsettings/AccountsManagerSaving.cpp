@@ -7,6 +7,7 @@
 #include "accountsettings/OnDiskAccounts.h"
 #include "accountsettings/Process.h"
 #include "accountsettings/ThreeWayMerge.h"
+#include "vocabulary/DevicePlaces.h"
 
 namespace accounts {
 
@@ -15,7 +16,6 @@ namespace {
 constexpr std::string_view saveOperation = "-[AccountsManager saveAllAccounts]";
 
 /// The user and the group that the account settings file belongs to.
-constexpr std::string_view fileOwner = "mobile";
 
 /// The array of account dictionaries in the account settings file; empty when there is none.
 PropertyArray accountsOnDisk() {
@@ -45,7 +45,8 @@ bool writeThroughTemporaryFile(const SerializedPropertyList& contents,
   if (!contents || !fileSystem.writeFile(temporaryPath, contents)) {
     return false;
   }
-  const Result attributes = fileSystem.setOwnerAndGroup(temporaryPath, fileOwner, fileOwner);
+  const Result attributes =
+      fileSystem.setOwnerAndGroup(temporaryPath, kSettingsFileOwner, kSettingsFileOwner);
   if (!attributes) {
     logToChannel(saveOperation,
                  "Could not set attributes on the temporary account settings plist. %@",

@@ -17,6 +17,7 @@ std::variant<OpenedDevice, ProgramError> openDevice(const DeviceOptions& options
   wanted.bundleResourcesDirectory = found.resourcesDirectory().string();
   wanted.deviceDescriptionFile = options.deviceDescription;
   wanted.channel = options.channel;
+  wanted.descriptionDecoding = DescriptionDecoding::Later;
   LinuxPlatformError error;
   std::unique_ptr<LinuxPlatform> platform = LinuxPlatform::create(wanted, error);
   if (platform == nullptr) {

@@ -37,7 +37,8 @@ struct OpenedDevice {
   std::unique_ptr<LinuxPlatform> platform;
 };
 
-/// Finds the bundle and makes the platform. That changes nothing beneath the root.
+/// Finds the bundle and makes the platform. That changes nothing beneath the root, and looks into
+/// no file: whoever is to use the platform decodes the device description.
 std::variant<OpenedDevice, ProgramError> openDevice(const DeviceOptions& options);
 
 }  // namespace accounts

@@ -9,6 +9,9 @@
 
 namespace accounts {
 
+KernelOwnershipRule::KernelOwnershipRule(const DeviceRoot& root)
+    : names_(root), self_{::geteuid(), ::getegid()} {}
+
 std::variant<FileOwner, PlaceFailure> KernelOwnershipRule::ownerNamed(std::string_view ownerName,
                                                                       std::string_view groupName) {
   PathError error;
@@ -17,12 +20,12 @@ std::variant<FileOwner, PlaceFailure> KernelOwnershipRule::ownerNamed(std::strin
   if (!group) {
     return placeFailure(error);
   }
-  const bool isAllowed = ::geteuid() == 0 || (*user == ::geteuid() && *group == ::getegid());
-  if (!isAllowed) {
+  const FileOwner owner = {*user, *group};
+  if (self_.user != 0 && owner != self_) {
     return PlaceFailure{
         EPERM, "A file cannot be given to " + std::string(ownerName) + ": Operation not permitted"};
   }
-  return FileOwner{*user, *group};
+  return owner;
 }
 
 }  // namespace accounts

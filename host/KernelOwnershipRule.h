@@ -1,5 +1,6 @@
 #pragma once
 
+#include <string>
 #include <string_view>
 #include <variant>
 
@@ -13,14 +14,18 @@ namespace accounts {
 /// names are those of the device.
 class KernelOwnershipRule final : public OwnershipRule {
  public:
-  /// `root` must outlive this.
-  explicit KernelOwnershipRule(const DeviceRoot& root) : names_(root) {}
+  /// The process is judged as it is now. `root` must outlive this.
+  explicit KernelOwnershipRule(const DeviceRoot& root);
+
+  /// Opens now what tells who `name` is; no other name is known afterwards.
+  void readAhead(const std::string& name) { names_.readAhead(name); }
 
   std::variant<FileOwner, PlaceFailure> ownerNamed(std::string_view ownerName,
                                                    std::string_view groupName) override;
 
  private:
   OwnerNames names_;
+  const FileOwner self_;
 };
 
 }  // namespace accounts

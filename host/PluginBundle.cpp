@@ -10,7 +10,6 @@ namespace {
 
 constexpr const char* kPluginName = "AccountsDataMigrator.so";
 constexpr const char* kEntryPointName = "CreateMigrationPlugin";
-using EntryPoint = MigrationPluginBase*(Platform&);
 
 ProgramError missing(const std::string& message) {
   return ProgramError{ExitStatus::MissingInput, message};
@@ -36,20 +35,25 @@ std::variant<PluginBundle, ProgramError> PluginBundle::find(
   return bundle;
 }
 
-std::variant<std::unique_ptr<MigrationPluginBase>, ProgramError> PluginBundle::makePlugin(
-    Platform& platform) const {
+std::variant<LoadedPlugin, ProgramError> PluginBundle::load() const {
   // Never closed: objects of the plug-in may live as long as the process.
   void* const library = dlopen(plugin().c_str(), RTLD_NOW | RTLD_LOCAL);
   if (library == nullptr) {
     return missing("The plug-in cannot be loaded: " + std::string(dlerror()));
   }
   // dlsym() gives functions as object pointers; POSIX promises that this conversion works.
-  auto* const entryPoint = reinterpret_cast<EntryPoint*>(dlsym(library, kEntryPointName));
+  auto* const entryPoint =
+      reinterpret_cast<LoadedPlugin::EntryPoint*>(dlsym(library, kEntryPointName));
   if (entryPoint == nullptr) {
     return missing("The plug-in has no entry point " + std::string(kEntryPointName) + ": " +
                    plugin().string());
   }
-  std::unique_ptr<MigrationPluginBase> instance(entryPoint(platform));
+  return LoadedPlugin(*entryPoint);
+}
+
+std::variant<std::unique_ptr<MigrationPluginBase>, ProgramError> LoadedPlugin::makeInstance(
+    Platform& platform) const {
+  std::unique_ptr<MigrationPluginBase> instance(entryPoint_(platform));
   if (instance == nullptr) {
     return ProgramError{ExitStatus::PluginEnded, "The plug-in made no instance of its class"};
   }

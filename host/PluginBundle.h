@@ -12,6 +12,21 @@
 
 namespace accounts {
 
+/// A plug-in in this process.
+class LoadedPlugin {
+ public:
+  using EntryPoint = MigrationPluginBase*(Platform&);
+  explicit LoadedPlugin(EntryPoint& entryPoint) : entryPoint_(entryPoint) {}
+
+  /// Makes one instance of its principal class. The platform must stay alive as long as the
+  /// process. An error when it makes none.
+  [[nodiscard]] std::variant<std::unique_ptr<MigrationPluginBase>, ProgramError> makeInstance(
+      Platform& platform) const;
+
+ private:
+  EntryPoint& entryPoint_;
+};
+
 /// A plug-in bundle: a directory with the plug-in and its resources.
 class PluginBundle {
  public:
@@ -25,11 +40,9 @@ class PluginBundle {
     return resourcesOfBundle(path_);
   }
 
-  /// Loads the plug-in into this process, for good, and makes one instance of its principal class.
-  /// The platform must stay alive as long as the process. An error when the plug-in cannot be
-  /// loaded, has no entry point or makes no instance.
-  [[nodiscard]] std::variant<std::unique_ptr<MigrationPluginBase>, ProgramError> makePlugin(
-      Platform& platform) const;
+  /// Loads the plug-in into this process, for good. An error when it cannot be loaded or has no
+  /// entry point.
+  [[nodiscard]] std::variant<LoadedPlugin, ProgramError> load() const;
 
  private:
   explicit PluginBundle(std::filesystem::path path) : path_(std::move(path)) {}

@@ -12,6 +12,7 @@
 #include <utility>
 #include <variant>
 
+#include "commandline/PlatformError.h"
 #include "host/Announcements.h"
 #include "host/KernelOwnershipRule.h"
 #include "host/ReportFiles.h"
@@ -25,6 +26,7 @@
 #include "report/RecordedPlatform.h"
 #include "safetynet/MigrationInMemory.h"
 #include "transaction/TransactionFileSystem.h"
+#include "transaction/TransactionFrameworkLoader.h"
 #include "transaction/TransactionPropertyLists.h"
 
 namespace accounts {
@@ -36,13 +38,14 @@ struct PluginOutcome {
   RecordedMigration recorded;
 };
 
-/// Loads the plug-in and lets it migrate.
-RunReport runPlugin(const PluginBundle& bundle, const Platform& platform, ToldFates& told) {
+using Loaded = std::variant<LoadedPlugin, ProgramError>;
+
+/// Makes an instance of the plug-in and lets it migrate.
+RunReport runPlugin(const LoadedPlugin& loaded, const Platform& platform, ToldFates& told) {
   told.passOnTo(platform.migrationObserver);
   Platform observed = platformWith(platform, {.migrationObserver = &told});
   RunReport report;
-  std::variant<std::unique_ptr<MigrationPluginBase>, ProgramError> made =
-      bundle.makePlugin(observed);
+  auto made = loaded.makeInstance(observed);
   if (const auto* error = std::get_if<ProgramError>(&made)) {
     setError(report, *error);
     return report;
@@ -88,9 +91,24 @@ RecordedMigration recordedSoFar(const PluginWork& work) {
   return RecordedMigration::fromLines(lines);
 }
 
-PluginOutcome runRecordedPlugin(const PluginWork& work, const Platform& platform, ToldFates& told) {
+/// What came of a plug-in that could not run.
+PluginOutcome failedOutcome(const ProgramError& error) {
+  PluginOutcome outcome;
+  setError(outcome.report, error);
+  return outcome;
+}
+
+PluginOutcome runRecordedPlugin(const PluginWork& work, const Loaded& loaded,
+                                const Platform& platform, ToldFates& told) {
+  if (const auto* error = std::get_if<ProgramError>(&loaded)) {
+    return failedOutcome(*error);
+  }
+  if (LinuxPlatformError error; !work.device.platform->decodeDescription(error)) {
+    return failedOutcome(programErrorOf(error));
+  }
+  const auto& plugin = std::get<LoadedPlugin>(loaded);
   if (!work.options.recorded) {
-    return {runPlugin(work.device.bundle, platform, told), {}};
+    return {runPlugin(plugin, platform, told), {}};
   }
   // A line that does not arrive is missed by people alone.
   MigrationRecorder recorder(
@@ -100,7 +118,7 @@ PluginOutcome runRecordedPlugin(const PluginWork& work, const Platform& platform
       *work.options.recorded);
   RecordedPlatform recorded(platform, recorder);
   recorder.recordBefore(storesOf(platform.propertyLists, work.home));
-  PluginOutcome outcome = {runPlugin(work.device.bundle, recorded.platform(), told), {}};
+  PluginOutcome outcome = {runPlugin(plugin, recorded.platform(), told), {}};
   recorder.recordAfter(
       platform.propertyLists.readDictionary(pathOfPlace(DevicePlace::Settings, work.home)));
   outcome.recorded = recordedSoFar(work);
@@ -204,14 +222,21 @@ void workInMemory(const PluginWork& work, const WorkerSide& side, const DeviceSn
                   const WorkerTask& task) {
   work.leaveHost();
   LinuxPlatform& linux = *work.device.platform;
-  MigrationInMemory migration(snapshot, work.home);
+  // Whatever has to be opened is opened here.
+  const Loaded loaded = work.device.bundle.load();
+  linux.readAhead();
   KernelOwnershipRule ownership(linux.root());
+  ownership.readAhead(std::string(kSettingsFileOwner));
+
+  MigrationInMemory migration(snapshot, work.home);
   TransactionFileSystem files(migration.transaction(), ownership,
                               [&side](std::string_view path) { endOnForeignPath(side, path); });
   TransactionPropertyLists propertyLists(migration.transaction(), linux.propertyLists());
   LinuxPreferenceDomain preferences(propertyLists, linux.platform().homeDirectory);
   TransactionSharedResources sharedResources(linux.platform().sharedResources, task.lock);
+  TransactionFrameworkLoader frameworks(linux.platform().frameworkLoader);
   const Platform platform = platformWith(linux.platform(), {.fileSystem = &files,
+                                                            .frameworkLoader = &frameworks,
                                                             .preferenceDomain = &preferences,
                                                             .propertyLists = &propertyLists,
                                                             .sharedResources = &sharedResources});
@@ -220,7 +245,7 @@ void workInMemory(const PluginWork& work, const WorkerSide& side, const DeviceSn
   if (task.purpose == RunPurpose::FinishingAlone) {
     migration.verify(PluginResult::NotAsked, {});
   } else {
-    outcome = runRecordedPlugin(work, platform, migration.told());
+    outcome = runRecordedPlugin(work, loaded, platform, migration.told());
     noteAnnouncements(work, outcome.report);
     migration.verify(outcome.report.result ? PluginResult::GaveTrue : PluginResult::GaveFalse,
                      factsOf(platform));
@@ -261,7 +286,8 @@ void tellOfEndedWorker(const PluginWork& work, const WorkerSide& side) {
 void workOnDevice(const PluginWork& work, const WorkerSide& side) {
   work.leaveHost();
   ToldFates told;
-  PluginOutcome outcome = runRecordedPlugin(work, work.device.platform->platform(), told);
+  PluginOutcome outcome =
+      runRecordedPlugin(work, work.device.bundle.load(), work.device.platform->platform(), told);
   RunReport& report = outcome.report;
   noteAnnouncements(work, report);
   if (!report.error && !report.result) {

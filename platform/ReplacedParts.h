@@ -8,6 +8,7 @@ namespace accounts {
 struct ReplacedParts {
   ConsoleLog* consoleLog = nullptr;
   FileSystem* fileSystem = nullptr;
+  FrameworkLoader* frameworkLoader = nullptr;
   LogSystem* logSystem = nullptr;
   PreferenceDomain* preferenceDomain = nullptr;
   PropertyLists* propertyLists = nullptr;
@@ -28,7 +29,7 @@ inline Platform platformWith(const Platform& original, const ReplacedParts& part
           .deviceInfoService = original.deviceInfoService,
           .externalSyncSources = original.externalSyncSources,
           .fileSystem = chosen(parts.fileSystem, original.fileSystem),
-          .frameworkLoader = original.frameworkLoader,
+          .frameworkLoader = chosen(parts.frameworkLoader, original.frameworkLoader),
           .homeDirectory = original.homeDirectory,
           .localizedStrings = original.localizedStrings,
           .logSystem = chosen(parts.logSystem, original.logSystem),

@@ -34,6 +34,9 @@ enum class DevicePlace : std::uint8_t {
   CommitRecord
 };
 
+/// The name of the user, and of the group, that the settings file belongs to.
+inline constexpr std::string_view kSettingsFileOwner = "mobile";
+
 /// One place.
 struct ListedPlace {
   enum class Base : std::uint8_t { System, Home };

@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <string_view>
+#include <utility>
 
 #include "platform/linux/DictionaryFile.h"
 
@@ -71,10 +72,6 @@ ExternalSyncSourcesAnswer syncSourcesAnswer(const PropertyDictionary& dictionary
   return answer;
 }
 
-std::optional<DeviceDescription> describe(const std::optional<PropertyDictionary>& dictionary) {
-  return dictionary ? std::optional(deviceDescriptionFromDictionary(*dictionary)) : std::nullopt;
-}
-
 }  // namespace
 
 DeviceDescription deviceDescriptionFromDictionary(const PropertyDictionary& dictionary) {
@@ -101,21 +98,30 @@ DeviceDescription deviceDescriptionFromDictionary(const PropertyDictionary& dict
   return description;
 }
 
-std::optional<DeviceDescription> readDeviceDescription(const DeviceRoot& root, PathError& error) {
+std::optional<DescriptionBytes> readDeviceDescription(const DeviceRoot& root, PathError& error) {
   PathError failure;
-  const auto dictionary = readDictionaryFile(root, kDeviceDescriptionPath, failure);
-  if (!dictionary && failure.isMissing()) {
-    return DeviceDescription();
-  }
-  if (!dictionary) {
+  std::optional<std::string> bytes = root.readFile(kDeviceDescriptionPath, failure);
+  if (!bytes && !failure.isMissing()) {
     error = failure;
+    return std::nullopt;
   }
-  return describe(dictionary);
+  return DescriptionBytes{std::move(bytes), std::string(kDeviceDescriptionPath)};
 }
 
-std::optional<DeviceDescription> readHostDeviceDescription(const std::string& path,
-                                                           PathError& error) {
-  return describe(readHostDictionaryFile(path, error));
+std::optional<DescriptionBytes> readHostDeviceDescription(const std::string& path,
+                                                          PathError& error) {
+  std::optional<std::string> bytes = readHostFile(path, error);
+  return bytes ? std::optional(DescriptionBytes{std::move(bytes), nameOfInput(path)})
+               : std::nullopt;
+}
+
+std::optional<DeviceDescription> decodeDeviceDescription(const DescriptionBytes& read,
+                                                         PathError& error) {
+  if (!read.bytes) {
+    return DeviceDescription();
+  }
+  const auto dictionary = dictionaryFromBytes(*read.bytes, read.path, error);
+  return dictionary ? std::optional(deviceDescriptionFromDictionary(*dictionary)) : std::nullopt;
 }
 
 }  // namespace accounts

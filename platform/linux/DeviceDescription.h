@@ -49,13 +49,26 @@ inline constexpr std::string_view kDeviceDescriptionPath = "/etc/device.plist";
 /// defaults; other keys are ignored.
 DeviceDescription deviceDescriptionFromDictionary(const PropertyDictionary& dictionary);
 
-/// The description that the device holds itself, at kDeviceDescriptionPath. One that is missing is
-/// a description without answers. None, with `error` set, when it cannot be read as a dictionary.
-std::optional<DeviceDescription> readDeviceDescription(const DeviceRoot& root, PathError& error);
+/// A description as it stands in its file, not looked into.
+struct DescriptionBytes {
+  /// None for a device without a description.
+  std::optional<std::string> bytes;
+  /// How an error names the file.
+  std::string path;
+};
+
+/// The description that the device holds itself, at kDeviceDescriptionPath; it may be missing.
+/// None, with `error` set, when it cannot be read.
+std::optional<DescriptionBytes> readDeviceDescription(const DeviceRoot& root, PathError& error);
 
 /// The description in a file of the host. None, with `error` set, when the file is missing
-/// (`error.isMissing()`) or cannot be read as a dictionary.
-std::optional<DeviceDescription> readHostDeviceDescription(const std::string& path,
-                                                           PathError& error);
+/// (`error.isMissing()`) or cannot be read.
+std::optional<DescriptionBytes> readHostDeviceDescription(const std::string& path,
+                                                          PathError& error);
+
+/// What a description says; one that is missing has no answers. None, with `error` set, when the
+/// bytes hold no dictionary.
+std::optional<DeviceDescription> decodeDeviceDescription(const DescriptionBytes& read,
+                                                         PathError& error);
 
 }  // namespace accounts

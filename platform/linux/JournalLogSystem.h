@@ -29,6 +29,9 @@ class JournalLogSystem final : public LogSystem {
   /// nothing takes entries there.
   static std::unique_ptr<JournalLogSystem> connect(const std::string& socketPath, PathError& error);
 
+  /// The journal's socket.
+  [[nodiscard]] int descriptor() const { return socket_.number(); }
+
   LogChannel& makeChannel(std::string_view subsystem, std::string_view category) override;
 
  private:

@@ -1,31 +1,24 @@
 #include "platform/linux/LinuxBundleResources.h"
 
-#include <unistd.h>
-
-#include <utility>
-
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/DictionaryFile.h"
 
 namespace accounts {
 namespace {
 
-std::string resourcePath(std::string_view directory, std::string_view name) {
-  return joinedPath(directory, name) + ".plist";
+std::string fileName(std::string_view name) {
+  return std::string(name) + ".plist";
 }
 
 }  // namespace
 
-LinuxBundleResources::LinuxBundleResources(std::string resourcesDirectory)
-    : resourcesDirectory_(std::move(resourcesDirectory)) {}
-
 bool LinuxBundleResources::hasPropertyList(std::string_view name) {
-  return ::access(resourcePath(resourcesDirectory_, name).c_str(), F_OK) == 0;
+  return files_.exists(fileName(name));
 }
 
 std::optional<PropertyDictionary> LinuxBundleResources::readPropertyList(std::string_view name) {
   PathError error;
-  return readHostDictionaryFile(resourcePath(resourcesDirectory_, name), error, Pipes::Refuse);
+  const std::optional<std::string> bytes = files_.read(fileName(name), error);
+  return bytes ? dictionaryFromBytes(*bytes, name, error) : std::nullopt;
 }
 
 }  // namespace accounts

@@ -5,19 +5,21 @@
 #include <string_view>
 
 #include "platform/BundleResources.h"
+#include "platform/linux/BundleFiles.h"
 
 namespace accounts {
 
-/// The Resources directory of a bundle, on the host, outside any device root.
+/// The property lists among the files of a bundle.
 class LinuxBundleResources final : public BundleResources {
  public:
-  explicit LinuxBundleResources(std::string resourcesDirectory);
+  /// `files` must outlive this.
+  explicit LinuxBundleResources(const BundleFiles& files) : files_(files) {}
 
   bool hasPropertyList(std::string_view name) override;
   std::optional<PropertyDictionary> readPropertyList(std::string_view name) override;
 
  private:
-  std::string resourcesDirectory_;
+  const BundleFiles& files_;
 };
 
 }  // namespace accounts

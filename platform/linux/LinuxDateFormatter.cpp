@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <array>
 #include <charconv>
+#include <cstdlib>
 #include <ctime>
 #include <utility>
 
@@ -11,6 +12,7 @@ namespace {
 
 using std::chrono::system_clock;
 
+constexpr int kKeepValue = 0;
 constexpr char kFractionLetter = 'S';
 
 struct Field {
@@ -51,6 +53,12 @@ std::string fractionText(std::chrono::nanoseconds fraction, std::size_t length) 
 }
 
 }  // namespace
+
+void readLocalTimeZoneAhead() {
+  // Without a name the C library looks for a changed zone before every date.
+  ::setenv("TZ", ":/etc/localtime", kKeepValue);
+  ::tzset();
+}
 
 LinuxDateFormatter::LinuxDateFormatter(Clock clock) : clock_(std::move(clock)) {}
 

@@ -9,6 +9,9 @@
 
 namespace accounts {
 
+/// Reads the local time zone now, so that nothing needs to be opened for a date from then on.
+void readLocalTimeZoneAhead();
+
 /// Dates by the C library. The calendar of weeks is that of ISO 8601: weeks begin on Monday, and
 /// the first one of a year holds its first Thursday.
 class LinuxDateFormatter final : public DateFormatter {

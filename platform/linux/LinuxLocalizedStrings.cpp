@@ -7,10 +7,6 @@
 
 namespace accounts {
 
-LinuxLocalizedStrings::LinuxLocalizedStrings(std::string resourcesDirectory,
-                                             std::vector<std::string> languages)
-    : resourcesDirectory_(std::move(resourcesDirectory)), languages_(std::move(languages)) {}
-
 std::string LinuxLocalizedStrings::localizedString(std::string_view key,
                                                    std::string_view defaultValue,
                                                    std::string_view table) {
@@ -24,16 +20,16 @@ std::string LinuxLocalizedStrings::localizedString(std::string_view key,
 
 const PropertyDictionary& LinuxLocalizedStrings::stringTable(const std::string& language,
                                                              std::string_view table) {
-  std::string path = joinedPath(joinedPath(resourcesDirectory_, language + ".lproj"), table);
-  path += ".strings";
-  const auto known = tablesByPath_.find(path);
-  if (known != tablesByPath_.end()) {
+  std::string name = joinedPath(language + ".lproj", table) + ".strings";
+  const auto known = tablesByName_.find(name);
+  if (known != tablesByName_.end()) {
     return known->second;
   }
   PathError error;
-  auto read = readHostDictionaryFile(path, error, Pipes::Refuse);
+  const std::optional<std::string> bytes = files_.read(name, error);
+  auto read = bytes ? dictionaryFromBytes(*bytes, name, error) : std::nullopt;
   // A table that cannot be read translates nothing.
-  return tablesByPath_.emplace(std::move(path), std::move(read).value_or(PropertyDictionary()))
+  return tablesByName_.emplace(std::move(name), std::move(read).value_or(PropertyDictionary()))
       .first->second;
 }
 

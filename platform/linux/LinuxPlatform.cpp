@@ -7,6 +7,7 @@
 #include <cstdlib>
 #include <utility>
 
+#include "platform/linux/BundleFiles.h"
 #include "platform/linux/DescribedCloudAccountService.h"
 #include "platform/linux/DescribedDeviceInfoService.h"
 #include "platform/linux/DescribedExternalSyncSources.h"
@@ -64,26 +65,47 @@ bool checkResources(const std::string& directory, LinuxPlatformError& error) {
   return true;
 }
 
-/// Null, with `error` set, when the channel cannot be opened.
-std::unique_ptr<LogSystem> makeLogSystem(const LinuxPlatformOptions& options, PathError& error) {
+/// A log, and what it writes to.
+struct OpenedLog {
+  std::unique_ptr<LogSystem> log;
+  std::optional<int> descriptor = {};
+};
+
+/// Without a log, with `error` set, when the channel cannot be opened.
+OpenedLog openLog(const LinuxPlatformOptions& options, PathError& error) {
   if (!options.channel) {
-    return std::make_unique<LinuxLogSystem>();
+    return {std::make_unique<LinuxLogSystem>()};
   }
   if (*options.channel == kJournal) {
-    return JournalLogSystem::connect(options.journalSocket, error);
+    auto journal = JournalLogSystem::connect(options.journalSocket, error);
+    const int descriptor = journal != nullptr ? journal->descriptor() : -1;
+    return {std::move(journal), descriptor};
   }
   std::optional<FileDescriptor> output = openLogOutput(*options.channel, error);
-  return output ? std::make_unique<LinuxLogSystem>(std::move(output)) : nullptr;
+  if (!output) {
+    return {};
+  }
+  const int descriptor = output->number();
+  return {std::make_unique<LinuxLogSystem>(std::move(output)), descriptor};
+}
+
+/// The device description as it stands in its file; null, with `error` set, when it cannot be read.
+std::optional<DescriptionBytes> readDescription(const LinuxPlatformOptions& options,
+                                                const DeviceRoot& root, PathError& error) {
+  return options.deviceDescriptionFile
+             ? readHostDeviceDescription(*options.deviceDescriptionFile, error)
+             : readDeviceDescription(root, error);
 }
 
 }  // namespace
 
 // Declared in the order in which they need each other.
 struct LinuxPlatform::Parts {
-  Parts(const LinuxPlatformOptions& options, DeviceRoot openedRoot, DeviceDescription read,
-        std::unique_ptr<LogSystem> madeLogSystem)
+  Parts(const LinuxPlatformOptions& options, DeviceRoot openedRoot, DescriptionBytes read,
+        OpenedLog openedLog)
       : root(std::move(openedRoot)),
-        description(std::move(read)),
+        descriptionBytes(std::move(read)),
+        bundleFiles(options.bundleResourcesDirectory),
         fileSystem(root, options.temporaryDirectory.value_or(
                              joinedPath(options.homeDirectory, kTemporaryDirectoryInHome))),
         propertyLists(root),
@@ -92,9 +114,10 @@ struct LinuxPlatform::Parts {
         mailDirectory(homeDirectory),
         preferenceDomain(propertyLists, homeDirectory),
         sharedResources(root),
-        bundleResources(options.bundleResourcesDirectory),
-        localizedStrings(options.bundleResourcesDirectory, userLanguages(::getenv)),
-        logSystem(std::move(madeLogSystem)),
+        bundleResources(bundleFiles),
+        localizedStrings(bundleFiles, userLanguages(::getenv)),
+        log(std::move(openedLog)),
+        logsToJournal(options.channel == kJournal),
         cloudAccountService(description),
         deviceInfoService(description),
         externalSyncSources(description),
@@ -102,7 +125,9 @@ struct LinuxPlatform::Parts {
         profileRestrictions(description) {}
 
   const DeviceRoot root;
-  const DeviceDescription description;
+  const DescriptionBytes descriptionBytes;
+  DeviceDescription description;
+  BundleFiles bundleFiles;
   LinuxFileSystem fileSystem;
   LinuxPropertyLists propertyLists;
   LinuxFrameworkLoader frameworkLoader;
@@ -113,7 +138,8 @@ struct LinuxPlatform::Parts {
   LinuxBundleResources bundleResources;
   LinuxLocalizedStrings localizedStrings;
   LinuxConsoleLog consoleLog;
-  const std::unique_ptr<LogSystem> logSystem;
+  const OpenedLog log;
+  const bool logsToJournal;
   LinuxDateFormatter dateFormatter;
   LinuxUUIDGenerator uuidGenerator;
   DescribedCloudAccountService cloudAccountService;
@@ -134,7 +160,7 @@ struct LinuxPlatform::Parts {
                        .frameworkLoader = frameworkLoader,
                        .homeDirectory = homeDirectory,
                        .localizedStrings = localizedStrings,
-                       .logSystem = *logSystem,
+                       .logSystem = *log.log,
                        .mailDirectory = mailDirectory,
                        .pairingValueStore = pairingValueStore,
                        .preferenceDomain = preferenceDomain,
@@ -159,20 +185,36 @@ std::unique_ptr<LinuxPlatform> LinuxPlatform::create(const LinuxPlatformOptions&
     fail(error, failure.number == ENOSYS ? Kind::InputOutput : Kind::MissingInput, failure);
     return nullptr;
   }
-  auto description = options.deviceDescriptionFile
-                         ? readHostDeviceDescription(*options.deviceDescriptionFile, failure)
-                         : readDeviceDescription(*root, failure);
+  auto description = readDescription(options, *root, failure);
   if (!description) {
     fail(error, Kind::MissingInput, failure);
     return nullptr;
   }
-  std::unique_ptr<LogSystem> logSystem = makeLogSystem(options, failure);
-  if (logSystem == nullptr) {
+  OpenedLog log = openLog(options, failure);
+  if (log.log == nullptr) {
     fail(error, Kind::CannotCreate, failure);
     return nullptr;
   }
-  return std::unique_ptr<LinuxPlatform>(new LinuxPlatform(std::make_unique<Parts>(
-      options, std::move(*root), std::move(*description), std::move(logSystem))));
+  std::unique_ptr<LinuxPlatform> platform(new LinuxPlatform(
+      std::make_unique<Parts>(options, std::move(*root), std::move(*description), std::move(log))));
+  const bool isUsable = options.descriptionDecoding == DescriptionDecoding::Later ||
+                        platform->decodeDescription(error);
+  return isUsable ? std::move(platform) : nullptr;
+}
+
+bool LinuxPlatform::decodeDescription(LinuxPlatformError& error) {
+  PathError failure;
+  auto description = decodeDeviceDescription(parts_->descriptionBytes, failure);
+  if (!description) {
+    return fail(error, Kind::MissingInput, failure);
+  }
+  parts_->description = *std::move(description);
+  return true;
+}
+
+void LinuxPlatform::readAhead() {
+  parts_->bundleFiles.readAhead();
+  readLocalTimeZoneAhead();
 }
 
 LinuxPlatform::LinuxPlatform(std::unique_ptr<Parts> parts) : parts_(std::move(parts)) {}
@@ -193,6 +235,14 @@ const RecordingCloudTabService& LinuxPlatform::cloudTabService() const {
 
 const DeviceRoot& LinuxPlatform::root() const {
   return parts_->root;
+}
+
+std::optional<int> LinuxPlatform::channelDescriptor() const {
+  return parts_->log.descriptor;
+}
+
+bool LinuxPlatform::logsToJournal() const {
+  return parts_->logsToJournal;
 }
 
 LinuxFileSystem& LinuxPlatform::fileSystem() {

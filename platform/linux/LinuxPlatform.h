@@ -15,6 +15,13 @@
 
 namespace accounts {
 
+/// When the device description, which is the device's own, is looked into.
+enum class DescriptionDecoding : std::uint8_t {
+  AtOnce,
+  /// With `decodeDescription`; no service has an answer before.
+  Later
+};
+
 /// What a Linux platform is made from. Paths belong to the machine that the program runs on, except
 /// those called device paths, which start at the root of the device.
 struct LinuxPlatformOptions {
@@ -28,6 +35,7 @@ struct LinuxPlatformOptions {
   std::string bundleResourcesDirectory;
   /// The device description; none for the device's own, if it has one.
   std::optional<std::string> deviceDescriptionFile;
+  DescriptionDecoding descriptionDecoding = DescriptionDecoding::AtOnce;
   /// The file that lines of log channels are appended to, "-" for standard error, "journal" for the
   /// system's journal; none keeps them off.
   std::optional<std::string> channel;
@@ -63,6 +71,14 @@ class LinuxPlatform {
                                                LinuxPlatformError& error);
   ~LinuxPlatform();
 
+  /// Looks into the device description, which was read when this was made. False, with `error` set,
+  /// when it is malformed.
+  bool decodeDescription(LinuxPlatformError& error);
+
+  /// Opens and reads what else the plug-in may ask for outside the root: the bundle's resources and
+  /// the local time zone. Nothing needs to be opened for them from then on.
+  void readAhead();
+
   /// Valid as long as this object.
   [[nodiscard]] Platform& platform();
 
@@ -71,6 +87,9 @@ class LinuxPlatform {
 
   /// What a program needs beneath the root beyond the interfaces of the platform.
   [[nodiscard]] const DeviceRoot& root() const;
+  /// What the lines of log channels are written to; none when they are off.
+  [[nodiscard]] std::optional<int> channelDescriptor() const;
+  [[nodiscard]] bool logsToJournal() const;
   [[nodiscard]] LinuxFileSystem& fileSystem();
   [[nodiscard]] LinuxPropertyLists& propertyLists();
 

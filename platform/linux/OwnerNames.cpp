@@ -84,9 +84,36 @@ std::optional<std::uint32_t> identifierInDatabase(std::string_view database,
   return std::nullopt;
 }
 
+void OwnerNames::readAhead(const std::string& name) {
+  if (root_.isSystemRoot()) {
+    // The name service keeps no promise of what it opens; its numbers are remembered.
+    PathError error;
+    static_cast<void>(userIdentifier(name, error));
+    static_cast<void>(groupIdentifier(name, error));
+    isNameServiceAsked_ = true;
+    return;
+  }
+  for (const std::string_view path : {kUserDatabase, kGroupDatabase}) {
+    Database database;
+    database.bytes = root_.readFile(path, database.error);
+    databases_.insert_or_assign(std::string(path), std::move(database));
+  }
+}
+
+std::optional<std::string> OwnerNames::databaseAt(std::string_view path, PathError& error) const {
+  const auto database = databases_.find(path);
+  if (database == databases_.end()) {
+    return root_.readFile(path, error);
+  }
+  if (!database->second.bytes) {
+    error = database->second.error;
+  }
+  return database->second.bytes;
+}
+
 std::optional<std::uint32_t> OwnerNames::lookUp(std::string_view databasePath,
                                                 const std::string& name, PathError& error) const {
-  const auto database = root_.readFile(databasePath, error);
+  const auto database = databaseAt(databasePath, error);
   if (!database) {
     return std::nullopt;
   }
@@ -95,6 +122,18 @@ std::optional<std::uint32_t> OwnerNames::lookUp(std::string_view databasePath,
     error = unknownName(databasePath, name);
   }
   return identifier;
+}
+
+template <class Entry, class LookUp, class Number>
+std::optional<std::uint32_t> OwnerNames::askIfPossible(LookUp lookUp, Number Entry::*number,
+                                                       std::string_view database,
+                                                       const std::string& name,
+                                                       PathError& error) const {
+  if (isNameServiceAsked_) {
+    error = unknownName(database, name);
+    return std::nullopt;
+  }
+  return askNameService<Entry>(lookUp, number, database, name, error);
 }
 
 template <class LookUp>
@@ -113,7 +152,7 @@ std::optional<std::uint32_t> OwnerNames::rememberedOr(const LookUp& lookUp, cons
 std::optional<std::uint32_t> OwnerNames::userIdentifier(const std::string& name, PathError& error) {
   const auto lookUpUser = [&] {
     return root_.isSystemRoot()
-               ? askNameService<passwd>(::getpwnam_r, &passwd::pw_uid, kUserDatabase, name, error)
+               ? askIfPossible<passwd>(::getpwnam_r, &passwd::pw_uid, kUserDatabase, name, error)
                : lookUp(kUserDatabase, name, error);
   };
   return rememberedOr(lookUpUser, name, users_);
@@ -123,7 +162,7 @@ std::optional<std::uint32_t> OwnerNames::groupIdentifier(const std::string& name
                                                          PathError& error) {
   const auto lookUpGroup = [&] {
     return root_.isSystemRoot()
-               ? askNameService<group>(::getgrnam_r, &group::gr_gid, kGroupDatabase, name, error)
+               ? askIfPossible<group>(::getgrnam_r, &group::gr_gid, kGroupDatabase, name, error)
                : lookUp(kGroupDatabase, name, error);
   };
   return rememberedOr(lookUpGroup, name, groups_);

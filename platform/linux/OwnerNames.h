@@ -23,6 +23,10 @@ class OwnerNames {
  public:
   explicit OwnerNames(const DeviceRoot& root) : root_(root) {}
 
+  /// Opens now whatever tells of `name`, so that nothing needs to be opened to look it up; no other
+  /// name is known afterwards. The root's databases are read, but not looked into.
+  void readAhead(const std::string& name);
+
   /// The number of a user or group; none, with `error` set, when the device does not know the name.
   [[nodiscard]] std::optional<std::uint32_t> userIdentifier(const std::string& name,
                                                             PathError& error);
@@ -31,6 +35,11 @@ class OwnerNames {
 
  private:
   using Found = std::map<std::string, std::uint32_t>;
+  template <class Entry, class LookUp, class Number>
+  [[nodiscard]] std::optional<std::uint32_t> askIfPossible(LookUp lookUp, Number Entry::*number,
+                                                           std::string_view database,
+                                                           const std::string& name,
+                                                           PathError& error) const;
   template <class LookUp>
   static std::optional<std::uint32_t> rememberedOr(const LookUp& lookUp, const std::string& name,
                                                    Found& found);
@@ -38,7 +47,20 @@ class OwnerNames {
                                                     const std::string& name,
                                                     PathError& error) const;
 
+  /// The bytes of a database, read ahead or now; none, with `error` set, for none.
+  [[nodiscard]] std::optional<std::string> databaseAt(std::string_view path,
+                                                      PathError& error) const;
+
+  struct Database {
+    std::optional<std::string> bytes;
+    /// Why there are no bytes.
+    PathError error;
+  };
   const DeviceRoot& root_;
+  /// Whether the running system's name service has been asked for the last time.
+  bool isNameServiceAsked_ = false;
+  /// Of a root that is not "/", by path, once they are read ahead.
+  std::map<std::string, Database, std::less<>> databases_;
   Found users_;
   Found groups_;
 };

@@ -8,7 +8,8 @@ namespace {
 
 class BundleResourcesTest : public DeviceFixture {
  protected:
-  LinuxBundleResources resources{outside().string()};
+  BundleFiles files{outside().string()};
+  LinuxBundleResources resources{files};
 };
 
 TEST_F(BundleResourcesTest, AResourceIsReadByItsName) {
@@ -42,8 +43,36 @@ TEST_F(BundleResourcesTest, ADirectoryInPlaceOfAResourceHoldsNothing) {
 
 TEST_F(BundleResourcesTest, ANamedPipeInPlaceOfAResourceIsNotWaitedFor) {
   makeNamedPipe("/Types.plist");
-  LinuxBundleResources withPipe(image().string());
+  const BundleFiles filesWithPipe(image().string());
+  LinuxBundleResources withPipe(filesWithPipe);
   EXPECT_FALSE(withPipe.readPropertyList("Types"));
+}
+
+TEST_F(BundleResourcesTest, WhatWasReadAheadNeedsNoFileAnyMore) {
+  makeHostFile(outside() / "Types.plist", xmlDictionary("<key>Mail</key><string>IMAP</string>"));
+  std::filesystem::create_directory(outside() / "en.lproj");
+  makeHostFile(outside() / "en.lproj" / "Table.strings", "a table");
+
+  files.readAhead();
+  std::filesystem::remove_all(outside());
+
+  EXPECT_TRUE(resources.hasPropertyList("Types"));
+  EXPECT_EQ(resources.readPropertyList("Types"), (PropertyDictionary{{"Mail", "IMAP"}}));
+  PathError error;
+  EXPECT_EQ(files.read("en.lproj/Table.strings", error), "a table");
+}
+
+TEST_F(BundleResourcesTest, WhatCannotBeReadAheadIsThereButHoldsNothing) {
+  std::filesystem::create_symlink("/dev/null", outside() / "Types.plist");
+
+  files.readAhead();
+
+  EXPECT_TRUE(resources.hasPropertyList("Types"));
+  EXPECT_FALSE(resources.readPropertyList("Types"));
+  EXPECT_FALSE(resources.hasPropertyList("Others"));
+  PathError error;
+  EXPECT_FALSE(files.read("Others.plist", error));
+  EXPECT_TRUE(error.isMissing());
 }
 
 }  // namespace

@@ -71,7 +71,8 @@ class LocalizedStringsTest : public DeviceFixture {
     return strings.localizedString(key, defaultValue, "Table");
   }
 
-  LinuxLocalizedStrings strings{outside().string(), languagesForLocale("de_AT.UTF-8")};
+  BundleFiles files{outside().string()};
+  LinuxLocalizedStrings strings{files, languagesForLocale("de_AT.UTF-8")};
 };
 
 TEST_F(LocalizedStringsTest, TheRegionsTextIsBest) {

@@ -92,6 +92,35 @@ TEST_F(OwnerNamesTest, ANameThatWasNotFoundIsLookedForAgain) {
   EXPECT_EQ(names.userIdentifier("mobile", error), 4711u);
 }
 
+TEST_F(OwnerNamesTest, DatabasesThatWereReadAheadAreNotOpenedAgain) {
+  makeFile("/etc/passwd", "mobile:*:4711:1:::\n");
+  names.readAhead("mobile");
+  std::filesystem::remove(onHost("/etc/passwd"));
+  makeFile("/etc/group", "mobile:*:4712:\n");
+
+  EXPECT_EQ(names.userIdentifier("mobile", error), 4711u);
+  EXPECT_EQ(names.groupIdentifier("mobile", error), std::nullopt);
+  EXPECT_EQ(error.text, "Cannot open /etc/group: No such file or directory");
+}
+
+// The name service is set to one that knows nobody, which cannot be undone.
+TEST_F(OwnerNamesTest, TheRunningSystemIsAskedAheadForTheNameAlone) {
+  const auto systemRoot = DeviceRoot::openRoot("/", error);
+  ASSERT_TRUE(systemRoot);
+  EXPECT_EXIT(
+      {
+        OwnerNames known(*systemRoot);
+        OwnerNames unknown(*systemRoot);
+        known.readAhead("root");
+        ::__nss_configure_lookup("passwd", "none");
+        unknown.readAhead("root");
+        ::__nss_configure_lookup("passwd", "files");
+        std::_Exit((known.userIdentifier("root", error) == 0u ? 0 : 1) +
+                   (unknown.userIdentifier("root", error) ? 2 : 0));
+      },
+      ::testing::ExitedWithCode(0), "");
+}
+
 TEST_F(OwnerNamesTest, TheRunningSystemAsksItsNameService) {
   const auto systemRoot = DeviceRoot::openRoot("/", error);
   ASSERT_TRUE(systemRoot);

@@ -1,0 +1,59 @@
+#include "platform/linux/BundleFiles.h"
+
+#include <unistd.h>
+
+#include <cerrno>
+#include <filesystem>
+#include <system_error>
+#include <utility>
+
+#include "platform/linux/DevicePath.h"
+#include "platform/linux/FileContents.h"
+
+namespace accounts {
+namespace {
+
+namespace fs = std::filesystem;
+
+}  // namespace
+
+std::string BundleFiles::pathOf(const std::string& name) const {
+  return joinedPath(directory_, name);
+}
+
+void BundleFiles::readAhead() {
+  std::map<std::string, Found> found;
+  std::error_code error;
+  fs::recursive_directory_iterator entry(directory_, error);
+  for (; !error && entry != fs::recursive_directory_iterator(); entry.increment(error)) {
+    if (std::error_code unknown; entry->is_directory(unknown)) {
+      continue;
+    }
+    std::string name = entry->path().lexically_relative(directory_).string();
+    Found file;
+    file.bytes = readHostFile(entry->path().string(), file.error, Pipes::Refuse);
+    found.emplace(std::move(name), std::move(file));
+  }
+  found_ = std::move(found);
+}
+
+bool BundleFiles::exists(const std::string& name) const {
+  return found_ ? found_->contains(name) : ::access(pathOf(name).c_str(), F_OK) == 0;
+}
+
+std::optional<std::string> BundleFiles::read(const std::string& name, PathError& error) const {
+  if (!found_) {
+    return readHostFile(pathOf(name), error, Pipes::Refuse);
+  }
+  const auto file = found_->find(name);
+  if (file == found_->end()) {
+    error = pathError("open", pathOf(name), ENOENT);
+    return std::nullopt;
+  }
+  if (!file->second.bytes) {
+    error = file->second.error;
+  }
+  return file->second.bytes;
+}
+
+}  // namespace accounts

@@ -1,0 +1,39 @@
+#pragma once
+
+#include <map>
+#include <optional>
+#include <string>
+#include <utility>
+
+#include "platform/linux/PathError.h"
+
+namespace accounts {
+
+/// The files of a bundle's Resources directory, on the host, outside any device root. Names are
+/// relative to the directory.
+class BundleFiles {
+ public:
+  explicit BundleFiles(std::string directory) : directory_(std::move(directory)) {}
+
+  /// Reads everything there is now, so that nothing needs to be opened later. What comes into the
+  /// directory afterwards is not seen.
+  void readAhead();
+
+  [[nodiscard]] bool exists(const std::string& name) const;
+  /// The bytes of a regular file; none, with `error` set, when it is missing or cannot be read.
+  [[nodiscard]] std::optional<std::string> read(const std::string& name, PathError& error) const;
+
+ private:
+  [[nodiscard]] std::string pathOf(const std::string& name) const;
+
+  struct Found {
+    std::optional<std::string> bytes;
+    /// Why there are no bytes.
+    PathError error;
+  };
+  std::string directory_;
+  /// By name; none as long as files are opened when they are asked for.
+  std::optional<std::map<std::string, Found>> found_;
+};
+
+}  // namespace accounts
