@@ -177,6 +177,25 @@ void handOverAndTell(const PluginWork& work, const WorkerSide& side, const Propo
   std::exit(EXIT_SUCCESS);
 }
 
+/// Gives up what neither a migration in memory nor telling of it needs; all is open by now. Ends
+/// the process when that cannot be done.
+void giveUpRights(const PluginWork& work, const WorkerSide& side) {
+  const LinuxPlatform& linux = *work.device.platform;
+  Confinement kept = {.descriptors = side.inputs, .limits = side.limits};
+  kept.descriptors.insert(kept.descriptors.end(), {side.socket.number(), side.memoryFile.number(),
+                                                   work.recording.number()});
+  if (const auto channel = linux.channelDescriptor()) {
+    kept.descriptors.push_back(*channel);
+  }
+  if (linux.logsToJournal()) {
+    kept.journalEntries = JournalEntries::Sent;
+  }
+  if (const auto error = accounts::giveUpRights(kept)) {
+    static_cast<void>(sendFrame(side.socket, FrameKind::Fault, error->text));
+    _exit(static_cast<int>(ExitStatus::PluginEnded));
+  }
+}
+
 /// Reports a path that no migration has and ends the process.
 [[noreturn]] void endOnForeignPath(const WorkerSide& side, std::string_view path) {
   static_cast<void>(
@@ -227,6 +246,7 @@ void workInMemory(const PluginWork& work, const WorkerSide& side, const DeviceSn
   linux.readAhead();
   KernelOwnershipRule ownership(linux.root());
   ownership.readAhead(std::string(kSettingsFileOwner));
+  giveUpRights(work, side);
 
   MigrationInMemory migration(snapshot, work.home);
   TransactionFileSystem files(migration.transaction(), ownership,
@@ -279,6 +299,7 @@ void workInMemory(const PluginWork& work, const WorkerSide& side, const DeviceSn
 
 void tellOfEndedWorker(const PluginWork& work, const WorkerSide& side) {
   work.leaveHost();
+  giveUpRights(work, side);
   PluginOutcome outcome = {{}, recordedSoFar(work)};
   handOverAndTell(work, side, {}, outcome, [](RunReport&, const RunConclusion&) {});
 }

@@ -107,7 +107,7 @@ class OpenedRun {
         [this](const WorkerSide& side, const DeviceSnapshot& snapshot, const WorkerTask& task) {
           workInMemory(work_, side, snapshot, task);
         },
-        stop_, StopGrace::None);
+        stop_, WorkerRights::GivenUp);
   }
 
   RunMeans means() {
@@ -151,7 +151,7 @@ class OpenedRun {
     }
     WorkerProcess teller([this](const WorkerSide& side, const DeviceSnapshot&,
                                 const WorkerTask&) { accounts::tellOfEndedWorker(work_, side); },
-                         stop_, StopGrace::None);
+                         stop_, WorkerRights::GivenUp);
     const bool isThere = std::holds_alternative<HandedOver>(teller.work({}, {}));
     return tell(options_, conclusion, isThere ? &teller : nullptr);
   }
@@ -168,7 +168,7 @@ class OpenedRun {
     }
     WorkerProcess worker([this](const WorkerSide& side, const DeviceSnapshot&,
                                 const WorkerTask&) { workOnDevice(work_, side); },
-                         stop_, StopGrace::ForAPluginOnTheDevice);
+                         stop_, WorkerRights::ThoseOfTheHost);
     RunConclusion conclusion;
     const auto worked = worker.work({}, {});
     if (const auto* error = std::get_if<ProgramError>(&worked)) {

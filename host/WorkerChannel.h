@@ -11,10 +11,14 @@ namespace accounts {
 
 /// What a frame between the host and its worker is.
 enum class FrameKind : std::uint8_t {
-  /// From the worker: its list of changes; what is to be announced; why it cannot go on.
+  /// From the worker: its list of changes; what is to be announced; why it cannot go on, as text,
+  /// as
+  /// the number of a system call, or because there is no memory.
   Proposal = 1,
   Announcements,
   Fault,
+  ForbiddenCall,
+  OutOfMemory,
   /// From the host: what the run came to; what became of the reports.
   Conclusion,
   ReportErrors,

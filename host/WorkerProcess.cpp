@@ -13,10 +13,14 @@
 #include <array>
 #include <cerrno>
 #include <csignal>
+#include <cstdio>
 #include <cstdlib>
 #include <cstring>
 #include <utility>
 
+#include "host/OpenInputs.h"
+#include "host/WorkerEnd.h"
+#include "host/WorkerLimits.h"
 #include "platform/linux/OpenedBytes.h"
 
 namespace accounts {
@@ -30,9 +34,10 @@ ProgramError temporaryFailure(const std::string& message) {
   return ProgramError{ExitStatus::TemporaryFailure, message + ": " + std::strerror(errno)};
 }
 
-// noexcept: an exception of the plug-in ends the worker as an abort, not the host's own main().
+// noexcept: an exception of the plug-in ends the worker, not the host's own main().
 [[noreturn]] void runChild(const WorkerFunction& function, const WorkerSide& side, pid_t parent,
                            const DeviceSnapshot& snapshot, const WorkerTask& task) noexcept {
+  tellHowThisWorkerEnds(side.socket);
   // A migration never goes on unseen: a host that is killed takes its worker along. The parent may
   // have ended before the request was made.
   prctl(PR_SET_PDEATHSIG, SIGKILL);
@@ -40,16 +45,11 @@ ProgramError temporaryFailure(const std::string& message) {
     _exit(EXIT_FAILURE);
   }
   dup2(STDERR_FILENO, STDOUT_FILENO);
+  // With a buffer of ours the C library does not look at what is behind standard output.
+  std::array<char, BUFSIZ> buffer{};
+  std::setvbuf(stdout, buffer.data(), _IOLBF, buffer.size());
   function(side, snapshot, task);
   std::exit(EXIT_SUCCESS);
-}
-
-std::string describe(int status) {
-  if (WIFSIGNALED(status)) {
-    const int signalNumber = WTERMSIG(status);
-    return "ended by signal " + std::to_string(signalNumber) + " (" + strsignal(signalNumber) + ")";
-  }
-  return "ended the process with exit status " + std::to_string(WEXITSTATUS(status));
 }
 
 }  // namespace
@@ -85,11 +85,16 @@ std::optional<ProgramError> WorkerProcess::start(const DeviceSnapshot& snapshot,
   }
   socket_.emplace(ends[0]);
   const FileDescriptor theirs(ends[1]);
+  const OpenInputs inputs = openInputsOf(snapshot);
+  const ProcessLimits limits = workerLimitsFor(inputs.size);
+  if (rights_ == WorkerRights::GivenUp && !kIsExemptFromConfinement) {
+    limits_ = limits;
+  }
   const pid_t parent = getpid();
   child_ = fork();
   if (child_ == 0) {
     socket_.reset();
-    runChild(function_, {theirs, *memoryFile_}, parent, snapshot, task);
+    runChild(function_, {theirs, *memoryFile_, inputs.descriptors, limits}, parent, snapshot, task);
   }
   if (child_ < 0) {
     return temporaryFailure("No process for the plug-in");
@@ -108,7 +113,7 @@ std::optional<ProgramError> WorkerProcess::waitForIt() {
     return std::nullopt;
   }
   const bool endedByItself =
-      grace_ == StopGrace::ForAPluginOnTheDevice && stop_.waitForEndOf(*process_, kGrace);
+      rights_ == WorkerRights::ThoseOfTheHost && stop_.waitForEndOf(*process_, kGrace);
   if (endedByItself) {
     return std::nullopt;
   }
@@ -122,7 +127,18 @@ ProgramError WorkerProcess::describeEnd() {
   while (waitpid(child_, &status, 0) < 0 && errno == EINTR) {
   }
   child_ = -1;
-  return ProgramError{ExitStatus::PluginEnded, "The plug-in " + describe(status)};
+  return endedWorkerError(status, limits_);
+}
+
+std::variant<HandedOver, ProgramError> WorkerProcess::takeOver(std::string proposal) {
+  // From here on nobody changes what the list speaks of.
+  struct stat status = {};
+  const int seals = F_SEAL_SHRINK | F_SEAL_GROW | F_SEAL_WRITE | F_SEAL_SEAL;
+  if (fcntl(memoryFile_->number(), F_ADD_SEALS, seals) != 0 ||
+      fstat(memoryFile_->number(), &status) != 0) {
+    return temporaryFailure("The migration's result cannot be sealed");
+  }
+  return HandedOver{std::move(proposal), static_cast<std::uint64_t>(status.st_size)};
 }
 
 std::variant<HandedOver, ProgramError> WorkerProcess::work(const DeviceSnapshot& snapshot,
@@ -147,16 +163,12 @@ std::variant<HandedOver, ProgramError> WorkerProcess::work(const DeviceSnapshot&
         break;
       case FrameKind::Fault:
         return ProgramError{ExitStatus::PluginEnded, std::move(frame->bytes)};
-      case FrameKind::Proposal: {
-        // From here on nobody changes what the list speaks of.
-        struct stat status = {};
-        const int seals = F_SEAL_SHRINK | F_SEAL_GROW | F_SEAL_WRITE | F_SEAL_SEAL;
-        if (fcntl(memoryFile_->number(), F_ADD_SEALS, seals) != 0 ||
-            fstat(memoryFile_->number(), &status) != 0) {
-          return temporaryFailure("The migration's result cannot be sealed");
-        }
-        return HandedOver{std::move(frame->bytes), static_cast<std::uint64_t>(status.st_size)};
-      }
+      case FrameKind::ForbiddenCall:
+        return forbiddenCallError(frame->bytes);
+      case FrameKind::OutOfMemory:
+        return outOfMemoryError(limits_);
+      case FrameKind::Proposal:
+        return takeOver(std::move(frame->bytes));
       default:
         return ProgramError{ExitStatus::PluginEnded, "The plug-in's process sent something else"};
     }

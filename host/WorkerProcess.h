@@ -11,6 +11,7 @@
 
 #include "host/StopSignals.h"
 #include "host/WorkerChannel.h"
+#include "platform/linux/Confinement.h"
 #include "platform/linux/FileDescriptor.h"
 #include "safetynet/MigrationRun.h"
 
@@ -21,14 +22,17 @@ struct WorkerSide {
   const FileDescriptor& socket;
   /// Empty; takes the contents of new files, one behind the other.
   const FileDescriptor& memoryFile;
+  /// What stays open for the snapshot, and what the worker may use for that.
+  std::vector<int> inputs;
+  ProcessLimits limits;
 };
 
 /// What runs in the worker's process, from the snapshot to the last frame. It need not return.
 using WorkerFunction =
     std::function<void(const WorkerSide& side, const DeviceSnapshot& snapshot, const WorkerTask&)>;
 
-/// How long a worker that is asked to stop may go on: one that changes nothing needs no time.
-enum class StopGrace : std::uint8_t { None, ForAPluginOnTheDevice };
+/// What a worker may do. One that can change nothing needs no time to stop.
+enum class WorkerRights : std::uint8_t { GivenUp, ThoseOfTheHost };
 
 /// A worker in a process of its own, forked when it is to work, killed when the host ends before
 /// it. Its standard output is its standard error, so that nothing that runs there can spoil what
@@ -36,8 +40,8 @@ enum class StopGrace : std::uint8_t { None, ForAPluginOnTheDevice };
 class WorkerProcess final : public Worker {
  public:
   /// All but `function` must outlive this.
-  WorkerProcess(WorkerFunction function, StopSignals& stop, StopGrace grace)
-      : function_(std::move(function)), stop_(stop), grace_(grace) {}
+  WorkerProcess(WorkerFunction function, StopSignals& stop, WorkerRights rights)
+      : function_(std::move(function)), stop_(stop), rights_(rights) {}
   WorkerProcess(const WorkerProcess&) = delete;
   WorkerProcess& operator=(const WorkerProcess&) = delete;
   /// Ends the process.
@@ -62,15 +66,19 @@ class WorkerProcess final : public Worker {
   std::optional<ProgramError> waitForIt();
   /// Waits for the worker's end and says how it ended.
   ProgramError describeEnd();
+  /// Takes what the worker made. An error when others could still change it.
+  std::variant<HandedOver, ProgramError> takeOver(std::string proposal);
   void end();
 
   WorkerFunction function_;
   StopSignals& stop_;
-  StopGrace grace_;
+  WorkerRights rights_;
   std::optional<FileDescriptor> memoryFile_;
   std::optional<FileDescriptor> socket_;
   std::optional<FileDescriptor> process_;
   pid_t child_ = -1;
+  /// None for a worker with the rights of the host.
+  std::optional<ProcessLimits> limits_;
   /// Whether the worker has said all.
   bool isDone_ = false;
   std::string announcements_;

@@ -12,10 +12,14 @@ PropertyDictionary SafetyNetFixture::legacyMail() {
            PropertyArray{PropertyDictionary{{"AccountType", "IMAPAccount"}, {"uniqueId", "M"}}}}};
 }
 
-ProgramResult SafetyNetFixture::migrateMisbehaving(const std::string& behaviour) const {
+ProgramCall SafetyNetFixture::misbehavingCall(const std::string& behaviour) const {
   ProgramCall call = migrationCall({"--plugin", MISBEHAVING_BUNDLE, "--json"});
   call.environment["MISBEHAVIOUR"] = behaviour;
-  return runProgram(call);
+  return call;
+}
+
+ProgramResult SafetyNetFixture::migrateMisbehaving(const std::string& behaviour) const {
+  return runProgram(misbehavingCall(behaviour));
 }
 
 ProgramResult SafetyNetFixture::restore(std::vector<std::string> arguments) const {

@@ -20,6 +20,7 @@ class SafetyNetFixture : public DeviceRootFixture {
 
   /// Runs a plug-in that misbehaves in a way of tests/program/plugins/MisbehavingPlugin.cpp.
   [[nodiscard]] ProgramResult migrateMisbehaving(const std::string& behaviour) const;
+  [[nodiscard]] ProgramCall misbehavingCall(const std::string& behaviour) const;
   /// Runs `migration-host restore --root` on the root with further arguments.
   [[nodiscard]] ProgramResult restore(std::vector<std::string> arguments = {}) const;
 

@@ -1,7 +1,10 @@
+#include <fcntl.h>
+#include <poll.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
+#include <array>
 #include <csignal>
 #include <filesystem>
 #include <functional>
@@ -12,6 +15,27 @@
 
 namespace accounts {
 namespace {
+
+enum class Heard : std::uint8_t { Text, End, NothingForLong };
+
+/// Reads until a text has come, or until everyone who could write it has gone.
+Heard readUntil(int descriptor, const std::string& text) {
+  constexpr int kLong = 20'000;  // milliseconds
+  std::string all;
+  std::array<char, 256> block{};
+  while (all.find(text) == std::string::npos) {
+    pollfd readable = {descriptor, POLLIN, 0};
+    if (poll(&readable, 1, kLong) <= 0) {
+      return Heard::NothingForLong;
+    }
+    const ssize_t count = read(descriptor, block.data(), block.size());
+    if (count <= 0) {
+      return Heard::End;
+    }
+    all.append(block.data(), static_cast<std::size_t>(count));
+  }
+  return Heard::Text;
+}
 
 /// What the host keeps, verifies and puts back around the plug-in.
 using SafetyNet = SafetyNetFixture;
@@ -151,7 +175,16 @@ TEST_F(SafetyNet, AHostThatIsKilledWhileThePluginRunsChangesNothing) {
   write(kSettingsPath, accountSettings(12));
   write(kLegacyMailPath, legacyMail());
 
-  EXPECT_EQ(migrateMisbehaving("lose mail and kill the host").exitStatus, -SIGKILL);
+  std::array<int, 2> output{};
+  ASSERT_EQ(pipe2(output.data(), O_CLOEXEC), 0);
+  const pid_t host = startProgram(misbehavingCall("lose mail and wait"), output[1], output[1]);
+  close(output[1]);
+  EXPECT_EQ(readUntil(output[0], "waiting\n"), Heard::Text);
+  kill(host, SIGKILL);
+  EXPECT_EQ(waitForEnd(host, std::chrono::seconds(60)), SIGKILL);
+  // The worker, which has the other end, too, is gone when that is closed.
+  EXPECT_EQ(readUntil(output[0], "more than the worker says"), Heard::End);
+  close(output[0]);
 
   EXPECT_EQ(readDictionary(kLegacyMailPath), legacyMail());
   EXPECT_FALSE(exists(kAccountMigration));

@@ -1,0 +1,22 @@
+#pragma once
+
+#include <cstdint>
+
+#include "platform/linux/Confinement.h"
+
+namespace accounts {
+
+/// What a worker may use for input files of a size, all together: several times what a migration of
+/// any device of that size takes in the slowest build, and an end for what grows without end.
+constexpr ProcessLimits workerLimitsFor(std::uint64_t inputSize) {
+  constexpr std::uint64_t kMebibyte = std::uint64_t{1} << 20;
+  constexpr std::uint64_t kMemoryForAnyInput = 256 * kMebibyte;
+  constexpr std::uint64_t kMemoryForAByte = 256;
+  constexpr std::uint64_t kSecondsForAnyInput = 5;
+  constexpr std::uint64_t kSecondsForAMebibyte = 20;
+  return {.memory = kMemoryForAnyInput + inputSize * kMemoryForAByte,
+          .processorTime = std::chrono::seconds(kSecondsForAnyInput +
+                                                inputSize * kSecondsForAMebibyte / kMebibyte)};
+}
+
+}  // namespace accounts
