@@ -62,8 +62,9 @@ SharedBytes SharedBytesArena::make(std::string_view bytes) {
   const std::size_t size =
       (sizeof(SharedBytes::Node) + bytes.size() + kAlignment - 1) / kAlignment * kAlignment;
   if (freeSize_ < size) {
-    releaseBlock(block_);
+    // First of all, since it may fail: the old block is still the arena's then.
     char* const memory = static_cast<char*>(::operator new(kBlockSize));
+    releaseBlock(block_);
     block_ = new (memory) SharedBytes::Block;
     free_ = memory + sizeof(SharedBytes::Block);
     freeSize_ = kBlockSize - sizeof(SharedBytes::Block);

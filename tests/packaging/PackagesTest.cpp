@@ -11,8 +11,8 @@ namespace fs = std::filesystem;
 
 TEST_F(InstalledPackages, NeedTheLibrariesOfTheProgramsAndNothingElse) {
   const std::string depends = field("accounts-migration", "Depends");
-  for (const char* library : {"libc6 (>= ", "libexpat1 (>= ", "libseccomp2 (>= ", "libstdc++6 (>= ",
-                              "libuuid1 (>= "}) {
+  for (const char* library :
+       {"libc6 (>= ", "libexpat1 (>= ", "libseccomp2 (>= ", "libstdc++6 (>= ", "libuuid1 (>= "}) {
     EXPECT_NE(depends.find(library), std::string::npos) << depends;
   }
   EXPECT_EQ(depends.find("-dev"), std::string::npos) << depends;
