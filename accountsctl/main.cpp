@@ -1,9 +1,11 @@
 #include <cstdlib>
+#include <new>
 #include <string>
 #include <variant>
 
 #include "accountsctl/CommandLine.h"
 #include "accountsctl/JSONText.h"
+#include "commandline/MemoryReserve.h"
 #include "commandline/StandardStreams.h"
 #include "commandline/Terminal.h"
 
@@ -46,9 +48,17 @@ std::string errorObject(const CommandLine& commandLine, const ProgramError& erro
   return lineOf(std::move(object), error.exitStatus);
 }
 
+/// What a command came to; want of memory is an error like another.
+CommandResult resultOf(const CommandLine& commandLine) {
+  try {
+    return std::visit([](const auto& asked) { return runCommand(asked); }, commandLine.asked);
+  } catch (const std::bad_alloc&) {
+    return outOfMemory();
+  }
+}
+
 ExitStatus run(const CommandLine& commandLine) {
-  const CommandResult result =
-      std::visit([](const auto& asked) { return runCommand(asked); }, commandLine.asked);
+  const CommandResult result = resultOf(commandLine);
   if (const auto* error = std::get_if<ProgramError>(&result)) {
     printError(kProgramName, error->message);
     return commandLine.wantsJSON ? printResult(kProgramName, errorObject(commandLine, *error),
@@ -64,5 +74,11 @@ ExitStatus run(const CommandLine& commandLine) {
 
 int main(int argumentCount, char** arguments) {
   accounts::prepareStandardStreams();
-  return static_cast<int>(accounts::run(accounts::parseCommandLine(argumentCount, arguments)));
+  accounts::endWhereMemoryIsWanted(accounts::kProgramName);
+  try {
+    return static_cast<int>(accounts::run(accounts::parseCommandLine(argumentCount, arguments)));
+  } catch (const std::bad_alloc&) {
+    accounts::printError(accounts::kProgramName, accounts::outOfMemory().message);
+    return static_cast<int>(accounts::outOfMemory().exitStatus);
+  }
 }

@@ -2,6 +2,7 @@
 
 #include <dlfcn.h>
 
+#include <new>
 #include <string>
 #include <system_error>
 
@@ -10,6 +11,16 @@ namespace {
 
 constexpr const char* kPluginName = "AccountsDataMigrator.so";
 constexpr const char* kEntryPointName = "CreateMigrationPlugin";
+
+/// Throws std::bad_alloc when there is no room to load a file. The loader does not tell that from a
+/// file that cannot be loaded.
+void requireMemoryFor(const std::filesystem::path& library) {
+  constexpr std::size_t kBeside = std::size_t{1} << 20;
+  std::error_code error;
+  const std::uintmax_t size = std::filesystem::file_size(library, error);
+  const std::size_t room = (error ? 0 : 2 * static_cast<std::size_t>(size)) + kBeside;
+  const std::unique_ptr<char[]> probe(new char[room]);
+}
 
 ProgramError missing(const std::string& message) {
   return ProgramError{ExitStatus::MissingInput, message};
@@ -39,6 +50,7 @@ std::variant<LoadedPlugin, ProgramError> PluginBundle::load() const {
   // Never closed: objects of the plug-in may live as long as the process.
   void* const library = dlopen(plugin().c_str(), RTLD_NOW | RTLD_LOCAL);
   if (library == nullptr) {
+    requireMemoryFor(plugin());
     return missing("The plug-in cannot be loaded: " + std::string(dlerror()));
   }
   // dlsym() gives functions as object pointers; POSIX promises that this conversion works.

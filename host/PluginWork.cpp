@@ -3,12 +3,14 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <cerrno>
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
 #include <iostream>
 #include <limits>
 #include <memory>
+#include <new>
 #include <utility>
 #include <variant>
 
@@ -191,6 +193,9 @@ void giveUpRights(const PluginWork& work, const WorkerSide& side) {
     kept.journalEntries = JournalEntries::Sent;
   }
   if (const auto error = accounts::giveUpRights(kept)) {
+    if (error->number == ENOMEM) {
+      throw std::bad_alloc();
+    }
     static_cast<void>(sendFrame(side.socket, FrameKind::Fault, error->text));
     _exit(static_cast<int>(ExitStatus::PluginEnded));
   }

@@ -7,6 +7,7 @@
 #include <utility>
 #include <variant>
 
+#include "commandline/MemoryReserve.h"
 #include "commandline/StandardStreams.h"
 #include "host/Announcements.h"
 #include "host/CommandLine.h"
@@ -115,10 +116,16 @@ class OpenedRun {
             .places = places_,
             .files = linux_.fileSystem(),
             .makeWorker = [this] { return makeWorker(); },
-            .isStopped = [this] { return stop_.haveArrived(); },
+            .isStopped = [this] { return isStoppedBeforeCommit(); },
             .tell = [this](std::string_view line) { tellOfAttempt(line); },
             .time = currentTimeText(),
             .lockTimeout = options_.device.lockTimeout};
+  }
+
+  /// What is begun after this is brought to its end.
+  bool isStoppedBeforeCommit() {
+    MemoryReserve::requireUntouched();
+    return stop_.haveArrived();
   }
 
   /// In both logs, so that their lines of an attempt that counts for nothing are not taken for

@@ -1,7 +1,9 @@
 #include <cstdlib>
+#include <new>
 #include <string>
 #include <variant>
 
+#include "commandline/MemoryReserve.h"
 #include "commandline/StandardStreams.h"
 #include "commandline/Terminal.h"
 #include "host/CommandLine.h"
@@ -35,13 +37,31 @@ ExitStatus finish(const RequestedText& requested, const CommandLine& /*commandLi
   return printResult(kProgramName, requested.text, ExitStatus::Success);
 }
 
-ExitStatus finish(const UnusableArguments& unusable, const CommandLine& commandLine) {
+/// Tells of an error that kept everything from being done.
+ExitStatus finish(const ProgramError& error, const CommandLine& commandLine) {
   RunReport report;
   report.root = commandLine.root;
-  setError(report, ProgramError{ExitStatus::UnusableArguments, unusable.message});
-  printError(kProgramName, unusable.message);
+  setError(report, error);
+  printError(kProgramName, error.message);
   return printResult(kProgramName, commandLine.wantsJSON ? jsonText(report) + "\n" : "",
                      report.exitStatus);
+}
+
+ExitStatus finish(const UnusableArguments& unusable, const CommandLine& commandLine) {
+  return finish(ProgramError{ExitStatus::UnusableArguments, unusable.message}, commandLine);
+}
+
+ExitStatus run(int argumentCount, char** arguments) {
+  CommandLine commandLine;
+  try {
+    const MemoryReserve reserve;
+    commandLine = parseCommandLine(argumentCount, arguments);
+    return std::visit([&](const auto& asked) { return finish(asked, commandLine); },
+                      commandLine.asked);
+  } catch (const std::bad_alloc&) {
+    // What was begun is taken apart, and the memory free.
+    return finish(outOfMemory(), commandLine);
+  }
 }
 
 }  // namespace
@@ -50,7 +70,6 @@ ExitStatus finish(const UnusableArguments& unusable, const CommandLine& commandL
 int main(int argumentCount, char** arguments) {
   // A reader of the log that goes away must not end a migration halfway.
   accounts::prepareStandardStreams();
-  const accounts::CommandLine commandLine = accounts::parseCommandLine(argumentCount, arguments);
-  return static_cast<int>(std::visit(
-      [&](const auto& asked) { return accounts::finish(asked, commandLine); }, commandLine.asked));
+  accounts::endWhereMemoryIsWanted(accounts::kProgramName);
+  return static_cast<int>(accounts::run(argumentCount, arguments));
 }

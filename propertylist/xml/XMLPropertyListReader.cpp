@@ -1,6 +1,7 @@
 #include <expat.h>
 
 #include <memory>
+#include <new>
 #include <string>
 
 #include "propertylist/xml/XMLPropertyList.h"
@@ -20,8 +21,7 @@ class Reader {
 
   std::optional<PropertyValue> read() {
     if (!parser_) {
-      error_.text = "XML property list: no memory for the parser";
-      return std::nullopt;
+      throw std::bad_alloc();
     }
     XML_SetUserData(parser_.get(), this);
     XML_SetElementHandler(parser_.get(), onStart, onEnd);
@@ -52,6 +52,11 @@ class Reader {
       const XML_Status status =
           XML_Parse(parser_.get(), chunk.data(), static_cast<int>(chunk.size()), isLast ? 1 : 0);
       if (status != XML_STATUS_OK) {
+        // The file is not to blame.
+        if (isOutOfMemory_ ||
+            (!hasFailed_ && XML_GetErrorCode(parser_.get()) == XML_ERROR_NO_MEMORY)) {
+          throw std::bad_alloc();
+        }
         fail(XML_ErrorString(XML_GetErrorCode(parser_.get())));
       }
     }
@@ -71,38 +76,54 @@ class Reader {
     XML_StopParser(parser_.get(), XML_FALSE);
   }
 
-  static Reader& readerOf(void* userData) { return *static_cast<Reader*>(userData); }
-
-  static void onStart(void* userData, const char* name, const char** attributes) {
-    Reader& reader = readerOf(userData);
-    if (*attributes != nullptr && reader.currentEventHasReference()) {
-      reader.fail("a reference to an entity within a tag");
-    } else {
-      reader.pass(reader.hasFailed_ || reader.builder_.start(name));
+  /// Runs what handles an event. Expat is written in C: an exception that went through it would
+  /// leave its memory in disorder.
+  template <class Handler>
+  static void handle(void* userData, Handler handler) {
+    auto& reader = *static_cast<Reader*>(userData);
+    try {
+      handler(reader);
+    } catch (const std::bad_alloc&) {
+      reader.isOutOfMemory_ = true;
+      reader.hasFailed_ = true;
+      XML_StopParser(reader.parser_.get(), XML_FALSE);
     }
   }
 
+  static void onStart(void* userData, const char* name, const char** attributes) {
+    handle(userData, [&](Reader& reader) {
+      if (*attributes != nullptr && reader.currentEventHasReference()) {
+        reader.fail("a reference to an entity within a tag");
+      } else {
+        reader.pass(reader.hasFailed_ || reader.builder_.start(name));
+      }
+    });
+  }
+
   static void onEnd(void* userData, const char*) {
-    Reader& reader = readerOf(userData);
-    reader.pass(reader.hasFailed_ || reader.builder_.end());
+    handle(userData,
+           [](Reader& reader) { reader.pass(reader.hasFailed_ || reader.builder_.end()); });
   }
 
   static void onCharacters(void* userData, const char* characters, int count) {
-    Reader& reader = readerOf(userData);
     const std::string_view text(characters, static_cast<std::size_t>(count));
-    reader.pass(reader.hasFailed_ || reader.builder_.addCharacters(text));
+    handle(userData, [text](Reader& reader) {
+      reader.pass(reader.hasFailed_ || reader.builder_.addCharacters(text));
+    });
   }
 
   // Refusing the declaration keeps entities from ever being expanded or fetched.
   static void onEntityDeclaration(void* userData, const char*, int, const char*, int, const char*,
                                   const char*, const char*, const char*) {
-    readerOf(userData).fail("a declaration of an entity");
+    handle(userData, [](Reader& reader) { reader.fail("a declaration of an entity"); });
   }
 
   // With a document type that lies outside the file, expat takes unknown entities for declared
   // there.
   static void onSkippedEntity(void* userData, const char*, int) {
-    readerOf(userData).fail("a reference to an entity that is not one of XML's own five");
+    handle(userData, [](Reader& reader) {
+      reader.fail("a reference to an entity that is not one of XML's own five");
+    });
   }
 
   void pass(bool isGood) {
@@ -123,6 +144,7 @@ class Reader {
   std::unique_ptr<XML_ParserStruct, ParserDeleter> parser_;
   ValueBuilder builder_;
   bool hasFailed_ = false;
+  bool isOutOfMemory_ = false;
 };
 
 }  // namespace

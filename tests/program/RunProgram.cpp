@@ -5,6 +5,7 @@
 #include <gtest/gtest.h>
 #include <poll.h>
 #include <sys/mman.h>
+#include <sys/resource.h>
 #include <sys/syscall.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -44,6 +45,11 @@ bool becomeUser(uid_t user) {
   return setgroups(0, nullptr) == 0 && setgid(user) == 0 && setuid(user) == 0;
 }
 
+bool takeAtMost(std::uint64_t memory) {
+  const rlimit limit = {.rlim_cur = memory, .rlim_max = memory};
+  return setrlimit(RLIMIT_AS, &limit) == 0;
+}
+
 }  // namespace
 
 std::vector<std::string> ProgramResult::outputLines() const {
@@ -74,7 +80,8 @@ void becomeProgram(const ProgramCall& call, int output, int errors) {
   }
   arguments.push_back(nullptr);
   const bool isThere = !call.directory || chdir(call.directory->c_str()) == 0;
-  if (isThere && (!call.user || becomeUser(*call.user))) {
+  if (isThere && (!call.user || becomeUser(*call.user)) &&
+      (!call.memory || takeAtMost(*call.memory))) {
     execvp(call.program.c_str(), arguments.data());
   }
   _exit(kCannotStart);

@@ -23,6 +23,8 @@ struct ProgramCall {
   std::optional<std::string> directory = {};
   /// Where standard output goes instead of into the result.
   std::optional<std::string> outputFile = {};
+  /// The address space that it may take, in bytes; none for as much as the test has.
+  std::optional<std::uint64_t> memory = {};
   /// How long it may take. Generous, for machines that are busy: it only has to tell a program that
   /// waits for something that never happens from one that works.
   std::chrono::seconds timeLimit = std::chrono::seconds(60);

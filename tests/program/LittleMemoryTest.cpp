@@ -1,0 +1,154 @@
+#include <gtest/gtest.h>
+
+#include <iostream>
+
+#include "propertylist/xml/XMLPropertyList.h"
+#include "tests/program/DeviceRootFixture.h"
+#include "tests/program/DeviceTree.h"
+#include "tests/program/ExitStatuses.h"
+#include "tests/program/Programs.h"
+#include "tests/program/Sanitizers.h"
+
+// Every program and subcommand with ever more memory, from too little to start to enough.
+
+namespace accounts {
+namespace {
+
+constexpr std::uint64_t kKibibyte = 1024;
+/// Between two limits that are tried.
+constexpr std::uint64_t kStep = 192 * kKibibyte;
+constexpr int kMostSteps = 400;
+constexpr int kAccounts = 400;
+
+enum class Format : std::uint8_t { XML, Binary };
+
+struct Use {
+  std::string name;
+  bool isHost = false;
+  /// ROOT and FILE stand for the device's root and its settings file.
+  std::vector<std::string> arguments;
+};
+
+void PrintTo(const Use& use, std::ostream* stream) {
+  *stream << use.name;
+}
+
+class LittleMemory : public DeviceRootFixture,
+                     public testing::WithParamInterface<std::tuple<Use, Format>> {
+ protected:
+  LittleMemory() : DeviceRootFixture(Medium::Memory) { makeSettings(); }
+
+  void makeSettings() const {
+    PropertyArray accounts;
+    for (int number = 0; number < kAccounts; ++number) {
+      accounts.append(PropertyDictionary{{"Type", "CalDAV"},
+                                         {"Class", "CalDAVAccount"},
+                                         {"Identifier", "ID" + std::to_string(number)},
+                                         {"Username", "user" + std::to_string(number)},
+                                         {"Notes", std::string(1000, 'n')}});
+    }
+    const PropertyDictionary settings = accountSettings(11, std::move(accounts));
+    if (std::get<Format>(GetParam()) == Format::Binary) {
+      write(kSettingsPath, settings);
+    } else {
+      PropertyListError error;
+      writeText(kSettingsPath, writeXMLPropertyList(settings, error).value());
+    }
+  }
+
+  [[nodiscard]] ProgramCall call(std::optional<std::uint64_t> memory) const {
+    const Use& use = std::get<Use>(GetParam());
+    ProgramCall call = {.program = use.isHost ? migrationHost() : accountsctl(),
+                        .arguments = use.arguments,
+                        .memory = memory};
+    for (std::string& argument : call.arguments) {
+      if (argument == "ROOT") {
+        argument = root();
+      } else if (argument == "FILE") {
+        argument = onThisMachine(kSettingsPath).string();
+      }
+    }
+    return call;
+  }
+
+  [[nodiscard]] static bool takesLittle() {
+    return std::get<Format>(GetParam()) == Format::Binary ||
+           std::get<Use>(GetParam()).name == "RestoreList";
+  }
+
+  /// The least memory with which the program starts: the system's own loader speaks before.
+  [[nodiscard]] std::uint64_t leastMemory() const {
+    std::uint64_t memory = 4096 * kKibibyte;
+    ProgramCall version = call(memory);
+    version.arguments = {"--version"};
+    while (runProgram(version).exitStatus != 0) {
+      memory += kStep;
+      version.memory = memory;
+    }
+    return memory;
+  }
+};
+
+TEST_P(LittleMemory, EndsWithOneClearLineOrAsWithEnough) {
+  if (kWithSanitizers) {
+    GTEST_SKIP() << "Sanitizers take address space without end.";
+  }
+  const bool isRun = std::get<Use>(GetParam()).arguments.front() == "run";
+  const ProgramResult enough = runProgram(call(std::nullopt));
+  if (isRun) {
+    makeSettings();
+  }
+  const std::string before = readText(kSettingsPath);
+  std::uint64_t memory = leastMemory();
+  int failures = 0;
+  for (int step = 0; step < kMostSteps; ++step, memory += kStep) {
+    const ProgramResult result = runProgram(call(memory));
+    if (result.exitStatus == enough.exitStatus) {
+      if (!std::get<Use>(GetParam()).isHost) {
+        EXPECT_EQ(result.output, enough.output);
+      }
+      std::cout << failures << " limits too low\n";
+      // Some take no more than starting.
+      EXPECT_TRUE(failures > 0 || takesLittle());
+      return;
+    }
+    ++failures;
+    SCOPED_TRACE(std::to_string(memory / kKibibyte) + " KiB");
+    EXPECT_EQ(result.exitStatus, kMayPass) << result.errors;
+    std::size_t lines = 0;
+    for (const std::string& line : result.errorLines()) {
+      const bool isOfTheProgram =
+          line.starts_with("migration-host: ") || line.starts_with("accountsctl: ");
+      lines += isOfTheProgram ? 1 : 0;
+      EXPECT_TRUE(!isOfTheProgram || line.find("memory") != std::string::npos) << line;
+    }
+    EXPECT_EQ(lines, 1u) << result.errors;
+    EXPECT_EQ(readText(kSettingsPath), before);
+    if (HasFailure()) {
+      return;
+    }
+  }
+  ADD_FAILURE() << "no limit was enough";
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    Uses, LittleMemory,
+    testing::Combine(
+        testing::Values(Use{"Run", true, {"run", "--root", "ROOT"}},
+                        Use{"Plan", true, {"plan", "--root", "ROOT"}},
+                        Use{"PlanAsJSON", true, {"plan", "--root", "ROOT", "--json"}},
+                        Use{"RestoreList", true, {"restore", "--root", "ROOT", "--list"}},
+                        Use{"Show", false, {"show", "FILE"}},
+                        Use{"ShowAsJSON", false, {"show", "FILE", "--json"}},
+                        Use{"Check", false, {"check", "FILE"}},
+                        Use{"Convert", false, {"convert", "FILE", "-", "--to", "xml"}},
+                        Use{"Diff", false, {"diff", "FILE", "FILE"}},
+                        Use{"Status", false, {"status", "--root", "ROOT"}}),
+        testing::Values(Format::XML, Format::Binary)),
+    [](const auto& information) {
+      return std::get<Use>(information.param).name +
+             (std::get<Format>(information.param) == Format::XML ? "OfXML" : "OfBinary");
+    });
+
+}  // namespace
+}  // namespace accounts
