@@ -40,6 +40,9 @@ struct PlaceOutcome {
 class StagedFile {
  public:
   virtual ~StagedFile() = default;
+
+  /// What it is, whatever name it has.
+  FileIdentity identity;
 };
 
 /// What a new file is made of.

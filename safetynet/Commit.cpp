@@ -1,8 +1,10 @@
 #include "safetynet/Commit.h"
 
+#include <algorithm>
 #include <array>
 #include <utility>
 
+#include "safetynet/CommitRecord.h"
 #include "safetynet/PlaceErrors.h"
 
 namespace accounts {
@@ -17,13 +19,6 @@ constexpr std::array kKeptPlaces = {
     DevicePlace::LegacyMail,      DevicePlace::LegacyExchangeOriginal,
     DevicePlace::CopyAside,       DevicePlace::LegacyMailOriginal,
     DevicePlace::AutoFetchEnabled};
-
-/// The legacy stores, in the order in which they are removed.
-constexpr std::array kRemovedStores = {DevicePlace::LegacyExchange, DevicePlace::LegacyMail};
-
-/// The copies that go with them.
-constexpr std::array kOriginals = {DevicePlace::LegacyExchangeOriginal,
-                                   DevicePlace::LegacyMailOriginal};
 
 /// Text as bytes to read.
 class TextBytes final : public ReadableBytes {
@@ -92,7 +87,8 @@ std::optional<CommitOutcome> Commit::replaceSettings() {
   const ProposedChange* const change = proposal_.changeOf(DevicePlace::Settings);
   std::unique_ptr<StagedFile> staged;
   if (change != nullptr) {
-    auto made = stage(*change);
+    const auto contents = contentsOf_(*change);
+    auto made = places_.stage(change->place, {.contents = contents.get(), .owner = change->owner});
     if (const auto* failure = std::get_if<PlaceFailure>(&made)) {
       return failed(writingError("The settings file cannot be written", *failure));
     }
@@ -181,36 +177,30 @@ std::optional<CommitOutcome> Commit::writeRecord() {
   if (const Result made = folders_.makeDirectory(); !made) {
     return failed(writingError(kOperation, placeFailureOf(made)));
   }
-  if (!isWritten) {
-    // That of an earlier run, which may have been killed before it was on the medium.
-    const auto failure = places_.flush(DevicePlace::CommitRecord);
-    return failure ? std::optional(failed(writingError(kOperation, *failure))) : std::nullopt;
+  if (isWritten) {
+    const auto contents = contentsOf_(*change);
+    const PlaceOutcome written =
+        write(change->place, {.contents = contents.get(), .owner = change->owner}, record_);
+    if (!written.isDone()) {
+      return refused(kOperation, written);
+    }
   }
-  auto made = stage(*change);
-  if (const auto* failure = std::get_if<PlaceFailure>(&made)) {
-    return failed(writingError(kOperation, *failure));
-  }
-  const PlaceOutcome put =
-      places_.put(DevicePlace::CommitRecord, *std::get<std::unique_ptr<StagedFile>>(made),
-                  identity(DevicePlace::CommitRecord));
-  if (!put.isDone()) {
-    return refused(kOperation, put);
-  }
-  const auto written = places_.identityAt(DevicePlace::CommitRecord);
-  if (const auto* failure = std::get_if<PlaceFailure>(&written)) {
-    return failed(readingError(*failure));
-  }
-  record_ = std::get<FileIdentity>(written);
-  if (const auto failure = places_.flush(DevicePlace::CommitRecord)) {
-    return failed(writingError(kOperation, *failure));
-  }
-  return std::nullopt;
+  // That of an earlier run may not be on the medium either, if it was killed.
+  const auto failure = places_.flush(DevicePlace::CommitRecord);
+  return failure ? std::optional(failed(writingError(kOperation, *failure))) : std::nullopt;
 }
 
-std::variant<std::unique_ptr<StagedFile>, PlaceFailure> Commit::stage(
-    const ProposedChange& change) {
-  const std::unique_ptr<ReadableBytes> contents = contentsOf_(change);
-  return places_.stage(change.place, {.contents = contents.get(), .owner = change.owner});
+PlaceOutcome Commit::write(DevicePlace place, const NewFile& file, FileIdentity& written) {
+  auto made = places_.stage(place, file);
+  if (auto* failure = std::get_if<PlaceFailure>(&made)) {
+    return PlaceOutcome::failed(std::move(*failure));
+  }
+  StagedFile& staged = *std::get<std::unique_ptr<StagedFile>>(made);
+  PlaceOutcome outcome = places_.put(place, staged, identity(place));
+  if (outcome.isDone()) {
+    written = staged.identity;
+  }
+  return outcome;
 }
 
 void Commit::undo() {
@@ -225,33 +215,24 @@ void Commit::undo() {
 }
 
 void Commit::removeStores() {
-  bool isAny = false;
-  for (const DevicePlace place : kRemovedStores) {
-    isAny = isAny || removes(place);
-  }
+  const bool isAny = std::ranges::any_of(
+      kLegacyStores, [this](const LegacyStore& each) { return removes(each.store); });
   const FileIdentity& before = identity(DevicePlace::RemovalSentinel);
   FileIdentity sentinel = before;
   if (isAny && !before.exists()) {
     const TextBytes contents(kRemovalSentinelContents);
-    auto made = places_.stage(DevicePlace::RemovalSentinel, {.contents = &contents});
-    if (auto* staged = std::get_if<std::unique_ptr<StagedFile>>(&made)) {
-      static_cast<void>(places_.put(DevicePlace::RemovalSentinel, **staged, before));
-    }
-    // Without it the removal goes on: the record protects it as well.
-    auto now = places_.identityAt(DevicePlace::RemovalSentinel);
-    if (auto* identity = std::get_if<FileIdentity>(&now)) {
-      sentinel = *identity;
-    } else {
-      keepRecord("The removal sentinel may stay: " + std::get<PlaceFailure>(now).text);
+    const PlaceOutcome made =
+        write(DevicePlace::RemovalSentinel, {.contents = &contents}, sentinel);
+    if (!made.isDone()) {
+      // The removal goes on: the record protects it as well.
+      keepRecord("The removal sentinel was not made: " + reasonOf(made));
     }
     flushOrWarn(DevicePlace::RemovalSentinel);
   }
   // What an interrupted run removed may not be on the medium yet.
   const bool followsAnotherRun = before.exists() || identity(DevicePlace::CommitRecord).exists();
   bool storesAreGone = true;
-  for (std::size_t index = 0; index < kRemovedStores.size(); ++index) {
-    const DevicePlace store = kRemovedStores[index];
-    const DevicePlace original = kOriginals[index];
+  for (const auto& [store, original] : kLegacyStores) {
     if (storesAreGone && removes(store)) {
       // Like the migration's own removal, this ends at the first store that stays.
       storesAreGone = removeOrWarn(store);
@@ -300,15 +281,10 @@ void Commit::makeCopyAside() {
   if (settings.contents == nullptr) {
     return;
   }
-  auto made = places_.stage(DevicePlace::CopyAside, {.contents = settings.contents.get(),
-                                                     .permissions = settings.permissions});
-  PlaceOutcome outcome;
-  if (auto* failure = std::get_if<PlaceFailure>(&made)) {
-    outcome = PlaceOutcome::failed(std::move(*failure));
-  } else {
-    outcome = places_.put(DevicePlace::CopyAside, *std::get<std::unique_ptr<StagedFile>>(made),
-                          identity(DevicePlace::CopyAside));
-  }
+  FileIdentity copy;
+  const PlaceOutcome outcome =
+      write(DevicePlace::CopyAside,
+            {.contents = settings.contents.get(), .permissions = settings.permissions}, copy);
   if (!outcome.isDone()) {
     warn("The settings file was not copied aside: " + reasonOf(outcome));
   }

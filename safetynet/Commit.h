@@ -60,7 +60,8 @@ class Commit {
   std::optional<CommitOutcome> whyNotUndisturbed();
   std::optional<CommitOutcome> keepFiles();
   std::optional<CommitOutcome> writeRecord();
-  std::variant<std::unique_ptr<StagedFile>, PlaceFailure> stage(const ProposedChange& change);
+  /// Puts a new file in the place of what the snapshot found there; `written` is that file then.
+  PlaceOutcome write(DevicePlace place, const NewFile& file, FileIdentity& written);
   void undo();
   void removeStores();
   /// Removes what stood at a place; false, with a warning, when that cannot be done.

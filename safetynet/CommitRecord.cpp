@@ -1,7 +1,6 @@
 #include "safetynet/CommitRecord.h"
 
 #include <algorithm>
-#include <array>
 #include <charconv>
 #include <optional>
 
@@ -13,13 +12,6 @@ namespace {
 constexpr std::string_view kFirstLine = "accounts-migration commit record 1\n";
 constexpr std::string_view kLastLine = "end\n";
 constexpr std::string_view kAnySettings = "any";
-constexpr std::array kLegacyStores = {DevicePlace::LegacyExchange, DevicePlace::LegacyMail};
-
-/// The copy of a legacy store that goes with it.
-DevicePlace originalOf(DevicePlace store) {
-  return store == DevicePlace::LegacyMail ? DevicePlace::LegacyMailOriginal
-                                          : DevicePlace::LegacyExchangeOriginal;
-}
 
 void append(std::string& text, std::string_view word) {
   text.append(" ").append(word);
@@ -121,7 +113,8 @@ std::optional<CommitRecord::Store> storeFrom(std::string_view line) {
   Words words(line);
   CommitRecord::Store store;
   const auto place = placeNamed(words.next());
-  if (!place || std::ranges::find(kLegacyStores, *place) == kLegacyStores.end() ||
+  if (!place ||
+      std::ranges::find(kLegacyStores, *place, &LegacyStore::store) == kLegacyStores.end() ||
       !words.nextTrace(store.store) || !words.nextProof(store.proof) || !words.isAtEnd()) {
     return std::nullopt;
   }
@@ -172,9 +165,6 @@ CommitRecord finishInterruptedCommit(Transaction& transaction) {
   }
   const std::optional<std::string> text = transaction.bytesBefore(DevicePlace::CommitRecord);
   const CommitRecord record = CommitRecord::parse(text.value_or(""));
-  const auto traceAt = [&](DevicePlace place) {
-    return CommitRecord::traceOf(transaction.snapshot().at(place).identity);
-  };
   const std::uint64_t size = transaction.snapshot().at(DevicePlace::Settings).identity.size;
   const std::optional<PropertyDictionary> settings =
       transaction.dictionaryBefore(DevicePlace::Settings);
@@ -182,15 +172,19 @@ CommitRecord finishInterruptedCommit(Transaction& transaction) {
     const bool isProved = !each.proof || (each.proof->accounts.empty()
                                               ? each.proof->settingsSize == size
                                               : hasAnyAccount(settings, each.proof->accounts));
-    const bool isCarriedOver = isMigrated(settings) && isProved;
-    if (isCarriedOver && transaction.exists(originalOf(each.place))) {
-      transaction.put(originalOf(each.place), Transaction::Removed{});
+    if (!isMigrated(settings) || !isProved) {
+      continue;
     }
-    const CommitRecord::Trace standing = traceAt(each.place);
-    if (isCarriedOver && standing == each.store) {
+    const DevicePlace original =
+        std::ranges::find(kLegacyStores, each.place, &LegacyStore::store)->original;
+    if (transaction.exists(original)) {
+      transaction.put(original, Transaction::Removed{});
+    }
+    const FileIdentity& standing = transaction.snapshot().at(each.place).identity;
+    if (CommitRecord::traceOf(standing) == each.store) {
       transaction.put(each.place, Transaction::Removed{});
       needed.stores.push_back(each);
-    } else if (isCarriedOver && !standing.exists) {
+    } else if (!standing.exists()) {
       // It may come back until its end is on the medium.
       needed.stores.push_back(each);
     }

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <array>
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -10,6 +11,17 @@
 #include "transaction/Transaction.h"
 
 namespace accounts {
+
+/// A legacy store and the copy of it that goes with it.
+struct LegacyStore {
+  DevicePlace store;
+  DevicePlace original;
+};
+
+/// All of them, in the order in which they are removed.
+inline constexpr std::array kLegacyStores = {
+    LegacyStore{DevicePlace::LegacyExchange, DevicePlace::LegacyExchangeOriginal},
+    LegacyStore{DevicePlace::LegacyMail, DevicePlace::LegacyMailOriginal}};
 
 /// What a commit leaves while it removes legacy stores: which stores it carried over, and what
 /// shows that a settings file has their accounts. The next run knows by it that a store that is

@@ -46,8 +46,19 @@ int renameTo(const StagedName& staged, DirectoryEntry& entry) {
   return number;
 }
 
-bool isInode(const FileIdentity& identity, const struct stat& file) {
-  return identity.exists() && identity.device == file.st_dev && identity.inode == file.st_ino;
+bool isSameInode(const FileIdentity& one, const FileIdentity& other) {
+  return one.exists() && one.device == other.device && one.inode == other.inode;
+}
+
+/// Writes all into a new file.
+std::optional<PlaceFailure> writeContents(const ReadableBytes& contents, const FileDescriptor& file,
+                                          std::string_view path) {
+  int number = 0;
+  auto failure = contents.giveTo([&](std::string_view piece) {
+    number = writeAll(file.number(), piece);
+    return number == 0;
+  });
+  return number == 0 ? failure : placeFailure("write", path, number);
 }
 
 /// A file that has a name of its own beside its place.
@@ -66,14 +77,13 @@ class StagedEntry final : public StagedFile {
   DirectoryEntry entry;
   /// Open, and so locked as a temporary file is.
   FileDescriptor file;
-  struct stat status = {};
   bool isThere = true;
 };
 
 /// Exchanges what the name of a place and `own` beside it have until what comes out is what was put
 /// in the place before: `lastPut` was, and `inHand`, which another program wrote, came out. What
-/// is newest stands at the place afterwards, and `own` is free. Whoever writes again and again
-/// without end keeps its file there.
+/// is newest stands at the place afterwards, and `own` is free. While another program writes again
+/// and again without end, a file stays under `own`, which the next run deals with.
 void handBack(DevicePlace place, DirectoryEntry& own, const char* name, FileIdentity lastPut,
               FileIdentity inHand) {
   const int directory = own.directory();
@@ -115,30 +125,24 @@ std::variant<std::unique_ptr<StagedFile>, PlaceFailure> LinuxDevicePlaces::stage
   }
   const int descriptor = made->file.number();
   auto staged = std::make_unique<StagedEntry>(std::move(made->entry), std::move(made->file));
-  int number = 0;
-  std::optional<PlaceFailure> unread = file.contents->giveTo([&](std::string_view piece) {
-    number = writeAll(descriptor, piece);
-    return number == 0;
-  });
-  if (unread) {
-    return *std::move(unread);
+  if (auto failure = writeContents(*file.contents, staged->file, path)) {
+    return *std::move(failure);
   }
   // All by the descriptor: whatever another process puts under the name, only this file changes.
-  if (number == 0 && file.owner && ::fchown(descriptor, file.owner->user, file.owner->group) != 0) {
+  if (file.owner && ::fchown(descriptor, file.owner->user, file.owner->group) != 0) {
     return placeFailure("set the owner of", path, errno);
   }
-  if (number == 0 && ::fchmod(descriptor, file.permissions & kPermissionBits) != 0) {
+  if (::fchmod(descriptor, file.permissions & kPermissionBits) != 0) {
     return placeFailure("set the permissions of", path, errno);
   }
-  if (number == 0) {
-    number = accounts::flush(staged->file);
-  }
-  if (number == 0 && ::fstat(descriptor, &staged->status) != 0) {
-    number = errno;
-  }
-  if (number != 0) {
+  if (const int number = accounts::flush(staged->file); number != 0) {
     return placeFailure("write", path, number);
   }
+  const auto status = fileStatus(staged->file, path, error);
+  if (!status) {
+    return placeFailure(error);
+  }
+  staged->identity = identityOf(*status);
   return staged;
 }
 
@@ -161,7 +165,7 @@ std::variant<std::unique_ptr<StagedFile>, PlaceFailure> LinuxDevicePlaces::stage
     return placeFailure(error);
   }
   auto staged = std::make_unique<StagedEntry>(std::move(*entry), std::move(*file));
-  staged->status = *status;
+  staged->identity = identityOf(*status);
   return staged;
 }
 
@@ -174,7 +178,7 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
     // It could be exchanged, but not be removed afterwards.
     return PlaceOutcome::failed(placeFailure("replace", path, EISDIR));
   }
-  const FileIdentity made = identityOf(staged.status);
+  const FileIdentity& made = staged.identity;
   if (const int number = renameTo({place, markOf(made), markOf(expected)}, staged.entry);
       number != 0) {
     return PlaceOutcome::failed(placeFailure("rename a file to", path, number));
@@ -191,7 +195,7 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
     }
     staged.isThere = false;
     const std::optional<FileIdentity> in = entryIn(directory, name.c_str());
-    return !in || isInode(*in, staged.status) ? PlaceOutcome::done() : PlaceOutcome::overtaken();
+    return !in || isSameInode(*in, made) ? PlaceOutcome::done() : PlaceOutcome::overtaken();
   }
   if (::renameat2(directory, own, directory, name.c_str(), RENAME_EXCHANGE) != 0) {
     if (errno == ENOENT) {
@@ -201,7 +205,7 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
       return PlaceOutcome::failed(placeFailure("exchange a file with", path, errno));
     }
     // The window that is left: what another program puts there from here on is replaced.
-    if (!isInode(identityIn(directory, own), staged.status) ||
+    if (!isSameInode(identityIn(directory, own), made) ||
         !identityIn(directory, name.c_str()).isSameFileAs(expected)) {
       return PlaceOutcome::disturbed();
     }
@@ -222,7 +226,7 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
     return PlaceOutcome::overtaken();
   }
   const std::optional<FileIdentity> in = entryIn(directory, name.c_str());
-  if (in && !isInode(*in, staged.status)) {
+  if (in && !isSameInode(*in, made)) {
     // Another file took the place at once, or took the staged name just before. The first is the
     // newest and stays; the second, which shows in its further name, must not stay.
     struct stat other = {};
@@ -333,20 +337,14 @@ std::optional<PlaceFailure> LinuxDevicePlaces::writeInformationFile(std::string_
   if (!temporary) {
     return placeFailure(error);
   }
-  int number = 0;
-  std::optional<PlaceFailure> failure = contents.giveTo([&](std::string_view piece) {
-    number = writeAll(temporary->file.number(), piece);
-    return number == 0;
-  });
-  if (!failure && number == 0) {
-    number = accounts::flush(temporary->file);
-  }
+  auto failure = writeContents(contents, temporary->file, path);
+  int number = failure ? 0 : accounts::flush(temporary->file);
   if (!failure && number == 0 &&
       ::renameat(temporary->entry.directory(), temporary->entry.name(), entry->directory(),
                  entry->name()) != 0) {
     number = errno;
   }
-  if (!failure && number != 0) {
+  if (number != 0) {
     failure = placeFailure("write", path, number);
   }
   if (failure) {

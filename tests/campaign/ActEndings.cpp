@@ -1,6 +1,6 @@
 #include "tests/campaign/ActEndings.h"
 
-#include "tests/campaign/DeviceProcess.h"
+#include "tests/campaign/LegacyStores.h"
 #include "tests/campaign/Run.h"
 
 namespace accounts {
@@ -32,15 +32,7 @@ Ending ActEndings::before(const NamedAct& act, std::size_t times, SimulatedDisk 
 
 Ending ActEndings::withoutGoneStores(const NamedAct& act, std::size_t times,
                                      const SimulatedDisk& other) {
-  SimulatedDisk disk = scenario_.disk;
-  for (const DevicePlace place : {DevicePlace::LegacyExchange, DevicePlace::LegacyExchangeOriginal,
-                                  DevicePlace::LegacyMail, DevicePlace::LegacyMailOriginal}) {
-    const std::string path = pathOfPlace(place, kHome);
-    if (!other.exists(path)) {
-      disk.removeFile(path);
-    }
-  }
-  return before(act, times, std::move(disk));
+  return before(act, times, withoutStoresGoneFrom(other, scenario_.disk));
 }
 
 /// Up to a number of times the program acts before an undisturbed run and then, when it may have

@@ -20,11 +20,17 @@
 #include "platform/linux/LinuxPropertyLists.h"
 #include "platform/linux/LinuxSharedResources.h"
 #include "tests/fakes/FakePlatform.h"
+#include "vocabulary/DevicePlaces.h"
 
 namespace accounts {
 
 /// The home directory on every device of the campaign.
 inline constexpr std::string_view kHome = "/var/mobile";
+
+/// Where a place is on them.
+inline std::string pathOf(DevicePlace place) {
+  return pathOfPlace(place, kHome);
+}
 
 /// Remembers what is turned into an account settings file.
 class ObservedPropertyLists final : public PropertyLists {

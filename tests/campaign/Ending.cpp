@@ -12,7 +12,7 @@ Ending endingOf(const SimulatedDisk& disk, ExitStatus exitStatus,
                 const std::set<std::string>& textsBefore) {
   Ending ending;
   ending.exitStatus = exitStatus;
-  if (const auto settings = disk.contentsOf(pathOfPlace(DevicePlace::Settings, kHome))) {
+  if (const auto settings = disk.contentsOf(pathOf(DevicePlace::Settings))) {
     // What is no property list compares by its bytes.
     const auto dictionary = dictionaryIn(*settings);
     ending.settings = dictionary ? withNamedIdentifiers(*dictionary, textsBefore)
@@ -22,8 +22,7 @@ Ending endingOf(const SimulatedDisk& disk, ExitStatus exitStatus,
     // What is for engineers tells of the newest run, whatever there was to do for it.
     const bool isForEngineers =
         each.place == DevicePlace::CopyAside || each.place == DevicePlace::InformationDirectory;
-    if (each.place != DevicePlace::Settings && !isForEngineers &&
-        disk.exists(pathOfPlace(each.place, kHome))) {
+    if (each.place != DevicePlace::Settings && !isForEngineers && disk.exists(pathOf(each.place))) {
       ending.places.insert(each.place);
     }
   }
@@ -43,7 +42,7 @@ std::optional<std::string> differenceOf(const Ending& expected, const Ending& fo
   for (const ListedPlace& each : kDevicePlaces) {
     const bool isExpected = expected.places.contains(each.place);
     if (found.places.contains(each.place) != isExpected) {
-      return (isExpected ? "missing: " : "left: ") + pathOfPlace(each.place, kHome);
+      return (isExpected ? "missing: " : "left: ") + pathOf(each.place);
     }
   }
   return std::nullopt;

@@ -1,10 +1,11 @@
 #include <algorithm>
-#include <array>
 #include <map>
 #include <string>
 
+#include "safetynet/CommitRecord.h"
 #include "tests/campaign/Campaigns.h"
 #include "tests/campaign/KilledDisks.h"
+#include "tests/campaign/LegacyStores.h"
 #include "tests/campaign/SettingsContents.h"
 #include "tests/campaign/TransactionInvariants.h"
 
@@ -16,10 +17,6 @@ constexpr std::size_t kFewestInterludes = 100'000;
 
 constexpr unsigned kSecondRun = 4;
 constexpr unsigned kBareRun = 5;
-
-std::string pathOf(DevicePlace place) {
-  return pathOfPlace(place, kHome);
-}
 
 /// What happens on a device between a run that was killed and the next one.
 enum class Interlude : std::uint8_t {
@@ -92,8 +89,9 @@ class InterruptedScenario {
         rewriteSettings(disk);
         return;
       case Interlude::StoresComeBack:
-        bringBack(disk, DevicePlace::LegacyExchange);
-        bringBack(disk, DevicePlace::LegacyMail);
+        for (const LegacyStore& each : kLegacyStores) {
+          bringBack(disk, each.store);
+        }
         return;
       case Interlude::SettingsComeBack:
         bringBack(disk, DevicePlace::Settings);
@@ -115,18 +113,13 @@ class InterruptedScenario {
   }
 
   void bringBack(SimulatedDisk& disk, DevicePlace place) const {
-    const std::string path = pathOf(place);
-    if (const auto inode = scenario_.disk.find(path)) {
-      const SimulatedInode& before = scenario_.disk.inode(*inode);
-      OtherProgram(disk).restore(path, before.contents, before.modified);
-    }
+    OtherProgram(disk).bringBack(pathOf(place), scenario_.disk);
   }
 
   [[nodiscard]] bool hasAllStores(const SimulatedDisk& disk) const {
-    return std::ranges::all_of(
-        std::array{DevicePlace::LegacyExchange, DevicePlace::LegacyMail}, [&](DevicePlace store) {
-          return disk.exists(pathOf(store)) || !scenario_.disk.exists(pathOf(store));
-        });
+    return std::ranges::all_of(kLegacyStores, [&](const LegacyStore& each) {
+      return disk.exists(pathOf(each.store)) || !scenario_.disk.exists(pathOf(each.store));
+    });
   }
 
   /// How the device must end at last.
@@ -170,17 +163,8 @@ class InterruptedScenario {
           break;
         }
         // What was carried over is lost with the settings file that had it.
-        SimulatedDisk restored = scenario_.disk;
-        std::string name = "without";
-        for (const DevicePlace store :
-             {DevicePlace::LegacyExchange, DevicePlace::LegacyExchangeOriginal,
-              DevicePlace::LegacyMail, DevicePlace::LegacyMailOriginal}) {
-          if (!disk.exists(pathOf(store))) {
-            restored.removeFile(pathOf(store));
-            name.append("-").append(listed(store).name);
-          }
-        }
-        return ending(name, restored);
+        const SimulatedDisk restored = withoutStoresGoneFrom(disk, scenario_.disk);
+        return ending("without-" + std::to_string(restored.fingerprint()), restored);
       }
       default:
         break;

@@ -7,7 +7,7 @@
 namespace accounts {
 
 void Intruder::operator()(OtherProgram& program) {
-  const std::string path = pathOfPlace(act_.place, kHome);
+  const std::string path = pathOf(act_.place);
   switch (act_.act) {
     case Act::Replaces:
       program.replace(path, next(program.disk()));
@@ -22,10 +22,7 @@ void Intruder::operator()(OtherProgram& program) {
       program.remove(path);
       break;
     case Act::BringsBack:
-      if (const auto inode = before_.find(path)) {
-        const SimulatedInode& old = before_.inode(*inode);
-        program.restore(path, old.contents, old.modified);
-      }
+      program.bringBack(path, before_);
       break;
   }
   ++times_;
@@ -33,7 +30,7 @@ void Intruder::operator()(OtherProgram& program) {
 
 std::string Intruder::next(const SimulatedDisk& disk) {
   const std::string identifier = "OTHER-" + std::to_string(times_ + 1);
-  const auto contents = disk.contentsOf(pathOfPlace(act_.place, kHome));
+  const auto contents = disk.contentsOf(pathOf(act_.place));
   std::string& bytes = writings_[{act_.place, contents, identifier}];
   if (bytes.empty()) {
     bytes = with(contents, identifier);

@@ -1,5 +1,7 @@
 #include "tests/campaign/LegacyStores.h"
 
+#include "safetynet/CommitRecord.h"
+#include "tests/campaign/DeviceProcess.h"
 #include "tests/campaign/SettingsContents.h"
 
 namespace accounts {
@@ -17,6 +19,17 @@ std::string withFurther(const std::optional<std::string>& store, std::string_vie
 }
 
 }  // namespace
+
+SimulatedDisk withoutStoresGoneFrom(const SimulatedDisk& other, SimulatedDisk disk) {
+  for (const LegacyStore& each : kLegacyStores) {
+    for (const std::string& path : {pathOf(each.store), pathOf(each.original)}) {
+      if (!other.exists(path)) {
+        disk.removeFile(path);
+      }
+    }
+  }
+  return disk;
+}
 
 std::string withFurtherMailAccount(const std::optional<std::string>& store,
                                    std::string_view identifier) {

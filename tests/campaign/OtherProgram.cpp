@@ -49,10 +49,13 @@ void OtherProgram::remove(std::string_view path) {
   }
 }
 
-void OtherProgram::restore(std::string_view path, std::string contents, std::uint64_t modified) {
-  replace(path, std::move(contents));
-  if (const std::optional<std::size_t> inode = disk_.find(path)) {
-    make_({.kind = Kind::SetModified, .inode = *inode, .modified = modified});
+void OtherProgram::bringBack(std::string_view path, const SimulatedDisk& backup) {
+  if (const std::optional<std::size_t> copied = backup.find(path)) {
+    replace(path, backup.inode(*copied).contents);
+    if (const std::optional<std::size_t> inode = disk_.find(path)) {
+      make_(
+          {.kind = Kind::SetModified, .inode = *inode, .modified = backup.inode(*copied).modified});
+    }
   }
 }
 

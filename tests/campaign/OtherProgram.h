@@ -31,9 +31,9 @@ class OtherProgram {
   void replace(std::string_view path, std::string contents);
   /// Takes a file's name away, if it is there.
   void remove(std::string_view path);
-  /// Puts a file in the place of what is there that says that it was modified when `modified` says,
-  /// as a backup does.
-  void restore(std::string_view path, std::string contents, std::uint64_t modified);
+  /// Puts a copy of the file that another disk has there in the place of what is there, if it has
+  /// one. The copy says that it was modified when the file was, as one from a backup does.
+  void bringBack(std::string_view path, const SimulatedDisk& backup);
 
  private:
   const SimulatedDisk& disk_;

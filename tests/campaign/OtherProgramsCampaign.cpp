@@ -12,6 +12,7 @@
 #include "tests/campaign/KilledDisks.h"
 #include "tests/campaign/SettingsContents.h"
 #include "tests/campaign/TransactionInvariants.h"
+#include "vocabulary/AccountVocabulary.h"
 
 namespace accounts {
 
@@ -22,15 +23,9 @@ constexpr unsigned kNextRun = 2;
 /// So many calls after an act the run is killed at each of them.
 constexpr std::size_t kMostKills = 12;
 
-constexpr std::string_view kRoot = "/";
-constexpr std::string_view kMigrationLock = "/tmp/AccountMigrationInProgress";
 constexpr std::size_t kCallsInVain = 3;
 
 constexpr std::size_t kWithoutEnd = std::numeric_limits<std::size_t>::max();
-
-std::string pathOf(DevicePlace place) {
-  return pathOfPlace(place, kHome);
-}
 
 constexpr NamedAct kActs[] = {
     {"settings-replaced", DevicePlace::Settings, Act::Replaces},
@@ -206,14 +201,13 @@ class DisturbedScenario {
       return;
     }
     std::size_t number = 0;
-    for (const std::string_view path : {kRoot, kMigrationLock}) {
+    for (const char* const path : {"/", kAccountMigrationLockFilename}) {
       if (report_.takes(scenario_.name, number++, std::string(act.name) + "-under-a-lock")) {
         Intruder intruder(act, scenario_.disk, writings_);
         SimulatedDisk disk = scenario_.disk;
-        disk.addFile(kMigrationLock, "");
-        const Run run =
-            runOn(disk, scenario_,
-                  {.otherLock = OtherLock{std::string(path), kCallsInVain, std::ref(intruder)}});
+        disk.addFile(kAccountMigrationLockFilename, "");
+        const Run run = runOn(disk, scenario_,
+                              {.otherLock = OtherLock{path, kCallsInVain, std::ref(intruder)}});
         report_.judge(intruder.times() == 1
                           ? ofEnding({endings_.before(act, 1, std::move(disk))}, run)
                           : "the run did not wait for the lock",

@@ -7,7 +7,7 @@ namespace accounts {
 
 namespace {
 
-constexpr std::size_t kMostComplaintsShown = 100000;
+constexpr std::size_t kMostComplaintsShown = 10;
 
 }  // namespace
 

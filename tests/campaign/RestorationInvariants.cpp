@@ -21,7 +21,7 @@ std::vector<std::string> safeContents(const SimulatedDisk& disk) {
     }
   }
   for (const ListedPlace& each : kDevicePlaces) {
-    const auto standing = disk.contentsOf(pathOfPlace(each.place, kHome));
+    const auto standing = disk.contentsOf(pathOf(each.place));
     if (standing && each.place != DevicePlace::RemovalSentinel &&
         each.place != DevicePlace::CommitRecord) {
       contents.push_back(*standing);
@@ -79,7 +79,7 @@ Complaint RestorationInvariants::ofNextRun(const SimulatedDisk& disk) {
 Complaint RestorationInvariants::judgeNextRun(const SimulatedDisk& disk) const {
   const Run run = runOn(disk, scenario_, {.number = 2});
   for (const ListedPlace& each : kDevicePlaces) {
-    const std::string path = pathOfPlace(each.place, kHome);
+    const std::string path = pathOf(each.place);
     if (each.place == DevicePlace::CopyAside) {
       // For engineers: where it cannot be told whether there is one, it is left alone.
       continue;

@@ -92,7 +92,7 @@ class Host {
 
   /// Alone on the device, when what an interrupted commit left is finished.
   void migrateBare() {
-    if (device_.fileSystem.fileExists(pathOfPlace(DevicePlace::CommitRecord, kHome))) {
+    if (device_.fileSystem.fileExists(pathOf(DevicePlace::CommitRecord))) {
       migrate(RunPurpose::FinishingAlone, KeepFiles::WhenNeeded);
       if (run_.exitStatus != ExitStatus::Success) {
         return;

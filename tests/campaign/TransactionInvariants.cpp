@@ -6,18 +6,11 @@
 #include "safetynet/CommitRecord.h"
 #include "tests/campaign/SettingsContents.h"
 #include "tests/program/StoredVersionsComparison.h"
+#include "vocabulary/AccountVocabulary.h"
 
 namespace accounts {
 
 namespace {
-
-constexpr std::array kStores = {DevicePlace::LegacyExchange, DevicePlace::LegacyMail};
-
-constexpr std::string_view kMigrationLock = "/tmp/AccountMigrationInProgress";
-
-std::string pathOf(DevicePlace place) {
-  return pathOfPlace(place, kHome);
-}
 
 /// Whether the same inode with the same contents, or nothing, stands at a path of two disks.
 bool isSameAt(const std::string& path, const SimulatedDisk& one, const SimulatedDisk& other) {
@@ -56,7 +49,8 @@ bool isIn(std::string_view path, std::string_view directory) {
 /// Whether a path is one that a run may make or change: a place, a temporary file, or the host's
 /// own.
 bool mayChange(const std::string& path) {
-  return isTemporary(path) || path == kMigrationLock || isIn(path, kAccountMigrationDirectory) ||
+  return isTemporary(path) || path == kAccountMigrationLockFilename ||
+         isIn(path, kAccountMigrationDirectory) ||
          isIn(path, pathOf(DevicePlace::InformationDirectory)) ||
          std::ranges::any_of(kDevicePlaces,
                              [&](const ListedPlace& each) { return path == pathOf(each.place); });
@@ -144,8 +138,8 @@ Complaint TransactionInvariants::ofKeptFolders(const SimulatedDisk& disk, bool i
 }
 
 Complaint TransactionInvariants::ofStores(const SimulatedDisk& disk, bool isMigrated) const {
-  for (const DevicePlace store : kStores) {
-    const std::string path = pathOf(store);
+  for (const LegacyStore& each : kLegacyStores) {
+    const std::string path = pathOf(each.store);
     const bool stood = scenario_.disk.exists(path);
     if (stood && !disk.exists(path) && !isMigrated) {
       return path + " is gone although its accounts are not in the settings file";
@@ -155,7 +149,7 @@ Complaint TransactionInvariants::ofStores(const SimulatedDisk& disk, bool isMigr
     }
     const bool isToGo = stood && !undisturbed_.disk.exists(path);
     if (isToGo && disk.exists(path) && isMigrated && writesSettings_ &&
-        !isVouchedFor(disk, store)) {
+        !isVouchedFor(disk, each.store)) {
       return path + " would be converted a second time";
     }
   }
@@ -222,7 +216,7 @@ bool TransactionInvariants::isFitting(const Run& run) const {
   }
   // Without a lock the plug-in says for itself that it cannot migrate.
   const bool isOfLock = std::ranges::any_of(run.refusedPaths, [](const std::string& path) {
-    return path == kMigrationLock || isIn(kMigrationLock, path);
+    return path == kAccountMigrationLockFilename || isIn(kAccountMigrationLockFilename, path);
   });
   static constexpr std::array kStatusesOfFaults = {
       ExitStatus::NotVerified, ExitStatus::MissingInput, ExitStatus::CannotCreate,

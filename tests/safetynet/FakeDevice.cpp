@@ -9,7 +9,9 @@ namespace {
 
 class FakeStagedFile final : public StagedFile {
  public:
-  explicit FakeStagedFile(std::shared_ptr<FakeDevice::Entry> staged) : entry(std::move(staged)) {}
+  explicit FakeStagedFile(std::shared_ptr<FakeDevice::Entry> staged) : entry(std::move(staged)) {
+    identity = entry->identity;
+  }
   std::shared_ptr<FakeDevice::Entry> entry;
 };
 
