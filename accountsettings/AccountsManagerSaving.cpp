@@ -101,7 +101,7 @@ void AccountsManager::saveAllAccounts() {
     for (const BasicAccountReference& account : _orderedTopLevelAccounts.accounts()) {
       account->setOriginalProperties(account->propertiesToSave());
     }
-    _lastSave.note(merged, _orderedTopLevelAccounts, fixing);
+    _newestSave.note(merged, _orderedTopLevelAccounts, fixing);
   }
   if (fixing != FixResult::Unchanged) {
     // Kept on purpose: also after a failed save. What matters to the fixers is that an attempt was
@@ -136,7 +136,7 @@ FixResult AccountsManager::_fixAccountsBeforeSaving() {
 }
 
 PropertyArray AccountsManager::_mergedAccounts() const {
-  const OnDiskAccounts onDisk(accountsOnDisk(), _lastSave, _orderedTopLevelAccounts);
+  const OnDiskAccounts onDisk(accountsOnDisk(), _newestSave, _orderedTopLevelAccounts);
   const Accounts& accounts = _orderedTopLevelAccounts.accounts();
   std::vector<PropertyValue> mergedAccounts;
   mergedAccounts.reserve(accounts.size());

@@ -7,8 +7,8 @@
 #include <system_error>
 #include <utility>
 
-#include "platform/linux/DevicePath.h"
 #include "platform/linux/FileContents.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 namespace {

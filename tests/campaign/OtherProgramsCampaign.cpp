@@ -5,7 +5,6 @@
 #include <string>
 #include <vector>
 
-#include "platform/linux/DevicePath.h"
 #include "tests/campaign/ActEndings.h"
 #include "tests/campaign/Campaigns.h"
 #include "tests/campaign/Intruder.h"
@@ -13,6 +12,7 @@
 #include "tests/campaign/SettingsContents.h"
 #include "tests/campaign/TransactionInvariants.h"
 #include "vocabulary/AccountVocabulary.h"
+#include "vocabulary/DevicePath.h"
 
 namespace accounts {
 

@@ -8,12 +8,12 @@
 #include <sstream>
 
 #include "platform/linux/Confinement.h"
+#include "tests/fakes/Sanitizers.h"
 #include "tests/program/DeviceRootFixture.h"
 #include "tests/program/DeviceTree.h"
 #include "tests/program/ExitStatuses.h"
 #include "tests/program/OutsideTree.h"
 #include "tests/program/Programs.h"
-#include "tests/program/Sanitizers.h"
 
 // In builds that measure coverage this is a function of theirs, in all others nothing.
 extern "C" int __llvm_profile_write_file() __attribute__((weak));

@@ -3,11 +3,11 @@
 #include <iostream>
 
 #include "propertylist/xml/XMLPropertyList.h"
+#include "tests/fakes/Sanitizers.h"
 #include "tests/program/DeviceRootFixture.h"
 #include "tests/program/DeviceTree.h"
 #include "tests/program/ExitStatuses.h"
 #include "tests/program/Programs.h"
-#include "tests/program/Sanitizers.h"
 
 // Every program and subcommand with ever more memory, from too little to start to enough.
 
