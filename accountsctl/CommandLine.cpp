@@ -71,6 +71,7 @@ struct Arguments {
   StatusOptions status;
   ConvertOptions convert;
   SummarizeOptions summarize;
+  ExplainOptions explain;
   bool wantsJSON = false;
   bool wantsXML = false;
   bool showsSecrets = false;
@@ -254,6 +255,19 @@ Asked summarizeAsked(Arguments& arguments) {
   return arguments.summarize;
 }
 
+void addExplain(CLI::App& command, Arguments& arguments) {
+  addFile(command, "REPORT", arguments.explain.report,
+          "The report that plan or run --report wrote, - for standard input");
+  addFile(command, "IDENTIFIER", arguments.explain.identifier,
+          "The account's identifier, also one that it had before");
+  addJSON(command, arguments);
+}
+
+Asked explainAsked(Arguments& arguments) {
+  arguments.explain.reportsJSON = arguments.wantsJSON;
+  return arguments.explain;
+}
+
 constexpr ProgramTexts kProgram = {kProgramName, kVersion, help::kProgram, help::kProgramExamples,
                                    help::kErrors};
 
@@ -270,6 +284,9 @@ constexpr Subcommand<Arguments, Asked> kSubcommands[] = {
     {{"summarize", help::kSummarize, help::kSummarizeStatuses, "", help::kSummarizeExamples},
      addSummarize,
      summarizeAsked},
+    {{"explain", help::kExplain, help::kExplainStatuses, "", help::kExplainExamples},
+     addExplain,
+     explainAsked},
 };
 
 }  // namespace

@@ -7,6 +7,7 @@
 #include "accountsctl/CheckCommand.h"
 #include "accountsctl/ConvertCommand.h"
 #include "accountsctl/DiffCommand.h"
+#include "accountsctl/ExplainCommand.h"
 #include "accountsctl/ShowCommand.h"
 #include "accountsctl/StatusCommand.h"
 #include "accountsctl/SummarizeCommand.h"
@@ -19,7 +20,7 @@ inline constexpr const char* kProgramName = "accountsctl";
 /// What the arguments ask for.
 struct CommandLine {
   std::variant<ShowOptions, DiffOptions, CheckOptions, StatusOptions, ConvertOptions,
-               SummarizeOptions, RequestedText, UnusableArguments>
+               SummarizeOptions, ExplainOptions, RequestedText, UnusableArguments>
       asked;
   /// The subcommand's name; none when the arguments name none.
   std::optional<std::string> subcommand;

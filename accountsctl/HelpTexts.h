@@ -79,6 +79,15 @@ inline constexpr const char* kConvertExamples =
     "  accountsctl convert settings.plist - --to xml | less\n"
     "  accountsctl convert edited.xml settings.plist --to binary\n";
 
+inline constexpr const char* kExplain =
+    "Tell the story of one account in a migration: where it came from, which stage did what to "
+    "it,\n"
+    "which values changed, and where it is now or why it is not.";
+inline constexpr const char* kExplainStatuses = "  0   the report has the account\n";
+inline constexpr const char* kExplainExamples =
+    "  migration-host plan --root image --report plan.json\n"
+    "  accountsctl explain plan.json 1A7B0001-9C3D-4E2F-8B5A-6D4C3B2A1F01\n";
+
 inline constexpr const char* kSummarize =
     "Count what runs of migration-host with --json on many images reported: by outcome, by step "
     "and\n"

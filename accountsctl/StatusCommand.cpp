@@ -10,6 +10,7 @@
 #include "accountsctl/TextTable.h"
 #include "accountsettings/AccountsManager.h"
 #include "commandline/BundleLocation.h"
+#include "commandline/PlatformError.h"
 #include "propertylist/value/Description.h"
 
 namespace accounts {
@@ -116,7 +117,11 @@ CommandResult status(const StatusOptions& options, const Terminal& terminal) {
   if (const auto* error = std::get_if<ProgramError>(&platform)) {
     return *error;
   }
-  const DeviceStatus found = statusOf(*std::get<std::unique_ptr<DevicePlatform>>(platform));
+  const auto& device = std::get<std::unique_ptr<DevicePlatform>>(platform);
+  if (const auto missing = whyNoDevice(device->linuxPlatform().root(), options.root)) {
+    return *missing;
+  }
+  const DeviceStatus found = statusOf(*device);
   const ExitStatus exitStatus =
       options.failsIfPending && found.isPending() ? ExitStatus::Attention : ExitStatus::Success;
   return CommandReport{

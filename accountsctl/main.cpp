@@ -30,6 +30,9 @@ CommandResult runCommand(const ConvertOptions& options) {
 CommandResult runCommand(const SummarizeOptions& options) {
   return summarize(options, standardOutputTerminal(::getenv));
 }
+CommandResult runCommand(const ExplainOptions& options) {
+  return explain(options);
+}
 CommandResult runCommand(const RequestedText& requested) {
   return CommandReport{requested.text};
 }

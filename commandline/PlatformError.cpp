@@ -1,5 +1,12 @@
 #include "commandline/PlatformError.h"
 
+#include <fcntl.h>
+
+#include <algorithm>
+#include <string>
+
+#include "vocabulary/DevicePlaces.h"
+
 namespace accounts {
 namespace {
 
@@ -33,6 +40,21 @@ ProgramError programErrorOf(const PathError& error, ExitStatus lasting) {
 
 ProgramError programErrorOf(const Result& failure, ExitStatus lasting) {
   return {exitStatusOf(failure.kind(), lasting), failure.error()};
+}
+
+std::optional<ProgramError> whyNoDevice(const DeviceRoot& root, std::string_view name) {
+  std::string missing;
+  for (const std::string_view each : kDeviceDirectories) {
+    PathError error;
+    // What cannot be looked at is there, as far as this is concerned.
+    if (root.open(each, O_PATH | O_DIRECTORY, error) || error.number != ENOENT) {
+      return std::nullopt;
+    }
+    missing.append(missing.empty() ? "" : ", ").append(each);
+  }
+  return ProgramError{ExitStatus::MissingInput,
+                      std::string(name) + " has none of the directories that every device has (" +
+                          missing + "): is the image mounted?"};
 }
 
 }  // namespace accounts

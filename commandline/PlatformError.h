@@ -1,5 +1,8 @@
 #pragma once
 
+#include <optional>
+#include <string_view>
+
 #include "commandline/ExitStatus.h"
 #include "platform/linux/LinuxPlatform.h"
 
@@ -12,5 +15,9 @@ ProgramError programErrorOf(const LinuxPlatformError& error);
 /// one `lasting`.
 ProgramError programErrorOf(const PathError& error, ExitStatus lasting);
 ProgramError programErrorOf(const Result& failure, ExitStatus lasting);
+
+/// Why a root is no device's, such as the empty directory on which an image was to be mounted; none
+/// when it has any of the directories that every device has. `name` is the root as it was named.
+std::optional<ProgramError> whyNoDevice(const DeviceRoot& root, std::string_view name);
 
 }  // namespace accounts

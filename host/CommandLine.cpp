@@ -75,9 +75,9 @@ void addReports(CLI::App& command, Arguments& arguments) {
                    "Show passwords, tokens and the like in reports as well");
 }
 
-void addJSON(CLI::App& command, Arguments& arguments) {
-  command.add_flag("--json", arguments.wantsJSON,
-                   "Write one JSON object on one line to standard output");
+CLI::Option* addJSON(CLI::App& command, Arguments& arguments) {
+  return command.add_flag("--json", arguments.wantsJSON,
+                          "Write one JSON object on one line to standard output");
 }
 
 void addRun(CLI::App& command, Arguments& arguments) {
@@ -109,7 +109,14 @@ Asked runAsked(Arguments& arguments) {
 void addPlan(CLI::App& command, Arguments& arguments) {
   addDeviceOptions(command, arguments.plan.device);
   addReports(command, arguments);
-  addJSON(command, arguments);
+  CLI::Option* const json = addJSON(command, arguments);
+  command
+      .add_option("--account", arguments.plan.account,
+                  "Tell of one account alone, by an identifier that it has or had: where it comes\n"
+                  "from, what each stage does to it, and where it ends")
+      ->option_text("IDENTIFIER")
+      ->check(requireText)
+      ->excludes(json);
 }
 
 Asked planAsked(Arguments& arguments) {

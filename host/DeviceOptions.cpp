@@ -23,6 +23,9 @@ std::variant<OpenedDevice, ProgramError> openDevice(const DeviceOptions& options
   if (platform == nullptr) {
     return programErrorOf(error);
   }
+  if (const auto missing = whyNoDevice(platform->root(), options.root)) {
+    return *missing;
+  }
   return OpenedDevice{std::move(found), std::move(platform)};
 }
 

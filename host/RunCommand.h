@@ -23,6 +23,8 @@ struct RunOptions {
   bool broadcastsOnDBus = false;
   /// How values are recorded; none for a run that is not recorded.
   std::optional<Secrets> recorded;
+  /// The account whose story is told in the place of the whole plan; none for the whole.
+  std::optional<std::string> account;
   /// Whether the result is one JSON object, and how people see it otherwise.
   bool wantsJSON = false;
   Terminal terminal;

@@ -4,6 +4,8 @@
 
 #include "commandline/ShellWord.h"
 #include "host/ReportFiles.h"
+#include "propertylist/value/Description.h"
+#include "report/AccountStory.h"
 #include "report/ReportText.h"
 #include "safetynet/FlatBytes.h"
 
@@ -37,6 +39,11 @@ std::optional<std::string> takeOptionalText(FlatReader& reader) {
   const bool isThere = reader.takeBoolean();
   std::string text = reader.takeText(kLongestText);
   return isThere ? std::optional(std::move(text)) : std::nullopt;
+}
+
+std::string storyText(const JSON& report, const std::string& account) {
+  const std::optional<std::string> story = accountStory(report, account);
+  return story ? *story : "No account has, or had, the identifier " + escapedText(account) + "\n";
 }
 
 }  // namespace
@@ -92,7 +99,9 @@ ToldResult toldResult(const RunOptions& options, const RunReport& report,
   ToldResult told{report.warnings, report.error, {}};
   if (options.purpose == RunPurpose::Plan) {
     const JSON full = fullReport(commandOf(options), report, recorded);
-    told.result = options.wantsJSON ? lineOf(full) + "\n" : reportText(full, options.terminal);
+    told.result = options.wantsJSON ? lineOf(full) + "\n"
+                  : options.account ? storyText(full, *options.account)
+                                    : reportText(full, options.terminal);
   } else {
     told.result = options.wantsJSON ? jsonText(report) + "\n" : summaryText(report);
   }

@@ -128,6 +128,8 @@ class LedgerMaker {
     }
   }
 
+  void forgetLostFiles() { ledger_.lostFiles.clear(); }
+
   AccountLedger take() { return std::move(ledger_); }
 
  private:
@@ -372,6 +374,8 @@ AccountLedger makeLedger(Transaction& transaction, const std::vector<DevicePlace
   // All of them first: an account is compared with what the other files hold, too.
   const auto take = [&maker](DevicePlace place) { maker.takeInput(place); };
   std::ranges::for_each(earlier, take);
+  // What could not be read of them was told of by the run that carried them over.
+  maker.forgetLostFiles();
   std::ranges::for_each(inputs, take);
   for (const DevicePlace place : earlier) {
     maker.accountForEarlier(place, true);

@@ -119,6 +119,10 @@ inline constexpr std::string_view kRemovalSentinelContents =
 inline constexpr std::string_view kAccountMigrationDirectory =
     "/var/mobile/Library/AccountMigration";
 
+/// Directories that every device has.
+inline constexpr std::array<std::string_view, 3> kDeviceDirectories = {"/var/mobile", "/etc",
+                                                                       "/tmp"};
+
 /// The lock that a migration holds.
 inline constexpr std::string_view kMigrationLockName = "AccountMigrationInProgress";
 

@@ -86,7 +86,7 @@ INSTANTIATE_TEST_SUITE_P(
                     Subcommand{"migration-host", "restore"}, Subcommand{"accountsctl", "show"},
                     Subcommand{"accountsctl", "diff"}, Subcommand{"accountsctl", "check"},
                     Subcommand{"accountsctl", "status"}, Subcommand{"accountsctl", "convert"},
-                    Subcommand{"accountsctl", "summarize"}));
+                    Subcommand{"accountsctl", "explain"}, Subcommand{"accountsctl", "summarize"}));
 
 TEST(ManualPages, HaveTheSectionsThatPeopleLookFor) {
   for (const char* page : {"migration-host.1", "accountsctl.1"}) {

@@ -30,6 +30,17 @@ class AccountsctlStatus : public DeviceRootFixture {
   }
 };
 
+TEST_F(AccountsctlStatus, ARootWithoutAnyDirectoryOfADeviceIsNotNothingToDo) {
+  const std::string empty = onThisMachine("/mnt").string();
+  std::filesystem::create_directory(empty);
+
+  const ProgramResult result =
+      runProgram({.program = accountsctl(), .arguments = {"status", "--root", empty}});
+
+  EXPECT_EQ(result.exitStatus, kMissingInput);
+  EXPECT_NE(result.errors.find("is the image mounted?"), std::string::npos) << result.errors;
+}
+
 TEST_F(AccountsctlStatus, ADeviceWithoutAccountsHasNothingToDo) {
   const ProgramResult result = status();
 

@@ -1,3 +1,5 @@
+#include <filesystem>
+
 #include "tests/program/DeviceRootFixture.h"
 #include "tests/program/ExitStatuses.h"
 #include "tests/program/Programs.h"
@@ -30,6 +32,22 @@ class HostError : public DeviceRootFixture {
     EXPECT_EQ(readText(kSettingsPath), settingsBefore);
   }
 };
+
+TEST_F(HostError, ARootWithoutAnyDirectoryOfADeviceIsTakenForAnImageThatIsNotMounted) {
+  const std::string empty = onThisMachine("/mnt").string();
+  std::filesystem::create_directory(empty);
+
+  for (const char* command : {"run", "plan"}) {
+    const ProgramResult result =
+        runProgram({.program = migrationHost(), .arguments = {command, "--root", empty}});
+
+    EXPECT_EQ(result.exitStatus, kMissingInput) << command;
+    EXPECT_EQ(result.errors, "migration-host: " + empty +
+                                 " has none of the directories that every device has "
+                                 "(/var/mobile, /etc, /tmp): is the image mounted?\n");
+  }
+  EXPECT_TRUE(std::filesystem::is_empty(empty));
+}
 
 TEST_F(HostError, AMissingRootIsNamed) {
   const std::string missing = onThisMachine("/missing").string();

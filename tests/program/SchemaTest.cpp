@@ -39,6 +39,10 @@ class Schemas : public DeviceRootFixture {
     add(migrationHost(), {"run", "--json"});
     add(accountsctl(), {"show", "--json", device(kSettingsPath)});
     add(accountsctl(), {"diff", "--json", device("/before.plist"), device(kSettingsPath)});
+    writeText("/report.json", runProgram({.program = migrationHost(),
+                                          .arguments = {"plan", "--root", root(), "--json"}})
+                                  .output);
+    add(accountsctl(), {"explain", device("/report.json"), "S", "--json"});
     add(accountsctl(), {"convert", "--json", device(kSettingsPath), device("/x"), "--to", "xml"});
     add(accountsctl(), {"summarize", "--json", device("/results"), "--roots", device("/roots")});
     add(accountsctl(), {"show", "--json"});

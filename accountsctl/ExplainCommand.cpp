@@ -1,0 +1,48 @@
+#include "accountsctl/ExplainCommand.h"
+
+#include <cerrno>
+#include <optional>
+#include <utility>
+
+#include "accountsctl/JSONText.h"
+#include "platform/linux/FileContents.h"
+#include "report/AccountStory.h"
+
+namespace accounts {
+
+CommandResult explain(const ExplainOptions& options) {
+  PathError error;
+  const std::optional<std::string> text = readHostFile(options.report, error);
+  if (!text) {
+    return ProgramError{
+        error.number == EIO ? ExitStatus::InputOutputError : ExitStatus::MissingInput, error.text};
+  }
+  const JSON report = JSON::parse(*text, nullptr, /*allow_exceptions=*/false);
+  if (!report.is_object() || !report.contains("stages")) {
+    return ProgramError{ExitStatus::MalformedInput,
+                        pathError("read the report", nameOfInput(options.report),
+                                  "It is none that plan or run --report wrote")
+                            .text};
+  }
+  std::optional<std::string> story = accountStory(report, options.identifier);
+  if (!story) {
+    return ProgramError{
+        ExitStatus::MissingInput,
+        nameOfInput(options.report) + " has no account with the identifier " + options.identifier};
+  }
+  if (!options.reportsJSON) {
+    return CommandReport{*std::move(story)};
+  }
+  JSON object = reportObject("explain");
+  object["report"] = options.report;
+  object["identifier"] = options.identifier;
+  JSON lines = JSON::array();
+  for (std::size_t begin = 0, end = 0; (end = story->find('\n', begin)) != std::string::npos;
+       begin = end + 1) {
+    lines.push_back(story->substr(begin, end - begin));
+  }
+  object["story"] = std::move(lines);
+  return CommandReport{lineOf(std::move(object), ExitStatus::Success)};
+}
+
+}  // namespace accounts
