@@ -1,5 +1,5 @@
 # What makes an error of the programs hard to use by somebody else. tests/packaging/HardeningTest.cpp asserts
-# each on what is installed; docs/performance.md has the cost.
+# each on what is installed.
 include(CheckCXXCompilerFlag)
 
 add_compile_options(-fstack-protector-strong)

@@ -11,9 +11,9 @@ namespace accounts {
 constexpr ProcessLimits workerLimitsFor(std::uint64_t inputSize) {
   constexpr std::uint64_t kMebibyte = std::uint64_t{1} << 20;
   constexpr std::uint64_t kMemoryForAnyInput = 256 * kMebibyte;
-  constexpr std::uint64_t kMemoryForAByte = 256;
+  constexpr std::uint64_t kMemoryForAByte = 2048;
   constexpr std::uint64_t kSecondsForAnyInput = 5;
-  constexpr std::uint64_t kSecondsForAMebibyte = 20;
+  constexpr std::uint64_t kSecondsForAMebibyte = 120;
   return {.memory = kMemoryForAnyInput + inputSize * kMemoryForAByte,
           .processorTime = std::chrono::seconds(kSecondsForAnyInput +
                                                 inputSize * kSecondsForAMebibyte / kMebibyte)};
