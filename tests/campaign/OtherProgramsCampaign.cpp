@@ -246,10 +246,7 @@ class DisturbedScenario {
   /// Whether the device ends in one of these ways, after a next run that has nothing in its way.
   [[nodiscard]] Complaint ofEnding(const std::vector<Ending>& possible, const Run& run) const {
     const Run next = runOn(run.disk, scenario_, {.number = kNextRun});
-    // What was not carried over may have been told of by either run.
-    const ExitStatus exitStatus =
-        next.exitStatus == ExitStatus::NotAllCarriedOver ? ExitStatus::Success : next.exitStatus;
-    const Ending ending = invariants_.endingOf(next.disk, exitStatus);
+    const Ending ending = invariants_.endingOf(next.disk, next.exitStatus);
     Complaint difference;
     for (const Ending& each : possible) {
       difference = differenceOf(each, ending);
