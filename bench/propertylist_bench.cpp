@@ -98,7 +98,7 @@ void writeBinaryInPieces(benchmark::State& state) {
   PropertyListError error;
   const PropertyValue value = readBinaryPropertyList(binaryFile(), error).value();
   for (auto _ : state) {
-    const SerializedPropertyList file = serializeBinaryPropertyList(value, error);
+    const SerializedPropertyList file = BinaryPropertyListSerializer().serialize(value, error);
     const bool areTaken = file.giveTo([](std::string_view piece) {
       benchmark::DoNotOptimize(piece.data());
       return true;

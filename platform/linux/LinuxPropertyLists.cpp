@@ -19,7 +19,7 @@ std::optional<PropertyDictionary> LinuxPropertyLists::readDictionary(std::string
 Result LinuxPropertyLists::serializeBinary(const PropertyValue& value,
                                            SerializedPropertyList& serialized) {
   PropertyListError error;
-  serialized = serializeBinaryPropertyList(value, error);
+  serialized = serializer_.serialize(value, error);
   return serialized ? Result::success() : Result::failure(std::move(error.text));
 }
 

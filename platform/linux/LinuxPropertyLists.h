@@ -24,6 +24,7 @@ class LinuxPropertyLists final : public PropertyLists {
 
  private:
   const DeviceRoot& root_;
+  BinaryPropertyListSerializer serializer_;
 };
 
 }  // namespace accounts

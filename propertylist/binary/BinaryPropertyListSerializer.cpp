@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <string_view>
+#include <utility>
 
 #include "propertylist/PropertyListLimits.h"
 #include "propertylist/binary/BinaryPropertyList.h"
@@ -10,30 +11,35 @@
 
 namespace accounts {
 
-namespace {
-
-/// What a part adds to what the limits are for.
-struct Extent {
-  std::uint64_t expandedCount = 0;
-  /// The most bytes that it can take in a file.
-  std::uint64_t size = 0;
-};
-
-/// A walk over one value.
-class Check {
+/// A walk over one value. The accounts of a store stand in an array of its root, and from one save
+/// to the next most are the same in memory and stand where they stood, or a few places off where
+/// others came or went. As long as the last value is kept, nobody changes its nodes or makes others
+/// at their addresses, and their depth is the same: what was found of them still holds, so that a
+/// save that changed three accounts looks at three.
+class BinaryPropertyListSerializer::Check {
  public:
-  explicit Check(PropertyListError& error) : error_(error) {}
+  Check(const std::vector<Element>& lastElements, PropertyListError& error)
+      : lastElements_(lastElements), error_(error) {}
 
   bool passes(const PropertyValue& root) {
+    const PropertyDictionary* const dictionary = root.asDictionary();
+    if (!(dictionary != nullptr ? passesRoot(*dictionary) : passesPart(root, 0))) {
+      return false;
+    }
     // Each value and each key is at most one object. Whether those of a huge value are few and
     // small enough, because many are equal, is seen when they are put down.
-    return passesPart(root, 0) &&
-           ((2 * whole_.expandedCount <= kMaximumObjectCount && whole_.size <= kMaximumFileSize) ||
-            binaryplist::giveFile(root, [](std::string_view) { return true; }) ||
-            fail("more objects or bytes than the limit"));
+    return (2 * whole_.expandedCount <= kMaximumObjectCount && whole_.size <= kMaximumFileSize) ||
+           binaryplist::giveFile(root, [](std::string_view) { return true; }) ||
+           fail("more objects or bytes than the limit");
   }
 
+  /// Those of the value that passed.
+  [[nodiscard]] std::vector<Element> takeElements() { return std::move(elements_); }
+
  private:
+  /// How far off its place an element is looked for.
+  static constexpr std::size_t kReach = 16;
+
   // The most that an object takes beside its content: its head, its place in the table, and, for
   // each time that it is reached, a reference.
   static constexpr std::uint64_t kSizeOfText = 6 + 4 + 4;
@@ -41,6 +47,54 @@ class Check {
   static constexpr std::uint64_t kSizeOfNumber = 17 + 4 + 4;
   /// More than header and trailer.
   static constexpr std::uint64_t kSizeOfFrame = 64;
+
+  bool passesRoot(const PropertyDictionary& root) {
+    return add({1, kSizeOfContainer}) &&
+           std::all_of(root.begin(), root.end(), [this](const PropertyEntry& entry) {
+             const PropertyArray* const array = entry.value.asArray();
+             return passesText(entry.key, 0) &&
+                    (array != nullptr ? passesArrayOfRoot(*array) : passesPart(entry.value, 1));
+           });
+  }
+
+  bool passesArrayOfRoot(const PropertyArray& array) {
+    return add({1, kSizeOfContainer}) &&
+           std::all_of(array.begin(), array.end(), [this](const PropertyValue& value) {
+             const PropertyDictionary* const dictionary = value.asDictionary();
+             return dictionary != nullptr && !dictionary->empty()
+                        ? passesElement(value, dictionary->sharedNode())
+                        : passesPart(value, 2);
+           });
+  }
+
+  bool passesElement(const PropertyValue& value, const SharedNodeBase* node) {
+    const Extent before = whole_;
+    const Element* const known = findKnown(node);
+    const bool isPassed = known != nullptr ? add(known->extent) : passesPart(value, 2);
+    elements_.push_back({.node = node,
+                         .extent = {.expandedCount = whole_.expandedCount - before.expandedCount,
+                                    .size = whole_.size - before.size}});
+    return isPassed;
+  }
+
+  /// The element of the last value with a node, null for none near its place.
+  const Element* findKnown(const SharedNodeBase* node) {
+    const std::size_t count = lastElements_.size();
+    const std::size_t place = next_++;
+    if (place < count && lastElements_[place].node == node) {
+      return &lastElements_[place];
+    }
+    const Element* const first = lastElements_.data();
+    const Element* const begin = first + std::min(count, place - std::min(place, kReach));
+    const Element* const end = first + std::min(count, place + kReach);
+    const Element* const found =
+        std::find_if(begin, end, [node](const Element& element) { return element.node == node; });
+    if (found == end) {
+      return nullptr;
+    }
+    next_ = static_cast<std::size_t>(found - first) + 1;
+    return found;
+  }
 
   /// `depth` is the number of containers around the value; it bounds the recursion.
   bool passesPart(const PropertyValue& value, std::size_t depth) {
@@ -95,21 +149,28 @@ class Check {
     return false;
   }
 
+  const std::vector<Element>& lastElements_;
   PropertyListError& error_;
   Extent whole_ = {.expandedCount = 0, .size = kSizeOfFrame};
+  std::vector<Element> elements_;
+  /// Where among the last elements the next one is looked for first.
+  std::size_t next_ = 0;
 };
 
-}  // namespace
-
-SerializedPropertyList serializeBinaryPropertyList(const PropertyValue& value,
-                                                   PropertyListError& error) {
-  return Check(error).passes(value) ? SerializedPropertyList(value, &binaryplist::giveFile)
-                                    : SerializedPropertyList();
+SerializedPropertyList BinaryPropertyListSerializer::serialize(const PropertyValue& value,
+                                                               PropertyListError& error) {
+  Check check(lastElements_, error);
+  if (!check.passes(value)) {
+    return {};
+  }
+  lastElements_ = check.takeElements();
+  lastValue_ = value;
+  return {value, &binaryplist::giveFile};
 }
 
 std::optional<std::string> writeBinaryPropertyList(const PropertyValue& value,
                                                    PropertyListError& error) {
-  const SerializedPropertyList serialized = serializeBinaryPropertyList(value, error);
+  const SerializedPropertyList serialized = BinaryPropertyListSerializer().serialize(value, error);
   return serialized ? std::optional(bytesOf(serialized)) : std::nullopt;
 }
 

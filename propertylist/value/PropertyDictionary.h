@@ -52,6 +52,9 @@ class PropertyDictionary {
   [[nodiscard]] bool isSameAs(const PropertyDictionary& other) const {
     return node_.get() == other.node_.get();
   }
+  /// The node, null for an empty one: as long as a handle to it lives, its address names the
+  /// content.
+  [[nodiscard]] const SharedNodeBase* sharedNode() const { return node_.get(); }
 
   /// Deep equality.
   friend bool operator==(const PropertyDictionary& left, const PropertyDictionary& right);

@@ -101,7 +101,7 @@ Result FakePropertyLists::serializeBinary(const PropertyValue& value,
     return Result::success();
   }
   PropertyListError error;
-  serialized = serializeBinaryPropertyList(value, error);
+  serialized = serializer_.serialize(value, error);
   return serialized ? Result::success() : Result::failure(error.text);
 }
 

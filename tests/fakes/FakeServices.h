@@ -215,6 +215,7 @@ class FakePropertyLists : public PropertyLists {
 
  private:
   FakeFileSystem& fileSystem_;
+  BinaryPropertyListSerializer serializer_;
 };
 
 class FakeSharedResources : public SharedResources {

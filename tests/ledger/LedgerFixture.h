@@ -113,8 +113,9 @@ class MigratedInMemory {
     tamper(accounts);
     root.set(kPlistAccountsKey, accounts);
     PropertyListError error;
-    transaction.put(DevicePlace::Settings,
-                    Transaction::List{serializeBinaryPropertyList(root, error), std::nullopt});
+    transaction.put(
+        DevicePlace::Settings,
+        Transaction::List{BinaryPropertyListSerializer().serialize(root, error), std::nullopt});
   }
 
   void migrate(Liar* liar, const std::function<void(PropertyArray&)>& tamper) {

@@ -47,7 +47,7 @@ class MigrationTest : public testing::Test {
     PropertyListError error;
     transaction().put(
         DevicePlace::Settings,
-        Transaction::List{serializeBinaryPropertyList(settings, error), std::nullopt});
+        Transaction::List{BinaryPropertyListSerializer().serialize(settings, error), std::nullopt});
     transaction().noteSave(LastSave::Written);
   }
   void remove(DevicePlace place) { transaction().put(place, Transaction::Removed{}); }

@@ -56,7 +56,7 @@ TEST_F(MigrationInMemoryTest, NewContentsStandInTheMemoryFileOneAfterTheOther) {
   PropertyListError error;
   transaction().putInformationFile(
       "AccountMigrationInformation-1.txt",
-      serializeBinaryPropertyList(PropertyDictionary{{"a", 1}}, error));
+      BinaryPropertyListSerializer().serialize(PropertyDictionary{{"a", 1}}, error));
 
   const Proposal proposed = proposal();
 

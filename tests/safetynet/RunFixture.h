@@ -86,8 +86,9 @@ class FakeWorker final : public Worker {
     }
     PropertyListError error;
     const PropertyDictionary after = {{"Version", 12}, {"Accounts", PropertyArray(std::move(all))}};
-    transaction.put(DevicePlace::Settings,
-                    Transaction::List{serializeBinaryPropertyList(after, error), std::nullopt});
+    transaction.put(
+        DevicePlace::Settings,
+        Transaction::List{BinaryPropertyListSerializer().serialize(after, error), std::nullopt});
     transaction.noteSave(LastSave::Written);
   }
 };

@@ -34,7 +34,7 @@ PropertyValue largeValue() {
 
 SerializedPropertyList serialized(const PropertyValue& value) {
   PropertyListError error;
-  return serializeBinaryPropertyList(value, error);
+  return BinaryPropertyListSerializer().serialize(value, error);
 }
 
 TEST(BinaryPieces, ASmallFileIsOnePiece) {

@@ -18,13 +18,16 @@ using testing::writeBinary;
 class BinarySerializer : public ::testing::Test {
  protected:
   bool serialize(const PropertyValue& value) {
-    return static_cast<bool>(serializeBinaryPropertyList(value, error));
+    return static_cast<bool>(serializer_.serialize(value, error));
   }
   std::string bytesFor(const PropertyValue& value) {
-    return bytesOf(serializeBinaryPropertyList(value, error));
+    return bytesOf(serializer_.serialize(value, error));
   }
 
   PropertyListError error;
+
+ private:
+  BinaryPropertyListSerializer serializer_;
 };
 
 PropertyDictionary store(PropertyArray accounts) {
@@ -34,8 +37,14 @@ PropertyDictionary store(PropertyArray accounts) {
 /// An account that stands for a quarter of as many values as may be, and a few more.
 PropertyDictionary largeAccount() {
   constexpr std::size_t kSideLength = std::size_t{1} << 11;
-  const PropertyArray line(std::vector<PropertyValue>(kSideLength, 7));
-  const PropertyArray square(std::vector<PropertyValue>(kSideLength, line));
+  PropertyArray line = PropertyArray::withRoomFor(kSideLength);
+  PropertyArray square = PropertyArray::withRoomFor(kSideLength);
+  for (std::size_t index = 0; index < kSideLength; ++index) {
+    line.append(7);
+  }
+  for (std::size_t index = 0; index < kSideLength; ++index) {
+    square.append(line);
+  }
   static_assert(kSideLength * kSideLength == kMaximumExpandedValueCount / 4);
   return {{"Values", square}};
 }
@@ -43,6 +52,17 @@ PropertyDictionary largeAccount() {
 TEST_F(BinarySerializer, TheBytesAreThoseOfTheWriter) {
   const PropertyValue value = testing::valueOfEveryKind();
   EXPECT_EQ(bytesFor(value), writeBinary(value));
+}
+
+TEST_F(BinarySerializer, EachValueGetsItsOwnBytesWhateverWentBefore) {
+  PropertyArray accounts;
+  for (int stage = 0; stage < 40; ++stage) {
+    accounts.append(PropertyDictionary{{"Identifier", stage}, {"Type", "Mail"}});
+    if (stage % 3 == 2) {
+      accounts.replace(static_cast<std::size_t>(stage) / 3, PropertyDictionary{{"New", stage}});
+    }
+    ASSERT_EQ(bytesFor(store(accounts)), writeBinary(store(accounts))) << "stage " << stage;
+  }
 }
 
 TEST_F(BinarySerializer, WhatIsNestedAsDeeplyAsTheReaderGoesPassesAndNoDeeper) {
@@ -57,6 +77,16 @@ TEST_F(BinarySerializer, DepthCountsFromTheRootOfAStore) {
   };
   EXPECT_TRUE(serialize(account(kMaximumNestingDepth - 3)));
   EXPECT_FALSE(serialize(account(kMaximumNestingDepth - 2)));
+}
+
+TEST_F(BinarySerializer, AnAccountThatChangedIsLookedAtAgain) {
+  PropertyArray accounts = {PropertyDictionary{{"Identifier", "A"}},
+                            PropertyDictionary{{"Identifier", "B"}}};
+  ASSERT_TRUE(serialize(store(accounts)));
+
+  accounts.replace(1, PropertyDictionary{{"Deep", nestedArrays(kMaximumNestingDepth)}});
+
+  EXPECT_FALSE(serialize(store(accounts)));
 }
 
 TEST_F(BinarySerializer, ATextThatIsNotWellFormedIsRefusedInEveryPlace) {
@@ -78,6 +108,15 @@ TEST_F(BinarySerializer, AValueThatStandsForTooManyValuesIsRefused) {
   EXPECT_TRUE(serialize(store({large, large, large})));
   EXPECT_FALSE(serialize(store({large, large, large, large})));
   EXPECT_TRUE(contains(error.text, "more values than the limit"));
+}
+
+TEST_F(BinarySerializer, AccountsThatArePassedOverBecauseTheyAreKnownStillCount) {
+  const PropertyDictionary large = largeAccount();
+  const PropertyDictionary small = {{"Identifier", "small"}};
+  ASSERT_TRUE(serialize(store({small, large, large})));
+  ASSERT_TRUE(serialize(store({large, small, large, large})));
+
+  EXPECT_FALSE(serialize(store({large, large, small, large, large})));
 }
 
 TEST_F(BinarySerializer, LongTextsDataAndKeysCountMoreThanOnce) {
