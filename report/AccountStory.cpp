@@ -12,14 +12,14 @@ namespace {
 
 constexpr std::size_t kLongestValue = 60;
 
-const JSON& member(const JSON& object, const char* key) {
+const JSON& memberOf(const JSON& object, const char* key) {
   static const JSON none;
   const auto found = object.is_object() ? object.find(key) : object.end();
   return found != object.end() ? *found : none;
 }
 
-std::string textIn(const JSON& object, const char* key) {
-  const JSON& text = member(object, key);
+std::string wordIn(const JSON& object, const char* key) {
+  const JSON& text = memberOf(object, key);
   return text.is_string() ? text.get<std::string>() : "";
 }
 
@@ -37,7 +37,7 @@ const JSON& accountAt(const JSON& accounts, const JSON& place) {
       return none;
     }
     found = &(*level)[index];
-    level = &member(*found, "children");
+    level = &memberOf(*found, "children");
   }
   return *found;
 }
@@ -51,11 +51,11 @@ class Names {
 
   /// Whether a change is one of this account; learns its other name if it renames it.
   bool learnFrom(const JSON& change) {
-    bool isOne = contains(textIn(change, "identifier"));
-    for (const JSON& property : member(change, "properties")) {
-      if (textIn(property, "path") == "Identifier") {
-        const std::string before = textIn(property, "before");
-        const std::string after = textIn(property, "after");
+    bool isOne = contains(wordIn(change, "identifier"));
+    for (const JSON& property : memberOf(change, "properties")) {
+      if (wordIn(property, "path") == "Identifier") {
+        const std::string before = wordIn(property, "before");
+        const std::string after = wordIn(property, "after");
         isOne = isOne || contains(before) || contains(after);
         if (isOne && !before.empty() && !after.empty()) {
           names_.insert(before);
@@ -68,12 +68,12 @@ class Names {
   /// Learns the name that an account of the ledger has where it is now, or had where it was.
   void learnFrom(const JSON& account, const JSON& accountsAfter) {
     // What was joined into others has not become them.
-    if (textIn(account, "fate") == "joined") {
+    if (wordIn(account, "fate") == "joined") {
       return;
     }
-    const std::string before = textIn(account, "identifier");
-    for (const JSON& place : member(account, "now")) {
-      const std::string after = textIn(accountAt(accountsAfter, place), "identifier");
+    const std::string before = wordIn(account, "identifier");
+    for (const JSON& place : memberOf(account, "now")) {
+      const std::string after = wordIn(accountAt(accountsAfter, place), "identifier");
       if ((contains(before) || contains(after)) && !before.empty() && !after.empty()) {
         names_.insert(before);
         names_.insert(after);
@@ -87,7 +87,7 @@ class Names {
 };
 
 std::string valueText(const JSON& property, const char* key) {
-  const JSON& value = member(property, key);
+  const JSON& value = memberOf(property, key);
   if (value.is_null()) {
     return "none";
   }
@@ -104,24 +104,24 @@ std::string valueText(const JSON& property, const char* key) {
 }
 
 std::string originLine(const JSON& account) {
-  std::string line = escapedText(textIn(account, "place")) + " of " +
-                     escapedText(textIn(account, "file")) + ": " +
-                     escapedText(textIn(account, "words"));
-  if (const std::string reason = textIn(account, "reason"); !reason.empty()) {
+  std::string line = escapedText(wordIn(account, "place")) + " of " +
+                     escapedText(wordIn(account, "file")) + ": " +
+                     escapedText(wordIn(account, "words"));
+  if (const std::string reason = wordIn(account, "reason"); !reason.empty()) {
     line += ", since " + escapedText(reason);
   }
-  for (const JSON& now : member(account, "now")) {
+  for (const JSON& now : memberOf(account, "now")) {
     line += ", now " + escapedText(now.is_string() ? now.get<std::string>() : "");
   }
   return line + "\n";
 }
 
 std::string changeLines(const JSON& stage, const JSON& change) {
-  std::string text = escapedText(textIn(stage, "title")) + " (" +
-                     escapedText(textIn(stage, "name")) +
-                     "): " + escapedText(textIn(change, "change")) + "\n";
-  for (const JSON& property : member(change, "properties")) {
-    text += "    " + escapedText(textIn(property, "path")) + ": " + valueText(property, "before") +
+  std::string text = escapedText(wordIn(stage, "title")) + " (" +
+                     escapedText(wordIn(stage, "name")) +
+                     "): " + escapedText(wordIn(change, "change")) + "\n";
+  for (const JSON& property : memberOf(change, "properties")) {
+    text += "    " + escapedText(wordIn(property, "path")) + ": " + valueText(property, "before") +
             " → " + valueText(property, "after") + "\n";
   }
   return text;
@@ -132,12 +132,12 @@ std::string changeLines(const JSON& stage, const JSON& change) {
 std::string resultLines(const JSON& accounts, const Names& names, bool areChildren = false) {
   std::string text;
   for (const JSON& account : accounts) {
-    if (names.contains(textIn(account, "identifier"))) {
-      text += "Afterwards: " + escapedText(textIn(account, "title")) + ", account " +
-              escapedText(textIn(account, "place")) + ", identifier " +
-              escapedText(textIn(account, "identifier")) + "\n";
+    if (names.contains(wordIn(account, "identifier"))) {
+      text += "Afterwards: " + escapedText(wordIn(account, "title")) + ", account " +
+              escapedText(wordIn(account, "place")) + ", identifier " +
+              escapedText(wordIn(account, "identifier")) + "\n";
     }
-    text += areChildren ? "" : resultLines(member(account, "children"), names, true);
+    text += areChildren ? "" : resultLines(memberOf(account, "children"), names, true);
   }
   return text;
 }
@@ -146,34 +146,34 @@ std::string resultLines(const JSON& accounts, const Names& names, bool areChildr
 
 std::optional<std::string> accountStory(const JSON& report, std::string_view identifier) {
   Names names(identifier);
-  const JSON& stages = member(report, "stages");
-  const JSON& accounts = member(member(report, "ledger"), "accounts");
+  const JSON& stages = memberOf(report, "stages");
+  const JSON& accounts = memberOf(memberOf(report, "ledger"), "accounts");
   // Twice as long as names are found: a later stage may tell of an earlier name.
   for (std::size_t known = 0; known != names.size();) {
     known = names.size();
     for (const JSON& account : accounts) {
-      names.learnFrom(account, member(report, "accountsAfter"));
+      names.learnFrom(account, memberOf(report, "accountsAfter"));
     }
     for (const JSON& stage : stages) {
-      for (const JSON& change : member(stage, "accounts")) {
+      for (const JSON& change : memberOf(stage, "accounts")) {
         names.learnFrom(change);
       }
     }
   }
   std::string story;
   for (const JSON& account : accounts) {
-    if (names.contains(textIn(account, "identifier"))) {
+    if (names.contains(wordIn(account, "identifier"))) {
       story += originLine(account);
     }
   }
   for (const JSON& stage : stages) {
-    for (const JSON& change : member(stage, "accounts")) {
+    for (const JSON& change : memberOf(stage, "accounts")) {
       if (names.learnFrom(change)) {
         story += changeLines(stage, change);
       }
     }
   }
-  const std::string result = resultLines(member(report, "accountsAfter"), names);
+  const std::string result = resultLines(memberOf(report, "accountsAfter"), names);
   if (story.empty() && result.empty()) {
     return std::nullopt;
   }
