@@ -16,7 +16,7 @@ namespace {
 
 constexpr std::uint64_t kKibibyte = 1024;
 /// Between two limits that are tried.
-constexpr std::uint64_t kStep = 192 * kKibibyte;
+constexpr std::uint64_t kLimitStep = 192 * kKibibyte;
 constexpr int kMostSteps = 400;
 constexpr int kAccounts = 400;
 
@@ -82,7 +82,7 @@ class LittleMemory : public DeviceRootFixture,
     ProgramCall version = call(memory);
     version.arguments = {"--version"};
     while (runProgram(version).exitStatus != 0) {
-      memory += kStep;
+      memory += kLimitStep;
       version.memory = memory;
     }
     return memory;
@@ -101,7 +101,7 @@ TEST_P(LittleMemory, EndsWithOneClearLineOrAsWithEnough) {
   const std::string before = readText(kSettingsPath);
   std::uint64_t memory = leastMemory();
   int failures = 0;
-  for (int step = 0; step < kMostSteps; ++step, memory += kStep) {
+  for (int step = 0; step < kMostSteps; ++step, memory += kLimitStep) {
     const ProgramResult result = runProgram(call(memory));
     if (result.exitStatus == enough.exitStatus) {
       if (!std::get<Use>(GetParam()).isHost) {
