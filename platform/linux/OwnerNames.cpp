@@ -111,8 +111,9 @@ std::optional<std::string> OwnerNames::databaseAt(std::string_view path, PathErr
   return database->second.bytes;
 }
 
-std::optional<std::uint32_t> OwnerNames::lookUp(std::string_view databasePath,
-                                                const std::string& name, PathError& error) const {
+std::optional<std::uint32_t> OwnerNames::numberInDatabase(std::string_view databasePath,
+                                                          const std::string& name,
+                                                          PathError& error) const {
   const auto database = databaseAt(databasePath, error);
   if (!database) {
     return std::nullopt;
@@ -153,7 +154,7 @@ std::optional<std::uint32_t> OwnerNames::userIdentifier(const std::string& name,
   const auto lookUpUser = [&] {
     return root_.isSystemRoot()
                ? askIfPossible<passwd>(::getpwnam_r, &passwd::pw_uid, kUserDatabase, name, error)
-               : lookUp(kUserDatabase, name, error);
+               : numberInDatabase(kUserDatabase, name, error);
   };
   return rememberedOr(lookUpUser, name, users_);
 }
@@ -163,7 +164,7 @@ std::optional<std::uint32_t> OwnerNames::groupIdentifier(const std::string& name
   const auto lookUpGroup = [&] {
     return root_.isSystemRoot()
                ? askIfPossible<group>(::getgrnam_r, &group::gr_gid, kGroupDatabase, name, error)
-               : lookUp(kGroupDatabase, name, error);
+               : numberInDatabase(kGroupDatabase, name, error);
   };
   return rememberedOr(lookUpGroup, name, groups_);
 }

@@ -43,9 +43,9 @@ class OwnerNames {
   template <class LookUp>
   static std::optional<std::uint32_t> rememberedOr(const LookUp& lookUp, const std::string& name,
                                                    Found& found);
-  [[nodiscard]] std::optional<std::uint32_t> lookUp(std::string_view databasePath,
-                                                    const std::string& name,
-                                                    PathError& error) const;
+  [[nodiscard]] std::optional<std::uint32_t> numberInDatabase(std::string_view databasePath,
+                                                              const std::string& name,
+                                                              PathError& error) const;
 
   /// The bytes of a database, read ahead or now; none, with `error` set, for none.
   [[nodiscard]] std::optional<std::string> databaseAt(std::string_view path,
