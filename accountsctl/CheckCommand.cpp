@@ -8,6 +8,7 @@
 #include "accountsctl/JSONText.h"
 #include "accountsctl/LegacyFindings.h"
 #include "accountsctl/PropertyListInput.h"
+#include "accountsctl/Rehearsal.h"
 #include "accountsctl/SettingsFindings.h"
 #include "accountsctl/TextTable.h"
 #include "commandline/BundleLocation.h"
@@ -47,16 +48,18 @@ LinuxPlatformOptions platformOptions(const CheckOptions& options) {
   return result;
 }
 
-std::string tableOf(const std::vector<Finding>& findings, const Terminal& terminal) {
+std::string textOf(const std::vector<Finding>& findings, const Rehearsed& rehearsed,
+                   const Terminal& terminal) {
+  const std::string losses = linesOf(rehearsed);
   if (findings.empty()) {
-    return "Nothing found\n";
+    return losses.empty() ? "Nothing found\n" : losses;
   }
   TextTable table({"Place", "Account", "Effect", "Finding"});
   for (const Finding& finding : findings) {
     table.addRow({finding.place.empty() ? "file" : finding.place, finding.title,
                   std::string(nameOf(finding.effect)), finding.text});
   }
-  return table.text(terminal);
+  return table.text(terminal) + losses;
 }
 
 JSON objectFor(const Finding& finding) {
@@ -70,7 +73,8 @@ JSON objectFor(const Finding& finding) {
 }
 
 std::string objectLine(const CheckOptions& options, FileKind kind,
-                       const std::vector<Finding>& findings, ExitStatus exitStatus) {
+                       const std::vector<Finding>& findings, const Rehearsed& rehearsed,
+                       ExitStatus exitStatus) {
   JSON list = JSON::array();
   for (const Finding& finding : findings) {
     list.push_back(objectFor(finding));
@@ -79,6 +83,7 @@ std::string objectLine(const CheckOptions& options, FileKind kind,
   object["file"] = options.file;
   object["kind"] = identifierOf(kind);
   object["findings"] = std::move(list);
+  object["ledger"] = ledgerObject(rehearsed);
   return lineOf(std::move(object), exitStatus);
 }
 
@@ -102,9 +107,13 @@ CommandResult check(const CheckOptions& options, const Terminal& terminal) {
     return *error;
   }
   const std::vector<Finding> findings = checked->findings(*content.asDictionary());
-  const ExitStatus exitStatus = findings.empty() ? ExitStatus::Success : ExitStatus::Attention;
-  return CommandReport{options.reportsJSON ? objectLine(options, kind, findings, exitStatus)
-                                           : tableOf(findings, terminal),
+  const Rehearsed rehearsed = rehearseFile(*std::get<std::unique_ptr<DevicePlatform>>(platform),
+                                           kind, content, options.file);
+  const bool isGood = findings.empty() && linesOf(rehearsed).empty();
+  const ExitStatus exitStatus = isGood ? ExitStatus::Success : ExitStatus::Attention;
+  return CommandReport{options.reportsJSON
+                           ? objectLine(options, kind, findings, rehearsed, exitStatus)
+                           : textOf(findings, rehearsed, terminal),
                        exitStatus};
 }
 

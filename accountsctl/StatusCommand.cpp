@@ -7,6 +7,7 @@
 #include "accountsctl/DevicePlatform.h"
 #include "accountsctl/DeviceStatus.h"
 #include "accountsctl/JSONText.h"
+#include "accountsctl/Rehearsal.h"
 #include "accountsctl/TextTable.h"
 #include "accountsettings/AccountsManager.h"
 #include "commandline/BundleLocation.h"
@@ -68,7 +69,8 @@ std::vector<Work> worksOf(const DeviceStatus& status) {
   return works;
 }
 
-std::string tableOf(const DeviceStatus& status, const Terminal& terminal) {
+std::string textOf(const DeviceStatus& status, const Rehearsed& rehearsed,
+                   const Terminal& terminal) {
   TextTable table({"", ""});
   table.addRow({"Account settings", settingsWords(status)});
   std::string_view label = "A migration would";
@@ -85,11 +87,11 @@ std::string tableOf(const DeviceStatus& status, const Terminal& terminal) {
   for (const std::string& file : status.abandonedFiles) {
     table.addRow({"Abandoned file", file});
   }
-  return table.text(terminal);
+  return table.text(terminal) + linesOf(rehearsed);
 }
 
 std::string objectLine(const StatusOptions& options, const DeviceStatus& status,
-                       ExitStatus exitStatus) {
+                       const Rehearsed& rehearsed, ExitStatus exitStatus) {
   JSON works = JSON::array();
   for (const Work& work : worksOf(status)) {
     works.push_back(work.name);
@@ -104,6 +106,7 @@ std::string objectLine(const StatusOptions& options, const DeviceStatus& status,
       {"accounts", status.accountCount}};
   object["currentVersion"] = AccountsManager::currentVersion();
   object["work"] = std::move(works);
+  object["ledger"] = ledgerObject(rehearsed);
   object["keptFolders"] = status.keptFolders;
   object["abandonedFiles"] = status.abandonedFiles;
   object["pending"] = status.isPending();
@@ -124,9 +127,10 @@ CommandResult status(const StatusOptions& options, const Terminal& terminal) {
   const DeviceStatus found = statusOf(*device);
   const ExitStatus exitStatus =
       options.failsIfPending && found.isPending() ? ExitStatus::Attention : ExitStatus::Success;
-  return CommandReport{
-      options.reportsJSON ? objectLine(options, found, exitStatus) : tableOf(found, terminal),
-      exitStatus};
+  const Rehearsed rehearsed = rehearseDevice(*device);
+  return CommandReport{options.reportsJSON ? objectLine(options, found, rehearsed, exitStatus)
+                                           : textOf(found, rehearsed, terminal),
+                       exitStatus};
 }
 
 }  // namespace accounts

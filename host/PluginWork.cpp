@@ -27,9 +27,7 @@
 #include "report/MigrationRecorder.h"
 #include "report/RecordedPlatform.h"
 #include "safetynet/MigrationInMemory.h"
-#include "transaction/TransactionFileSystem.h"
-#include "transaction/TransactionFrameworkLoader.h"
-#include "transaction/TransactionPropertyLists.h"
+#include "transaction/TransactionPlatform.h"
 
 namespace accounts {
 namespace {
@@ -254,17 +252,10 @@ void workInMemory(const PluginWork& work, const WorkerSide& side, const DeviceSn
   giveUpRights(work, side);
 
   MigrationInMemory migration(snapshot, work.home);
-  TransactionFileSystem files(migration.transaction(), ownership,
-                              [&side](std::string_view path) { endOnForeignPath(side, path); });
-  TransactionPropertyLists propertyLists(migration.transaction(), linux.propertyLists());
-  LinuxPreferenceDomain preferences(propertyLists, linux.platform().homeDirectory);
-  TransactionSharedResources sharedResources(linux.platform().sharedResources, task.lock);
-  TransactionFrameworkLoader frameworks(linux.platform().frameworkLoader);
-  const Platform platform = platformWith(linux.platform(), {.fileSystem = &files,
-                                                            .frameworkLoader = &frameworks,
-                                                            .preferenceDomain = &preferences,
-                                                            .propertyLists = &propertyLists,
-                                                            .sharedResources = &sharedResources});
+  TransactionPlatform inMemory(migration.transaction(), linux.platform(), ownership, task.lock,
+                               [&side](std::string_view path) { endOnForeignPath(side, path); });
+  LinuxPreferenceDomain preferences(inMemory.propertyLists(), linux.platform().homeDirectory);
+  const Platform platform = inMemory.platform(preferences);
   PluginOutcome outcome;
   Proposal proposal;
   if (task.purpose == RunPurpose::FinishingAlone) {

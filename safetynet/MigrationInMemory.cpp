@@ -74,20 +74,23 @@ void MigrationInMemory::verify(PluginResult result, const DeviceFacts& facts) {
 
 CommitRecord MigrationInMemory::recordOfThisRun() {
   CommitRecord record = carriedOver_;
-  std::optional<CommitRecord::Proof> proof;
-  // Without a save this was the end of an interrupted removal: what the stores held was in the
-  // settings file before.
-  if (transaction_.lastSave() == LastSave::Written) {
-    proof = CommitRecord::Proof{
-        .accounts = accountsBrought(transaction_.dictionaryBefore(DevicePlace::Settings),
-                                    transaction_.dictionaryAt(DevicePlace::Settings),
-                                    kMostProvingAccounts)};
-  }
   for (const DevicePlace place : inputs_) {
     const PlaceState& state = transaction_.snapshot().at(place);
     // What is no file holds no accounts that could be converted twice.
     if (place != DevicePlace::Settings && state.contents != nullptr) {
-      record.stores.push_back({place, CommitRecord::traceOf(state.identity), proof});
+      record.stores.push_back({place, CommitRecord::traceOf(state.identity), std::nullopt});
+    }
+  }
+  // Without a save this was the end of an interrupted removal: what the stores held was in the
+  // settings file before.
+  const bool hasNewStores = record.stores.size() > carriedOver_.stores.size();
+  if (hasNewStores && transaction_.lastSave() == LastSave::Written) {
+    const CommitRecord::Proof proof = {
+        .accounts = accountsBrought(transaction_.dictionaryBefore(DevicePlace::Settings),
+                                    transaction_.dictionaryAt(DevicePlace::Settings),
+                                    kMostProvingAccounts)};
+    for (std::size_t index = carriedOver_.stores.size(); index < record.stores.size(); ++index) {
+      record.stores[index].proof = proof;
     }
   }
   return record;

@@ -10,11 +10,9 @@
 #include "accountsettings/Process.h"
 #include "host/WorkerChannel.h"
 #include "migrator/AccountsDataMigrator.h"
-#include "platform/ReplacedParts.h"
 #include "safetynet/MigrationInMemory.h"
 #include "tests/campaign/AllocationFailures.h"
-#include "transaction/TransactionFileSystem.h"
-#include "transaction/TransactionPropertyLists.h"
+#include "transaction/TransactionPlatform.h"
 
 namespace accounts {
 
@@ -91,16 +89,12 @@ std::variant<HandedOver, ProgramError> InProcessWorker::work(const DeviceSnapsho
 Proposal InProcessWorker::migrate(const DeviceSnapshot& snapshot, const WorkerTask& task) {
   MigrationInMemory migration(snapshot, kHome);
   KernelOwnershipRule ownership(device_.root);
-  TransactionFileSystem files(migration.transaction(), ownership, [](std::string_view path) {
-    throw std::logic_error("a path that no migration has: " + std::string(path));
-  });
-  TransactionPropertyLists propertyLists(migration.transaction(), device_.propertyLists);
-  LinuxPreferenceDomain preferences(propertyLists, device_.homeDirectory);
-  TransactionSharedResources sharedResources(device_.sharedResources, task.lock);
-  Platform platform = platformWith(device_.platform, {.fileSystem = &files,
-                                                      .preferenceDomain = &preferences,
-                                                      .propertyLists = &propertyLists,
-                                                      .sharedResources = &sharedResources});
+  TransactionPlatform inMemory(
+      migration.transaction(), device_.platform, ownership, task.lock, [](std::string_view path) {
+        throw std::logic_error("a path that no migration has: " + std::string(path));
+      });
+  LinuxPreferenceDomain preferences(inMemory.propertyLists(), device_.homeDirectory);
+  Platform platform = inMemory.platform(preferences);
   if (task.purpose == RunPurpose::FinishingAlone) {
     migration.verify(PluginResult::NotAsked, {});
   } else {

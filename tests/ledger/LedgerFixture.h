@@ -11,13 +11,11 @@
 #include <vector>
 
 #include "migrator/AccountsDataMigrator.h"
-#include "platform/ReplacedParts.h"
 #include "propertylist/binary/BinaryPropertyListSerializer.h"
 #include "safetynet/MigrationInMemory.h"
 #include "tests/fakes/FakePlatform.h"
 #include "tests/fakes/FakeSnapshot.h"
-#include "transaction/TransactionFileSystem.h"
-#include "transaction/TransactionPropertyLists.h"
+#include "transaction/TransactionPlatform.h"
 #include "vocabulary/AccountClasses.h"
 #include "vocabulary/AccountVocabulary.h"
 #include "vocabulary/LegacyStoreKeys.h"
@@ -120,18 +118,16 @@ class MigratedInMemory {
 
   void migrate(Liar* liar, const std::function<void(PropertyArray&)>& tamper) {
     migration_.emplace(snapshot, "/var/mobile");
-    TransactionFileSystem files(migration_->transaction(), owners_, [](std::string_view path) {
-      FAIL() << "a path that no migration has: " << path;
-    });
-    TransactionPropertyLists lists(migration_->transaction(), device.propertyLists);
+    TransactionPlatform inMemory(
+        migration_->transaction(), device.platform, owners_, MigrationLockState::Available,
+        [](std::string_view path) { FAIL() << "a path that no migration has: " << path; });
     MigrationObserver* observer = &migration_->told();
     if (liar != nullptr) {
       liar->listener = observer;
       observer = liar;
     }
-    Platform platform = platformWith(
-        device.platform,
-        {.fileSystem = &files, .propertyLists = &lists, .migrationObserver = observer});
+    Platform platform = inMemory.platform(device.preferenceDomain);
+    platform.migrationObserver = observer;
     const Process process(platform);
     const bool result = AccountsDataMigrator().performMigration();
     if (tamper) {

@@ -26,13 +26,17 @@ TEST_F(AccountsctlCheck, AFileAsItShouldBeGivesZero) {
 }
 
 TEST_F(AccountsctlCheck, FindingsAreATableAndGiveOne) {
-  const ProgramResult result =
-      run({"check", settingsWith({{"Type", "Pigeon"}, {"Class", "C"}, {"DisplayName", "Loft"}})});
+  const std::string file =
+      settingsWith({{"Type", "Pigeon"}, {"Class", "C"}, {"DisplayName", "Loft"}});
+
+  const ProgramResult result = run({"check", file});
 
   EXPECT_EQ(result.exitStatus, kAttention);
   EXPECT_EQ(result.output,
             "Place\tAccount\tEffect\tFinding\n"
-            "1\tPigeon 'Loft'\tdropped\tThe type 'Pigeon' is unknown\n");
+            "1\tPigeon 'Loft'\tdropped\tThe type 'Pigeon' is unknown\n"
+            "Not carried over: Accounts[0] \"Loft\" of " +
+                file + ": its type is unknown\n");
   EXPECT_EQ(result.errors, "");
 }
 
@@ -48,6 +52,26 @@ TEST_F(AccountsctlCheck, WithJSONFindingsAreOneObject) {
                                     {"title", "Pigeon"},
                                     {"identifier", "P"},
                                     {"text", "The type 'Pigeon' is unknown"}}}));
+}
+
+TEST_F(AccountsctlCheck, WhatAMigrationOfTheFileWouldNotCarryOverIsNamed) {
+  const std::string file = write(
+      "mail", PropertyDictionary{
+                  {"MailAccounts", PropertyArray{PropertyDictionary{{"AccountType", "IMAPAccount"},
+                                                                    {"uniqueId", "M"}},
+                                                 PropertyDictionary{}}}});
+  const std::string first = "MailAccounts[0] (identifier M) of " + file +
+                            ": another account of its store was refused, so the store stays out as "
+                            "a whole";
+  const std::string second = "MailAccounts[1] of " + file + ": it has no class";
+
+  EXPECT_EQ(run({"check", file}).output,
+            "Place\tAccount\tEffect\tFinding\n"
+            "MailAccounts 2\tMail\trefused\tIt has no class\n"
+            "Not carried over: " +
+                first + "\nNot carried over: " + second + "\n");
+  EXPECT_EQ(onlyObject(run({"check", "--json", file}))["ledger"]["losses"],
+            nlohmann::json::array({first, second}));
 }
 
 TEST_F(AccountsctlCheck, TheProfilesOfTheDeviceDescriptionCount) {

@@ -107,6 +107,19 @@ TEST_F(AccountsctlStatus, UnreadableSettingsAreReportedWithTheReason) {
   EXPECT_NE(object["settings"]["problem"].get<std::string>().find("in line 1"), std::string::npos);
 }
 
+TEST_F(AccountsctlStatus, AMigrationThatWouldFailIsForetold) {
+  write(kSettingsPath, accountSettings(9));
+  writeText(kSentinelPath, "");
+
+  EXPECT_EQ(status().output.substr(status().output.rfind("\nA migration") + 1),
+            "A migration would fail: The plug-in reported success but the settings file has not "
+            "the current version, although " +
+                std::string(kSentinelPath) +
+                " says that the legacy stores were being removed after a migration; without that "
+                "file a run migrates them; nothing is changed\n");
+  EXPECT_EQ(statusObject(true)["ledger"], nullptr);
+}
+
 TEST_F(AccountsctlStatus, KeptInputsAreNamed) {
   const std::string folder = "/var/mobile/Library/AccountMigration/Kept-20260101T000000Z";
   writeText(folder + "/file", "");

@@ -189,6 +189,8 @@ TEST_P(Losses, AreForetoldNamedKeptAndCanBePutBack) {
   ProgramCall call = migrationCall({"--json"});
   call.arguments.front() = "plan";
   const nlohmann::json plan = onlyObject(runProgram(call));
+  const nlohmann::json status = onlyObject(
+      runProgram({.program = accountsctl(), .arguments = {"status", "--root", root(), "--json"}}));
 
   const ProgramResult result = migrate({"--json"});
 
@@ -200,7 +202,9 @@ TEST_P(Losses, AreForetoldNamedKeptAndCanBePutBack) {
     expected.push_back(testing::StartsWith(line));
   }
   EXPECT_THAT(lines, ElementsAreArray(expected));
+  EXPECT_EQ(plan["ledger"]["counts"], object["ledger"]["counts"]);
   EXPECT_EQ(plan["ledger"]["losses"], object["ledger"]["losses"]);
+  EXPECT_EQ(status["ledger"], object["ledger"]);
   EXPECT_EQ(plan["exitStatus"], kNotAllCarriedOver);
   EXPECT_THAT(object["outcome"].get<std::string>(), HasSubstr(lines.front()));
   const std::string folder = onlyKeptFolder();
@@ -217,12 +221,16 @@ TEST_P(Losses, AreForetoldNamedKeptAndCanBePutBack) {
   }
 }
 
-TEST_P(Losses, AreEachALineOfTheSummary) {
+TEST_P(Losses, AreEachALineOfTheSummaryAndOfTheStatusBefore) {
+  const ProgramResult status =
+      runProgram({.program = accountsctl(), .arguments = {"status", "--root", root()}});
+
   const ProgramResult result = migrate();
 
   EXPECT_THAT(result.output, HasSubstr("not carried over:\n"));
   for (const std::string& line : GetParam().lines) {
     EXPECT_THAT(result.output, HasSubstr("  Not carried over: " + line));
+    EXPECT_THAT(status.output, HasSubstr("\nNot carried over: " + line));
   }
 }
 

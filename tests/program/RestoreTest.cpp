@@ -1,5 +1,10 @@
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
 #include <filesystem>
 
+#include "tests/program/DeviceTree.h"
 #include "tests/program/ExitStatuses.h"
 #include "tests/program/Programs.h"
 #include "tests/program/SafetyNetFixture.h"
@@ -140,6 +145,48 @@ TEST_F(Restore, WithNothingKeptSaysSo) {
   EXPECT_EQ(result.exitStatus, 66);
   EXPECT_EQ(result.errors,
             "migration-host: No files are kept in /var/mobile/Library/AccountMigration\n");
+}
+
+TEST_F(Restore, BringsBackBytesOwnersModesAndTimesOfAllThatARunReplacesOrRemoves) {
+  ASSERT_EQ(restore().exitStatus, 0);
+  std::filesystem::remove_all(onThisMachine(kAccountMigration));
+  std::filesystem::remove(onThisMachine(kSettingsPath));
+  const std::vector<std::string> changed = {
+      kSettingsPath,       kSettingsCopyPath,
+      kLegacyMailPath,     kLegacyMailPath + std::string(".original"),
+      kLegacyExchangePath, kLegacyExchangePath + std::string(".original"),
+      kAutoFetchPath};
+  write(kSettingsPath, accountSettings(3));
+  write(kLegacyMailPath, legacyMail());
+  write(kLegacyExchangePath, PropertyDictionary{{"DAAccountsKey", PropertyArray{}}});
+  // Each with a mode and, where the test may, an owner of its own, written long ago.
+  mode_t mode = 0600;
+  for (const std::string& each : changed) {
+    if (!exists(each)) {
+      writeText(each, "bytes of " + each);
+    }
+    const std::string path = onThisMachine(each);
+    ASSERT_EQ(chmod(path.c_str(), ++mode), 0);
+    ASSERT_TRUE(geteuid() != 0 || chown(path.c_str(), mode, mode) == 0);
+    const timespec times[] = {{0, UTIME_OMIT}, {1000000000 + mode, 123456789}};
+    ASSERT_EQ(utimensat(AT_FDCWD, path.c_str(), times, 0), 0);
+  }
+  const DeviceTree before = treeOf(onThisMachine("/"));
+  ASSERT_EQ(migrate({"--keep"}).exitStatus, 0);
+  for (const std::string& each : changed) {
+    EXPECT_FALSE(exists(each) && readText(each) == before.at(each).contents) << each;
+  }
+
+  ASSERT_EQ(restore().exitStatus, 0);
+
+  const DeviceTree after = treeOf(onThisMachine("/"));
+  mode = 0600;
+  for (const std::string& each : changed) {
+    ASSERT_TRUE(after.contains(each)) << each;
+    EXPECT_EQ(after.at(each), before.at(each)) << each;
+    EXPECT_EQ(statusOf(each).st_mtim.tv_sec, 1000000000 + ++mode) << each;
+    EXPECT_EQ(statusOf(each).st_mtim.tv_nsec, 123456789) << each;
+  }
 }
 
 TEST_F(Restore, EndsWhatWouldTakeTheStoresForConvertedOnes) {

@@ -1,0 +1,31 @@
+#pragma once
+
+#include <string>
+#include <variant>
+
+#include "accountsctl/DevicePlatform.h"
+#include "inspection/PropertyListJSON.h"
+#include "inspection/StoreLayout.h"
+#include "safetynet/AccountLedger.h"
+
+namespace accounts {
+
+/// The ledger of a migration that was made in memory, as a run makes it, and of which nothing is
+/// written; or why a run would fail.
+using Rehearsed = std::variant<AccountLedger, ProgramError>;
+
+/// Rehearses the migration of a device.
+Rehearsed rehearseDevice(DevicePlatform& device);
+
+/// Rehearses the migration of a device that has one file alone: account settings or a legacy store.
+/// `name` is what the ledger calls the file.
+Rehearsed rehearseFile(DevicePlatform& device, FileKind kind, const PropertyValue& content,
+                       const std::string& name);
+
+/// The ledger for the object of a subcommand; null when there is none.
+JSON ledgerObject(const Rehearsed& rehearsed);
+
+/// Why it would fail, or what would not be carried over, a line each; empty for nothing.
+std::string linesOf(const Rehearsed& rehearsed);
+
+}  // namespace accounts
