@@ -7,6 +7,7 @@
 #include "inspection/ListedAccount.h"
 #include "propertylist/value/HiddenSecrets.h"
 #include "vocabulary/AccountVocabulary.h"
+#include "vocabulary/ElementName.h"
 
 namespace accounts {
 namespace {
@@ -38,8 +39,8 @@ JSON dataclassesOf(const PropertyDictionary& properties) {
   return list;
 }
 
-JSON objectFor(const ListedAccount& account, const StoreLayout& layout, FileKind kind,
-               Secrets secrets) {
+JSON objectFor(const ListedAccount& account, const std::string& element, const StoreLayout& layout,
+               FileKind kind, Secrets secrets) {
   PropertyDictionary properties = account.properties.value_or(PropertyDictionary());
   if (!account.isChild && properties.arrayForKey(layout.childrenKey)) {
     properties.remove(layout.childrenKey);
@@ -48,6 +49,7 @@ JSON objectFor(const ListedAccount& account, const StoreLayout& layout, FileKind
       secrets == Secrets::Hide ? withSecretsHidden(properties) : PropertyValue(properties);
   return {{"source", identifierOf(kind)},
           {"place", account.place},
+          {"element", element},
           {"identifier", textOrNull(account.identifier)},
           {"title", titleOf(account, layout)},
           {"type", textOrNull(wordOrNone(properties, layout.typeKey))},
@@ -66,9 +68,16 @@ void appendAccountTree(JSON& list, const PropertyDictionary& root, FileKind kind
   }
   for (const AccountArray& array : layout->arrays) {
     const PropertyArray accounts = root.arrayForKey(array.key).value_or(PropertyArray());
+    std::size_t count = 0;
     for (const ListedAccount& account : listedAccounts(accounts, *layout)) {
-      JSON& destination = account.isChild ? list.back()["children"] : list;
-      destination.push_back(objectFor(account, *layout, kind, secrets));
+      if (account.isChild) {
+        JSON& siblings = list.back()["children"];
+        const std::string element = elementName(array.key, count - 1, siblings.size());
+        siblings.push_back(objectFor(account, element, *layout, kind, secrets));
+      } else {
+        list.push_back(objectFor(account, elementName(array.key, count), *layout, kind, secrets));
+        ++count;
+      }
     }
   }
 }

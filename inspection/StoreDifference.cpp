@@ -1,5 +1,6 @@
 #include "inspection/StoreDifference.h"
 
+#include <algorithm>
 #include <deque>
 #include <unordered_map>
 #include <utility>
@@ -36,9 +37,14 @@ class ArrayComparison {
         layout_(layout),
         secrets_(secrets) {}
 
-  void addTo(StoreDifference& difference) {
-    matchInOrder([&](const ListedAccount& account) { return matchingKey(account, layout_); });
-    matchRenamed();
+  void addTo(StoreDifference& difference, const std::optional<Partners>& partners) {
+    if (partners) {
+      matchTold(*partners);
+    }
+    matchInOrder();
+    if (!partners) {
+      matchRenamed();
+    }
     for (std::size_t index = 0; index < after_.size(); ++index) {
       if (partners_[index]) {
         addChange(*partners_[index], std::move(after_[index]), difference);
@@ -59,15 +65,41 @@ class ArrayComparison {
     isMatched_[before] = true;
   }
 
+  /// The places of the top-level accounts among all.
+  static std::vector<std::size_t> topLevel(const std::vector<ListedAccount>& accounts) {
+    std::vector<std::size_t> places;
+    for (std::size_t index = 0; index < accounts.size(); ++index) {
+      if (!accounts[index].isChild) {
+        places.push_back(index);
+      }
+    }
+    return places;
+  }
+
+  void matchTold(const Partners& partners) {
+    const std::vector<std::size_t> before = topLevel(before_);
+    const std::vector<std::size_t> after = topLevel(after_);
+    for (std::size_t index = 0; index < std::min(after.size(), partners.size()); ++index) {
+      const auto partner = partners[index];
+      if (partner && *partner < before.size() && !isMatched_[before[*partner]]) {
+        match(before[*partner], after[index]);
+      }
+    }
+  }
+
   /// Accounts with one key are the same, in their order.
-  template <class KeyOf>
-  void matchInOrder(const KeyOf& keyOf) {
+  void matchInOrder() {
     std::unordered_map<std::string, std::deque<std::size_t>> unmatched;
     for (std::size_t index = 0; index < before_.size(); ++index) {
-      unmatched[keyOf(before_[index])].push_back(index);
+      if (!isMatched_[index]) {
+        unmatched[matchingKey(before_[index], layout_)].push_back(index);
+      }
     }
     for (std::size_t index = 0; index < after_.size(); ++index) {
-      std::deque<std::size_t>& candidates = unmatched[keyOf(after_[index])];
+      if (partners_[index]) {
+        continue;
+      }
+      std::deque<std::size_t>& candidates = unmatched[matchingKey(after_[index], layout_)];
       if (!candidates.empty()) {
         match(candidates.front(), index);
         candidates.pop_front();
@@ -129,8 +161,7 @@ class ArrayComparison {
   std::vector<ListedAccount> before_;
   std::vector<ListedAccount> after_;
   /// Of each account in the newer file, the same one in the older file.
-  std::vector<std::optional<std::size_t>> partners_ =
-      std::vector<std::optional<std::size_t>>(after_.size());
+  Partners partners_ = Partners(after_.size());
   std::vector<bool> isMatched_ = std::vector<bool>(before_.size());
   const StoreLayout& layout_;
   Secrets secrets_;
@@ -141,7 +172,8 @@ class ArrayComparison {
 }  // namespace
 
 StoreDifference differenceBetween(const PropertyDictionary& before, const PropertyDictionary& after,
-                                  FileKind kind, Secrets secrets) {
+                                  FileKind kind, Secrets secrets,
+                                  const std::optional<Partners>& partners) {
   StoreDifference difference;
   PropertyDictionary restBefore = before;
   PropertyDictionary restAfter = after;
@@ -151,7 +183,7 @@ StoreDifference differenceBetween(const PropertyDictionary& before, const Proper
       const std::optional<PropertyArray> right = after.arrayForKey(array.key);
       ArrayComparison(left.value_or(PropertyArray()), right.value_or(PropertyArray()), *layout,
                       secrets)
-          .addTo(difference);
+          .addTo(difference, partners);
       // An empty array where the other file has none is a difference of its own.
       if (left && (right || !left->empty())) {
         restBefore.remove(array.key);

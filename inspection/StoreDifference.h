@@ -36,11 +36,18 @@ struct StoreDifference {
   }
 };
 
-/// Compares two roots of one kind. Accounts are the same if they have the same identifier;
-/// several with one identifier are compared in their order, as are those without one that have the
-/// same type and name. Of what is left, an account that alone has its type and name on both sides
-/// is the same with another identifier.
+/// Of each top-level account of a newer file the index of the same one among those of the older
+/// one; none for one that was not there.
+using Partners = std::vector<std::optional<std::size_t>>;
+
+/// Compares two roots of one kind. With `partners` these tell which top-level accounts are the
+/// same, as whoever changed them says, and identifiers tell of children and of what is left.
+/// Otherwise accounts are the same if they have the same identifier; several with one identifier
+/// are compared in their order, as are those without one that have the same type and name. Of what
+/// is left, an account that alone has its type and name on both sides is the same with another
+/// identifier.
 StoreDifference differenceBetween(const PropertyDictionary& before, const PropertyDictionary& after,
-                                  FileKind kind, Secrets secrets);
+                                  FileKind kind, Secrets secrets,
+                                  const std::optional<Partners>& partners = std::nullopt);
 
 }  // namespace accounts

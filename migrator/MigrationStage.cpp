@@ -13,15 +13,24 @@ MigrationObserver* observer() {
   return Process::current().platform.migrationObserver;
 }
 
-/// What a settings file of the accounts in memory would hold.
-PropertyDictionary accountSettings(const AccountsManager& store) {
+std::vector<AccountOrigin> originsOf(const AccountsManager& store) {
+  std::vector<AccountOrigin> origins;
+  origins.reserve(store.allBasicAccounts().size());
+  for (const BasicAccountReference& account : store.allBasicAccounts()) {
+    origins.push_back(account->origin());
+  }
+  return origins;
+}
+
+AccountsInMemory accountsOf(const AccountsManager& store) {
   std::vector<PropertyValue> accounts;
   accounts.reserve(store.allBasicAccounts().size());
   for (const BasicAccountReference& account : store.allBasicAccounts()) {
     accounts.emplace_back(account->propertiesToSave());
   }
-  return {{kPlistAccountsKey, PropertyArray(std::move(accounts))},
-          {kPlistVersionKey, store.dataVersion()}};
+  return {{{kPlistAccountsKey, PropertyArray(std::move(accounts))},
+           {kPlistVersionKey, store.dataVersion()}},
+          originsOf(store)};
 }
 
 }  // namespace
@@ -33,16 +42,9 @@ void tellFate(const AccountEvent& event) {
 }
 
 void tellSavedAccounts(const AccountsManager& store) {
-  MigrationObserver* const told = observer();
-  if (told == nullptr) {
-    return;
+  if (MigrationObserver* const told = observer()) {
+    told->accountsSaved(originsOf(store));
   }
-  std::vector<AccountOrigin> origins;
-  origins.reserve(store.allBasicAccounts().size());
-  for (const BasicAccountReference& account : store.allBasicAccounts()) {
-    origins.push_back(account->origin());
-  }
-  told->accountsSaved(origins);
 }
 
 void nameMadeAccount(BasicAccount& account) {
@@ -58,7 +60,7 @@ MigrationStage::MigrationStage(std::string_view operation, std::string_view purp
 void MigrationStage::end(bool succeeded, const AccountsManager* store) {
   if (MigrationObserver* const told = observer()) {
     told->stageEnded(succeeded, store != nullptr && told->wantsAccounts()
-                                    ? std::optional(accountSettings(*store))
+                                    ? std::optional(accountsOf(*store))
                                     : std::nullopt);
   }
 }

@@ -9,6 +9,14 @@
 
 namespace accounts {
 
+/// The accounts in memory at one moment.
+struct AccountsInMemory {
+  /// What a settings file of them would hold.
+  PropertyDictionary settings;
+  /// Which account each top-level one is, in the order of the file.
+  std::vector<AccountOrigin> origins;
+};
+
 /// Is told what a migration does, stage by stage, on the migration's own thread. No stage begins
 /// before the one before it has ended.
 class MigrationObserver {
@@ -22,11 +30,9 @@ class MigrationObserver {
   /// few words for people what that is for.
   virtual void stageBegan(std::string_view operation, std::string_view purpose) = 0;
 
-  /// The stage that began last has ended. `accountSettings` is what a settings file of the accounts
-  /// in memory would hold now; none where they are not in memory or not
-  /// wanted.
-  virtual void stageEnded(bool succeeded,
-                          const std::optional<PropertyDictionary>& accountSettings) = 0;
+  /// The stage that began last has ended, with these accounts; none where they are not in memory or
+  /// not wanted.
+  virtual void stageEnded(bool succeeded, const std::optional<AccountsInMemory>& accounts) = 0;
 
   /// An account of the store that is migrated, not of one that a save makes to look at the file,
   /// met a fate.

@@ -1,5 +1,6 @@
 #include "report/MigrationRecorder.h"
 
+#include <unordered_map>
 #include <utility>
 
 #include "inspection/AccountTree.h"
@@ -13,6 +14,38 @@ namespace {
 JSON versionOf(const PropertyDictionary& settings) {
   const PropertyValue* const version = settings.find(kPlistVersionKey);
   return version != nullptr ? jsonOf(*version) : JSON(nullptr);
+}
+
+/// The accounts of a settings file as nobody has changed them.
+std::vector<AccountOrigin> originsIn(const PropertyDictionary& settings) {
+  std::vector<AccountOrigin> origins(
+      settings.arrayForKey(kPlistAccountsKey).value_or(PropertyArray()).size());
+  for (std::uint32_t index = 0; index < origins.size(); ++index) {
+    origins[index] = {AccountOrigin::Kind::Settings, index};
+  }
+  return origins;
+}
+
+/// Of each account the place where it stood before.
+Partners partnersOf(const std::vector<AccountOrigin>& accounts,
+                    const std::vector<AccountOrigin>& before) {
+  const auto keyOf = [](AccountOrigin origin) {
+    return (static_cast<std::uint64_t>(origin.kind) << 32U) | origin.number;
+  };
+  std::unordered_map<std::uint64_t, std::size_t> places;
+  for (std::size_t index = 0; index < before.size(); ++index) {
+    // Of made accounts that nothing is told of there may be several.
+    if (before[index] != AccountOrigin()) {
+      places.emplace(keyOf(before[index]), index);
+    }
+  }
+  Partners partners(accounts.size());
+  for (std::size_t index = 0; index < accounts.size(); ++index) {
+    if (const auto found = places.find(keyOf(accounts[index])); found != places.end()) {
+      partners[index] = found->second;
+    }
+  }
+  return partners;
 }
 
 }  // namespace
@@ -29,7 +62,7 @@ void MigrationRecorder::recordBefore(const std::vector<StoreFile>& stores) {
   for (const StoreFile& store : stores) {
     appendAccountTree(accounts, store.content, store.kind, secrets_);
     if (store.kind == FileKind::AccountSettings) {
-      accountSettings_ = store.content;
+      accounts_ = {store.content, originsIn(store.content)};
       version = versionOf(store.content);
     }
   }
@@ -67,14 +100,15 @@ void MigrationRecorder::stageBegan(std::string_view operation, std::string_view 
 }
 
 void MigrationRecorder::stageEnded(bool succeeded,
-                                   const std::optional<PropertyDictionary>& accountSettings) {
+                                   const std::optional<AccountsInMemory>& accounts) {
   const std::chrono::duration<double> duration = std::chrono::steady_clock::now() - stageBegin_;
   JSON ended = {{"succeeded", succeeded}, {"seconds", duration.count()}};
-  if (accountSettings) {
+  if (accounts) {
     const StoreDifference difference =
-        differenceBetween(accountSettings_, *accountSettings, FileKind::AccountSettings, secrets_);
+        differenceBetween(accounts_.settings, accounts->settings, FileKind::AccountSettings,
+                          secrets_, partnersOf(accounts->origins, accounts_.origins));
     ended.update(differenceObject(difference, *layoutOf(FileKind::AccountSettings)));
-    accountSettings_ = *accountSettings;
+    accounts_ = *accounts;
   }
   write(events::kEnded, std::move(ended));
 }

@@ -48,8 +48,7 @@ class MigrationRecorder final : public MigrationObserver {
   void recordLogLine(LogKind kind, std::string_view line);
 
   void stageBegan(std::string_view operation, std::string_view purpose) override;
-  void stageEnded(bool succeeded,
-                  const std::optional<PropertyDictionary>& accountSettings) override;
+  void stageEnded(bool succeeded, const std::optional<AccountsInMemory>& accounts) override;
 
  private:
   void write(std::string_view event, JSON content);
@@ -58,7 +57,7 @@ class MigrationRecorder final : public MigrationObserver {
   const Secrets secrets_;
   std::mutex mutex_;
   /// The accounts after the newest stage that had any.
-  PropertyDictionary accountSettings_;
+  AccountsInMemory accounts_;
   std::chrono::steady_clock::time_point stageBegin_;
 };
 

@@ -5,6 +5,7 @@
 #include "propertylist/value/Description.h"
 #include "propertylist/value/HiddenSecrets.h"
 #include "vocabulary/AccountVocabulary.h"
+#include "vocabulary/ElementName.h"
 #include "vocabulary/LegacyStoreKeys.h"
 
 namespace accounts {
@@ -39,14 +40,6 @@ std::optional<PropertyDictionary> childOf(const std::optional<PropertyDictionary
     return parent;
   }
   return dictionaryAt(parent->arrayForKey(kAccountChildAccounts).value_or(PropertyArray()), *child);
-}
-
-std::string elementOf(std::string_view array, std::uint32_t index) {
-  return std::string(array) + "[" + std::to_string(index) + "]";
-}
-
-std::string childElement(const std::optional<std::uint32_t>& child) {
-  return child ? "." + elementOf(kAccountChildAccounts, *child) : "";
 }
 
 }  // namespace
@@ -105,12 +98,11 @@ std::size_t AccountLedger::countOf(AccountFate fate) const {
 }
 
 std::string AccountLedger::placeOf(const LedgerEntry& entry) {
-  return elementOf(arrayKeyOf(entry.account.kind), entry.account.number) +
-         childElement(entry.child);
+  return elementName(arrayKeyOf(entry.account.kind), entry.account.number, entry.child);
 }
 
 std::string AccountLedger::placeOf(const LedgerPlace& place) {
-  return elementOf(kPlistAccountsKey, place.index) + childElement(place.child);
+  return elementName(kPlistAccountsKey, place.index, place.child);
 }
 
 DevicePlace AccountLedger::fileOf(const LedgerEntry& entry) {

@@ -11,10 +11,9 @@ void ToldFates::stageBegan(std::string_view operation, std::string_view purpose)
   }
 }
 
-void ToldFates::stageEnded(bool succeeded,
-                           const std::optional<PropertyDictionary>& accountSettings) {
+void ToldFates::stageEnded(bool succeeded, const std::optional<AccountsInMemory>& accounts) {
   if (next_ != nullptr) {
-    next_->stageEnded(succeeded, accountSettings);
+    next_->stageEnded(succeeded, accounts);
   }
 }
 

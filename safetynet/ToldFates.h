@@ -28,8 +28,7 @@ class ToldFates final : public MigrationObserver {
     return next_ != nullptr && next_->wantsAccounts();
   }
   void stageBegan(std::string_view operation, std::string_view purpose) override;
-  void stageEnded(bool succeeded,
-                  const std::optional<PropertyDictionary>& accountSettings) override;
+  void stageEnded(bool succeeded, const std::optional<AccountsInMemory>& accounts) override;
   void accountFared(const AccountEvent& event) override;
   void accountsSaved(const std::vector<AccountOrigin>& accounts) override;
 

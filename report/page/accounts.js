@@ -14,9 +14,17 @@ function textsOf({ content, properties }) {
                        ...properties.values()], []);
 }
 
-function badge(mark) {
+function badge(mark, words = kMarkNames[mark] ?? mark) {
   return make("span", { class: `badge ${mark}` },
-    make("span", { "aria-hidden": "true" }, `${kMarks[mark] ?? "•"} `), kMarkNames[mark] ?? mark);
+    make("span", { "aria-hidden": "true" }, `${kMarks[mark] ?? "•"} `), words);
+}
+
+/** A mark of an account, with what it was joined into or why it was not carried over. */
+function badgeOf(mark, { others, entry, side }) {
+  if (side === "before" && mark === "joined") {
+    return badge(mark, shown(`joined into ${others.map(({ title }) => title).join(", ")}`));
+  }
+  return side === "before" && mark === "lost" ? badge(mark, shown(`not carried over: ${entry.reason ?? ""}`)) : badge(mark);
 }
 
 function shortName(dataclass) {
@@ -46,7 +54,7 @@ function accountSummary(account) {
   const source = kSources[account.content.source];
   return [
     make("span", { class: "line" }, data("strong", { class: "title" }, account.title),
-      source ? make("span", { class: "source" }, source) : null, account.marks.map(badge)),
+      source ? make("span", { class: "source" }, source) : null, account.marks.map((mark) => badgeOf(mark, account))),
     dataclassLine(account),
   ];
 }

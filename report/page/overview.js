@@ -27,7 +27,8 @@ function outcomeOf(report, counts) {
     return { 2: "unverified", 3: "losses" }[report.exitStatus] ?? "failed";
   }
   const { before, after } = report.versions ?? {};
-  const isChanged = Object.keys(kMarks).some((mark) => counts[mark] > 0);
+  // Without a ledger nobody knows.
+  const isChanged = !report.ledger || Object.keys(kMarks).some((mark) => counts[mark] > 0);
   return isChanged || before !== after ? "migrated" : "unchanged";
 }
 
@@ -39,12 +40,11 @@ function versionWords({ before, after } = {}) {
     before === after ? `; their version stays ${after}` : ` from version ${before} to ${after}`;
 }
 
-/** How many accounts have each mark; those without one are "unchanged". */
-function countMarks(accounts) {
-  const counts = { unchanged: 0 };
-  const removed = accounts.allBefore.filter((account) => account.partner === null);
-  for (const { marks } of [...accounts.allAfter, ...removed]) {
-    for (const mark of marks.length === 0 ? ["unchanged"] : marks) {
+/** How many accounts of the inputs have each mark, and how many of the result are new. */
+function countMarks({ allBefore, allAfter }) {
+  const counts = { unchanged: 0, added: allAfter.filter(({ marks }) => marks.includes("added")).length };
+  for (const { marks, entry } of allBefore) {
+    for (const mark of marks.length === 0 && entry !== null ? ["unchanged"] : marks) {
       counts[mark] = (counts[mark] ?? 0) + 1;
     }
   }

@@ -1,4 +1,4 @@
-// The accounts before and after, each account paired with what it was or became.
+// The accounts before and after. What became of each is what the ledger of the migration says.
 
 /** One account of one side. */
 class Account {
@@ -9,7 +9,10 @@ class Account {
     this.title = content.title || content.identifier || "an account";
     this.properties = propertiesOf(content);
     this.children = (content.children ?? []).map((child) => new Account(child, side, this));
-    // The same account on the other side, and what became of it: rows of kMarks.
+    // Before: the ledger's entry. What the account became, or was, on the other side; the first one
+    // is what it is compared with.
+    this.entry = null;
+    this.others = [];
     this.partner = null;
     this.marks = [];
     this.part = null;
@@ -18,9 +21,17 @@ class Account {
 
 // Each with the sign that tells it without its colour.
 const kMarks = {
-  added: "+", removed: "−", changed: "≠", moved: "⇄", converted: "⇒", identified: "#",
+  added: "+", removed: "−", changed: "≠", moved: "⇄", converted: "⇒", renamed: "#", joined: "∪",
+  rebuilt: "↻", earlier: "✓", lost: "✕",
 };
-const kMarkNames = { identified: "new identifier" };
+const kMarkNames = {
+  rebuilt: "made anew", earlier: "carried over by an earlier run", lost: "not carried over",
+};
+const kMarksOfFates = {
+  changed: "changed", renamed: "renamed", converted: "converted", movedBelow: "moved",
+  movedToOtherParent: "moved", joined: "joined", rebuilt: "rebuilt", carriedOverEarlier: "earlier",
+  notCarriedOver: "lost",
+};
 
 /** An account's values by their paths, without the children, which are accounts of their own. */
 function propertiesOf(content) {
@@ -36,97 +47,58 @@ function flattened(accounts) {
   return accounts.flatMap((account) => [account, ...flattened(account.children)]);
 }
 
-function pair(one, other) {
-  one.partner = other;
-  other.partner = one;
-}
-
-/** Pairs accounts that have no partner yet, those of equal keys in their order. */
-function pairBy(keyOf, before, after) {
-  const waiting = new Map();
-  for (const account of after.filter((each) => each.partner === null).reverse()) {
-    const key = keyOf(account);
-    waiting.has(key) ? waiting.get(key).push(account) : waiting.set(key, [account]);
-  }
-  for (const account of before.filter((each) => each.partner === null)) {
-    const partner = waiting.get(keyOf(account))?.pop();
-    if (partner !== undefined) {
-      pair(account, partner);
-    }
-  }
-}
-
-/** The accounts that have no partner yet and alone have their type and name in their store. */
-function aloneWithTheirName(accounts) {
-  const byName = new Map();
-  for (const account of accounts.filter((each) => each.partner === null)) {
-    const { type, source, properties } = account.content;
-    if (type && properties?.DisplayName) {
-      const name = `${source} ${account.title}`;
-      byName.set(name, byName.has(name) ? null : account);
-    }
-  }
-  return byName;
-}
-
-/** Pairs accounts that got another identifier: those that alone have their name on both sides. */
-function pairRenamed(before, after) {
-  const candidates = aloneWithTheirName(after);
-  for (const [name, account] of aloneWithTheirName(before)) {
-    const partner = candidates.get(name) ?? null;
-    if (account !== null && partner !== null) {
-      pair(account, partner);
-    }
-  }
-}
-
-function identityOf(account) {
-  const { identifier } = account.content;
-  return identifier ? `identifier ${identifier}` : `title ${account.title}`;
-}
-
 function hasSameProperties(one, other) {
   return one.properties.size === other.properties.size &&
     [...one.properties].every(([path, value]) =>
       other.properties.has(path) && isSame(value, other.properties.get(path)));
 }
 
-/** What became of an account, or what it is new in. */
-function marksOf(account) {
-  const { content, partner } = account;
-  if (partner === null) {
-    return [account.side === "before" ? "removed" : "added"];
+/** Lets each account know what the ledger's entries say of it. */
+function pairByLedger(entries, { allBefore, allAfter }) {
+  const byElement = (accounts) => new Map(accounts.map((account) => [account.content.element, account]));
+  const before = byElement(allBefore);
+  const after = byElement(allAfter);
+  for (const entry of entries) {
+    const account = before.get(entry.place);
+    if (account !== undefined) {
+      account.entry = entry;
+      account.others = (entry.now ?? []).map((place) => after.get(place)).filter((each) => each !== undefined);
+      account.partner = account.others[0] ?? null;
+      account.others.forEach((other) => other.others.push(account));
+    }
   }
-  const marks = [];
-  if (content.source !== partner.content.source) {
-    marks.push("converted");
-  } else if (!hasSameProperties(account, partner) ||
-             !isSame(content.dataclasses, partner.content.dataclasses) ||
-             content.type !== partner.content.type || content.class !== partner.content.class) {
-    marks.push("changed");
+  const isItself = ({ entry }) => !["joined", "notCarriedOver"].includes(entry.fate);
+  for (const account of allAfter) {
+    account.partner = account.others.find(isItself) ?? account.others[0] ?? null;
   }
-  const hasSameParent = account.parent === null ? partner.parent === null :
-    partner.parent !== null && account.parent.partner === partner.parent;
-  if (!hasSameParent) {
-    marks.push("moved");
-  }
-  if (identityOf(account) !== identityOf(partner)) {
-    marks.push("identified");
-  }
-  return marks;
 }
 
-/** Both sides of a report as accounts that know each other. */
+/** What became of an account of the inputs. */
+function marksBefore({ content, entry, partner, properties }) {
+  const mark = kMarksOfFates[entry?.fate];
+  const mayAlsoChange = ["moved", "renamed"].includes(mark) && partner !== null;
+  const isChanged = mayAlsoChange && (!hasSameProperties({ properties }, partner) ||
+                                      !isSame(content.dataclasses, partner.content.dataclasses));
+  return [isChanged ? "changed" : null, mark].filter((each) => each);
+}
+
+/** What an account of the result is new in. */
+function marksAfter({ others, partner }) {
+  return others.length === 0 ? ["added"] : partner.marks.filter((each) => !["joined", "lost"].includes(each));
+}
+
+/** Both sides of a report as accounts that know each other; without a ledger nobody knows. */
 function accountsOf(report) {
   const before = (report.accountsBefore ?? []).map((each) => new Account(each, "before", null));
   const after = (report.accountsAfter ?? []).map((each) => new Account(each, "after", null));
   const sides = { before, after, allBefore: flattened(before), allAfter: flattened(after) };
-  pairBy((account) => `${account.content.source} ${identityOf(account)}`, sides.allBefore, sides.allAfter);
-  pairBy(identityOf, sides.allBefore, sides.allAfter);
-  pairRenamed(sides.allBefore, sides.allAfter);
+  if (Array.isArray(report.ledger?.accounts)) {
+    pairByLedger(report.ledger.accounts, sides);
+    sides.allBefore.forEach((account) => { account.marks = marksBefore(account); });
+    sides.allAfter.forEach((account) => { account.marks = marksAfter(account); });
+  }
   sides.withIdentifier = { before: new Map(), after: new Map() };
   for (const account of [...sides.allBefore, ...sides.allAfter]) {
-    account.marks = marksOf(account);
     const known = sides.withIdentifier[account.side];
     if (account.content.identifier && !known.has(account.content.identifier)) {
       known.set(account.content.identifier, account);

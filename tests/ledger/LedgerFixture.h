@@ -39,8 +39,8 @@ class Liar : public MigrationObserver {
   void stageBegan(std::string_view operation, std::string_view purpose) override {
     listener->stageBegan(operation, purpose);
   }
-  void stageEnded(bool succeeded, const std::optional<PropertyDictionary>& settings) override {
-    listener->stageEnded(succeeded, settings);
+  void stageEnded(bool succeeded, const std::optional<AccountsInMemory>& accounts) override {
+    listener->stageEnded(succeeded, accounts);
   }
   void accountFared(const AccountEvent& event) override { listener->accountFared(event); }
   void accountsSaved(const std::vector<AccountOrigin>& accounts) override {

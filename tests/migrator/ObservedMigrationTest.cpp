@@ -19,12 +19,11 @@ class Observer final : public MigrationObserver {
     hasEnded_ = false;
     stages.push_back({std::string(operation), false, std::nullopt});
   }
-  void stageEnded(bool succeeded,
-                  const std::optional<PropertyDictionary>& accountSettings) override {
+  void stageEnded(bool succeeded, const std::optional<AccountsInMemory>& accounts) override {
     EXPECT_FALSE(hasEnded_);
     hasEnded_ = true;
     stages.back().succeeded = succeeded;
-    stages.back().accountSettings = accountSettings;
+    stages.back().accountSettings = accounts ? std::optional(accounts->settings) : std::nullopt;
   }
 
   [[nodiscard]] TextList operations() const {

@@ -41,7 +41,8 @@ TEST(AccountTreesTest, BothSidesListTheirAccountsWithWhatBecameOfThem) {
   EXPECT_EQ(noted["before"],
             json({"OnMyDevice 'My Device'", "Gmail 'Ada at Gmail' ≠ changed",
                   "CalDAV 'Google calendars' ≠ changed ⇄ moved", "IMAP 'Work'",
-                  "SubscribedCalendar 'Public holidays' − removed",
+                  "SubscribedCalendar 'Public holidays' ✕ not carried over: it was deleted "
+                  "(_migrateAccountsFrom7A242:)",
                   "IMAPAccount 'Family' ⇒ converted", "EASAccount 'Office' ⇒ converted"}));
   EXPECT_EQ(noted["after"], json({"OnMyDevice 'My Device'", "Gmail 'Ada at Gmail' ≠ changed",
                                   "CalDAV 'Google calendars' ≠ changed ⇄ moved", "IMAP 'Work'",
@@ -129,43 +130,65 @@ TEST(AccountTreesTest, AStepsChangeLeadsToTheAccountAlsoWhenAFilterHidesIt) {
   EXPECT_EQ(noted["filter"], "");
 }
 
-TEST(AccountTreesTest, AccountsArePairedByIdentifierOrElseByTitleEachWithOneOther) {
-  const json same = {{"Port", 143}};
-  json anonymous = plainAccount("", "IMAP 'No identifier'", same);
-  anonymous["identifier"] = nullptr;
-  const json first = plainAccount("A", "IMAP 'First'", same);
-  const json second = plainAccount("A", "IMAP 'Second of the same identifier'", same);
-  json legacy = plainAccount("A", "Legacy 'First'", same);
-  legacy["source"] = "mailStore";
-
-  const json noted = notedOnTrees({{"accountsBefore", {legacy, first, second, anonymous}},
-                                   {"accountsAfter", {first, anonymous, anonymous}}},
-                                  R"js(
+TEST(AccountTreesTest, AccountsAreThoseThatTheLedgerSaysAndNotThoseOfEqualIdentifiers) {
+  const json noted =
+      notedOnTrees({{"accountsBefore",
+                     {standingAt("MailAccounts[0]", plainAccount("A", "Legacy 'First'")),
+                      standingAt("Accounts[0]", plainAccount("A", "IMAP 'Second'")),
+                      standingAt("Accounts[1]", plainAccount("A", "IMAP 'Third'"))}},
+                    {"accountsAfter",
+                     {standingAt("Accounts[0]", plainAccount("A", "IMAP 'Third'")),
+                      standingAt("Accounts[1]", plainAccount("A", "IMAP 'First'")),
+                      standingAt("Accounts[2]", plainAccount("B", "IMAP 'New'"))}},
+                    {"ledger",
+                     {{"accounts",
+                       {fateOf("MailAccounts[0]", "converted", {"Accounts[1]"}),
+                        fateOf("Accounts[0]", "notCarriedOver", {}, "its type is unknown"),
+                        fateOf("Accounts[1]", "kept", {"Accounts[0]"})}}}}},
+                   R"js(
     note("before", tree("before"));
     note("after", tree("after"));
+    (await openOn("before", "IMAP 'Third'")).querySelector("button").click();
+    await pause();
+    note("reached", page.activeElement.closest("#after .account").querySelector(".title").textContent);
   )js");
 
   EXPECT_EQ(noted["before"],
-            json({"Legacy 'First' − removed", "IMAP 'First'",
-                  "IMAP 'Second of the same identifier' − removed", "IMAP 'No identifier'"}));
+            json({"Legacy 'First' ⇒ converted",
+                  "IMAP 'Second' ✕ not carried over: its type is unknown", "IMAP 'Third'"}));
   EXPECT_EQ(noted["after"],
-            json({"IMAP 'First'", "IMAP 'No identifier'", "IMAP 'No identifier' + added"}));
+            json({"IMAP 'Third'", "IMAP 'First' ⇒ converted", "IMAP 'New' + added"}));
+  EXPECT_EQ(noted["reached"], "IMAP 'Third'");
 }
 
-TEST(AccountTreesTest, AnAccountThatAloneHasItsNameIsTheSameWithANewIdentifier) {
-  const json name = {{"DisplayName", "Ada"}};
-  const json children = json::array({plainAccount("CHILD", "IMAP 'Child'")});
-  json before = plainAccount("OLD", "IMAP 'Ada'", name);
-  before["children"] = children;
-  json after = plainAccount("NEW", "IMAP 'Ada'", name);
-  after["children"] = children;
-  const json change = {{"change", "changed"}, {"identifier", "NEW"}};
+TEST(AccountTreesTest, WhatWasJoinedRenamedMovedOrMadeAnewIsSaidToBeSo) {
+  json parent = standingAt("Accounts[0]", plainAccount("P", "Gmail 'Parent'"));
+  parent["children"].push_back(standingAt("Accounts[0].ChildAccounts[0]",
+                                          plainAccount("M", "Velmora 'Moved'", {{"Port", 993}})));
 
-  const json noted =
-      notedOnTrees({{"accountsBefore", json::array({before})},
-                    {"accountsAfter", json::array({after})},
-                    {"stages", json::array({{{"accounts", json::array({change})}}})}},
-                   R"js(
+  const json noted = notedOnTrees(
+      {{"accountsBefore",
+        {standingAt("Accounts[0]", plainAccount("P", "Gmail 'Parent'")),
+         standingAt("Accounts[1]", plainAccount("M", "Velmora 'Moved'", {{"Port", 143}})),
+         standingAt("Accounts[2]", plainAccount("J", "CalDAV 'Joined'")),
+         standingAt("Accounts[3]", plainAccount("OLD", "IMAP 'Renamed'")),
+         standingAt("Accounts[4]", plainAccount("D", "OnMyDevice 'Device'")),
+         standingAt("Accounts[5]", plainAccount("E", "IMAP 'Earlier'"))}},
+       {"accountsAfter",
+        {parent, standingAt("Accounts[1]", plainAccount("NEW", "IMAP 'Renamed'")),
+         standingAt("Accounts[2]", plainAccount("D", "OnMyDevice 'Device'")),
+         standingAt("Accounts[3]", plainAccount("E", "IMAP 'Earlier'"))}},
+       {"stages", json::array({{{"accounts",
+                                 json::array({{{"change", "changed"}, {"identifier", "NEW"}}})}}})},
+       {"ledger",
+        {{"accounts",
+          {fateOf("Accounts[0]", "kept", {"Accounts[0]"}),
+           fateOf("Accounts[1]", "movedBelow", {"Accounts[0].ChildAccounts[0]"}),
+           fateOf("Accounts[2]", "joined", {"Accounts[0]"}),
+           fateOf("Accounts[3]", "renamed", {"Accounts[1]"}),
+           fateOf("Accounts[4]", "rebuilt", {"Accounts[2]"}),
+           fateOf("Accounts[5]", "carriedOverEarlier", {"Accounts[3]"})}}}}},
+      R"js(
     note("before", tree("before"));
     note("after", tree("after"));
     one("#expand").click();
@@ -174,41 +197,28 @@ TEST(AccountTreesTest, AnAccountThatAloneHasItsNameIsTheSameWithANewIdentifier) 
     note("reached", page.activeElement.closest("#before .account").querySelector(".facts dd").textContent);
   )js");
 
-  EXPECT_EQ(noted["before"], json({"IMAP 'Ada' # new identifier", "IMAP 'Child'"}));
-  EXPECT_EQ(noted["after"], json({"IMAP 'Ada' # new identifier", "IMAP 'Child'"}));
+  EXPECT_EQ(noted["before"], json({"Gmail 'Parent'", "Velmora 'Moved' ≠ changed ⇄ moved",
+                                   "CalDAV 'Joined' ∪ joined into Gmail 'Parent'",
+                                   "IMAP 'Renamed' # renamed", "OnMyDevice 'Device' ↻ made anew",
+                                   "IMAP 'Earlier' ✓ carried over by an earlier run"}));
+  EXPECT_EQ(noted["after"], json({"Gmail 'Parent'", "Velmora 'Moved' ≠ changed ⇄ moved",
+                                  "IMAP 'Renamed' # renamed", "OnMyDevice 'Device' ↻ made anew",
+                                  "IMAP 'Earlier' ✓ carried over by an earlier run"}));
   EXPECT_EQ(noted["reached"], "OLD");
 }
 
-TEST(AccountTreesTest, AccountsWithANamesakeAreNotTheSameWithANewIdentifier) {
-  const json name = {{"DisplayName", "Ada"}};
-
-  const json noted =
-      notedOnTrees({{"accountsBefore", json::array({plainAccount("OLD", "IMAP 'Ada'", name)})},
-                    {"accountsAfter", json::array({plainAccount("NEW", "IMAP 'Ada'", name),
-                                                   plainAccount("OTHER", "IMAP 'Ada'", name)})}},
-                   R"js(
-    note("before", tree("before"));
-    note("after", tree("after"));
-  )js");
-
-  EXPECT_EQ(noted["before"], json::array({"IMAP 'Ada' − removed"}));
-  EXPECT_EQ(noted["after"], json({"IMAP 'Ada' + added", "IMAP 'Ada' + added"}));
-}
-
-TEST(AccountTreesTest, AChildThatOutlivesItsParentHasMoved) {
-  json parent = plainAccount("PARENT", "Velmora 'Parent'");
-  const json child = plainAccount("CHILD", "Velmora 'Child'");
-  parent["children"].push_back(child);
+TEST(AccountTreesTest, WithoutALedgerNobodySaysWhatBecameOfAnAccount) {
+  const json account = standingAt("Accounts[0]", plainAccount("A", "IMAP 'Same'"));
 
   const json noted = notedOnTrees(
-      {{"accountsBefore", json::array({parent})}, {"accountsAfter", json::array({child})}},
+      {{"accountsBefore", json::array({account})}, {"accountsAfter", json::array({account})}},
       R"js(
     note("before", tree("before"));
     note("after", tree("after"));
   )js");
 
-  EXPECT_EQ(noted["before"], json({"Velmora 'Parent' − removed", "Velmora 'Child' ⇄ moved"}));
-  EXPECT_EQ(noted["after"], json::array({"Velmora 'Child' ⇄ moved"}));
+  EXPECT_EQ(noted["before"], json::array({"IMAP 'Same'"}));
+  EXPECT_EQ(noted["after"], json::array({"IMAP 'Same'"}));
 }
 
 }  // namespace

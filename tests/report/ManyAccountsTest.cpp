@@ -19,15 +19,18 @@ json reportOfMany() {
   for (int number = 0; number < kAccounts; ++number) {
     const std::string name = std::to_string(number);
     const std::string title = "IMAP 'Account " + name + "'";
+    const std::string element = "Accounts[" + name + "]";
     json before = plainAccount("ID-" + name, title,
                                {{"DisplayName", "Account " + name},
                                 {"Hostname", "imap.example"},
                                 {"PortNumber", 143},
                                 {"Username", "user" + name}});
+    before["element"] = element;
     json after = before;
     after["properties"]["PortNumber"] = 993;
     report["accountsBefore"].push_back(before);
     report["accountsAfter"].push_back(after);
+    report["ledger"]["accounts"].push_back(fateOf(element, "changed", {element}));
     stage["accounts"].push_back(
         {{"change", "changed"},
          {"identifier", "ID-" + name},

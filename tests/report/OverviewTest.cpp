@@ -26,8 +26,10 @@ std::vector<std::string> sentencesOf(const json& reports) {
 }
 
 TEST(OverviewTest, OneSentenceSaysWhatCameOfARunOrAPlan) {
-  const json before = json::array({plainAccount("A", "Work", {{"Port", 143}})});
-  const json after = json::array({plainAccount("A", "Work", {{"Port", 993}})});
+  const json account = json::array({standingAt("Accounts[0]", plainAccount("A", "Work"))});
+  const auto ledger = [](const char* fate) {
+    return json{{"accounts", json::array({fateOf("Accounts[0]", fate, {"Accounts[0]"})})}};
+  };
   const json upgrade = {{"before", 3}, {"after", 12}};
   const json current = {{"before", 12}, {"after", 12}};
   const json none = {{"before", nullptr}, {"after", 12}};
@@ -35,18 +37,30 @@ TEST(OverviewTest, OneSentenceSaysWhatCameOfARunOrAPlan) {
   const std::vector<std::string> sentences = sentencesOf(json::array({
       {{"command", "run"}, {"result", true}, {"exitStatus", 0}, {"versions", upgrade}},
       {{"command", "run"}, {"result", true}, {"exitStatus", 0}, {"versions", none}},
-      {{"command", "run"}, {"result", true}, {"exitStatus", 0}, {"versions", current}},
       {{"command", "run"},
        {"result", true},
        {"exitStatus", 0},
        {"versions", current},
-       {"accountsBefore", before},
-       {"accountsAfter", after}},
+       {"accountsBefore", account},
+       {"accountsAfter", account},
+       {"ledger", ledger("kept")}},
+      {{"command", "run"},
+       {"result", true},
+       {"exitStatus", 0},
+       {"versions", current},
+       {"accountsBefore", account},
+       {"accountsAfter", account},
+       {"ledger", ledger("changed")}},
+      {{"command", "run"}, {"result", true}, {"exitStatus", 0}, {"versions", current}},
       {{"command", "run"}, {"result", true}, {"exitStatus", 2}, {"versions", upgrade}},
       {{"command", "run"}, {"result", false}, {"exitStatus", 1}, {"versions", upgrade}},
       {{"command", "run"}, {"result", true}, {"exitStatus", 74}},
       {{"command", "plan"}, {"result", true}, {"exitStatus", 0}, {"versions", upgrade}},
-      {{"command", "plan"}, {"result", true}, {"exitStatus", 0}, {"versions", current}},
+      {{"command", "plan"},
+       {"result", true},
+       {"exitStatus", 0},
+       {"versions", current},
+       {"ledger", ledger("kept")}},
       {{"command", "plan"}, {"result", false}, {"exitStatus", 1}},
       json::object(),
   }));
@@ -56,6 +70,7 @@ TEST(OverviewTest, OneSentenceSaysWhatCameOfARunOrAPlan) {
                   "The accounts were migrated from version 3 to 12.",
                   "The accounts were migrated to version 12.",
                   "The migration succeeded and changed no account.",
+                  "The accounts were migrated; their version stays 12.",
                   "The accounts were migrated; their version stays 12.",
                   "The result could not be verified, so nothing was changed.",
                   "The migration failed.", "The migration failed.",
@@ -74,13 +89,14 @@ TEST(OverviewTest, ShowsTheFactsWarningsKeptInputsAndAnnouncements) {
   )js");
 
   EXPECT_EQ(noted["title"], "Report of a migration: /mnt/image");
-  EXPECT_EQ(noted["badges"],
-            json({"1 added", "1 removed", "2 changed", "1 moved", "2 converted", "2 unchanged"}));
+  EXPECT_EQ(noted["badges"], json({"1 added", "2 changed", "1 moved", "2 converted",
+                                   "1 not carried over", "2 unchanged"}));
   EXPECT_EQ(noted["facts"], json({"Root/mnt/image", "Time2026-11-21 22:10:00 UTC", "Version3 → 12",
-                                  "Took33 ms", "Exit status0"}));
-  ASSERT_EQ(noted["notices"].size(), 2U);
-  EXPECT_THAT(noted["notices"][0].get<std::string>(), ::testing::StartsWith("Warning\n"));
-  EXPECT_EQ(noted["notices"][1],
+                                  "Took33 ms", "Exit status3"}));
+  ASSERT_EQ(noted["notices"].size(), 3U);
+  EXPECT_THAT(noted["notices"][0].get<std::string>(), ::testing::StartsWith("Not carried over\n"));
+  EXPECT_THAT(noted["notices"][1].get<std::string>(), ::testing::StartsWith("Warning\n"));
+  EXPECT_EQ(noted["notices"][2],
             "Kept inputs\n/var/mobile/Library/AccountMigration/Kept-20261121T221000Z");
   EXPECT_EQ(noted["announcements"], json({"com.quarx.mobilemail was told that MailAccounts changed",
                                           "Cloud tabs were announced once"}));

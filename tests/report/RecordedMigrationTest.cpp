@@ -46,12 +46,39 @@ TEST_F(Recording, AStageHasWhatHappenedInIt) {
   EXPECT_EQ(stage["log"], (JSON{{{"to", "console"}, {"text", "line"}}}));
 }
 
+TEST_F(Recording, AStagesAccountsAreThoseThatTheMigrationSaysAndNotThoseOfEqualIdentifiers) {
+  const auto account = [](std::string_view identifier, std::string_view name) {
+    return PropertyDictionary{{"Identifier", identifier}, {"DisplayName", name}};
+  };
+  const auto settingsOf = [](const PropertyArray& accounts) {
+    return PropertyDictionary{{"Version", 1}, {"Accounts", accounts}};
+  };
+  using Kind = AccountOrigin::Kind;
+  recorder.recordBefore(
+      {{FileKind::AccountSettings, settingsOf({account("A", "first"), account("B", "second")})}});
+  recorder.stageBegan("first:", "First");
+
+  recorder.stageEnded(true,
+                      AccountsInMemory{settingsOf({account("A", "second"), account("C", "made")}),
+                                       {{Kind::Settings, 1}, {Kind::Made, 1}}});
+
+  const JSON changes = recorded().stages.at(0)["accounts"];
+  ASSERT_EQ(changes.size(), 3U);
+  EXPECT_EQ(changes[0]["change"], "changed");
+  EXPECT_EQ(changes[0]["properties"],
+            (JSON{{{"path", "Identifier"}, {"before", "B"}, {"after", "A"}}}));
+  EXPECT_EQ(changes[1]["change"], "added");
+  EXPECT_EQ(changes[1]["identifier"], "C");
+  EXPECT_EQ(changes[2]["change"], "removed");
+  EXPECT_EQ(changes[2]["title"], "'first'");
+}
+
 TEST_F(Recording, AStageIsComparedWithTheOneBeforeIt) {
   recorder.recordBefore({{FileKind::AccountSettings, settings(1, "one")}});
   recorder.stageBegan("first:", "First");
-  recorder.stageEnded(true, settings(1, "two"));
+  recorder.stageEnded(true, AccountsInMemory{settings(1, "two"), {}});
   recorder.stageBegan("second:", "Second");
-  recorder.stageEnded(true, settings(2, "two"));
+  recorder.stageEnded(true, AccountsInMemory{settings(2, "two"), {}});
 
   const JSON stages = recorded().stages;
   EXPECT_EQ(stages.at(0)["accounts"][0]["properties"],
@@ -101,7 +128,7 @@ TEST_F(Recording, TheAccountsBeforeAndAfterAreTrees) {
 TEST_F(Recording, SecretsAreHidden) {
   recorder.recordBefore({{FileKind::AccountSettings, settings(1, "one")}});
   recorder.stageBegan("first:", "First");
-  recorder.stageEnded(true, PropertyDictionary{{"Accounts", PropertyArray{}}});
+  recorder.stageEnded(true, AccountsInMemory{{{"Accounts", PropertyArray{}}}, {}});
   recorder.recordAfter(settings(2, "two"));
 
   for (const std::string& line : lines) {

@@ -15,6 +15,16 @@ std::string pageOf(const nlohmann::json& report) {
   return htmlReport(report.dump());
 }
 
+nlohmann::json fateOf(const std::string& element, const std::string& fate,
+                      const std::vector<std::string>& now, const std::string& reason) {
+  return {{"place", element}, {"fate", fate}, {"now", now}, {"reason", reason}};
+}
+
+nlohmann::json standingAt(const std::string& element, nlohmann::json account) {
+  account["element"] = element;
+  return account;
+}
+
 nlohmann::json plainAccount(const std::string& identifier, const std::string& title,
                             const nlohmann::json& properties) {
   return {{"source", "accountSettings"},
