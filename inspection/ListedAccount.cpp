@@ -29,6 +29,7 @@ void appendChildren(std::vector<ListedAccount>& accounts, const ListedAccount& p
       parent.properties->arrayForKey(layout.childrenKey).value_or(PropertyArray());
   for (const PropertyValue& element : children) {
     ListedAccount child = listed(parent.place + "." + std::to_string(++number), element, layout);
+    child.index = parent.index;
     child.isChild = true;
     child.parentIdentifier = parent.identifier;
     accounts.push_back(std::move(child));
@@ -39,9 +40,10 @@ void appendChildren(std::vector<ListedAccount>& accounts, const ListedAccount& p
 
 std::vector<ListedAccount> listedAccounts(const PropertyArray& array, const StoreLayout& layout) {
   std::vector<ListedAccount> accounts;
-  std::size_t number = 0;
+  std::size_t index = 0;
   for (const PropertyValue& element : array) {
-    const ListedAccount account = listed(std::to_string(++number), element, layout);
+    ListedAccount account = listed(std::to_string(index + 1), element, layout);
+    account.index = index++;
     accounts.push_back(account);
     appendChildren(accounts, account, layout);
   }

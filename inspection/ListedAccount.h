@@ -14,6 +14,8 @@ namespace accounts {
 struct ListedAccount {
   /// "3" for the third top-level account, "3.1" for its first child.
   std::string place;
+  /// The index in the array, of a child its parent's.
+  std::size_t index = 0;
   /// None for an element that is no dictionary and so no account.
   std::optional<PropertyDictionary> properties;
   /// The element itself.

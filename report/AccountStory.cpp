@@ -42,49 +42,39 @@ const JSON& accountAt(const JSON& accounts, const JSON& place) {
   return *found;
 }
 
-/// The identifiers that one account had, one after the other.
-class Names {
- public:
-  explicit Names(std::string_view first) : names_{std::string(first)} {}
+/// What tells an account in a report: where it, or its namesakes, stood before, and the identifiers
+/// that they had and have.
+struct Traces {
+  std::set<std::string, std::less<>> elements;
+  std::set<std::string, std::less<>> identifiers;
 
-  [[nodiscard]] bool contains(const std::string& name) const { return names_.contains(name); }
-
-  /// Whether a change is one of this account; learns its other name if it renames it.
-  bool learnFrom(const JSON& change) {
-    bool isOne = contains(wordIn(change, "identifier"));
-    for (const JSON& property : memberOf(change, "properties")) {
-      if (wordIn(property, "path") == "Identifier") {
-        const std::string before = wordIn(property, "before");
-        const std::string after = wordIn(property, "after");
-        isOne = isOne || contains(before) || contains(after);
-        if (isOne && !before.empty() && !after.empty()) {
-          names_.insert(before);
-          names_.insert(after);
-        }
-      }
-    }
-    return isOne;
+  /// Whether a change of a stage is one of it. Children are told by their identifiers alone.
+  [[nodiscard]] bool areOf(const JSON& change) const {
+    const JSON& element = memberOf(change, "account");
+    return element.is_string() ? elements.contains(element.get<std::string>())
+                               : identifiers.contains(wordIn(change, "identifier"));
   }
-  /// Learns the name that an account of the ledger has where it is now, or had where it was.
-  void learnFrom(const JSON& account, const JSON& accountsAfter) {
-    // What was joined into others has not become them.
-    if (wordIn(account, "fate") == "joined") {
-      return;
-    }
-    const std::string before = wordIn(account, "identifier");
-    for (const JSON& place : memberOf(account, "now")) {
-      const std::string after = wordIn(accountAt(accountsAfter, place), "identifier");
-      if ((contains(before) || contains(after)) && !before.empty() && !after.empty()) {
-        names_.insert(before);
-        names_.insert(after);
-      }
-    }
-  }
-  [[nodiscard]] std::size_t size() const { return names_.size(); }
-
- private:
-  std::set<std::string, std::less<>> names_;
 };
+
+Traces tracesOf(const JSON& report, std::string_view identifier) {
+  Traces traces;
+  traces.identifiers.emplace(identifier);
+  for (const JSON& account : memberOf(memberOf(report, "ledger"), "accounts")) {
+    std::set<std::string, std::less<>> names = {wordIn(account, "identifier")};
+    // What was joined into others has not become them.
+    if (wordIn(account, "fate") != "joined") {
+      for (const JSON& place : memberOf(account, "now")) {
+        names.insert(wordIn(accountAt(memberOf(report, "accountsAfter"), place), "identifier"));
+      }
+    }
+    if (names.contains(identifier)) {
+      traces.elements.insert(wordIn(account, "place"));
+      traces.identifiers.merge(names);
+    }
+  }
+  traces.identifiers.erase("");
+  return traces;
+}
 
 std::string valueText(const JSON& property, const char* key) {
   const JSON& value = memberOf(property, key);
@@ -127,17 +117,17 @@ std::string changeLines(const JSON& stage, const JSON& change) {
   return text;
 }
 
-/// The line of an account of the result that has one of the names; empty for none. Children have no
-/// children that count.
-std::string resultLines(const JSON& accounts, const Names& names, bool areChildren = false) {
+/// The lines of the accounts of the result that have one of the identifiers; empty for none.
+/// Children have no children that count.
+std::string resultLines(const JSON& accounts, const Traces& traces, bool areChildren = false) {
   std::string text;
   for (const JSON& account : accounts) {
-    if (names.contains(wordIn(account, "identifier"))) {
+    if (traces.identifiers.contains(wordIn(account, "identifier"))) {
       text += "Afterwards: " + escapedText(wordIn(account, "title")) + ", account " +
               escapedText(wordIn(account, "place")) + ", identifier " +
               escapedText(wordIn(account, "identifier")) + "\n";
     }
-    text += areChildren ? "" : resultLines(memberOf(account, "children"), names, true);
+    text += areChildren ? "" : resultLines(memberOf(account, "children"), traces, true);
   }
   return text;
 }
@@ -145,35 +135,21 @@ std::string resultLines(const JSON& accounts, const Names& names, bool areChildr
 }  // namespace
 
 std::optional<std::string> accountStory(const JSON& report, std::string_view identifier) {
-  Names names(identifier);
-  const JSON& stages = memberOf(report, "stages");
-  const JSON& accounts = memberOf(memberOf(report, "ledger"), "accounts");
-  // Twice as long as names are found: a later stage may tell of an earlier name.
-  for (std::size_t known = 0; known != names.size();) {
-    known = names.size();
-    for (const JSON& account : accounts) {
-      names.learnFrom(account, memberOf(report, "accountsAfter"));
-    }
-    for (const JSON& stage : stages) {
-      for (const JSON& change : memberOf(stage, "accounts")) {
-        names.learnFrom(change);
-      }
-    }
-  }
+  const Traces traces = tracesOf(report, identifier);
   std::string story;
-  for (const JSON& account : accounts) {
-    if (names.contains(wordIn(account, "identifier"))) {
+  for (const JSON& account : memberOf(memberOf(report, "ledger"), "accounts")) {
+    if (traces.elements.contains(wordIn(account, "place"))) {
       story += originLine(account);
     }
   }
-  for (const JSON& stage : stages) {
+  for (const JSON& stage : memberOf(report, "stages")) {
     for (const JSON& change : memberOf(stage, "accounts")) {
-      if (names.learnFrom(change)) {
+      if (traces.areOf(change)) {
         story += changeLines(stage, change);
       }
     }
   }
-  const std::string result = resultLines(memberOf(report, "accountsAfter"), names);
+  const std::string result = resultLines(memberOf(report, "accountsAfter"), traces);
   if (story.empty() && result.empty()) {
     return std::nullopt;
   }

@@ -6,7 +6,9 @@
 #include "inspection/AccountTree.h"
 #include "inspection/DifferenceJSON.h"
 #include "report/RecordedEvents.h"
+#include "safetynet/AccountLedger.h"
 #include "vocabulary/AccountVocabulary.h"
+#include "vocabulary/ElementName.h"
 
 namespace accounts {
 namespace {
@@ -46,6 +48,18 @@ Partners partnersOf(const std::vector<AccountOrigin>& accounts,
     }
   }
   return partners;
+}
+
+/// Which account a change is of; a made one where that is not told, as of children.
+AccountOrigin originOf(const AccountChange& change, const std::vector<AccountOrigin>& before,
+                       const std::vector<AccountOrigin>& after) {
+  const auto at = [](const std::optional<ListedAccount>& account,
+                     const std::vector<AccountOrigin>& origins) {
+    return account && !account->isChild && account->index < origins.size() ? origins[account->index]
+                                                                           : AccountOrigin();
+  };
+  const AccountOrigin origin = at(change.before, before);
+  return origin != AccountOrigin() ? origin : at(change.after, after);
 }
 
 }  // namespace
@@ -108,6 +122,13 @@ void MigrationRecorder::stageEnded(bool succeeded,
         differenceBetween(accounts_.settings, accounts->settings, FileKind::AccountSettings,
                           secrets_, partnersOf(accounts->origins, accounts_.origins));
     ended.update(differenceObject(difference, *layoutOf(FileKind::AccountSettings)));
+    for (std::size_t index = 0; index < difference.accounts.size(); ++index) {
+      const AccountOrigin origin =
+          originOf(difference.accounts[index], accounts_.origins, accounts->origins);
+      if (origin.kind != AccountOrigin::Kind::Made) {
+        ended["accounts"][index]["account"] = elementName(arrayKeyOf(origin.kind), origin.number);
+      }
+    }
     accounts_ = *accounts;
   }
   write(events::kEnded, std::move(ended));

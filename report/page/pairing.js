@@ -53,13 +53,15 @@ function hasSameProperties(one, other) {
       other.properties.has(path) && isSame(value, other.properties.get(path)));
 }
 
+function byElement(accounts) {
+  return new Map(accounts.map((account) => [account.content.element, account]));
+}
+
 /** Lets each account know what the ledger's entries say of it. */
-function pairByLedger(entries, { allBefore, allAfter }) {
-  const byElement = (accounts) => new Map(accounts.map((account) => [account.content.element, account]));
-  const before = byElement(allBefore);
+function pairByLedger(entries, { allAfter, beforeByElement }) {
   const after = byElement(allAfter);
   for (const entry of entries) {
-    const account = before.get(entry.place);
+    const account = beforeByElement.get(entry.place);
     if (account !== undefined) {
       account.entry = entry;
       account.others = (entry.now ?? []).map((place) => after.get(place)).filter((each) => each !== undefined);
@@ -92,6 +94,7 @@ function accountsOf(report) {
   const before = (report.accountsBefore ?? []).map((each) => new Account(each, "before", null));
   const after = (report.accountsAfter ?? []).map((each) => new Account(each, "after", null));
   const sides = { before, after, allBefore: flattened(before), allAfter: flattened(after) };
+  sides.beforeByElement = byElement(sides.allBefore);
   if (Array.isArray(report.ledger?.accounts)) {
     pairByLedger(report.ledger.accounts, sides);
     sides.allBefore.forEach((account) => { account.marks = marksBefore(account); });
@@ -111,4 +114,11 @@ function accountsOf(report) {
 function accountOn(side, identifier, { withIdentifier }) {
   const otherSide = side === "before" ? "after" : "before";
   return withIdentifier[side].get(identifier) ?? withIdentifier[otherSide].get(identifier)?.partner ?? null;
+}
+
+/** The account of a stage's change on each side, null for none. */
+function accountsOfChange({ account, identifier }, accounts) {
+  const itself = account === undefined ? null : accounts.beforeByElement.get(account) ?? null;
+  return { before: itself ?? accountOn("before", identifier, accounts),
+           after: itself?.partner ?? accountOn("after", identifier, accounts) };
 }

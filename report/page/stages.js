@@ -116,8 +116,7 @@ function standing(where, side, page) {
 function changeBody(change, page) {
   const before = standing(change.before, "before", page);
   const after = standing(change.after, "after", page);
-  const links = ["before", "after"]
-    .map((side) => [side, accountOn(side, change.identifier, page.accounts)])
+  const links = Object.entries(accountsOfChange(change, page.accounts))
     .filter(([, account]) => account !== null)
     .map(([side, account]) => [button(`Show it ${side}`, () => page.reveal(account)), " "]);
   return [

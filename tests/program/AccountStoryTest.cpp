@@ -52,6 +52,27 @@ TEST_F(AccountStory, SaysWhyAnAccountIsNotThere) {
                 "Afterwards: not in the settings file\n");
 }
 
+TEST_F(AccountStory, IsNotThatOfAnotherAccountThatGotTheIdentifier) {
+  write(kSettingsPath,
+        PropertyDictionary{
+            {"Version", 1},
+            {"Accounts", PropertyArray{PropertyDictionary{{"Identifier", "A"},
+                                                          {"uniqueId", "B"},
+                                                          {"Type", "Mail"},
+                                                          {"Class", "IMAPAccount"}},
+                                       PropertyDictionary{{"Identifier", "C"},
+                                                          {"uniqueId", "A"},
+                                                          {"Type", "Exchange"},
+                                                          {"Class", "ExchangeAccount"}}}}});
+
+  const std::string story = plan({"--account", "B"}).output;
+
+  EXPECT_THAT(story, HasSubstr("Accounts[0] of"));
+  EXPECT_THAT(story, HasSubstr("Identifier: A → B\n"));
+  EXPECT_EQ(story.find("Accounts[1] of"), std::string::npos) << story;
+  EXPECT_EQ(story.find("C → A"), std::string::npos) << story;
+}
+
 TEST_F(AccountStory, OfNobodySaysSo) {
   EXPECT_EQ(plan({"--account", "NOBODY"}).output,
             "No account has, or had, the identifier NOBODY\n");

@@ -178,8 +178,9 @@ TEST(AccountTreesTest, WhatWasJoinedRenamedMovedOrMadeAnewIsSaidToBeSo) {
         {parent, standingAt("Accounts[1]", plainAccount("NEW", "IMAP 'Renamed'")),
          standingAt("Accounts[2]", plainAccount("D", "OnMyDevice 'Device'")),
          standingAt("Accounts[3]", plainAccount("E", "IMAP 'Earlier'"))}},
-       {"stages", json::array({{{"accounts",
-                                 json::array({{{"change", "changed"}, {"identifier", "NEW"}}})}}})},
+       {"stages",
+        json::array(
+            {{{"accounts", json::array({{{"change", "changed"}, {"account", "Accounts[3]"}}})}}})},
        {"ledger",
         {{"accounts",
           {fateOf("Accounts[0]", "kept", {"Accounts[0]"}),

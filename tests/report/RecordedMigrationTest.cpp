@@ -65,12 +65,15 @@ TEST_F(Recording, AStagesAccountsAreThoseThatTheMigrationSaysAndNotThoseOfEqualI
   const JSON changes = recorded().stages.at(0)["accounts"];
   ASSERT_EQ(changes.size(), 3U);
   EXPECT_EQ(changes[0]["change"], "changed");
+  EXPECT_EQ(changes[0]["account"], "Accounts[1]");
   EXPECT_EQ(changes[0]["properties"],
             (JSON{{{"path", "Identifier"}, {"before", "B"}, {"after", "A"}}}));
   EXPECT_EQ(changes[1]["change"], "added");
   EXPECT_EQ(changes[1]["identifier"], "C");
+  EXPECT_FALSE(changes[1].contains("account"));
   EXPECT_EQ(changes[2]["change"], "removed");
   EXPECT_EQ(changes[2]["title"], "'first'");
+  EXPECT_EQ(changes[2]["account"], "Accounts[0]");
 }
 
 TEST_F(Recording, AStageIsComparedWithTheOneBeforeIt) {
