@@ -15,7 +15,12 @@ void runOneInput(std::string_view bytes) {
     return;
   }
   const std::optional<std::string> written = writeBinaryPropertyList(*value, error);
-  require(written.has_value(), "what is read can be written");
+  if (!written) {
+    // A file that has more bytes than its values take may stand for more than one without them.
+    require(error.text.find("more values than a file of its size") != error.text.npos,
+            "what is read can be written");
+    return;
+  }
   const std::optional<PropertyValue> again = readPropertyList(*written, error);
   require(again.has_value(), "what is written can be read");
   require(*again == *value, "what is written reads as an equal value");

@@ -282,9 +282,14 @@ void workInMemory(const PluginWork& work, const WorkerSide& side, const DeviceSn
     if (made) {
       proposal = *made;
     } else {
-      proposal.status = ExitStatus::TemporaryFailure;
-      setError(report, {ExitStatus::TemporaryFailure,
-                        pathError("write", "the migration's result in memory", number).text});
+      const ProgramError error =
+          number != 0
+              ? ProgramError{ExitStatus::TemporaryFailure,
+                             pathError("write", "the migration's result in memory", number).text}
+              : ProgramError{ExitStatus::NotVerified,
+                             "The result stands for more values than a file of its size may"};
+      proposal.status = error.exitStatus;
+      setError(report, error);
     }
   }
   handOverAndTell(work, side, proposal, outcome,

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 
@@ -20,12 +21,20 @@ inline constexpr std::size_t kMaximumFileSize = std::size_t{256} << 20;
 /// need if no two values are equal; the tables for as many still fit a small machine's memory.
 inline constexpr std::size_t kMaximumObjectCount = std::size_t{1} << 24;
 
-/// How many values a property list may stand for, where a child that several containers share
+/// How many values any property list may stand for, where a child that several containers share
 /// counts each time it is reached: a file of a few hundred bytes can stand for billions, and
 /// whoever walks the value would never come to an end. A text or data counts once more for every
 /// `kBytesPerExpandedValue` bytes, since a long one can be reached many times as well; so does a
 /// key.
 inline constexpr std::uint64_t kMaximumExpandedValueCount = std::uint64_t{1} << 24;
+
+/// How many values a binary file of a size may stand for, counted in the same way: what is done
+/// with a file takes what goes with its size. Where equal parts are written once, accounts come to
+/// a fifth of a value a byte; a small file may share more.
+constexpr std::uint64_t maximumExpandedValueCount(std::size_t fileSize) {
+  constexpr std::uint64_t kOfAnyFile = std::uint64_t{1} << 13;
+  return std::min<std::uint64_t>(kMaximumExpandedValueCount, kOfAnyFile + fileSize);
+}
 
 /// See `kMaximumExpandedValueCount`: together they hold the texts of one value to a gibibyte.
 inline constexpr std::uint64_t kBytesPerExpandedValue = 64;

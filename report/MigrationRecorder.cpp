@@ -13,6 +13,23 @@
 namespace accounts {
 namespace {
 
+/// More than a line about an account of any device has. One can be as long as all that a file
+/// stands for, and there are many.
+constexpr std::size_t kLongestLogLine = std::size_t{16} << 10;
+
+/// A line, or as much of it as a report needs and how much it does not have.
+std::string shortened(std::string_view line) {
+  if (line.size() <= kLongestLogLine) {
+    return std::string(line);
+  }
+  std::size_t end = kLongestLogLine;
+  while (end > 0 && (static_cast<unsigned char>(line[end]) & 0xC0) == 0x80) {
+    --end;
+  }
+  return std::string(line.substr(0, end)) + "… (" + std::to_string(line.size() - end) +
+         " bytes more)";
+}
+
 JSON versionOf(const PropertyDictionary& settings) {
   const PropertyValue* const version = settings.find(kPlistVersionKey);
   return version != nullptr ? jsonOf(*version) : JSON(nullptr);
@@ -105,7 +122,8 @@ void MigrationRecorder::recordFile(std::string_view action, std::string_view pat
 }
 
 void MigrationRecorder::recordLogLine(LogKind kind, std::string_view line) {
-  write(events::kLog, {{"to", kind == LogKind::Console ? "console" : "channel"}, {"text", line}});
+  write(events::kLog,
+        {{"to", kind == LogKind::Console ? "console" : "channel"}, {"text", shortened(line)}});
 }
 
 void MigrationRecorder::stageBegan(std::string_view operation, std::string_view purpose) {

@@ -211,7 +211,8 @@ bool giveFile(const PropertyValue& value, const SerializedPropertyList::Taker& t
   }
   putTableAndTrailer(output, offsets, referenceSize);
   output.passOn();
-  return !output.isRefused();
+  return !output.isRefused() &&
+         objects.expandedCount() <= maximumExpandedValueCount(output.count());
 }
 
 }  // namespace accounts::binaryplist

@@ -60,6 +60,7 @@ std::string_view asBytes(std::span<const Objects::Reference> references) {
 
 void Objects::visit(const PropertyValue& value) {
   const std::size_t firstPending = pending_.size();
+  ++expandedCount_;
   if (const PropertyDictionary* dictionary = value.asDictionary()) {
     for (const PropertyEntry& entry : *dictionary) {
       leave(scalarOf(Kind::ASCIIText, entry.key.bytes()));
@@ -108,6 +109,7 @@ void Objects::leave(const Scalar& scalar) {
     scalars_.push_back(scalar);
   }
   pending_.push_back(found);
+  expandedCount_ += holdsBytes(scalar.kind) ? expandedCountOfBytes(scalar.byteCount) : 0;
 }
 
 }  // namespace accounts::binaryplist

@@ -47,6 +47,8 @@ class Objects {
   /// The value must be within the limits, and outlive this.
   explicit Objects(const PropertyValue& value) { visit(value); }
 
+  /// How many values the value stands for, as `maximumExpandedValueCount` has it.
+  [[nodiscard]] std::uint64_t expandedCount() const { return expandedCount_; }
   [[nodiscard]] std::size_t count() const { return scalars_.size() + containers_.size(); }
   [[nodiscard]] const std::vector<Scalar>& scalars() const { return scalars_; }
   [[nodiscard]] const std::vector<Container>& containers() const { return containers_; }
@@ -67,6 +69,7 @@ class Objects {
   std::vector<Reference> references_;
   /// References of the containers that are being walked, the innermost one's last.
   std::vector<Reference> pending_;
+  std::uint64_t expandedCount_ = 0;
 };
 
 }  // namespace accounts::binaryplist

@@ -25,6 +25,8 @@ struct Layout {
   std::size_t referenceSize = 0;
   std::size_t objectCount = 0;
   std::uint32_t topObject = 0;
+  /// How many values the file may stand for.
+  std::uint64_t mostValues = 0;
 };
 
 bool readTrailer(std::string_view bytes, Layout& layout, PropertyListError& error) {
@@ -63,6 +65,7 @@ bool readTrailer(std::string_view bytes, Layout& layout, PropertyListError& erro
   layout.table = bytes.data() + table;
   layout.objectCount = static_cast<std::size_t>(objectCount);
   layout.topObject = static_cast<std::uint32_t>(topObject);
+  layout.mostValues = maximumExpandedValueCount(bytes.size());
   return true;
 }
 
@@ -345,8 +348,9 @@ class Reader {
   bool close() {
     Container closed = std::move(openContainers_.back());
     openContainers_.pop_back();
-    if (closed.expandedCount > kMaximumExpandedValueCount) {
-      return fail("a container that stands for more values than the limit", closed.offset);
+    if (closed.expandedCount > layout_.mostValues) {
+      return fail("a container that stands for more values than a file of this size may",
+                  closed.offset);
     }
     // A child that was read before, at a lower level, may be too high for this one.
     if (closed.height > kMaximumNestingDepth) {

@@ -171,7 +171,20 @@ SerializedPropertyList BinaryPropertyListSerializer::serialize(const PropertyVal
 std::optional<std::string> writeBinaryPropertyList(const PropertyValue& value,
                                                    PropertyListError& error) {
   const SerializedPropertyList serialized = BinaryPropertyListSerializer().serialize(value, error);
-  return serialized ? std::optional(bytesOf(serialized)) : std::nullopt;
+  if (!serialized) {
+    return std::nullopt;
+  }
+  std::string bytes;
+  const bool isWhole = serialized.giveTo([&bytes](std::string_view piece) {
+    bytes.append(piece);
+    return true;
+  });
+  if (!isWhole) {
+    error.text =
+        "binary property list: cannot write more values than a file of its size may stand for";
+    return std::nullopt;
+  }
+  return bytes;
 }
 
 }  // namespace accounts

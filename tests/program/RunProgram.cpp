@@ -95,7 +95,7 @@ pid_t startProgram(const ProgramCall& call, int output, int errors) {
   return child;
 }
 
-int waitForEnd(pid_t process, std::chrono::seconds timeLimit) {
+int waitForEnd(pid_t process, std::chrono::seconds timeLimit, std::uint64_t* peakMemory) {
   const auto handle = static_cast<int>(syscall(SYS_pidfd_open, process, 0));
   pollfd ended = {handle, POLLIN, 0};
   const auto milliseconds = std::chrono::milliseconds(timeLimit).count();
@@ -105,7 +105,12 @@ int waitForEnd(pid_t process, std::chrono::seconds timeLimit) {
   }
   close(handle);
   int status = 0;
-  waitpid(process, &status, 0);
+  rusage used = {};
+  wait4(process, &status, 0, &used);
+  if (peakMemory != nullptr) {
+    constexpr std::uint64_t kKibibyte = 1024;
+    *peakMemory = static_cast<std::uint64_t>(used.ru_maxrss) * kKibibyte;
+  }
   return status;
 }
 

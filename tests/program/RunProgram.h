@@ -53,8 +53,9 @@ struct ProgramResult {
 pid_t startProgram(const ProgramCall& call, int output, int errors);
 
 /// Waits for the end of a process that this one started and returns what waitpid() says. One that
-/// takes longer than its time is killed, and the test fails.
-int waitForEnd(pid_t process, std::chrono::seconds timeLimit);
+/// takes longer than its time is killed, and the test fails. `peakMemory` gets the most bytes of
+/// memory that it, or a process that it waited for, had at a time.
+int waitForEnd(pid_t process, std::chrono::seconds timeLimit, std::uint64_t* peakMemory = nullptr);
 
 /// Runs a program to its end, standard input being empty. One that takes longer than its time limit
 /// is killed, and the test fails.

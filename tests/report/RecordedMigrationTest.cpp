@@ -76,6 +76,16 @@ TEST_F(Recording, AStagesAccountsAreThoseThatTheMigrationSaysAndNotThoseOfEqualI
   EXPECT_EQ(changes[2]["account"], "Accounts[0]");
 }
 
+TEST_F(Recording, ALongLogLineIsCutBetweenCharactersAndSaysSo) {
+  const std::string kept((std::size_t{16} << 10) - 1, 'x');
+  recorder.recordLogLine(LogKind::Console, kept + "x");
+  recorder.recordLogLine(LogKind::Channel, kept + "\u00e9!");
+
+  const JSON log = recorded().stages.at(0)["log"];
+  EXPECT_EQ(log[0]["text"], kept + "x");
+  EXPECT_EQ(log[1]["text"], kept + "… (3 bytes more)");
+}
+
 TEST_F(Recording, AStageIsComparedWithTheOneBeforeIt) {
   recorder.recordBefore({{FileKind::AccountSettings, settings(1, "one")}});
   recorder.stageBegan("first:", "First");

@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -30,25 +31,40 @@ std::size_t addDoublingArrays(BinaryFile& file, std::size_t depth) {
   return array;
 }
 
-constexpr std::size_t kDepthOfNearlyAllValues = 24;
-static_assert(kMaximumExpandedValueCount == std::uint64_t{1} << kDepthOfNearlyAllValues);
+constexpr std::size_t kFileSize = std::size_t{1} << 13;
+constexpr std::size_t kDepthOfNearlyAllValues = 14;
+static_assert(maximumExpandedValueCount(kFileSize) == std::uint64_t{1} << kDepthOfNearlyAllValues);
+
+/// A file of `kFileSize` bytes with these objects, the last of them at the top.
+std::string fileWith(const std::function<void(BinaryFile&)>& addObjects) {
+  const auto withUnusedBytes = [&](std::size_t count) {
+    BinaryFile file;
+    file.add(std::string(count, 'u'));
+    addObjects(file);
+    return file.build();
+  };
+  return withUnusedBytes(kFileSize - withUnusedBytes(0).size());
+}
+
+constexpr const char* kTooManyValues =
+    "a container that stands for more values than a file of this size may";
 
 TEST(BinaryLimits, AContainerMayStandForAsManyValuesAsTheLimit) {
-  BinaryFile file;
-  const std::size_t nearlyAll = addDoublingArrays(file, kDepthOfNearlyAllValues);
-  file.addContainer(kArrayOfOne, {nearlyAll});
+  const std::string file = fileWith([](BinaryFile& made) {
+    made.addContainer(kArrayOfOne, {addDoublingArrays(made, kDepthOfNearlyAllValues)});
+  });
 
-  EXPECT_EQ(readBinary(file.build()).kind(), PropertyKind::Array);
+  EXPECT_EQ(file.size(), kFileSize);
+  EXPECT_EQ(readBinary(file).kind(), PropertyKind::Array);
 }
 
 TEST(BinaryLimits, OneValueMoreThanTheLimitIsRefused) {
-  BinaryFile file;
-  const std::size_t scalar = file.add("\x08");
-  const std::size_t nearlyAll = addDoublingArrays(file, kDepthOfNearlyAllValues);
-  file.addContainer(kArrayOfTwo, {nearlyAll, scalar});
+  const std::string file = fileWith([](BinaryFile& made) {
+    const std::size_t scalar = made.add("\x08");
+    made.addContainer(kArrayOfTwo, {addDoublingArrays(made, kDepthOfNearlyAllValues), scalar});
+  });
 
-  EXPECT_TRUE(contains(errorOfReadingBinary(file.build()),
-                       "a container that stands for more values than the limit"));
+  EXPECT_TRUE(contains(errorOfReadingBinary(file), kTooManyValues));
 }
 
 /// A text of some length below 256 as it stands in a file.
@@ -59,35 +75,37 @@ std::string encodedText(std::size_t length, char character) {
 
 /// A dictionary that stands for as many values as the limit but for what its key counts.
 std::string fileAtTheLimitWithKeyOf(std::size_t length) {
-  BinaryFile file;
-  const std::size_t key = file.add(encodedText(length, 'k'));
-  const std::size_t nearlyAll = addDoublingArrays(file, kDepthOfNearlyAllValues);
-  file.addContainer(kDictionaryOfOne, {key, nearlyAll});
-  return file.build();
+  return fileWith([length](BinaryFile& file) {
+    const std::size_t key = file.add(encodedText(length, 'k'));
+    file.addContainer(kDictionaryOfOne, {key, addDoublingArrays(file, kDepthOfNearlyAllValues)});
+  });
 }
 
 TEST(BinaryLimits, AKeyCountsForEveryWholePieceOfItsBytesOnly) {
   EXPECT_EQ(readBinary(fileAtTheLimitWithKeyOf(kBytesPerExpandedValue - 1)).kind(),
             PropertyKind::Dictionary);
   EXPECT_TRUE(contains(errorOfReadingBinary(fileAtTheLimitWithKeyOf(kBytesPerExpandedValue)),
-                       "a container that stands for more values than the limit"));
+                       kTooManyValues));
 }
 
 TEST(BinaryLimits, EveryKeyOfADictionaryCounts) {
   const auto fileWithKeysOf = [](std::size_t firstLength, std::size_t secondLength) {
-    BinaryFile file;
-    const std::size_t first = file.add(encodedText(firstLength, 'k'));
-    const std::size_t second = file.add(encodedText(secondLength, 'l'));
-    // Twice half of the limit less one, and the dictionary: room for one more.
-    const std::size_t half = addDoublingArrays(file, kDepthOfNearlyAllValues - 1);
-    file.addContainer('\xD2', {first, second, half, half});
-    return file.build();
+    return fileWith([&](BinaryFile& file) {
+      const std::size_t first = file.add(encodedText(firstLength, 'k'));
+      const std::size_t second = file.add(encodedText(secondLength, 'l'));
+      // Twice half of the limit less one, and the dictionary: room for one more.
+      const std::size_t half = addDoublingArrays(file, kDepthOfNearlyAllValues - 1);
+      file.addContainer('\xD2', {first, second, half, half});
+    });
   };
   constexpr std::size_t kPiece = kBytesPerExpandedValue;
   EXPECT_EQ(readBinary(fileWithKeysOf(kPiece, 1)).kind(), PropertyKind::Dictionary);
   EXPECT_EQ(readBinary(fileWithKeysOf(1, kPiece)).kind(), PropertyKind::Dictionary);
-  EXPECT_TRUE(contains(errorOfReadingBinary(fileWithKeysOf(kPiece, kPiece)),
-                       "a container that stands for more values than the limit"));
+  EXPECT_TRUE(contains(errorOfReadingBinary(fileWithKeysOf(kPiece, kPiece)), kTooManyValues));
+}
+
+TEST(BinaryLimits, ALargeFileMayStandForNoMoreThanAnyValueMay) {
+  EXPECT_EQ(maximumExpandedValueCount(kMaximumFileSize), kMaximumExpandedValueCount);
 }
 
 /// Arrays in each other as deep as `height`, of which the lower half is read first, as the child of

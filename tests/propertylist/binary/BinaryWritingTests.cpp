@@ -96,11 +96,11 @@ TEST(BinaryWriting, AnArrayAndADictionaryWithTheSameReferencesAreNotMerged) {
 
 TEST(BinaryWriting, AValueReachedTwiceIsWrittenOnce) {
   PropertyValue value = "leaf";
-  for (int level = 0; level < 20; ++level) {
+  for (int level = 0; level < 12; ++level) {
     value = PropertyArray{value, value};
   }
 
-  EXPECT_EQ(objectCount(writeBinary(value)), 21U);
+  EXPECT_EQ(objectCount(writeBinary(value)), 13U);
 }
 
 TEST(BinaryWriting, AScalarMayStandAlone) {
