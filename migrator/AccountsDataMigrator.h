@@ -9,6 +9,7 @@
 
 #include "accountsettings/AccountsManager.h"
 #include "accountsettings/BasicAccount.h"
+#include "migrator/UpgradeStep.h"
 #include "platform/MigrationPluginBase.h"
 #include "propertylist/value/PropertyValue.h"
 
@@ -20,12 +21,14 @@ bool _UseGoogleMail();
 
 namespace accounts {
 
-struct UpgradeStep;
-
 /// The plug-in's principal class: one instance runs one migration. The operations below
 /// performMigration() are its category Internal, called by the migration and by tests alone.
 class AccountsDataMigrator : public MigrationPluginBase {
  public:
+  AccountsDataMigrator();
+  /// With an upgrade chain of the caller's, which must outlive it.
+  explicit AccountsDataMigrator(std::span<const UpgradeStep> chain) : chain_(chain) {}
+
   // Driver (AccountsDataMigrator.cpp)
 
   std::string dataClassName() override;
@@ -71,12 +74,9 @@ class AccountsDataMigrator : public MigrationPluginBase {
   // Upgrade chain (UpgradeChain.cpp)
 
   /// Upgrades the accounts of the store from the version that the file on disk has. False when a
-  /// step failed. Virtual, so that a test can let it fail, which no step of today does.
-  virtual bool _migrateNewAccountsInfo(AccountsManager& store);
+  /// step failed or the chain has none for that version.
+  bool _migrateNewAccountsInfo(AccountsManager& store);
   static bool _newAccountsInformationPresent();
-  /// The same with a chain and a current version of the caller's.
-  bool runUpgradeChain(AccountsManager& store, std::span<const UpgradeStep> chain,
-                       std::uint64_t currentVersion);
 
   // Steps; each returns true (FirstTrainSteps.cpp, WebMailCalendars.cpp, SecondTrainSteps.cpp,
   // CloudAccountSteps.cpp)
@@ -138,6 +138,7 @@ class AccountsDataMigrator : public MigrationPluginBase {
   /// store. False, with nothing changed in the store, at the first that cannot be converted.
   bool replaceMailAccounts(AccountsManager& store, const PropertyDictionary& legacyAccounts);
 
+  std::span<const UpgradeStep> chain_;
   std::optional<PropertyDictionary> _collatedMigrationData;
   bool _foundOldMailAccountsToMigrate = false;
   bool _foundOldDAAccountsToMigrate = false;

@@ -5,20 +5,6 @@
 
 namespace accounts {
 
-namespace {
-
-bool contains(const std::vector<std::string>& texts, const std::optional<Text>& text) {
-  return text && std::ranges::find(texts, text->view()) != texts.end();
-}
-
-}  // namespace
-
-bool calDAVMatches(const CalDAVEndpoint& endpoint, const ExpectedCalDAV& expected) {
-  return endpoint.server && expected.host && endpoint.server->view() == *expected.host &&
-         contains(expected.logins, endpoint.login) &&
-         contains(expected.principalPaths, endpoint.principalPath);
-}
-
 CalDAVIndex::CalDAVIndex(std::vector<CalDAVEndpoint> endpoints) : endpoints_(std::move(endpoints)) {
   for (std::size_t position = 0; position < endpoints_.size(); ++position) {
     if (const std::optional<Key> key = keyOf(endpoints_[position])) {

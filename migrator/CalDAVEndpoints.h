@@ -27,12 +27,10 @@ struct ExpectedCalDAV {
   std::vector<std::string> principalPaths;
 };
 
-/// Whether an endpoint is where calendars are expected. All parts are compared exactly.
-bool calDAVMatches(const CalDAVEndpoint& endpoint, const ExpectedCalDAV& expected);
-
-/// Many endpoints, to be matched against many expectations in linear time: an expectation is looked
-/// up by its few combinations instead of being compared with each endpoint. The outcome is that of
-/// calDAVMatches() for every pair.
+/// Endpoints, to be matched against expectations: an endpoint matches when its server is the host,
+/// its login one of the logins and its path one of the paths, all exactly. Linear for many of both,
+/// because an expectation is looked up by its few combinations instead of being compared with each
+/// endpoint.
 class CalDAVIndex {
  public:
   explicit CalDAVIndex(std::vector<CalDAVEndpoint> endpoints);

@@ -100,7 +100,9 @@ std::vector<std::string> AccountsDataMigrator::_expectedCalDAVPrincipalURLsForAc
 
 bool AccountsDataMigrator::_calDAVAccount_matchesUmbrellaAccount(
     const BasicAccount& calDAVAccount, const BasicAccount& umbrellaAccount) {
-  return calDAVMatches(calDAVEndpointOf(calDAVAccount), expectedCalDAVOf(umbrellaAccount));
+  return !CalDAVIndex({calDAVEndpointOf(calDAVAccount)})
+              .matches(expectedCalDAVOf(umbrellaAccount))
+              .empty();
 }
 
 }  // namespace accounts

@@ -21,9 +21,7 @@ std::uint64_t storedVersion(const PropertyDictionary& accountSettings) {
 
 }  // namespace
 
-bool AccountsDataMigrator::_migrateNewAccountsInfo(AccountsManager& store) {
-  return runUpgradeChain(store, upgradeChain, AccountsManager::currentVersion());
-}
+AccountsDataMigrator::AccountsDataMigrator() : AccountsDataMigrator(upgradeChain) {}
 
 bool AccountsDataMigrator::_newAccountsInformationPresent() {
   return Process::current().platform.fileSystem.fileExists(
@@ -32,9 +30,7 @@ bool AccountsDataMigrator::_newAccountsInformationPresent() {
 
 // Kept on purpose: the chain keeps no record of its progress. Its first saving step already writes
 // the current version, so a chain that is interrupted after it is not taken up again.
-bool AccountsDataMigrator::runUpgradeChain(AccountsManager& store,
-                                           std::span<const UpgradeStep> chain,
-                                           std::uint64_t currentVersion) {
+bool AccountsDataMigrator::_migrateNewAccountsInfo(AccountsManager& store) {
   const std::optional<PropertyDictionary> file =
       Process::current().platform.propertyLists.readDictionary(
           AccountsManager::fullPathToAccountSettingsPlist());
@@ -43,11 +39,11 @@ bool AccountsDataMigrator::runUpgradeChain(AccountsManager& store,
   // Kept on purpose: the file decides, not the store's data version, so accounts that were just
   // converted from legacy stores go through the same steps as those of the file.
   const std::uint64_t version = storedVersion(file.value_or(PropertyDictionary()));
-  if (version >= currentVersion) {
+  if (version >= AccountsManager::currentVersion()) {
     return true;
   }
-  const auto entry = std::ranges::find(chain, version, &UpgradeStep::entryVersion);
-  return entry != chain.end() && std::all_of(entry, chain.end(), [&](const UpgradeStep& step) {
+  const auto entry = std::ranges::find(chain_, version, &UpgradeStep::entryVersion);
+  return entry != chain_.end() && std::all_of(entry, chain_.end(), [&](const UpgradeStep& step) {
            return runStage(step.name, step.purpose, store,
                            [&] { return (this->*step.run)(store); });
          });

@@ -3,26 +3,12 @@
 #include <array>
 #include <cstdint>
 #include <span>
-#include <string_view>
 
 #include "migrator/AccountsDataMigrator.h"
+#include "migrator/UpgradeStep.h"
 #include "vocabulary/MigrationStages.h"
 
 namespace accounts {
-
-/// One step of the upgrade chain. It takes accounts as the build in its name left them, stored with
-/// the entry version, one version forward.
-struct UpgradeStep {
-  using Operation = bool (AccountsDataMigrator::*)(AccountsManager& store);
-
-  /// The stored version at which the chain starts with this step.
-  std::uint64_t entryVersion;
-  /// The operation's name.
-  std::string_view name;
-  /// What it does, in a few words for people.
-  std::string_view purpose;
-  Operation run;
-};
 
 /// Every upgrade step in its fixed order. To add one: raise `kMigratedVersion`
 /// (vocabulary/DevicePlaces.h) and append a row.

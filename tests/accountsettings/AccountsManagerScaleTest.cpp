@@ -1,22 +1,40 @@
+#include "tests/accountsettings/CountedComparisons.h"
 #include "tests/accountsettings/StoreFixture.h"
 
 // What is done once for each account or child of a large store must not be a walk through all of
-// them. Nothing is timed here: with a walk these tests would take minutes.
+// them: four times the accounts make four times the comparisons, not sixteen.
 
 namespace accounts {
 namespace {
-
-constexpr std::size_t manyAccounts = 10'000;
 
 class AccountsManagerScale : public StoreFixture {
  protected:
   AccountsManagerScale() { device.logSystem.channel.enabled = false; }
 
+  void SetUp() override {
+    if (!kCountsComparisons) {
+      GTEST_SKIP() << "Comparisons are counted in the preset asan-ubsan alone.";
+    }
+  }
+
+  /// Requires that the comparisons that an action makes for a number of accounts, the making of the
+  /// store included, are in proportion to the number.
+  template <class Action>
+  static void expectInProportion(const Action& action) {
+    constexpr std::size_t few = 1'000;
+    constexpr std::size_t many = 4 * few;
+    const std::uint64_t forFew = comparisonsIn([&] { action(few); });
+    const std::uint64_t forMany = comparisonsIn([&] { action(many); });
+    EXPECT_GT(forFew, few);
+    // A little more: tables grow by leaps, and what is sorted takes the logarithm besides.
+    EXPECT_LT(forMany, forFew * 5) << forFew << " comparisons for " << few << " accounts";
+  }
+
   static std::string name(std::string_view prefix, std::size_t number) {
     return std::string(prefix) + std::to_string(number);
   }
   /// A store of so many accounts, each with one child.
-  static Store largeStore(std::size_t count = manyAccounts) {
+  static Store largeStore(std::size_t count) {
     std::vector<PropertyValue> accounts;
     for (std::size_t number = 0; number < count; ++number) {
       accounts.push_back(mail(name("A", number))
@@ -25,82 +43,106 @@ class AccountsManagerScale : public StoreFixture {
     }
     return storeOf(std::move(accounts));
   }
+
+ private:
+  template <class Action>
+  static std::uint64_t comparisonsIn(const Action& action) {
+    const std::uint64_t before = comparisonsSoFar();
+    action();
+    return comparisonsSoFar() - before;
+  }
 };
 
 TEST_F(AccountsManagerScale, EveryAccountIsDeletedOneByOne) {
-  const Store store = largeStore(2 * manyAccounts);
-  const AccountsManager::Accounts accounts = store->allBasicAccounts();
-  for (const BasicAccountReference& account : accounts) {
-    store->deleteAccount(account);
-  }
-  EXPECT_EQ(identifiersOf(store->allBasicSyncableAccounts()), "");
+  expectInProportion([](std::size_t count) {
+    const Store store = largeStore(count);
+    const AccountsManager::Accounts accounts = store->allBasicAccounts();
+    for (const BasicAccountReference& account : accounts) {
+      store->deleteAccount(account);
+    }
+    EXPECT_EQ(identifiersOf(store->allBasicSyncableAccounts()), "");
+  });
 }
 
 TEST_F(AccountsManagerScale, EveryAccountIsReplacedOneByOne) {
-  const Store store = largeStore();
-  const AccountsManager::Accounts accounts = store->allBasicAccounts();
-  for (const BasicAccountReference& account : accounts) {
-    const BasicAccountReference parent = exchange(account->identifier()->string() + "Q").record();
-    store->replaceAccount_withAccount(account, parent);
-    account->setParentAccount(parent);
-    store->addChild_toAccount(account, parent);
-  }
-  EXPECT_EQ(store->countOfBasicAccountsWithTypes({kExchangeAccountType}), manyAccounts);
-  EXPECT_EQ(store->allBasicSyncableAccounts().size(), 2 * manyAccounts);
+  expectInProportion([](std::size_t count) {
+    const Store store = largeStore(count);
+    const AccountsManager::Accounts accounts = store->allBasicAccounts();
+    for (const BasicAccountReference& account : accounts) {
+      const BasicAccountReference parent = exchange(account->identifier()->string() + "Q").record();
+      store->replaceAccount_withAccount(account, parent);
+      account->setParentAccount(parent);
+      store->addChild_toAccount(account, parent);
+    }
+    EXPECT_EQ(store->countOfBasicAccountsWithTypes({kExchangeAccountType}), count);
+    EXPECT_EQ(store->allBasicSyncableAccounts().size(), 2 * count);
+  });
 }
 
 TEST_F(AccountsManagerScale, EveryAccountIsUpdatedAndFoundOneByOne) {
-  const Store store = largeStore();
-  for (std::size_t number = 0; number < manyAccounts; ++number) {
-    const BasicAccountReference account = exchange(name("A", number)).record();
-    store->updateAccount(account);
-    ASSERT_EQ(store->accountWithIdentifier(name("A", number)), account);
-  }
-  EXPECT_EQ(store->count(), manyAccounts);
+  expectInProportion([](std::size_t count) {
+    const Store store = largeStore(count);
+    for (std::size_t number = 0; number < count; ++number) {
+      const BasicAccountReference account = exchange(name("A", number)).record();
+      store->updateAccount(account);
+      ASSERT_EQ(store->accountWithIdentifier(name("A", number)), account);
+    }
+    EXPECT_EQ(store->count(), count);
+  });
 }
 
 TEST_F(AccountsManagerScale, EveryAccountIsFoundByItsSyncIdentifier) {
-  const Store store = largeStore();
-  for (std::size_t number = 0; number < manyAccounts; ++number) {
-    ASSERT_EQ(store->displayAccountWithSyncIdentifier(name("s", number))->identifier(),
-              Text(name("A", number)));
-  }
+  expectInProportion([](std::size_t count) {
+    const Store store = largeStore(count);
+    for (std::size_t number = 0; number < count; ++number) {
+      ASSERT_EQ(store->displayAccountWithSyncIdentifier(name("s", number))->identifier(),
+                Text(name("A", number)));
+    }
+  });
 }
 
 TEST_F(AccountsManagerScale, AccountsWithOneIdentifierAreDeletedOneByOne) {
-  const Store store = storeOf(std::vector<PropertyValue>(manyAccounts, mail("A")));
-  const AccountsManager::Accounts accounts = store->allBasicAccounts();
-  for (const BasicAccountReference& account : accounts) {
-    store->deleteAccount(account);
-  }
-  EXPECT_EQ(store->count(), 0u);
+  expectInProportion([](std::size_t count) {
+    const Store store = storeOf(std::vector<PropertyValue>(count, mail("A")));
+    const AccountsManager::Accounts accounts = store->allBasicAccounts();
+    for (const BasicAccountReference& account : accounts) {
+      store->deleteAccount(account);
+    }
+    EXPECT_EQ(store->count(), 0u);
+  });
 }
 
 TEST_F(AccountsManagerScale, EveryAccountIsReplacedAtOnce) {
-  const Store store = largeStore();
-  AccountsManager::Accounts accounts;
-  for (std::size_t number = 0; number < manyAccounts; ++number) {
-    accounts.push_back(
-        exchange(name("A", number)).withChildren({calDAV(name("d", number))}).record());
-  }
-  store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, accounts);
-  EXPECT_EQ(store->allBasicAccounts(), accounts);
-  EXPECT_EQ(store->allBasicSyncableAccounts().size(), 2 * manyAccounts);
+  expectInProportion([](std::size_t count) {
+    const Store store = largeStore(count);
+    AccountsManager::Accounts accounts;
+    for (std::size_t number = 0; number < count; ++number) {
+      accounts.push_back(
+          exchange(name("A", number)).withChildren({calDAV(name("d", number))}).record());
+    }
+    store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, accounts);
+    EXPECT_EQ(store->allBasicAccounts(), accounts);
+    EXPECT_EQ(store->allBasicSyncableAccounts().size(), 2 * count);
+  });
 }
 
 TEST_F(AccountsManagerScale, OneNewAccountTakesManyPlaces) {
-  const Store store = storeOf(std::vector<PropertyValue>(manyAccounts, mail("A")));
-  store->replaceAccountsWithTypes_withAccounts({},
-                                               {mail("A").withChildren({calDAV("c")}).record()});
-  EXPECT_EQ(store->count(), manyAccounts);
-  EXPECT_EQ(childrenOf(*store), "c");
+  expectInProportion([](std::size_t count) {
+    const Store store = storeOf(std::vector<PropertyValue>(count, mail("A")));
+    store->replaceAccountsWithTypes_withAccounts({},
+                                                 {mail("A").withChildren({calDAV("c")}).record()});
+    EXPECT_EQ(store->count(), count);
+    EXPECT_EQ(childrenOf(*store), "c");
+  });
 }
 
 TEST_F(AccountsManagerScale, ALargeStoreIsSaved) {
-  const Store store = largeStore();
-  store->saveAllAccounts();
-  store->saveAllAccounts();
-  EXPECT_EQ(settingsAccounts().size(), manyAccounts);
+  expectInProportion([this](std::size_t count) {
+    const Store store = largeStore(count);
+    store->saveAllAccounts();
+    store->saveAllAccounts();
+    EXPECT_EQ(settingsAccounts().size(), count);
+  });
 }
 
 }  // namespace

@@ -186,10 +186,6 @@ TEST_F(MigrationStagesTest, AFailedExchangeConversionDoesNotKeepTheMailConversio
   EXPECT_EQ(savedIdentifiers(), TextList{"M"});
 }
 
-class FailingUpgrade : public AccountsDataMigrator {
-  bool _migrateNewAccountsInfo(AccountsManager&) override { return false; }
-};
-
 TEST_F(MigrationStagesTest, AFailedChainStillSavesTheStoreAsCurrent) {
   addSettingsFile(11, {anAccount("A", kMailAccountType, "IMAPAccount")});
 

@@ -6,6 +6,7 @@
 #include <initializer_list>
 #include <memory>
 #include <optional>
+#include <span>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -30,6 +31,13 @@ inline const std::string copyAside =
     "/var/mobile/Library/Logs/CrashReporter/com.quarx.accountsettings.plist";
 
 using Migrator = AccountsDataMigrator;
+
+/// A migrator whose upgrade fails, as no step of today does: its chain has no step for any version.
+class FailingUpgrade : public AccountsDataMigrator {
+ public:
+  FailingUpgrade() : AccountsDataMigrator(std::span<const UpgradeStep>()) {}
+};
+
 using Lines = std::vector<std::string>;
 using TextList = std::vector<std::string>;
 

@@ -131,9 +131,6 @@ TEST_F(ObservedMigration, EachStageShowsTheVersionThatTheAccountsHaveAfterIt) {
 }
 
 TEST_F(ObservedMigration, TheStoreThatIsSavedIsStampedAsCurrentAlsoAfterAFailedChain) {
-  class FailingUpgrade : public AccountsDataMigrator {
-    bool _migrateNewAccountsInfo(AccountsManager&) override { return false; }
-  };
   addSettings(5);
   FailingUpgrade().performMigration();
   EXPECT_EQ(*observer.stage("initInsideOfMigration").accountSettings->find("Version"),

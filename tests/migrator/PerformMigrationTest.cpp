@@ -56,9 +56,6 @@ TEST_F(PerformMigrationTest, AMigrationKilledWhileSavingLeavesItsFileToTheNext) 
 }
 
 TEST_F(PerformMigrationTest, TheResultIsThatOfTheMigrationSteps) {
-  class FailingUpgrade : public AccountsDataMigrator {
-    bool _migrateNewAccountsInfo(AccountsManager&) override { return false; }
-  };
   addSettingsFile(11, {});
 
   EXPECT_FALSE(FailingUpgrade().performMigration());

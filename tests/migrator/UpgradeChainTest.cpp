@@ -10,6 +10,8 @@ namespace {
 /// A migrator whose steps only write down that they ran. The step of one version may fail.
 class RecordingMigrator : public AccountsDataMigrator {
  public:
+  using AccountsDataMigrator::AccountsDataMigrator;
+
   std::vector<std::uint64_t> ran;
   std::optional<std::uint64_t> failing;
 
@@ -30,11 +32,10 @@ constexpr std::array<UpgradeStep, sizeof...(versions)> recordingChain(
 
 class UpgradeChainTest : public StepTest {
  protected:
-  bool run(std::uint64_t currentVersion = AccountsManager::currentVersion()) {
-    constexpr auto chain = recordingChain(std::make_index_sequence<upgradeChain.size()>());
-    return recorder.runUpgradeChain(*store, chain, currentVersion);
-  }
-  RecordingMigrator recorder;
+  bool run() { return recorder._migrateNewAccountsInfo(*store); }
+
+  static constexpr auto chain = recordingChain(std::make_index_sequence<upgradeChain.size()>());
+  RecordingMigrator recorder{chain};
   using Versions = std::vector<std::uint64_t>;
   const Versions allVersions = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11};
 };
@@ -126,13 +127,13 @@ TEST_F(UpgradeChainTest, AStepThatFailsEndsTheChain) {
   EXPECT_EQ(recorder.ran, (Versions{3, 4, 5}));
 }
 
-TEST_F(UpgradeChainTest, ARaisedCurrentVersionWithoutAStepFails) {
-  constexpr std::uint64_t raisedVersion = 13;
-  addSettingsFile(12, {});
+TEST_F(UpgradeChainTest, AChainWithoutAStepForTheVersionFails) {
+  RecordingMigrator lackingTheLast(std::span(chain).first(11));
+  addSettingsFile(11, {});
 
-  EXPECT_FALSE(run(raisedVersion));
+  EXPECT_FALSE(lackingTheLast._migrateNewAccountsInfo(*store));
 
-  EXPECT_TRUE(recorder.ran.empty());
+  EXPECT_TRUE(lackingTheLast.ran.empty());
 }
 
 TEST_F(UpgradeChainTest, TheFileDecidesNotTheStore) {
