@@ -19,7 +19,7 @@ install(FILES ${PROJECT_SOURCE_DIR}/README.md ${PROJECT_SOURCE_DIR}/CHANGELOG.md
   DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration COMPONENT ${programs_component})
 install(DIRECTORY ${PROJECT_SOURCE_DIR}/docs
   DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration COMPONENT ${programs_component}
-  FILES_MATCHING PATTERN "*.md" PATTERN "schema/*.json")
+  FILES_MATCHING PATTERN "*.md" PATTERN "*.png" PATTERN "schema/*.json")
 
 # Parts of these libraries are in the programs; their licences ask for these notices then.
 foreach(library libcli11-dev libfmt-dev nlohmann-json3-dev)
