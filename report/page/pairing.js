@@ -7,7 +7,7 @@ class Account {
     this.side = side;
     this.parent = parent;
     this.title = content.title || content.identifier || "an account";
-    this.properties = propertiesOf(content);
+    this.valuesByPath = null;
     this.children = (content.children ?? []).map((child) => new Account(child, side, this));
     // Before: the ledger's entry. What the account became, or was, on the other side; the first one
     // is what it is compared with.
@@ -16,6 +16,12 @@ class Account {
     this.partner = null;
     this.marks = [];
     this.part = null;
+  }
+
+  /** Its values by their paths, made when they are first asked for. */
+  get properties() {
+    this.valuesByPath ??= propertiesOf(this.content);
+    return this.valuesByPath;
   }
 }
 
@@ -76,10 +82,11 @@ function pairByLedger(entries, { allAfter, beforeByElement }) {
 }
 
 /** What became of an account of the inputs. */
-function marksBefore({ content, entry, partner, properties }) {
+function marksBefore(account) {
+  const { content, entry, partner } = account;
   const mark = kMarksOfFates[entry?.fate];
   const mayAlsoChange = ["moved", "renamed"].includes(mark) && partner !== null;
-  const isChanged = mayAlsoChange && (!hasSameProperties({ properties }, partner) ||
+  const isChanged = mayAlsoChange && (!hasSameProperties(account, partner) ||
                                       !isSame(content.dataclasses, partner.content.dataclasses));
   return [isChanged ? "changed" : null, mark].filter((each) => each);
 }

@@ -82,10 +82,17 @@ function watchFilter(page) {
   });
 }
 
-function start() {
+/** The report's JSON, which a long report holds compressed. */
+async function expanded(text) {
+  const bytes = Uint8Array.from(atob(text), (character) => character.charCodeAt(0));
+  const plain = new Blob([bytes]).stream().pipeThrough(new DecompressionStream("gzip"));
+  return new Response(plain).text();
+}
+
+function start(json) {
   let report = null;
   try {
-    report = JSON.parse(byId("report").textContent);
+    report = JSON.parse(json);
   } catch (error) {
     byId("overview").replaceChildren(make("h1", { class: "failed" }, "This report cannot be read."),
       make("p", {}, shown(error.message)));
@@ -103,4 +110,10 @@ function start() {
   byId("fold").addEventListener("click", () => foldAll(content));
 }
 
-start();
+const embedded = byId("report");
+if (embedded.type === "application/gzip") {
+  byId("overview").replaceChildren(make("p", { class: "dim" }, "The report is being expanded."));
+  expanded(embedded.textContent).then(start, () => start(""));
+} else {
+  start(embedded.textContent);
+}

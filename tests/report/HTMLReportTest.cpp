@@ -26,6 +26,20 @@ TEST(HTMLReportTest, HoldsTheReportAsItsJSON) {
   EXPECT_EQ(embeddedReport(page), R"({"root":"/mnt/image","stages":[]})");
 }
 
+TEST(HTMLReportTest, ALongReportIsCompressed) {
+  nlohmann::json report;
+  for (int number = 0; number < 100000; ++number) {
+    report["accountsBefore"].push_back({{"title", "account " + std::to_string(number)}});
+  }
+  const std::string plain = htmlReport(R"({"accountsBefore":[]})");
+
+  const std::string page = htmlReport(report.dump() + std::string(3 << 20, ' '));
+
+  EXPECT_THAT(page, HasSubstr(R"(<script type="application/gzip" id="report">H4s)"));
+  EXPECT_LT(page.size(), plain.size() + report.dump().size() / 4);
+  EXPECT_EQ(std::ranges::count(page, '<'), std::ranges::count(plain, '<'));
+}
+
 TEST(HTMLReportTest, ATextThatLooksLikeMarkupStaysTheSameTextAndBringsNoTag) {
   const nlohmann::json report = {{"error", "</script><!--<script>alert(1)</script>"}};
 

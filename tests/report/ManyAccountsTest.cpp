@@ -41,7 +41,10 @@ json reportOfMany() {
 }
 
 TEST(ManyAccountsTest, AreInGroupsThatAreBuiltWhenTheyAreOpenedAndFoundByTheFilter) {
-  const json noted = notedOn(pageOf(reportOfMany()), R"js(
+  const std::string page = pageOf(reportOfMany());
+  ASSERT_NE(page.find("application/gzip"), std::string::npos);
+
+  const json noted = notedOn(page, R"js(
     note("badge", one(".counts .badge").textContent);
     note("groups", all("#after .group").length);
     note("accountsBuilt", all(".account").length);
