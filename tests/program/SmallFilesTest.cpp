@@ -233,8 +233,11 @@ TEST_F(SmallResult, ThatCouldNotBeReadAgainIsNotWritten) {
   const PropertyArray texts(std::vector<PropertyValue>(1000, std::string(1000, 't')));
   PropertyListError error;
   const std::string settings =
-      writeXMLPropertyList(
-          accountSettings(11, {PropertyDictionary{{"Identifier", "A"}, {"Type", "CalDAV"}, {"Class", "CalDAVAccount"}, {"Texts", texts}}}), error)
+      writeXMLPropertyList(accountSettings(11, {PropertyDictionary{{"Identifier", "A"},
+                                                                   {"Type", "CalDAV"},
+                                                                   {"Class", "CalDAVAccount"},
+                                                                   {"Texts", texts}}}),
+                           error)
           .value();
   writeText(kSettingsPath, settings);
 
