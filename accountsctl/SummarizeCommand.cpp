@@ -19,6 +19,7 @@
 #include "commandline/PlatformError.h"
 #include "commandline/ReplacedFile.h"
 #include "platform/linux/FileContents.h"
+#include "propertylist/value/Description.h"
 
 namespace accounts {
 namespace {
@@ -114,10 +115,12 @@ std::size_t missingCount(const SummarizeOptions& options, const FleetSummary& su
   return expected > summary.imageCount() ? expected - summary.imageCount() : 0;
 }
 
-std::string listText(const std::vector<std::string>& roots, bool endsWithNull) {
+/// For programs the names as they are; a terminal gets nothing that it could take for a command.
+std::string listText(const std::vector<std::string>& roots, bool endsWithNull,
+                     const Terminal& terminal) {
   std::string text;
   for (const std::string& root : roots) {
-    text += root;
+    text += terminal.isInteractive ? escapedText(root) : root;
     text += endsWithNull ? '\0' : '\n';
   }
   return text;
@@ -142,10 +145,11 @@ std::string reasonsText(const std::vector<const RunResult*>& results, const Term
 std::string listOf(const ListedImages& images, const SummarizeOptions& options,
                    const FleetSummary& summary, const Terminal& terminal) {
   if (!images.remedy) {
-    return listText(summary.missingRoots(), options.endsWithNull);
+    return listText(summary.missingRoots(), options.endsWithNull, terminal);
   }
-  return options.withReasons ? reasonsText(summary.resultsWith(*images.remedy), terminal)
-                             : listText(summary.rootsWith(*images.remedy), options.endsWithNull);
+  return options.withReasons
+             ? reasonsText(summary.resultsWith(*images.remedy), terminal)
+             : listText(summary.rootsWith(*images.remedy), options.endsWithNull, terminal);
 }
 
 std::string outcomesText(const SummarizeOptions& options, const FleetSummary& summary,

@@ -18,6 +18,7 @@
 #include "host/WorkerProcess.h"
 #include "platform/linux/LinuxDevicePlaces.h"
 #include "platform/linux/LinuxHostLocks.h"
+#include "propertylist/value/Description.h"
 #include "report/HTMLReport.h"
 
 namespace accounts {
@@ -130,7 +131,8 @@ class OpenedRun {
 
   /// In both logs, so that their lines of an attempt that counts for nothing are not taken for
   /// more.
-  void tellOfAttempt(std::string_view line) {
+  void tellOfAttempt(std::string_view words) {
+    const std::string line = escapedText(words);
     linux_.platform().consoleLog.writeLine(line);
     if (channel_ == nullptr) {
       channel_ = &linux_.platform().logSystem.makeChannel("com.quarx.accountsettings", "log");

@@ -58,7 +58,7 @@ JSON jsonOf(const PropertyValue& value) {
 std::string lineOf(const JSON& value) {
   constexpr int onOneLine = -1;
   constexpr bool keepUnicode = false;
-  return value.dump(onOneLine, ' ', keepUnicode, JSON::error_handler_t::replace);
+  return escapedJSON(value.dump(onOneLine, ' ', keepUnicode, JSON::error_handler_t::replace));
 }
 
 JSON textOrNull(const std::optional<Text>& text) {

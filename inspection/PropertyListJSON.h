@@ -18,7 +18,8 @@ JSON jsonOf(const PropertyValue& value);
 JSON textOrNull(const std::optional<Text>& text);
 JSON textOrNull(const std::optional<std::string>& text);
 
-/// A value on one line, without a line end. Bytes that are no UTF-8 are replaced.
+/// A value on one line, without a line end. Bytes that are no UTF-8 are replaced; control
+/// characters and marks that reorder text are escaped.
 std::string lineOf(const JSON& value);
 
 }  // namespace accounts

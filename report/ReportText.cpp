@@ -98,6 +98,11 @@ std::string reportText(const JSON& report, const Terminal& terminal) {
                   versionIn(report["versions"], "before"), versionIn(report["versions"], "after"),
                   countAccounts(report["accountsBefore"]), countAccounts(report["accountsAfter"]));
   text += lossesText(report, terminal);
+  for (const JSON& warning : report["warnings"]) {
+    text += emphasized(terminal, Emphasis::Warning,
+                       "Warning: " + escapedText(warning.get<std::string>())) +
+            "\n";
+  }
   for (const JSON& stage : report["stages"]) {
     text += stageText(stage, terminal);
   }

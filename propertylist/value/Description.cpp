@@ -1,5 +1,6 @@
 #include "propertylist/value/Description.h"
 
+#include <algorithm>
 #include <charconv>
 #include <chrono>
 #include <cmath>
@@ -37,18 +38,9 @@ char letterOfEscape(char character, Quoting quoting) {
   }
 }
 
-/// True of the marks that put the text after them in another direction or order, to their end or
-/// the line's: with them a text could show itself, and what follows it, as something else.
-bool isDirectionalOverride(char32_t codePoint) {
-  return (codePoint >= 0x202A && codePoint <= 0x202E) ||
-         (codePoint >= 0x2066 && codePoint <= 0x2069);
-}
-
-/// True of what a terminal or an editor may take for a command or for the end of a line, and of
-/// surrogates, which are no characters in UTF-8.
+/// Of surrogates, too, which are no characters in UTF-8.
 bool needsNumericEscape(char32_t codePoint) {
-  return codePoint < 0x20 || (codePoint >= 0x7F && codePoint < 0xA0) || codePoint == 0x2028 ||
-         codePoint == 0x2029 || isSurrogate(codePoint) || isDirectionalOverride(codePoint);
+  return isControlOrReordering(codePoint) || isSurrogate(codePoint);
 }
 
 bool isPlain(char character, Quoting quoting) {
@@ -261,6 +253,26 @@ std::string describe(const PropertyValue& value) {
 
 void appendEscapedText(std::string& line, std::string_view text) {
   appendText(line, text, Quoting::None);
+}
+
+std::string escapedJSON(std::string json) {
+  constexpr std::string_view kBeginnings = "\x7F\xC2\xE2";
+  std::string_view rest = json;
+  std::string line;
+  for (std::size_t place = 0; (place = rest.find_first_of(kBeginnings)) != rest.npos;) {
+    line.append(rest.substr(0, place));
+    rest.remove_prefix(place);
+    const DecodedCodePoint decoded = decodeCodePoint(rest);
+    const std::size_t length = std::max<std::size_t>(decoded.length, 1);
+    if (isControlOrReordering(decoded.value) && decoded.length > 0) {
+      line.append("\\u");
+      appendHex(line, decoded.value, 4);
+    } else {
+      line.append(rest.substr(0, length));
+    }
+    rest.remove_prefix(length);
+  }
+  return line.empty() ? json : line.append(rest);
 }
 
 std::string escapedText(std::string_view text) {

@@ -21,4 +21,7 @@ void appendEscapedText(std::string& line, std::string_view text);
 /// A text with the same escaped.
 std::string escapedText(std::string_view text);
 
+/// JSON that means the same, in which the same is escaped: they stand nowhere but in its texts.
+std::string escapedJSON(std::string json);
+
 }  // namespace accounts

@@ -26,6 +26,16 @@ constexpr bool isLowSurrogate(char32_t codePoint) {
   return codePoint >= 0xDC00 && codePoint <= 0xDFFF;
 }
 
+/// True of what a terminal or an editor may take for a command or for the end of a line, and of the
+/// marks that put the text after them in another direction or order, to their end or the line's:
+/// with them a text could show itself, and what follows it, as something else. Marks that count as
+/// a letter of a direction do no harm and stand in names.
+constexpr bool isControlOrReordering(char32_t codePoint) {
+  return codePoint < 0x20 || (codePoint >= 0x7F && codePoint < 0xA0) ||
+         (codePoint >= 0x2028 && codePoint <= 0x202E) ||
+         (codePoint >= 0x2066 && codePoint <= 0x2069);
+}
+
 /// Whether every byte is below 0x80. Looks at eight or four at a time, the last of which may be
 /// ones that it has seen.
 inline bool isASCII(std::string_view text) {

@@ -99,7 +99,11 @@ bool appendCharacters(std::string& output, std::string_view text) {
       return false;
     }
     const std::string_view reference = referenceFor(text.front());
-    output += reference.empty() ? text.substr(0, decoded.length) : reference;
+    if (decoded.value >= 0x7F && isControlOrReordering(decoded.value)) {
+      output.append("&#").append(digitsOf(static_cast<std::uint32_t>(decoded.value))).append(";");
+    } else {
+      output += reference.empty() ? text.substr(0, decoded.length) : reference;
+    }
     text.remove_prefix(decoded.length);
   }
   return true;

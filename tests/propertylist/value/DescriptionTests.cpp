@@ -52,6 +52,12 @@ TEST(Description, LettersAndSingleMarksOfADirectionStandAsTheyAre) {
   EXPECT_EQ(describe("\u05E9\u0628 Yahoo!\u200E"), "\u05E9\u0628 Yahoo!\u200E");
 }
 
+TEST(Description, JSONMeansTheSameWithoutThem) {
+  EXPECT_EQ(escapedJSON("[\"a\x7F\u0080\u202E\u2069\u00E9\u05E9\u2026\xFF\"]"),
+            "[\"a\\u007f\\u0080\\u202e\\u2069\u00E9\u05E9\u2026\xFF\"]");
+  EXPECT_EQ(escapedJSON("[\"\\n\"]"), "[\"\\n\"]");
+}
+
 TEST(Description, AnUnpairedSurrogateIsEscaped) {
   EXPECT_EQ(describe("a\xED\xA0\xBD"
                      "b"),

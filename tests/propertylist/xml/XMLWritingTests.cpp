@@ -68,6 +68,14 @@ TEST(XMLWriting, BlanksAndLineEndsInTextsAreKept) {
   }
 }
 
+TEST(XMLWriting, WhatATerminalMightObeyIsWrittenAsItsNumber) {
+  const PropertyValue value = PropertyDictionary{{"\x7F", "\u0080a\u202E\u200E"}};
+  const std::string file = writeXML(value);
+  EXPECT_TRUE(contains(file, "<key>&#127;</key>"));
+  EXPECT_TRUE(contains(file, "<string>&#128;a&#8238;\u200E</string>"));
+  EXPECT_EQ(readXML(file), value);
+}
+
 TEST(XMLWriting, RealsAreKeptBitForBit) {
   using Limits = std::numeric_limits<double>;
   for (const double real :
