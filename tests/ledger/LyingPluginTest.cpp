@@ -112,8 +112,45 @@ TEST(LyingPlugin, AnAccountIsNotMadeAnewAsOneWithOtherValues) {
   EXPECT_THAT(
       MigratedInMemory({.settings = settings(12, {with(ldap("A"), kAccountType, "No"), ldap("B")})},
                        &liar)
-          .lost(),
-      ElementsAre("Accounts[0]"));
+          .losses(),
+      ElementsAre(HasSubstr(": another account with its identifier took its place: its \"")));
+}
+
+TEST(LyingPlugin, AnAccountIsComparedWithTheLastOfThoseThatTookItsPlace) {
+  OtherFates liar([](AccountEvent& event) {
+    event.fate = ToldFate::Overwritten;
+    event.other = {AccountOrigin::Kind::Settings, event.account.number + 1};
+  });
+  const PropertyDictionary refused = with(ldap("A"), kAccountType, "No");
+  EXPECT_THAT(
+      MigratedInMemory({.settings = settings(12, {refused, refused, ldap("A")})}, &liar).losses(),
+      ElementsAre(HasSubstr("took its place: its \"Type\""),
+                  HasSubstr("took its place: its \"Type\"")));
+}
+
+TEST(LyingPlugin, AnAccountWhoseParentIsNowhereIsLost) {
+  OtherFates liar([](AccountEvent& event) {
+    event.fate = ToldFate::MovedBelow;
+    event.other = {AccountOrigin::Kind::Settings, 77};
+  });
+  EXPECT_THAT(
+      MigratedInMemory({.settings = settings(12, {with(ldap("A"), kAccountType, "No")})}, &liar)
+          .losses(),
+      ElementsAre(EndsWith("the parent account that it was moved below is gone")));
+}
+
+TEST(LyingPlugin, AValueThatAnAccountGivesToItsParentMustBeThere) {
+  const PropertyDictionary hosted =
+      with(anAccount("A", kVelmoraAccountType, kVelmoraAccountClass),
+           kCalendarsAccountSubscribedCalendars, PropertyArray{"a calendar"});
+  const MigratedInMemory migrated(
+      {.settings = settings(6, {hosted})}, nullptr, [](PropertyArray& accounts) {
+        accounts.replace(0, with(*accounts.at(0).asDictionary(),
+                                 kCalendarsAccountSubscribedCalendars, PropertyArray{"another"}));
+      });
+  EXPECT_THAT(migrated.losses(),
+              ElementsAre(EndsWith("its \"" + std::string(kCalendarsAccountSubscribedCalendars) +
+                                   "\" did not go to the parent account made from it")));
 }
 
 TEST(LyingPlugin, AccountsThatAreSaidToOverwriteEachOtherInACircleAreLost) {
@@ -122,8 +159,9 @@ TEST(LyingPlugin, AccountsThatAreSaidToOverwriteEachOtherInACircleAreLost) {
     event.other = {AccountOrigin::Kind::Settings, 1 - event.account.number};
   });
   const PropertyDictionary refused = with(ldap("A"), kAccountType, "No");
-  EXPECT_THAT(MigratedInMemory({.settings = settings(12, {refused, refused})}, &liar).lost(),
-              ElementsAre("Accounts[0]", "Accounts[1]"));
+  EXPECT_THAT(MigratedInMemory({.settings = settings(12, {refused, refused})}, &liar).losses(),
+              ElementsAre(EndsWith(": another account with its identifier took its place"),
+                          EndsWith(": another account with its identifier took its place")));
 }
 
 TEST(LyingPlugin, AValueThatIsGoneIsALoss) {

@@ -56,7 +56,9 @@ TEST_F(SavesInMemoryTest, ASettingsFileThatCannotBeReplacedSaysWhyTheSaveFailed)
 
 TEST_F(SavesInMemoryTest, OnlyWhatIsAboutToBePutInPlaceIsGivenAway) {
   snapshot.addFile(DevicePlace::Settings, "");
-  EXPECT_FALSE(files.setOwnerAndGroup(path(DevicePlace::Settings), "mobile", "mobile"));
+  EXPECT_EQ(
+      files.setOwnerAndGroup(path(DevicePlace::Settings), "mobile", "mobile").error(),
+      "Cannot set the owner of " + path(DevicePlace::Settings) + ": No such file or directory");
 }
 
 TEST_F(SavesInMemoryTest, AWrittenListStaysTheValueThatItWas) {
