@@ -166,6 +166,7 @@ TEST_F(AccountsManagerMutations, AnAccountOfTheStoresOwnListCanBeReplaced) {
 TEST_F(AccountsManagerMutations, ReplacingAnAccountThatIsNotInTheStoreIsAProgrammingError) {
   const Store store = storeOf({mail("A")});
   EXPECT_DEATH(store->replaceAccount_withAccount(mail("A").record(), mail("B").record()),
+               R"(-\[AccountsManager replaceAccount:withAccount:\], AccountsManager: )"
                "The account to replace is not in the store");
 }
 

@@ -109,6 +109,15 @@ TEST(Fates, WhatAnEarlierRunCarriedOverWithoutAnIdentifierIsFoundByItsValues) {
   EXPECT_THAT(migrated.losses(), IsEmpty());
 }
 
+TEST(DeviceFacts, SayWhetherTheDeviceHasTheOldestProcessor) {
+  FakePlatform device;
+  EXPECT_FALSE(factsOf(device.platform).hasOldestProcessor);
+  device.deviceInfoService.answers.insert_or_assign("CPUArchitecture", "armv7");
+  EXPECT_FALSE(factsOf(device.platform).hasOldestProcessor);
+  device.deviceInfoService.answers.insert_or_assign("CPUArchitecture", "armv6");
+  EXPECT_TRUE(factsOf(device.platform).hasOldestProcessor);
+}
+
 TEST(Fates, OtherContentsAreListedAsLeftBehind) {
   PropertyDictionary file = settings(12, {});
   file.set("Other", 1);

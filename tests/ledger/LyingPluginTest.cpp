@@ -124,8 +124,8 @@ TEST(LyingPlugin, AnAccountIsComparedWithTheLastOfThoseThatTookItsPlace) {
   const PropertyDictionary refused = with(ldap("A"), kAccountType, "No");
   EXPECT_THAT(
       MigratedInMemory({.settings = settings(12, {refused, refused, ldap("A")})}, &liar).losses(),
-      ElementsAre(HasSubstr("took its place: its \"Type\""),
-                  HasSubstr("took its place: its \"Type\"")));
+      ElementsAre(EndsWith("took its place: its \"Type\" gave way to another value"),
+                  EndsWith("took its place: its \"Type\" gave way to another value")));
 }
 
 TEST(LyingPlugin, AnAccountWhoseParentIsNowhereIsLost) {
@@ -205,6 +205,92 @@ TEST(LyingPlugin, AKeyOfAStepMayDifferOnlyInAccountsOfItsTypeOrClass) {
               ElementsAre("Accounts[0]"));
   EXPECT_THAT(MigratedInMemory({.settings = settings(9, {cloud})}, nullptr, tamper).lost(),
               IsEmpty());
+}
+
+/// An account or a description, a value that it has in the result, and whether that is a loss.
+struct Tampered {
+  const char* what;
+  DeviceFiles files;
+  std::string_view key;
+  PropertyValue value;
+  bool isLoss;
+};
+
+TEST(LyingPlugin, AKeyThatAConversionSetsMayDifferWhereItDoesAlone) {
+  const auto mail = [](std::string_view accountClass) {
+    return DeviceFiles{
+        .mail = mailStore({with(mailDescription("A", accountClass), kAccountUsername, "jo@x")})};
+  };
+  const DeviceFiles exchange = {.exchange = exchangeStore({exchangeDescription("A")})};
+  for (const Tampered& each : {
+           Tampered{"a hosted account's user name", mail(kVelmoraAccountClass), kAccountUsername,
+                    "jo", false},
+           Tampered{"another one's", mail(kIMAPAccountClass), kAccountUsername, "jo", true},
+           Tampered{"a hosted account's password", mail(kVelmoraAccountClass), "Password", "x",
+                    true},
+           Tampered{"a type's text", mail(kIMAPAccountClass), kAccountTypeString, "x", false},
+           Tampered{"an Exchange account's", exchange, kAccountShortTypeString, "x", false},
+           Tampered{"its password", exchange, "Password", "x", true},
+       }) {
+    const MigratedInMemory migrated(each.files, nullptr, [&](PropertyArray& accounts) {
+      PropertyDictionary account = *accounts.at(0).asDictionary();
+      if (each.files.mail && account.contains(kAccountChildAccounts)) {
+        // A step has put it below a parent.
+        PropertyDictionary child =
+            *account.arrayForKey(kAccountChildAccounts)->at(0).asDictionary();
+        child.set(each.key, each.value);
+        account.set(kAccountChildAccounts, PropertyArray{child});
+      } else {
+        account.set(each.key, each.value);
+      }
+      accounts.replace(0, account);
+    });
+    EXPECT_EQ(!migrated.lost().empty(), each.isLoss) << each.what;
+  }
+}
+
+TEST(LyingPlugin, AKeyOfAChildMayDifferWhereAStepTouchesChildrenAlone) {
+  const PropertyDictionary hosted =
+      with(anAccount("K", kVelmoraAccountType, kVelmoraAccountClass), kAccountDisplayName, "name");
+  const PropertyDictionary other = with(ldap("K"), kAccountDisplayName, "name");
+  const PropertyDictionary nameless = without(hosted, kAccountIdentifier);
+  const auto below = [](const PropertyDictionary& parent, const PropertyDictionary& child) {
+    return DeviceFiles{
+        .settings = settings(7, {with(parent, kAccountChildAccounts, PropertyArray{child})})};
+  };
+  const PropertyDictionary cloud = anAccount("Q", kQuarxAccountType, kCloudAccountClass);
+  for (const Tampered& each : {
+           Tampered{"the name of a hosted child", below(cloud, hosted), kAccountDisplayName, "x",
+                    false},
+           Tampered{"another child's", below(cloud, other), kAccountDisplayName, "x", true},
+           Tampered{"that of another parent's child", below(ldap("P"), hosted), kAccountDisplayName,
+                    "x", true},
+           Tampered{"its identifier", below(cloud, hosted), kAccountIdentifier, "x", true},
+           Tampered{"one that it had not", below(cloud, nameless), kAccountIdentifier, "x", false},
+           Tampered{"another key of that one", below(cloud, nameless), "Hostname", "x", true},
+       }) {
+    const MigratedInMemory migrated(each.files, nullptr, [&](PropertyArray& accounts) {
+      const PropertyDictionary& parent = *accounts.at(0).asDictionary();
+      const PropertyArray children = parent.arrayForKey(kAccountChildAccounts).value();
+      accounts.replace(
+          0, with(parent, kAccountChildAccounts,
+                  PropertyArray{with(*children.at(0).asDictionary(), each.key, each.value)}));
+    });
+    EXPECT_EQ(!migrated.lost().empty(), each.isLoss) << each.what;
+  }
+}
+
+TEST(LyingPlugin, AValueOfAnAccountThatWasMovedMustBeBelowItsParent) {
+  const MigratedInMemory migrated(
+      {.settings = settings(6, {anAccount("A", kVelmoraAccountType, kVelmoraAccountClass)})},
+      nullptr, [](PropertyArray& accounts) {
+        const PropertyDictionary& parent = *accounts.at(0).asDictionary();
+        const PropertyArray children = parent.arrayForKey(kAccountChildAccounts).value();
+        accounts.replace(0,
+                         with(parent, kAccountChildAccounts,
+                              PropertyArray{without(*children.at(0).asDictionary(), "Hostname")}));
+      });
+  EXPECT_THAT(migrated.losses(), ElementsAre(EndsWith(": its \"Hostname\" is gone")));
 }
 
 TEST(LyingPlugin, AChildThatIsGoneIsALoss) {

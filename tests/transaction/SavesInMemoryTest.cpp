@@ -61,6 +61,11 @@ TEST_F(SavesInMemoryTest, OnlyWhatIsAboutToBePutInPlaceIsGivenAway) {
       "Cannot set the owner of " + path(DevicePlace::Settings) + ": No such file or directory");
 }
 
+TEST_F(SavesInMemoryTest, AListThatIsWrittenToAPlaceAtOnceStandsThere) {
+  ASSERT_TRUE(files.writeFileAtomically(path(DevicePlace::Settings), serialized(kNew)));
+  EXPECT_EQ(transaction.dictionaryAt(DevicePlace::Settings), kNew);
+}
+
 TEST_F(SavesInMemoryTest, AWrittenListStaysTheValueThatItWas) {
   PropertyDictionary value = kNew;
   const SerializedPropertyList list = serialized(value);
