@@ -207,6 +207,18 @@ TEST(LyingPlugin, AKeyOfAStepMayDifferOnlyInAccountsOfItsTypeOrClass) {
               IsEmpty());
 }
 
+TEST(LyingPlugin, WhatAConversionSetsMayNotDifferWhereNoDescriptionTookAPlace) {
+  OtherOrder liar([&liar](auto& accounts) {
+    liar.listener->accountFared({accounts[0], ToldFate::Overwritten, accounts[1]});
+    accounts[0] = accounts[1];
+  });
+  const MigratedInMemory migrated(
+      {.settings = settings(12, {ldap("A"), ldap("A")})}, &liar, [](PropertyArray& accounts) {
+        accounts.replace(0, with(*accounts.at(0).asDictionary(), kAccountSyncIdentifier, "x"));
+      });
+  EXPECT_THAT(migrated.lost(), ElementsAre("Accounts[0]", "Accounts[1]"));
+}
+
 /// An account or a description, a value that it has in the result, and whether that is a loss.
 struct Tampered {
   const char* what;
