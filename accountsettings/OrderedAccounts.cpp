@@ -188,8 +188,7 @@ void OrderedAccounts::takeFromIndexes(PlaceNumber number, const BasicAccount& ac
       placesByRecord_.erase(entry);
     }
   }
-  const std::optional<Text> identifier = account.identifier();
-  if (identifier && placesByIdentifier_.contains(*identifier)) {
+  if (const std::optional<Text> identifier = account.identifier()) {
     PlaceNumbers& numbers = placesByIdentifier_[*identifier];
     numbers.erase(number);
     if (numbers.empty()) {

@@ -20,16 +20,10 @@ void ToldFates::stageEnded(bool succeeded, const std::optional<AccountsInMemory>
 void ToldFates::accountFared(const AccountEvent& event) {
   events_.push_back({event.account, event.fate, event.other, std::string(event.reason),
                      stages_.empty() ? std::string() : stages_.back()});
-  if (next_ != nullptr) {
-    next_->accountFared(event);
-  }
 }
 
 void ToldFates::accountsSaved(const std::vector<AccountOrigin>& accounts) {
   saved_ = accounts;
-  if (next_ != nullptr) {
-    next_->accountsSaved(accounts);
-  }
 }
 
 bool ToldFates::hasRun(std::string_view stage) const {

@@ -18,7 +18,7 @@ struct KeptEvent {
   std::string stage;
 };
 
-/// Keeps what a migration tells of its stages and its accounts, and passes it on.
+/// Keeps what a migration tells of its stages and its accounts, and passes the stages on.
 class ToldFates final : public MigrationObserver {
  public:
   /// Null for nobody else who observes.

@@ -203,7 +203,7 @@ class Source:
         find(r"(?<![\w.'])(0x[0-9A-Fa-f]+|\d+)(?=[uUlL]*\b)(?![.'])", lambda match: str(int(match[0], 0) + 1))
         find(r"\b(true|false)\b", lambda match: "false" if match[0] == "true" else "true")
         find(r'"(_+)"', lambda match: self.text[region.start + match.start():region.start + match.end() - 1] + 'x"')
-        for match in re.finditer(r"(?!if|while|switch|return)\b\w+(<[\w:]+>)?\(", self.code[region.start:region.end]):
+        for match in re.finditer(r"(?!if|while|switch|return|min|max)\b\w+(<[\w:]+>)?\(", self.code[region.start:region.end]):
             opening = region.start + match.end() - 1
             arguments = self.split(opening + 1, self.partner[opening], ",")
             texts = [self.text[start:end].strip() for start, end in arguments]

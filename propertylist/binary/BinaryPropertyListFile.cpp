@@ -171,11 +171,11 @@ void putTableAndTrailer(Output& output, const std::vector<std::uint32_t>& offset
   for (const std::uint32_t offset : offsets) {
     output.putNumber(offset, offsetSize);
   }
+  // The top object is the first: its number is 0, as everything is that is not set here.
   std::array<char, kTrailerSize> trailer = {};
   trailer[kOffsetSizePosition] = static_cast<char>(offsetSize);
   trailer[kReferenceSizePosition] = static_cast<char>(referenceSize);
   store(trailer.data() + kObjectCountPosition, offsets.size(), 8);
-  store(trailer.data() + kTopObjectPosition, 0, 8);
   store(trailer.data() + kTablePosition, table, 8);
   output.putBytes({trailer.data(), trailer.size()});
 }

@@ -89,7 +89,8 @@ TEST(AccountTypesLoadingDeathTest, AMissingResourceEndsTheProcess) {
 TEST(AccountTypesLoadingDeathTest, AnUnreadableResourceEndsTheProcessNamingTheDataclasses) {
   FakeProcess device;
   device.bundleResources.unreadable.insert("AccountTypesProperties");
-  EXPECT_DEATH(BasicAccount::initialize(), "Could not load the dataclasses configuration file");
+  EXPECT_DEATH(BasicAccount::initialize(), R"(\+\[BasicAccount initialize\], BasicAccount: )"
+                                           "Could not load the dataclasses configuration file");
 }
 
 TEST(AccountTypes, AnUnknownTypeHasNoListsAndAnswersFalse) {

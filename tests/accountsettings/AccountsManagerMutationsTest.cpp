@@ -1,3 +1,4 @@
+#include "propertylist/value/Description.h"
 #include "tests/accountsettings/StoreFixture.h"
 
 namespace accounts {
@@ -52,8 +53,8 @@ TEST_F(AccountsManagerMutations, AnUpdatedAccountTakesThePlaceOfTheOneWithItsIde
   EXPECT_EQ(store->allBasicAccounts().front(), account);
   EXPECT_EQ(store->accountWithIdentifier("A"), account);
   EXPECT_EQ(childrenOf(*store), "d");
-  EXPECT_EQ(takeLines().front().substr(0, 58),
-            R"(-[AccountsManager updateAccount:] (N) "Updating account: {)");
+  EXPECT_EQ(takeLines().front(), "-[AccountsManager updateAccount:] (N) \"Updating account: " +
+                                     describe(account->properties()) + "\"");
 }
 
 TEST_F(AccountsManagerMutations, AnUpdateTakesEveryPlaceOfTheIdentifier) {
@@ -165,6 +166,7 @@ TEST_F(AccountsManagerMutations, AnAccountOfTheStoresOwnListCanBeReplaced) {
 TEST_F(AccountsManagerMutations, ReplacingAnAccountThatIsNotInTheStoreIsAProgrammingError) {
   const Store store = storeOf({mail("A")});
   EXPECT_DEATH(store->replaceAccount_withAccount(mail("A").record(), mail("B").record()),
+               R"(-\[AccountsManager replaceAccount:withAccount:\], AccountsManager: )"
                "The account to replace is not in the store");
 }
 

@@ -268,7 +268,7 @@ TEST_F(ChangeNotificationsDeathTest, ANotifierThatCannotBeToldOfChangesIsAnError
   account_->setDisplayName("other");
 
   EXPECT_DEATH(store_->saveAllAccounts(),
-               "The class MailNotifier does not answer noteAccountChanges:");
+               "AccountsManager: The class MailNotifier does not answer noteAccountChanges:");
 }
 
 }  // namespace

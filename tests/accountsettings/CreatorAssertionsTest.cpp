@@ -12,7 +12,7 @@ class CreatorAssertionsDeathTest : public CreatorsTest {
   void expectDeathOfFullAccount(const std::string& text) {
     const BasicAccountReference record = account("A", kMailAccountType);
     EXPECT_EXIT(static_cast<void>(record->fullAccountUsingLoader(nullptr)),
-                testing::KilledBySignal(SIGABRT), testing::HasSubstr(text));
+                testing::KilledBySignal(SIGABRT), testing::HasSubstr("BasicAccount: " + text));
   }
 };
 
@@ -84,8 +84,11 @@ TEST_F(CreatorAssertionsDeathTest, AClassThatNamesNoneForTheType) {
 
 TEST_F(CreatorAssertionsDeathTest, TheTextNamesTheOperationAndTheSourceFile) {
   setCreators({});
-  expectDeathOfFullAccount(
-      "-[BasicAccount _creatorClassNameForAccountType:creatorType:loader:], BasicAccount: ");
+  const BasicAccountReference record = account("A", kMailAccountType);
+  EXPECT_EXIT(static_cast<void>(record->fullAccountUsingLoader(nullptr)),
+              testing::KilledBySignal(SIGABRT),
+              testing::HasSubstr("-[BasicAccount _creatorClassNameForAccountType:creatorType:"
+                                 "loader:], BasicAccount: "));
 }
 
 TEST_F(CreatorAssertionsDeathTest, AMapThatIsNotThere) {

@@ -39,13 +39,13 @@ TEST(MailServices, TheyAreReadOnceAProcess) {
 TEST(MailServicesDeathTest, AMissingResourceEndsTheProcess) {
   FakeProcess device;
   device.bundleResources.replaced[servicesResource] = std::nullopt;
-  EXPECT_DEATH(MailServices::current(), "Could not find MailServices.plist");
+  EXPECT_DEATH(MailServices::current(), "MailServices: Could not find MailServices.plist");
 }
 
 TEST(MailServicesDeathTest, AnUnreadableResourceEndsTheProcess) {
   FakeProcess device;
   device.bundleResources.unreadable.insert(servicesResource);
-  EXPECT_DEATH(MailServices::current(), "Could not load MailServices.plist");
+  EXPECT_DEATH(MailServices::current(), "MailServices: Could not load MailServices.plist");
 }
 
 TEST(MailServicesDeathTest, AMissingNameEndsTheProcessAndIsNamed) {
@@ -53,8 +53,9 @@ TEST(MailServicesDeathTest, AMissingNameEndsTheProcessAndIsNamed) {
   PropertyDictionary incomplete = *device.bundleResources.readPropertyList(servicesResource);
   incomplete.remove("Yahoo IMAP Host");
   device.bundleResources.replaced[servicesResource] = incomplete;
-  EXPECT_DEATH(MailServices::current(),
-               "Malformed MailServices information. Could not find the Yahoo IMAP Host");
+  EXPECT_DEATH(
+      MailServices::current(),
+      "MailServices: Malformed MailServices information. Could not find the Yahoo IMAP Host");
 }
 
 TEST(MailServicesDeathTest, AnEmptyNameCountsAsMissing) {

@@ -95,7 +95,7 @@ class NotifierAssertionsDeathTest : public CreatorsTest {
   static void expectDeathOfLookup(const std::string& text) {
     EXPECT_EXIT(static_cast<void>(AccountsManager::_notifierClassNamesForAccountType_dataclass(
                     "Mail", kAccountDataclassMail)),
-                testing::KilledBySignal(SIGABRT), testing::HasSubstr(text));
+                testing::KilledBySignal(SIGABRT), testing::HasSubstr("AccountsManager: " + text));
   }
 };
 

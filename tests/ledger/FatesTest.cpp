@@ -55,7 +55,18 @@ TEST(Fates, AHostedAccountMovesBelowAParentWithItsChildrenAtTheParentsSide) {
       {.settings = settings(6, {with(hosted("A"), kAccountChildAccounts, PropertyArray{child})})});
   EXPECT_THAT(migrated.fates(), ElementsAre("Accounts[0] movedBelow",
                                             "Accounts[0].ChildAccounts[0] movedToOtherParent"));
+  EXPECT_EQ(migrated.ledger().entries[0].now, std::vector{LedgerPlace({0, 1})});
+  EXPECT_EQ(migrated.ledger().entries[1].now, std::vector{LedgerPlace({0, 0})});
   EXPECT_THAT(migrated.losses(), IsEmpty());
+}
+
+TEST(Fates, AHostedChildWithoutAnIdentifierIsGivenOneWhereAStepTakesItsNameOff) {
+  const PropertyDictionary child =
+      without(with(hosted("A"), kAccountDisplayName, "Velmora"), kAccountIdentifier);
+  const PropertyDictionary cloud = with(anAccount("Q", kQuarxAccountType, kCloudAccountClass),
+                                        kAccountChildAccounts, PropertyArray{child});
+  EXPECT_THAT(MigratedInMemory({.settings = settings(7, {cloud})}).fates(),
+              ElementsAre("Accounts[0] changed", "Accounts[0].ChildAccounts[0] changed"));
 }
 
 TEST(Fates, ACalendarAccountIsJoinedIntoItsMailAccount) {
@@ -96,6 +107,15 @@ TEST(Fates, WhatAnEarlierRunCarriedOverWithoutAnIdentifierIsFoundByItsValues) {
        .mail = mailStore({without(mailDescription("A", kIMAPAccountClass), kLegacyMailIdentifier)}),
        .hasSentinel = true});
   EXPECT_THAT(migrated.losses(), IsEmpty());
+}
+
+TEST(DeviceFacts, SayWhetherTheDeviceHasTheOldestProcessor) {
+  FakePlatform device;
+  EXPECT_FALSE(factsOf(device.platform).hasOldestProcessor);
+  device.deviceInfoService.answers.insert_or_assign("CPUArchitecture", "armv7");
+  EXPECT_FALSE(factsOf(device.platform).hasOldestProcessor);
+  device.deviceInfoService.answers.insert_or_assign("CPUArchitecture", "armv6");
+  EXPECT_TRUE(factsOf(device.platform).hasOldestProcessor);
 }
 
 TEST(Fates, OtherContentsAreListedAsLeftBehind) {

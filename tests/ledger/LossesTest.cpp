@@ -172,6 +172,19 @@ TEST(Losses, AnOutgoingDescriptionOfAMailClassIsConvertedAndRemovedAgain) {
   EXPECT_THAT(migrated.lost(), ElementsAre("DeliveryAccounts[0]"));
 }
 
+TEST(Losses, TheChildOfACalendarAccountThatIsJoined) {
+  const PropertyDictionary gmail =
+      with(anAccount("G", kMailAccountType, kGmailAccountClass), kAccountUsername, "jo");
+  PropertyDictionary calendars = with(
+      with(anAccount("K", kCalDAVAccountType, kCalDAVAccountClass), "CalDAVPrincipalConfiguration",
+           PropertyDictionary{{"Login_Key", "jo"}, {"CalDAV_Server_Key", "www.google.com"}}),
+      "CalDAVAccountConfiguration",
+      PropertyDictionary{{"CalDAV_PrincipalPath_Key", "/calendar/dav/jo/user"}});
+  calendars.set(kAccountChildAccounts, PropertyArray{calDAV("C")});
+  EXPECT_THAT(MigratedInMemory({.settings = settings(4, {gmail, calendars})}).losses(),
+              ElementsAre(EndsWith(": its parent was joined into another account")));
+}
+
 TEST(Losses, ADescriptionThatAnEarlierRunDidNotCarryOver) {
   const MigratedInMemory migrated({.settings = settings(12, {calDAV("B")}),
                                    .mail = mailStore({mailDescription("A", kIMAPAccountClass)}),

@@ -112,8 +112,45 @@ TEST(LyingPlugin, AnAccountIsNotMadeAnewAsOneWithOtherValues) {
   EXPECT_THAT(
       MigratedInMemory({.settings = settings(12, {with(ldap("A"), kAccountType, "No"), ldap("B")})},
                        &liar)
-          .lost(),
-      ElementsAre("Accounts[0]"));
+          .losses(),
+      ElementsAre(HasSubstr(": another account with its identifier took its place: its \"")));
+}
+
+TEST(LyingPlugin, AnAccountIsComparedWithTheLastOfThoseThatTookItsPlace) {
+  OtherFates liar([](AccountEvent& event) {
+    event.fate = ToldFate::Overwritten;
+    event.other = {AccountOrigin::Kind::Settings, event.account.number + 1};
+  });
+  const PropertyDictionary refused = with(ldap("A"), kAccountType, "No");
+  EXPECT_THAT(
+      MigratedInMemory({.settings = settings(12, {refused, refused, ldap("A")})}, &liar).losses(),
+      ElementsAre(EndsWith("took its place: its \"Type\" gave way to another value"),
+                  EndsWith("took its place: its \"Type\" gave way to another value")));
+}
+
+TEST(LyingPlugin, AnAccountWhoseParentIsNowhereIsLost) {
+  OtherFates liar([](AccountEvent& event) {
+    event.fate = ToldFate::MovedBelow;
+    event.other = {AccountOrigin::Kind::Settings, 77};
+  });
+  EXPECT_THAT(
+      MigratedInMemory({.settings = settings(12, {with(ldap("A"), kAccountType, "No")})}, &liar)
+          .losses(),
+      ElementsAre(EndsWith("the parent account that it was moved below is gone")));
+}
+
+TEST(LyingPlugin, AValueThatAnAccountGivesToItsParentMustBeThere) {
+  const PropertyDictionary hosted =
+      with(anAccount("A", kVelmoraAccountType, kVelmoraAccountClass),
+           kCalendarsAccountSubscribedCalendars, PropertyArray{"a calendar"});
+  const MigratedInMemory migrated(
+      {.settings = settings(6, {hosted})}, nullptr, [](PropertyArray& accounts) {
+        accounts.replace(0, with(*accounts.at(0).asDictionary(),
+                                 kCalendarsAccountSubscribedCalendars, PropertyArray{"another"}));
+      });
+  EXPECT_THAT(migrated.losses(),
+              ElementsAre(EndsWith("its \"" + std::string(kCalendarsAccountSubscribedCalendars) +
+                                   "\" did not go to the parent account made from it")));
 }
 
 TEST(LyingPlugin, AccountsThatAreSaidToOverwriteEachOtherInACircleAreLost) {
@@ -122,8 +159,9 @@ TEST(LyingPlugin, AccountsThatAreSaidToOverwriteEachOtherInACircleAreLost) {
     event.other = {AccountOrigin::Kind::Settings, 1 - event.account.number};
   });
   const PropertyDictionary refused = with(ldap("A"), kAccountType, "No");
-  EXPECT_THAT(MigratedInMemory({.settings = settings(12, {refused, refused})}, &liar).lost(),
-              ElementsAre("Accounts[0]", "Accounts[1]"));
+  EXPECT_THAT(MigratedInMemory({.settings = settings(12, {refused, refused})}, &liar).losses(),
+              ElementsAre(EndsWith(": another account with its identifier took its place"),
+                          EndsWith(": another account with its identifier took its place")));
 }
 
 TEST(LyingPlugin, AValueThatIsGoneIsALoss) {
@@ -167,6 +205,104 @@ TEST(LyingPlugin, AKeyOfAStepMayDifferOnlyInAccountsOfItsTypeOrClass) {
               ElementsAre("Accounts[0]"));
   EXPECT_THAT(MigratedInMemory({.settings = settings(9, {cloud})}, nullptr, tamper).lost(),
               IsEmpty());
+}
+
+TEST(LyingPlugin, WhatAConversionSetsMayNotDifferWhereNoDescriptionTookAPlace) {
+  OtherOrder liar([&liar](auto& accounts) {
+    liar.listener->accountFared({accounts[0], ToldFate::Overwritten, accounts[1]});
+    accounts[0] = accounts[1];
+  });
+  const MigratedInMemory migrated(
+      {.settings = settings(12, {ldap("A"), ldap("A")})}, &liar, [](PropertyArray& accounts) {
+        accounts.replace(0, with(*accounts.at(0).asDictionary(), kAccountSyncIdentifier, "x"));
+      });
+  EXPECT_THAT(migrated.lost(), ElementsAre("Accounts[0]", "Accounts[1]"));
+}
+
+/// An account or a description, a value that it has in the result, and whether that is a loss.
+struct Tampered {
+  const char* what;
+  DeviceFiles files;
+  std::string_view key;
+  PropertyValue value;
+  bool isLoss;
+};
+
+TEST(LyingPlugin, AKeyThatAConversionSetsMayDifferWhereItDoesAlone) {
+  const auto mail = [](std::string_view accountClass) {
+    return DeviceFiles{
+        .mail = mailStore({with(mailDescription("A", accountClass), kAccountUsername, "jo@x")})};
+  };
+  const DeviceFiles exchange = {.exchange = exchangeStore({exchangeDescription("A")})};
+  for (const Tampered& each : {
+           Tampered{"a hosted account's user name", mail(kVelmoraAccountClass), kAccountUsername,
+                    "jo", false},
+           Tampered{"another one's", mail(kIMAPAccountClass), kAccountUsername, "jo", true},
+           Tampered{"a hosted account's password", mail(kVelmoraAccountClass), "Password", "x",
+                    true},
+           Tampered{"a type's text", mail(kIMAPAccountClass), kAccountTypeString, "x", false},
+           Tampered{"an Exchange account's", exchange, kAccountShortTypeString, "x", false},
+           Tampered{"its password", exchange, "Password", "x", true},
+       }) {
+    const MigratedInMemory migrated(each.files, nullptr, [&](PropertyArray& accounts) {
+      PropertyDictionary account = *accounts.at(0).asDictionary();
+      if (each.files.mail && account.contains(kAccountChildAccounts)) {
+        // A step has put it below a parent.
+        PropertyDictionary child =
+            *account.arrayForKey(kAccountChildAccounts)->at(0).asDictionary();
+        child.set(each.key, each.value);
+        account.set(kAccountChildAccounts, PropertyArray{child});
+      } else {
+        account.set(each.key, each.value);
+      }
+      accounts.replace(0, account);
+    });
+    EXPECT_EQ(!migrated.lost().empty(), each.isLoss) << each.what;
+  }
+}
+
+TEST(LyingPlugin, AKeyOfAChildMayDifferWhereAStepTouchesChildrenAlone) {
+  const PropertyDictionary hosted =
+      with(anAccount("K", kVelmoraAccountType, kVelmoraAccountClass), kAccountDisplayName, "name");
+  const PropertyDictionary other = with(ldap("K"), kAccountDisplayName, "name");
+  const PropertyDictionary nameless = without(hosted, kAccountIdentifier);
+  const auto below = [](const PropertyDictionary& parent, const PropertyDictionary& child) {
+    return DeviceFiles{
+        .settings = settings(7, {with(parent, kAccountChildAccounts, PropertyArray{child})})};
+  };
+  const PropertyDictionary cloud = anAccount("Q", kQuarxAccountType, kCloudAccountClass);
+  for (const Tampered& each : {
+           Tampered{"the name of a hosted child", below(cloud, hosted), kAccountDisplayName, "x",
+                    false},
+           Tampered{"another child's", below(cloud, other), kAccountDisplayName, "x", true},
+           Tampered{"that of another parent's child", below(ldap("P"), hosted), kAccountDisplayName,
+                    "x", true},
+           Tampered{"its identifier", below(cloud, hosted), kAccountIdentifier, "x", true},
+           Tampered{"one that it had not", below(cloud, nameless), kAccountIdentifier, "x", false},
+           Tampered{"another key of that one", below(cloud, nameless), "Hostname", "x", true},
+       }) {
+    const MigratedInMemory migrated(each.files, nullptr, [&](PropertyArray& accounts) {
+      const PropertyDictionary& parent = *accounts.at(0).asDictionary();
+      const PropertyArray children = parent.arrayForKey(kAccountChildAccounts).value();
+      accounts.replace(
+          0, with(parent, kAccountChildAccounts,
+                  PropertyArray{with(*children.at(0).asDictionary(), each.key, each.value)}));
+    });
+    EXPECT_EQ(!migrated.lost().empty(), each.isLoss) << each.what;
+  }
+}
+
+TEST(LyingPlugin, AValueOfAnAccountThatWasMovedMustBeBelowItsParent) {
+  const MigratedInMemory migrated(
+      {.settings = settings(6, {anAccount("A", kVelmoraAccountType, kVelmoraAccountClass)})},
+      nullptr, [](PropertyArray& accounts) {
+        const PropertyDictionary& parent = *accounts.at(0).asDictionary();
+        const PropertyArray children = parent.arrayForKey(kAccountChildAccounts).value();
+        accounts.replace(0,
+                         with(parent, kAccountChildAccounts,
+                              PropertyArray{without(*children.at(0).asDictionary(), "Hostname")}));
+      });
+  EXPECT_THAT(migrated.losses(), ElementsAre(EndsWith(": its \"Hostname\" is gone")));
 }
 
 TEST(LyingPlugin, AChildThatIsGoneIsALoss) {

@@ -1,6 +1,7 @@
 #include "tests/propertylist/PropertyListTesting.h"
 
 #include <bit>
+#include <cctype>
 #include <limits>
 
 namespace accounts::testing {
@@ -54,8 +55,14 @@ PropertyValue nestedArrays(std::size_t depth) {
 }
 
 ::testing::AssertionResult contains(std::string_view text, std::string_view part) {
-  if (text.find(part) != std::string_view::npos) {
-    return ::testing::AssertionSuccess();
+  const auto isOfAWord = [](char each) {
+    return std::isalnum(static_cast<unsigned char>(each)) != 0;
+  };
+  for (std::size_t at = text.find(part); at != text.npos; at = text.find(part, at + 1)) {
+    const std::size_t end = at + part.size();
+    if (end == text.size() || !isOfAWord(part.back()) || !isOfAWord(text[end])) {
+      return ::testing::AssertionSuccess();
+    }
   }
   return ::testing::AssertionFailure() << "\"" << text << "\" does not contain \"" << part << "\"";
 }

@@ -165,7 +165,7 @@ PropertyValue valueOfEveryKindInXML();
 /// An array in an array and so on; `depth` 1 is an empty array alone.
 PropertyValue nestedArrays(std::size_t depth);
 
-/// Passes when the text contains the part; prints both otherwise.
+/// Passes when the text contains the part, and its last word as a whole; prints both otherwise.
 ::testing::AssertionResult contains(std::string_view text, std::string_view part);
 
 }  // namespace accounts::testing

@@ -215,6 +215,16 @@ TEST_F(InterruptedCommitTest, WithASettingsFileThatIsNoPropertyListTheStoreIsCon
   expectStoreCounts(false);
 }
 
+TEST_F(InterruptedCommitTest, TheFileBesideAStoreThatWasCarriedOverGoesWithIt) {
+  snapshot.addFile(DevicePlace::LegacyMailOriginal, "left by an older build");
+  addRecord();
+  Transaction transaction(snapshot, "/var/mobile");
+  static_cast<void>(finishInterruptedCommit(transaction));
+  EXPECT_FALSE(transaction.exists(DevicePlace::LegacyMailOriginal));
+  EXPECT_TRUE(std::holds_alternative<Transaction::AsItWas>(
+      transaction.at(DevicePlace::LegacyExchangeOriginal)));
+}
+
 TEST_F(InterruptedCommitTest, AMalformedRecordVouchesForNothingAndGoes) {
   snapshot.addFile(DevicePlace::CommitRecord, "malformed");
   expectStoreCounts(false);

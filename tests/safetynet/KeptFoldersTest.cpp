@@ -191,6 +191,24 @@ TEST_F(KeptFoldersTest, NoFaultLosesAFileOrLeavesAFolder) {
   }
 }
 
+TEST_F(KeptFoldersTest, AFolderThatHasItsNameButMayLoseItAgainIsRemoved) {
+  device.write(kSettings, "settings");
+  // The name is given, and only the flush after that fails.
+  device.before = [&](const std::string& line) {
+    if (line.starts_with("renameDirectory ")) {
+      device.before = nullptr;
+      device.removeFaults();
+      ASSERT_TRUE(device.renameDirectory(folderPath("Unfinished-" + std::string(kTime)), folder));
+      device.failWhenLineBegins("renameDirectory " + folderPath("Unfinished-"));
+    }
+  };
+  std::string made;
+  device.failWhenLineBegins("renameDirectory " + folderPath("Unfinished-"));
+  EXPECT_FALSE(folders.keep(toKeep(device), KeptFor::Migration, kTime, made).isDone());
+  EXPECT_EQ(made, "");
+  EXPECT_THAT(device.keptNames(), IsEmpty());
+}
+
 TEST_F(KeptFoldersTest, ARunThatIsKilledAnywhereLeavesAWholeFolderOrNone) {
   device.write(kSettings, "settings");
   device.write(kMail, "store");

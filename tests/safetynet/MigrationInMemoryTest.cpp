@@ -126,6 +126,16 @@ TEST_F(MigrationInMemoryTest, AStoreThatIsReadForTheCheckAloneCannotFailUnseen) 
   EXPECT_TRUE(migration.error());
 }
 
+TEST_F(MigrationInMemoryTest, AFileThatIsNoPropertyListIsALoss) {
+  snapshot.addFile(DevicePlace::LegacyMail, "no property list");
+  MigrationInMemory& migration = begin();
+  save(settingsWith(12, {"one"}));
+  migration.verify(PluginResult::GaveTrue, {});
+  EXPECT_THAT(migration.ledger().losses(),
+              testing::Contains(snapshot.pathOf(DevicePlace::LegacyMail) +
+                                " could not be read as a property list"));
+}
+
 TEST_F(MigrationInMemoryTest, ALossIsToldAndTheFilesAreKept) {
   MigrationInMemory& migration = begin();
   save(settingsWith(12, {"one"}));

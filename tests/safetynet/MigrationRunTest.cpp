@@ -145,7 +145,8 @@ TEST_F(MigrationRunTest, AWorkerThatHandsOverRubbishChangesNothing) {
     useWorker([&](const WorkerTask&) { return HandedOver{rubbish, 0}; });
     const RunConclusion conclusion = run();
     EXPECT_EQ(conclusion.exitStatus, ExitStatus::PluginEnded);
-    EXPECT_TRUE(conclusion.error);
+    ASSERT_TRUE(conclusion.error);
+    EXPECT_EQ(conclusion.error->message, "The migration handed over no usable list of changes");
     EXPECT_EQ(device.contents(), before);
   }
 }

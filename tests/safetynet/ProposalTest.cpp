@@ -58,6 +58,19 @@ TEST(ProposalTest, AnInformationDirectoryWithoutAFileHasNoNameOfOne) {
   EXPECT_EQ(sent(proposal), std::nullopt);
 }
 
+TEST(ProposalTest, AnInformationFilesNameHasLettersDigitsHyphensAndDotsAlone) {
+  Proposal proposal;
+  proposal.changes = {{.place = DevicePlace::InformationDirectory, .action = Action::Write}};
+  for (const char each : {'0', '9', 'A', 'Z', 'a', 'z', '-', '.'}) {
+    proposal.informationFileName = "AccountMigrationInformation-" + std::string(1, each) + ".txt";
+    EXPECT_EQ(sent(proposal), proposal) << each;
+  }
+  for (const char each : {'/', ':', '@', '[', '`', '{', ',', '\0', '\xE4'}) {
+    proposal.informationFileName = "AccountMigrationInformation-" + std::string(1, each) + ".txt";
+    EXPECT_EQ(sent(proposal), std::nullopt) << each;
+  }
+}
+
 TEST(ProposalTest, APartOfTheBytesIsNoProposal) {
   const std::string bytes = bytesOf(wholeProposal());
   for (std::size_t size = 0; size < bytes.size(); ++size) {

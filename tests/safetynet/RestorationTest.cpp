@@ -227,6 +227,16 @@ TEST_F(RestorationTest, AnyFailureLeavesTheFolderWholeOrEverythingBack) {
   }
 }
 
+TEST_F(RestorationTest, AFolderThatStaysWhenAllIsBackIsTold) {
+  device.failWhenLineBegins("renameDirectory " + folder);
+  const Restoration restoration = restore();
+  ASSERT_TRUE(restoration.error);
+  EXPECT_EQ(restoration.error->exitStatus, ExitStatus::InputOutputError);
+  EXPECT_THAT(restoration.error->message,
+              HasSubstr("Everything is put back, but the folder cannot be removed: Cannot rename"));
+  EXPECT_EQ(device.at(kSettings), "kept settings");
+}
+
 TEST_F(RestorationTest, AnotherProgramsFileIsNotReplacedUnseen) {
   device.before = [&](const std::string& line) {
     if (line == "put Settings") {

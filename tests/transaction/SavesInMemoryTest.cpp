@@ -56,7 +56,14 @@ TEST_F(SavesInMemoryTest, ASettingsFileThatCannotBeReplacedSaysWhyTheSaveFailed)
 
 TEST_F(SavesInMemoryTest, OnlyWhatIsAboutToBePutInPlaceIsGivenAway) {
   snapshot.addFile(DevicePlace::Settings, "");
-  EXPECT_FALSE(files.setOwnerAndGroup(path(DevicePlace::Settings), "mobile", "mobile"));
+  EXPECT_EQ(
+      files.setOwnerAndGroup(path(DevicePlace::Settings), "mobile", "mobile").error(),
+      "Cannot set the owner of " + path(DevicePlace::Settings) + ": No such file or directory");
+}
+
+TEST_F(SavesInMemoryTest, AListThatIsWrittenToAPlaceAtOnceStandsThere) {
+  ASSERT_TRUE(files.writeFileAtomically(path(DevicePlace::Settings), serialized(kNew)));
+  EXPECT_EQ(transaction.dictionaryAt(DevicePlace::Settings), kNew);
 }
 
 TEST_F(SavesInMemoryTest, AWrittenListStaysTheValueThatItWas) {

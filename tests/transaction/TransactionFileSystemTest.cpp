@@ -120,7 +120,8 @@ TEST_F(TransactionFileSystemTest, ACopyTakesThePlaceOfWhatWasRemoved) {
 
 TEST_F(TransactionFileSystemTest, OnlyTheSettingsFileIsCopied) {
   snapshot.addFile(DevicePlace::LegacyMail, "store");
-  EXPECT_FALSE(files.copyFile(path(DevicePlace::LegacyMail), path(DevicePlace::CopyAside)));
+  EXPECT_EQ(files.copyFile(path(DevicePlace::LegacyMail), path(DevicePlace::CopyAside)).error(),
+            "Cannot copy " + path(DevicePlace::LegacyMail) + ": Operation not supported");
   EXPECT_EQ(changes(), std::vector<std::string>{});
 }
 

@@ -125,6 +125,7 @@ TEST(BinaryScalars, AnUnpairedUTF16UnitIsKeptAndWrittenBackAsItWas) {
       fileWithObject("\x62\xD8\x3D\0\x41"s),          // a high unit before a letter
       fileWithObject("\x61\xD8\x3D"),                 // a high unit at the end
       fileWithObject("\x62\xDE\x00\0\x41"s),          // a low unit
+      fileWithObject("\x62\0\x41\xDE\x00"s),          // a letter before a low unit
       fileWithObject("\x62\xDE\x00\xD8\x3D"s),        // a pair the wrong way round
       fileWithObject("\x63\xD8\x3D\xD8\x3D\xDE\0"s),  // a high unit before a pair
   };

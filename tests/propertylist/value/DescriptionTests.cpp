@@ -46,6 +46,8 @@ TEST(Description, LineBreaksBeyondASCIIAreEscapedToo) {
 
 TEST(Description, MarksThatReorderTheTextAfterThemAreEscaped) {
   EXPECT_EQ(describe("a\u202Ab\u202Ec\u2066d\u2069"), "a\\u202ab\\u202ec\\u2066d\\u2069");
+  const char* const beside = "\u2027\u202F\u2065\u206A";
+  EXPECT_EQ(describe(beside), beside);
 }
 
 TEST(Description, LettersAndSingleMarksOfADirectionStandAsTheyAre) {

@@ -37,6 +37,24 @@ TEST(PropertyKeysSearch, EachKeyIsFoundAtItsIndex) {
   }
 }
 
+TEST(PropertyKeysSearch, ShortKeysStandInTheOrderOfTheirBytes) {
+  std::vector<Text> ordered;
+  for (const std::string_view first : {"", "A", "B", "\x7F", "\xFE"}) {
+    for (const std::string_view second : {"", "\x01", "\x7F", "\x80", "\xFF"}) {
+      for (const std::string_view third : {"", "\x01", "\x80", "\xFF"}) {
+        ordered.emplace_back(std::string(first).append(second).append(third));
+      }
+    }
+  }
+  std::ranges::sort(ordered, {}, [](const Text& each) { return each.string(); });
+  ordered.erase(std::ranges::unique(ordered).begin(), ordered.end());
+  const PropertyKeys keys = keysOf(ordered);
+  for (std::size_t index = 0; index < ordered.size(); ++index) {
+    EXPECT_EQ(keys.find(ordered[index]).index, index);
+    EXPECT_TRUE(keys.find(ordered[index]).isThere);
+  }
+}
+
 TEST(PropertyKeysSearch, AKeyThatIsNotThereHasItsPlaceInTheOrder) {
   const PropertyKeys keys = keysOf({"Account", "Accounts1", "Accounts3", "Type"});
   struct Missing {

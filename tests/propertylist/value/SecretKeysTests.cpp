@@ -24,8 +24,8 @@ constexpr const char* kSecretKeys[] = {
     // Tokens.
     "OAuthToken", "OAuth Token Secret", "access_token", "accessToken", "refresh_token", "id_token",
     "x-csrf-token", "deviceTokens", "jwt", "JWT", "JWTValue", "userJwt", "myjwt", "bearer",
-    "BearerValue", "Authorization", "proxy-authorization", "authCode", "code_verifier",
-    "SAMLResponse",
+    "BearerValue", "Authorization", "AUTHORIZATION", "proxy-authorization", "authCode",
+    "code_verifier", "SAMLResponse",
     // Sessions.
     "SessionID", "sessionId", "session_id", "SESSIONID", "PHPSESSID", "JSESSIONID",
     "sessionIdentifier", "session-key", "cookie", "Cookies", "Set-Cookie", "Session Cookie",
