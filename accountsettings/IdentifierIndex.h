@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "propertylist/value/ContentTable.h"
+#include "propertylist/value/KeyedHash.h"
 #include "propertylist/value/Text.h"
 
 namespace accounts {

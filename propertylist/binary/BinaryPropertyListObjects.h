@@ -8,6 +8,7 @@
 
 #include "propertylist/binary/BinaryPropertyListFormat.h"
 #include "propertylist/value/ContentTable.h"
+#include "propertylist/value/KeyedHash.h"
 #include "propertylist/value/PropertyValue.h"
 
 namespace accounts::binaryplist {

@@ -9,6 +9,7 @@
 #include "propertylist/binary/BinaryPropertyListScalars.h"
 #include "propertylist/value/ContentTable.h"
 #include "propertylist/value/KeyList.h"
+#include "propertylist/value/KeyedHash.h"
 #include "propertylist/value/OrderedValues.h"
 
 namespace accounts {

@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include "propertylist/value/KeyedHash.h"
+
 namespace accounts {
 namespace {
 
