@@ -4,7 +4,10 @@ const kSources = { mailStore: "legacy mail store", exchangeStore: "legacy Exchan
 
 /** Whether the filter shows an account for its own sake, and not for its children's. */
 function isChosen(account) {
-  return (!filter.changedOnly || account.marks.length > 0) && matches(account, () => textsOf(account));
+  const { marks } = account;
+  return (!filter.changedOnly || marks.length > 0) &&
+    (filter.mark === null || (filter.mark === kUnchanged ? isUnchanged(account) : marks.includes(filter.mark))) &&
+    matches(account, () => textsOf(account));
 }
 
 /** What of an account a filter looks through: what is shown of it, its properties' paths included. */

@@ -1,6 +1,7 @@
-// What is shown: the words of the filter, and whether only changes are.
+// What is shown: the words of the filter, whether only changes are, and the one mark of accounts that
+// is looked for.
 
-const filter = { words: [], changedOnly: false };
+const filter = { words: [], changedOnly: false, mark: null };
 
 // The texts that items of the report are searched by, made when they are first asked for.
 const searchTexts = new WeakMap();
@@ -35,7 +36,8 @@ function marked(text) {
 }
 
 /** Takes over what the person entered. */
-function setFilter(text, changedOnly) {
+function setFilter(text, changedOnly, mark = null) {
+  filter.mark = mark;
   filter.words = shown(text).toLowerCase().split(/\s+/).filter((word) => word !== "");
   filter.changedOnly = changedOnly;
 }

@@ -43,8 +43,8 @@ function versionWords({ before, after } = {}) {
 /** How many accounts of the inputs have each mark, and how many of the result are new. */
 function countMarks({ allBefore, allAfter }) {
   const counts = { unchanged: 0, added: allAfter.filter(({ marks }) => marks.includes("added")).length };
-  for (const { marks, entry } of allBefore) {
-    for (const mark of marks.length === 0 && entry !== null ? ["unchanged"] : marks) {
+  for (const account of allBefore) {
+    for (const mark of isUnchanged(account) ? [kUnchanged] : account.marks) {
       counts[mark] = (counts[mark] ?? 0) + 1;
     }
   }
@@ -79,21 +79,26 @@ function notice(kind, heading, texts) {
     make("h2", {}, heading), make("ul", {}, texts.map((text) => make("li", {}, data("span", {}, text)))));
 }
 
+/** A count of accounts, which shows these alone when it is pressed. */
+function chip(mark, count) {
+  return make("button", { type: "button", class: `badge ${mark}`, "data-mark": mark, "aria-pressed": "false" },
+    `${count.toLocaleString("en")} ${kMarkNames[mark] ?? mark}`);
+}
+
 /** The top of the page. */
 function overview(report, accounts) {
   const counts = countMarks(accounts);
   const outcome = outcomeOf(report, counts);
   const sentence = (kSentences[report.command] ?? kSentences.run)[outcome]
     .replace("%", () => shown(versionWords(report.versions)));
-  const marks = Object.keys(kMarks).filter((mark) => counts[mark] > 0);
+  const marks = [...Object.keys(kMarks), kUnchanged].filter((mark) => counts[mark] > 0);
   const kept = report.keptInputs ?? [];
   return [
     make("p", { class: "kind" }, report.command === "plan" ? "Plan of a migration" : "Report of a migration"),
     make("h1", { class: outcome }, make("span", { class: "sign", "aria-hidden": "true" },
       { failed: "✕", unverified: "✕", losses: "!" }[outcome] ?? "✓"), sentence),
-    make("p", { class: "counts" }, marks.map((mark) => [make("span", { class: `badge ${mark}` },
-      `${counts[mark].toLocaleString("en")} ${kMarkNames[mark] ?? mark}`), " "]),
-      counts.unchanged > 0 ? make("span", { class: "badge" }, `${counts.unchanged.toLocaleString("en")} unchanged`) : null),
+    make("p", { class: "counts", role: "group", "aria-label": "Accounts to show" },
+      marks.map((mark) => [chip(mark, counts[mark]), " "])),
     overviewFacts(report),
     notice("error", "Error", report.error ? [report.error] : []),
     notice("warning", "Not carried over", report.ledger?.losses ?? []),

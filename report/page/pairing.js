@@ -96,6 +96,13 @@ function marksAfter({ others, partner }) {
   return others.length === 0 ? ["added"] : partner.marks.filter((each) => !["joined", "lost"].includes(each));
 }
 
+// What chips call the accounts without a mark.
+const kUnchanged = "unchanged";
+
+function isUnchanged({ marks, entry, partner }) {
+  return marks.length === 0 && (entry !== null || partner !== null);
+}
+
 /** Both sides of a report as accounts that know each other; without a ledger nobody knows. */
 function accountsOf(report) {
   const before = (report.accountsBefore ?? []).map((each) => new Account(each, "before", null));

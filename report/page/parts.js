@@ -146,16 +146,6 @@ function foldAll(root) {
   root.querySelectorAll("details[open]").forEach((part) => { part.open = false; });
 }
 
-/** Opens what is folded for as long as the page is printed. */
-function openForPrinting(root) {
-  let opened = [];
-  window.addEventListener("beforeprint", () => { opened = [...openEverything(root)]; });
-  window.addEventListener("afterprint", () => {
-    opened.forEach((part) => { part.open = false; });
-    opened = [];
-  });
-}
-
 /** Builds parts when they are opened, and remembers those that a person opened. */
 function watchParts(root) {
   root.addEventListener("toggle", (event) => {

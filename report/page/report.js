@@ -38,7 +38,10 @@ class Page {
     const { allBefore, allAfter, before, after } = this.accounts;
     const counts = [allBefore, allAfter].map((accounts) => accounts.filter(isChosen).length);
     const stages = this.stages.filter(showsStage).length;
-    const isAll = filter.words.length === 0 && !filter.changedOnly;
+    const isAll = filter.words.length === 0 && !filter.changedOnly && filter.mark === null;
+    for (const chip of document.querySelectorAll(".counts .badge")) {
+      chip.setAttribute("aria-pressed", String(chip.dataset.mark === filter.mark));
+    }
     setMatchCount(counts[0] + counts[1] + stages);
     byId("shown").textContent = isAll ? "" : `Shown: ${stages} of ${counted(this.stages.length, "step")}, ` +
       `${counts[0].toLocaleString("en")} of ${counted(allBefore.length, "account")} before, ` +
@@ -62,16 +65,22 @@ class Page {
 }
 
 function watchFilter(page) {
-  const apply = () => {
-    setFilter(byId("filter").value, byId("changed-only").checked);
+  const apply = (mark = filter.mark) => {
+    setFilter(byId("filter").value, byId("changed-only").checked, mark);
     page.showFiltered();
   };
+  byId("overview").addEventListener("click", ({ target }) => {
+    const mark = target.dataset.mark ?? null;
+    if (mark !== null) {
+      apply(mark === filter.mark ? null : mark);
+    }
+  });
   let typing = null;
   byId("filter").addEventListener("input", () => {
     clearTimeout(typing);
     typing = setTimeout(apply, kTypingMilliseconds);
   });
-  byId("changed-only").addEventListener("change", apply);
+  byId("changed-only").addEventListener("change", () => apply());
   document.addEventListener("keydown", (event) => {
     const isTyping = event.target.closest?.("input, textarea, select");
     if (event.key === "/" && !isTyping && !event.ctrlKey && !event.metaKey && !event.altKey) {
@@ -105,7 +114,6 @@ function start(json) {
   watchParts(content);
   watchPartners(byId("accounts"), page);
   watchFilter(page);
-  openForPrinting(content);
   byId("expand").addEventListener("click", () => expandAll(content));
   byId("fold").addEventListener("click", () => foldAll(content));
 }

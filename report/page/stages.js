@@ -3,15 +3,21 @@
 // What every upgrade step changes, whether it has work or not.
 const kStamp = "Version";
 
-/** Whether a step did more than put its version on what it found. */
+/** Whether nothing but the settings file's next version was written. */
+function isMereWriting(file) {
+  return ["written", "given away"].includes(file.action) && file.error === undefined;
+}
+
+/** Whether a step did more than put its version on what it found, and write that. */
 function changedAnything(stage) {
-  return stage.accounts?.length > 0 || stage.files?.length > 0 ||
+  return stage.accounts?.length > 0 || !(stage.files ?? []).every(isMereWriting) ||
     (stage.otherProperties ?? []).some((property) => property.path !== kStamp);
 }
 
 /** Whether the filter shows a step. */
 function showsStage(stage) {
-  return (!filter.changedOnly || changedAnything(stage) || stage.succeeded === false) && matches(stage);
+  return filter.mark === null && matches(stage) &&
+    (!filter.changedOnly || changedAnything(stage) || stage.succeeded === false);
 }
 
 /** What of a step's list is shown: all of it if the step's own name has the words. */

@@ -120,6 +120,30 @@ TEST(FilterTest, OnlyWhatChangedLeavesChangedAccountsStepsAndProperties) {
   EXPECT_EQ(noted["everything"], json({13, 7, 7}));
 }
 
+TEST(FilterTest, ACountOfAccountsShowsTheseAloneUntilItIsPressedAgain) {
+  const json noted = notedWhileFiltering(R"js(
+    const chip = (words) => all(".counts button").find((each) => each.textContent === words);
+    chip("2 converted").click();
+    note("converted", shownNow());
+    note("pressed", all(".counts [aria-pressed=true]").map((each) => each.textContent));
+    chip("2 unchanged").click();
+    note("unchanged", shownNow());
+    chip("2 unchanged").click();
+    const everything = shownNow();
+    note("everything", [everything.steps, everything.before.length, everything.after.length]);
+    note("pressedAtLast", all(".counts [aria-pressed=true]").length);
+  )js");
+
+  EXPECT_EQ(noted["converted"], json({{"steps", 0},
+                                      {"before", {"IMAPAccount 'Family'", "EASAccount 'Office'"}},
+                                      {"after", {"IMAP 'Family'", "Exchange 'Office'"}}}));
+  EXPECT_EQ(noted["pressed"], json::array({"2 converted"}));
+  EXPECT_EQ(noted["unchanged"]["before"], json({"OnMyDevice 'My Device'", "IMAP 'Work'"}));
+  EXPECT_EQ(noted["unchanged"]["after"], json({"OnMyDevice 'My Device'", "IMAP 'Work'"}));
+  EXPECT_EQ(noted["everything"], json({13, 7, 7}));
+  EXPECT_EQ(noted["pressedAtLast"], 0);
+}
+
 TEST(FilterTest, ASlashGoesToTheFilterAndIsTextWithinIt) {
   const json noted = notedWhileFiltering(R"js(
     press("/");

@@ -13,9 +13,9 @@ class Listener final : public MigrationObserver {
   void stageBegan(std::string_view operation, std::string_view purpose) override {
     heard.push_back(std::string(operation) + ": " + std::string(purpose));
   }
-  void stageEnded(bool succeeded, const std::optional<PropertyDictionary>& settings) override {
+  void stageEnded(bool succeeded, const std::optional<AccountsInMemory>& accounts) override {
     heard.push_back(std::string(succeeded ? "succeeded" : "failed") +
-                    (settings ? " with accounts" : ""));
+                    (accounts ? " with accounts" : ""));
   }
 };
 
@@ -28,7 +28,7 @@ TEST(ToldFatesTest, StagesArePassedOn) {
 
   told.stageBegan("step", "what for");
   told.stageEnded(false, std::nullopt);
-  told.stageEnded(true, PropertyDictionary());
+  told.stageEnded(true, AccountsInMemory());
 
   EXPECT_THAT(listener.heard,
               testing::ElementsAre("step: what for", "failed", "succeeded with accounts"));
