@@ -1,5 +1,8 @@
 #include "accountsettings/AccountCreators.h"
 
+#include <exception>
+#include <new>
+
 #include "accountsettings/BasicAccount.h"
 #include "accountsettings/Log.h"
 #include "accountsettings/Process.h"
@@ -30,6 +33,20 @@ void loadCreatorFramework(std::string_view relativePath, std::string_view operat
                   "Could not load the account creator framework %@. Error %s",
                   {path, loaded.error()});
   }
+}
+
+void failOnException(const std::optional<Text>& className, std::string_view operation,
+                     std::string_view sourceFile) {
+  std::string words = "one without words";
+  try {
+    throw;
+  } catch (const std::bad_alloc&) {
+    throw;
+  } catch (const std::exception& exception) {
+    words = exception.what();
+  } catch (...) {
+  }
+  failAssertion(operation, sourceFile, "The class %@ threw an exception: %@", {className, words});
 }
 
 const AccountClass* creatorClassNamed(std::string_view name) {

@@ -25,6 +25,22 @@ PropertyArray creatorEntriesForType(const std::optional<Text>& type, std::string
 void loadCreatorFramework(std::string_view relativePath, std::string_view operation,
                           std::string_view sourceFile);
 
+/// Ends the process by a fatal assertion that says what a class of a framework threw, in the words
+/// of the exception that is being handled. Want of memory goes on to where it is dealt with.
+[[noreturn]] void failOnException(const std::optional<Text>& className, std::string_view operation,
+                                  std::string_view sourceFile);
+
+/// What a class of a framework answers to a call. An exception never leaves its framework.
+template <class Call>
+auto answerOf(const std::optional<Text>& className, std::string_view operation,
+              std::string_view sourceFile, const Call& call) {
+  try {
+    return call();
+  } catch (...) {
+    failOnException(className, operation, sourceFile);
+  }
+}
+
 /// The class of a creator or notifier that the loaded frameworks, or the system itself, made known
 /// under a name; null for none.
 const AccountClass* creatorClassNamed(std::string_view name);

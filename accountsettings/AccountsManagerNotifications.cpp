@@ -104,7 +104,7 @@ void callNotifiers(const BasicAccount& account, std::string_view dataclass,
        AccountsManager::_notifierClassNamesForAccountType_dataclass(type, dataclass)) {
     const NotifierOperation& notify = notifierClassNamed(name, operation).*notifierOperation;
     if (notify) {
-      notify(identifier, dataclass);
+      answerOf(name, operation, kManagerSourceFile, [&] { notify(identifier, dataclass); });
     }
   }
 }
@@ -230,7 +230,8 @@ void AccountsManager::_sendNotificationsForChangedAccounts() const {
       failAssertion(kSendOperation, kManagerSourceFile,
                     "The class %@ does not answer noteAccountChanges:", {name});
     }
-    notifier.noteAccountChanges(PropertyArray(std::move(changes)));
+    answerOf(name, kSendOperation, kManagerSourceFile,
+             [&] { notifier.noteAccountChanges(PropertyArray(std::move(changes))); });
   }
 }
 

@@ -93,21 +93,27 @@ FullAccountReference BasicAccount::fullAccountUsingLoader(FullAccountLoader* loa
     failAssertion(kFullAccountOperation, kAccountSourceFile,
                   "The framework/bundle where %@ is defined has not been loaded", {className});
   }
-  FullAccountReference account;
-  if (creator->classForAccountType) {
-    const AccountClass* accountClass = creator->classForAccountType(*accountType);
-    if (accountClass != nullptr && accountClass->initWithProperties) {
-      account = accountClass->initWithProperties(properties());
-    }
-  } else if (creator->accountWithBasicAccount) {
-    account = creator->accountWithBasicAccount(shared_from_this());
-  }
+  const FullAccountReference account =
+      answerOf(className, kFullAccountOperation, kAccountSourceFile, [&] {
+        FullAccountReference made;
+        if (creator->classForAccountType) {
+          const AccountClass* accountClass = creator->classForAccountType(*accountType);
+          if (accountClass != nullptr && accountClass->initWithProperties) {
+            made = accountClass->initWithProperties(properties());
+          }
+        } else if (creator->accountWithBasicAccount) {
+          made = creator->accountWithBasicAccount(shared_from_this());
+        }
+        if (made != nullptr) {
+          made->setParentAccount(_parentAccount);
+        }
+        return made;
+      });
   if (account == nullptr) {
     failAssertion(kFullAccountOperation, kAccountSourceFile,
                   "Could not create the account with class %@ and id %@",
                   {className, identifier()});
   }
-  account->setParentAccount(_parentAccount);
   setFullAccount(account);
   return _fullAccount;
 }
@@ -134,7 +140,9 @@ SyncAccountReference BasicAccount::_cachedSyncAccount() {
   }
   // A failed attempt is not remembered: the next call tries again.
   if (creator->accountToRefreshForBasicAccount) {
-    _syncAccount = creator->accountToRefreshForBasicAccount(shared_from_this());
+    _syncAccount = answerOf(className, kSyncAccountOperation, kAccountSourceFile, [&] {
+      return creator->accountToRefreshForBasicAccount(shared_from_this());
+    });
   }
   if (_syncAccount == nullptr) {
     logToChannel(kSyncAccountOperation,
@@ -144,29 +152,53 @@ SyncAccountReference BasicAccount::_cachedSyncAccount() {
   return _syncAccount;
 }
 
+namespace {
+
+/// What the sync account of a record answers to a refresh; none without one.
+template <class Call>
+std::optional<PropertyValue> refreshed(BasicAccount& record, std::string_view operation,
+                                       const Call& call) {
+  const SyncAccountReference account = record._cachedSyncAccount();
+  if (account == nullptr) {
+    return std::nullopt;
+  }
+  try {
+    return call(*account);
+  } catch (...) {
+    failOnException(record.syncAccountCreatorClassNameForAccountType(record.type()), operation,
+                    kAccountSourceFile);
+  }
+}
+
+}  // namespace
+
 std::optional<PropertyValue>
 BasicAccount::refreshContainerWithIdentifier_forDataclass_isUserRequested(
     std::string_view identifier, std::string_view dataclass, bool isUserRequested) {
-  const SyncAccountReference account = _cachedSyncAccount();
-  return account != nullptr ? account->refreshContainerWithIdentifier_forDataclass_isUserRequested(
-                                  identifier, dataclass, isUserRequested)
-                            : std::nullopt;
+  return refreshed(*this,
+                   "-[BasicAccount refreshContainerWithIdentifier:forDataclass:isUserRequested:]",
+                   [&](SyncAccount& account) {
+                     return account.refreshContainerWithIdentifier_forDataclass_isUserRequested(
+                         identifier, dataclass, isUserRequested);
+                   });
 }
 
 std::optional<PropertyValue> BasicAccount::refreshContainerListForDataclass_isUserRequested(
     std::string_view dataclass, bool isUserRequested) {
-  const SyncAccountReference account = _cachedSyncAccount();
-  return account != nullptr
-             ? account->refreshContainerListForDataclass_isUserRequested(dataclass, isUserRequested)
-             : std::nullopt;
+  return refreshed(*this, "-[BasicAccount refreshContainerListForDataclass:isUserRequested:]",
+                   [&](SyncAccount& account) {
+                     return account.refreshContainerListForDataclass_isUserRequested(
+                         dataclass, isUserRequested);
+                   });
 }
 
 std::optional<PropertyValue> BasicAccount::refreshContainersForDataclass_isUserRequested(
     std::string_view dataclass, bool isUserRequested) {
-  const SyncAccountReference account = _cachedSyncAccount();
-  return account != nullptr
-             ? account->refreshContainersForDataclass_isUserRequested(dataclass, isUserRequested)
-             : std::nullopt;
+  return refreshed(*this, "-[BasicAccount refreshContainersForDataclass:isUserRequested:]",
+                   [&](SyncAccount& account) {
+                     return account.refreshContainersForDataclass_isUserRequested(dataclass,
+                                                                                  isUserRequested);
+                   });
 }
 
 std::optional<PropertyValue> BasicAccount::refreshContainerWithIdentifier_forDataclass(

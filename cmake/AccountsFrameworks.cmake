@@ -1,6 +1,6 @@
 # add_accounts_framework(NAME SOURCE...) builds a framework as a device holds it, in
 # build directory/frameworks/NAME.framework/NAME.so. Of its own code it exports
-# RegisterClasses and nothing else.
+# RegisterClasses and the version of the interface, nothing else.
 function(add_accounts_framework name)
   add_library(${name} MODULE ${ARGN})
   set_target_properties(${name} PROPERTIES

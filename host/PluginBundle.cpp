@@ -6,6 +6,8 @@
 #include <string>
 #include <system_error>
 
+#include "platform/linux/LoadedInterface.h"
+
 namespace accounts {
 namespace {
 
@@ -59,6 +61,9 @@ std::variant<LoadedPlugin, ProgramError> PluginBundle::load() const {
   if (entryPoint == nullptr) {
     return missing("The plug-in has no entry point " + std::string(kEntryPointName) + ": " +
                    plugin().string());
+  }
+  if (const auto otherVersion = whyOtherInterface(library)) {
+    return missing("The plug-in cannot be used: " + plugin().string() + ": " + *otherVersion);
   }
   return LoadedPlugin(*entryPoint);
 }

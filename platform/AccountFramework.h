@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstdint>
 #include <functional>
 #include <memory>
 #include <optional>
@@ -9,6 +10,12 @@
 #include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
+
+/// The version of what frameworks and the bundle share with a program that loads them: all headers
+/// of platform/ and of the values. To be raised when one of them changes its layout.
+inline constexpr std::uint32_t kInterfaceVersion = 1;
+/// The name under which what is loaded tells the version that it was built with.
+inline constexpr const char* kInterfaceVersionFunction = "AccountsInterfaceVersion";
 
 /// What a framework sees of an account: its record in the store.
 class AccountRecord {
@@ -92,7 +99,7 @@ class ClassRegistry {
  public:
   virtual ~ClassRegistry() = default;
 
-  /// Makes a class known. A class that is known under the name already is replaced.
+  /// Makes a class known. Of two frameworks that bring a class of one name the first has it.
   virtual void registerClass(std::string name, AccountClass accountClass) = 0;
   /// The class of a name, null for none; valid as long as the process lives.
   [[nodiscard]] virtual const AccountClass* classNamed(std::string_view name) const = 0;
@@ -104,4 +111,9 @@ extern "C" {
 /// What every framework exports: called once, when the framework was loaded, to make its classes
 /// known.
 [[gnu::visibility("default")]] void RegisterClasses(accounts::ClassRegistry& registry);
+
+/// In whatever is built with this header, for a program that loads it.
+[[gnu::used, gnu::visibility("default")]] inline std::uint32_t AccountsInterfaceVersion() {
+  return accounts::kInterfaceVersion;
+}
 }

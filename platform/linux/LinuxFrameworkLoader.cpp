@@ -1,8 +1,14 @@
 #include "platform/linux/LinuxFrameworkLoader.h"
 
 #include <dlfcn.h>
+#include <sys/stat.h>
 
-#include <utility>
+#include <cerrno>
+#include <exception>
+#include <new>
+
+#include "platform/linux/LoadedInterface.h"
+#include "propertylist/value/Description.h"
 
 namespace accounts {
 
@@ -10,16 +16,35 @@ namespace {
 
 constexpr const char* kEntryPoint = "RegisterClasses";
 
+/// Calls a framework's entry point.
+Result registerClassesOf(void* entryPoint, ClassRegistry& registry) {
+  try {
+    reinterpret_cast<decltype(&RegisterClasses)>(entryPoint)(registry);
+    return Result::success();
+  } catch (const std::bad_alloc&) {
+    throw;
+  } catch (const std::exception& exception) {
+    return Result::failure(std::string("It threw an exception: ") + exception.what());
+  } catch (...) {
+    return Result::failure("It threw an exception without words");
+  }
+}
+
 }  // namespace
 
 Result LinuxFrameworkLoader::loadFramework(std::string_view path) {
-  if (loaded_.contains(path)) {
-    return Result::success();
-  }
   PathError error;
   std::optional<FileDescriptor> file = root_.openRegularFile(path, error);
   if (!file) {
     return Result::failure(error.text);
+  }
+  struct stat status = {};
+  if (::fstat(file->number(), &status) != 0) {
+    return Result::failure(pathError("look at", path, errno).text);
+  }
+  const std::pair identity(status.st_dev, status.st_ino);
+  if (loaded_.contains(identity)) {
+    return Result::success();
   }
   // Loaded through its descriptor: a path would be looked up again, and could then lead out of the
   // root.
@@ -37,18 +62,32 @@ Result LinuxFrameworkLoader::loadFramework(std::string_view path) {
     dlclose(library);
     return missing;
   }
-  loaded_.emplace(path);
-  reinterpret_cast<decltype(&RegisterClasses)>(entryPoint)(*this);
-  return Result::success();
+  if (const auto otherVersion = whyOtherInterface(library)) {
+    dlclose(library);
+    return Result::failure(*otherVersion);
+  }
+  loaded_.insert(identity);
+  registering_ = path;
+  const Result registered = registerClassesOf(entryPoint, *this);
+  registering_.clear();
+  return registered;
 }
 
 void LinuxFrameworkLoader::registerClass(std::string name, AccountClass accountClass) {
-  classes_.insert_or_assign(std::move(name), std::move(accountClass));
+  const auto known = classes_.find(name);
+  if (known == classes_.end() || registering_.empty()) {
+    classes_.insert_or_assign(std::move(name), Registered{std::move(accountClass), registering_});
+    return;
+  }
+  const std::string& first = known->second.framework;
+  log_.writeLine(escapedText("The class " + name + " of the framework " + registering_ +
+                             " is not taken: " + (first.empty() ? "the system" : first) +
+                             " has one of that name"));
 }
 
 const AccountClass* LinuxFrameworkLoader::classNamed(std::string_view name) const {
   const auto place = classes_.find(name);
-  return place != classes_.end() ? &place->second : nullptr;
+  return place != classes_.end() ? &place->second.accountClass : nullptr;
 }
 
 }  // namespace accounts

@@ -1,10 +1,14 @@
 #pragma once
 
+#include <sys/types.h>
+
 #include <map>
 #include <set>
 #include <string>
 #include <string_view>
+#include <utility>
 
+#include "platform/ConsoleLog.h"
 #include "platform/FrameworkLoader.h"
 #include "platform/linux/DeviceRoot.h"
 
@@ -14,7 +18,8 @@ namespace accounts {
 /// process lives, since their classes do.
 class LinuxFrameworkLoader : public FrameworkLoader, private ClassRegistry {
  public:
-  explicit LinuxFrameworkLoader(const DeviceRoot& root) : root_(root) {}
+  /// The log gets a line for a class that two frameworks bring.
+  LinuxFrameworkLoader(const DeviceRoot& root, ConsoleLog& log) : root_(root), log_(log) {}
 
   Result loadFramework(std::string_view path) override;
   ClassRegistry& classes() override { return *this; }
@@ -23,10 +28,19 @@ class LinuxFrameworkLoader : public FrameworkLoader, private ClassRegistry {
   void registerClass(std::string name, AccountClass accountClass) override;
   [[nodiscard]] const AccountClass* classNamed(std::string_view name) const override;
 
+  struct Registered {
+    AccountClass accountClass;
+    /// The framework that brought it; empty for the system itself.
+    std::string framework;
+  };
+
   const DeviceRoot& root_;
-  /// The device paths of the loaded frameworks.
-  std::set<std::string, std::less<>> loaded_;
-  std::map<std::string, AccountClass, std::less<>> classes_;
+  ConsoleLog& log_;
+  /// Devices and inodes of the loaded frameworks, whatever names led to them.
+  std::set<std::pair<dev_t, ino_t>> loaded_;
+  std::map<std::string, Registered, std::less<>> classes_;
+  /// The framework that registers its classes.
+  std::string registering_;
 };
 
 }  // namespace accounts

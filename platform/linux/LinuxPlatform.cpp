@@ -43,6 +43,10 @@ bool fail(LinuxPlatformError& error, Kind kind, std::string text) {
 
 bool fail(LinuxPlatformError& error, Kind kind, const PathError& reason) {
   error = {.kind = kind, .failure = failureKind(reason.number), .text = reason.text};
+  if (reason.number == EIO) {
+    error.kind = Kind::InputOutput;
+    error.failure = FailureKind::Lasting;
+  }
   return false;
 }
 
@@ -109,7 +113,7 @@ struct LinuxPlatform::Parts {
         fileSystem(root, options.temporaryDirectory.value_or(
                              joinedPath(options.homeDirectory, kTemporaryDirectoryInHome))),
         propertyLists(root),
-        frameworkLoader(root),
+        frameworkLoader(root, consoleLog),
         homeDirectory(options.homeDirectory),
         mailDirectory(homeDirectory),
         preferenceDomain(propertyLists, homeDirectory),
@@ -130,6 +134,7 @@ struct LinuxPlatform::Parts {
   BundleFiles bundleFiles;
   LinuxFileSystem fileSystem;
   LinuxPropertyLists propertyLists;
+  LinuxConsoleLog consoleLog;
   LinuxFrameworkLoader frameworkLoader;
   LinuxHomeDirectory homeDirectory;
   LinuxMailDirectory mailDirectory;
@@ -137,7 +142,6 @@ struct LinuxPlatform::Parts {
   LinuxSharedResources sharedResources;
   LinuxBundleResources bundleResources;
   LinuxLocalizedStrings localizedStrings;
-  LinuxConsoleLog consoleLog;
   const OpenedLog log;
   const bool logsToJournal;
   LinuxDateFormatter dateFormatter;

@@ -1,5 +1,7 @@
 #include "tests/accountsettings/CreatorsFixture.h"
 
+#include <stdexcept>
+
 // A broken account-creation map is a programming error: it ends the process, and its text tells the
 // engineer where to look.
 
@@ -104,6 +106,74 @@ TEST_F(CreatorAssertionsDeathTest, AClassOfFullAccountsThatMakesNone) {
   creator.classForAccountType = [&](std::string_view) { return &classWithoutOperations; };
   frameworkLoader.registerClass("Creator", creator);
   expectDeathOfFullAccount("Could not create the account with class Creator and id A\n");
+}
+
+/// A sync account that throws whatever it is asked.
+struct ThrowingSyncAccount : SyncAccount {
+  [[noreturn]] static std::optional<PropertyValue> fail() {
+    throw std::runtime_error("no\nserver");
+  }
+
+  std::optional<PropertyValue> refreshContainerWithIdentifier_forDataclass_isUserRequested(
+      std::string_view, std::string_view, bool) override {
+    fail();
+  }
+  std::optional<PropertyValue> refreshContainerListForDataclass_isUserRequested(std::string_view,
+                                                                                bool) override {
+    fail();
+  }
+  std::optional<PropertyValue> refreshContainersForDataclass_isUserRequested(std::string_view,
+                                                                             bool) override {
+    fail();
+  }
+};
+
+struct ThrowingFullAccount : FullAccount {
+  void setParentAccount(AccountRecordReference) override { throw 7; }
+};
+
+TEST_F(CreatorAssertionsDeathTest, AClassThatThrowsWhileItMakesAnAccount) {
+  setCreators({{"Mail", PropertyArray{fullAccountCreator("Mail.so", "Creator"),
+                                      syncAccountCreator("Mail.so", "Creator")}}});
+  AccountClass creator;
+  creator.accountWithBasicAccount = [](const AccountRecordReference&) -> FullAccountReference {
+    throw std::runtime_error("no\nserver");
+  };
+  creator.accountToRefreshForBasicAccount =
+      [](const AccountRecordReference&) -> SyncAccountReference {
+    throw std::runtime_error("no\nserver");
+  };
+  frameworkLoader.registerClass("Creator", creator);
+  expectDeathOfFullAccount(
+      "-[BasicAccount fullAccountUsingLoader:], BasicAccount: The class Creator threw an "
+      "exception: no\\nserver\n");
+  const BasicAccountReference record = account("A", kMailAccountType);
+  EXPECT_EXIT(static_cast<void>(record->_cachedSyncAccount()), testing::KilledBySignal(SIGABRT),
+              testing::HasSubstr("The class Creator threw an exception: no\\nserver\n"));
+
+  creator.classForAccountType = [](std::string_view) -> const AccountClass* { throw 7; };
+  frameworkLoader.registerClass("Creator", creator);
+  expectDeathOfFullAccount("The class Creator threw an exception: one without words\n");
+}
+
+TEST_F(CreatorAssertionsDeathTest, AnAccountThatThrowsWhenItIsAsked) {
+  setCreators({{"Mail", PropertyArray{fullAccountCreator("Mail.so", "Creator"),
+                                      syncAccountCreator("Mail.so", "Creator")}}});
+  AccountClass creator;
+  creator.accountWithBasicAccount = [](const AccountRecordReference&) {
+    return std::make_shared<ThrowingFullAccount>();
+  };
+  creator.accountToRefreshForBasicAccount = [](const AccountRecordReference&) {
+    return std::make_shared<ThrowingSyncAccount>();
+  };
+  frameworkLoader.registerClass("Creator", creator);
+  expectDeathOfFullAccount("The class Creator threw an exception: one without words\n");
+  const BasicAccountReference record = account("A", kMailAccountType);
+  const auto dies = testing::KilledBySignal(SIGABRT);
+  const auto says = testing::HasSubstr("The class Creator threw an exception: no\\nserver\n");
+  EXPECT_EXIT(record->refreshContainersForDataclass("Mail"), dies, says);
+  EXPECT_EXIT(record->refreshContainerListForDataclass("Mail"), dies, says);
+  EXPECT_EXIT(record->refreshContainerWithIdentifier_forDataclass("A", "Mail"), dies, says);
 }
 
 }  // namespace

@@ -1,6 +1,7 @@
 #include <fstream>
 
 #include "platform/linux/DeviceRoot.h"
+#include "platform/linux/LinuxConsoleLog.h"
 #include "platform/linux/LinuxFrameworkLoader.h"
 #include "tests/packaging/InstalledPackages.h"
 
@@ -36,7 +37,8 @@ TEST_F(DevelopmentFiles, AreAllThatTheSmallestFrameworkIsBuiltFrom) {
   PathError error;
   const auto device = DeviceRoot::openRoot((build() / "frameworks").string(), error);
   ASSERT_TRUE(device) << error.text;
-  LinuxFrameworkLoader loader(*device);
+  LinuxConsoleLog log;
+  LinuxFrameworkLoader loader(*device, log);
   const Result loaded =
       loader.loadFramework("/DeviceAndCloudAccounts.framework/DeviceAndCloudAccounts.so");
   ASSERT_TRUE(loaded) << loaded.error();

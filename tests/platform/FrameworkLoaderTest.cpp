@@ -22,7 +22,14 @@ class FrameworkLoaderTest : public DeviceFixture {
   }
 
   DeviceRoot root_ = openImage();
-  LinuxFrameworkLoader loader_{root_};
+  /// The lines that the loader wrote.
+  struct Log : ConsoleLog {
+    std::vector<std::string> lines;
+    void writeLine(std::string_view line) override { lines.emplace_back(line); }
+  };
+
+  Log log_;
+  LinuxFrameworkLoader loader_{root_, log_};
 };
 
 TEST_F(FrameworkLoaderTest, AFrameworkMakesItsClassesKnown) {
@@ -60,17 +67,47 @@ TEST_F(FrameworkLoaderTest, SeveralFrameworksStayLoadedSideBySide) {
   EXPECT_NE(loader_.classes().classNamed("CloudFullAccount"), nullptr);
 }
 
-TEST_F(FrameworkLoaderTest, AFrameworkThatIsLoadedIsNotRegisteredAgain) {
+TEST_F(FrameworkLoaderTest, AFrameworkIsRegisteredOnceWhateverNameLeadsToIt) {
   installExample("MailAccounts", "/Library/Mail.so");
+  makeLink("/Library/Link.so", "Mail.so");
+  std::filesystem::create_hard_link(onHost("/Library/Mail.so"), onHost("/Library/Other.so"));
   ASSERT_TRUE(loader_.loadFramework("/Library/Mail.so"));
   const AccountClass* before = loader_.classes().classNamed("MailAccountNotifier");
-  loader_.classes().registerClass("MailFullAccount", AccountClass());
 
-  ASSERT_TRUE(loader_.loadFramework("/Library/Mail.so"));
+  for (const char* const name : {"/Library/Mail.so", "/Library/../Library/Mail.so",
+                                 "/Library/Link.so", "/Library/Other.so"}) {
+    ASSERT_TRUE(loader_.loadFramework(name)) << name;
+  }
 
   EXPECT_EQ(loader_.classes().classNamed("MailAccountNotifier"), before);
-  EXPECT_FALSE(loader_.classes().classNamed("MailFullAccount")->classForAccountType)
-      << "a second registration would have replaced it";
+  EXPECT_TRUE(log_.lines.empty()) << "a second registration would have found the first";
+}
+
+TEST_F(FrameworkLoaderTest, OfTwoFrameworksWithAClassOfOneNameTheFirstHasIt) {
+  installExample("MailAccounts", "/Library/Mail.so");
+  installBroken("Throwing", "/Library/Other\n.so");
+  ASSERT_TRUE(loader_.loadFramework("/Library/Mail.so"));
+  ASSERT_TRUE(loader_.classes().classNamed("MailAccountNotifier")->accountDidChange_forDataclass);
+
+  ASSERT_TRUE(loader_.loadFramework("/Library/Other\n.so"));
+
+  EXPECT_TRUE(loader_.classes().classNamed("MailAccountNotifier")->accountDidChange_forDataclass)
+      << "the other framework's class does not answer it";
+  EXPECT_EQ(log_.lines,
+            std::vector<std::string>{
+                "The class MailAccountNotifier of the framework /Library/Other\\n.so is "
+                "not taken: /Library/Mail.so has one of that name"});
+}
+
+TEST_F(FrameworkLoaderTest, AFrameworkOfOtherHeadersIsAFailureThatSaysSo) {
+  installBroken("OfOtherHeaders", "/Library/Other.so");
+  installBroken("OfNoVersion", "/Library/Old.so");
+
+  EXPECT_EQ(loader_.loadFramework("/Library/Other.so").error(),
+            "It was built against other headers: its interface has version 999, which is 1 here");
+  EXPECT_EQ(loader_.loadFramework("/Library/Old.so").error(),
+            "It was built against other headers: it names no version of its interface, which is 1 "
+            "here");
 }
 
 TEST_F(FrameworkLoaderTest, AnUnknownClassIsNone) {

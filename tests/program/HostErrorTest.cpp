@@ -138,6 +138,12 @@ TEST_F(HostError, APluginWithoutAnEntryPointCannotBeLoaded) {
   expectUntouched({"--plugin", EMPTY_BUNDLE}, kMissingInput, "CreateMigrationPlugin");
 }
 
+TEST_F(HostError, APluginOfOtherHeadersIsNotCalled) {
+  expectUntouched({"--plugin", OTHER_HEADERS_BUNDLE}, kMissingInput,
+                  "AccountsDataMigrator.so: It was built against other headers: its interface has "
+                  "version 999, which is 1 here");
+}
+
 TEST_F(HostError, AChannelThatCannotBeCreatedIsNamed) {
   expectUntouched({"--channel", onThisMachine("/missing/channel.log").string()}, kCannotCreate,
                   "channel.log");

@@ -1,3 +1,4 @@
+#include <csignal>
 #include <filesystem>
 
 #include "tests/program/HostileRootFixture.h"
@@ -66,6 +67,61 @@ TEST_P(HostileLibrary, IsLoadedOnlyIfItIsTheDevicesOwnFile) {
 TEST_P(HostileFrameworkDirectory, HoldsNothingToLoadUnlessItIsTheDevicesOwn) {
   EXPECT_EQ(isNotified(), GetParam().finding == Finding::Usable);
   expectNothingCrossedTheBorder();
+}
+
+/// A framework of the device's own that throws.
+class ThrowingFramework : public HostileRootFixture {
+ protected:
+  ThrowingFramework() {
+    std::filesystem::create_directories(onThisMachine(kFrameworks).parent_path());
+    std::filesystem::copy(EXAMPLE_FRAMEWORKS_DIRECTORY, onThisMachine(kFrameworks),
+                          std::filesystem::copy_options::recursive);
+    std::filesystem::copy_file(THROWING_FRAMEWORK, onThisMachine(kLibrary),
+                               std::filesystem::copy_options::overwrite_existing);
+    write(kSettingsPath,
+          accountSettings(12, {PropertyDictionary{{"Type", "Yahoo"},
+                                                  {"Class", "YahooAccount"},
+                                                  {"Identifier", "YAHOO"},
+                                                  {"Enabled Dataclasses",
+                                                   PropertyArray{"com.quarx.Dataclass.Mail"}}}}));
+  }
+
+  [[nodiscard]] ProgramResult notifyWhereItThrows(const std::string& when) const {
+    return runProgram({.program = NOTIFY_PROGRAM,
+                       .arguments = {"--root", root(), "--bundle", pluginBundle()},
+                       .environment = {{"THROWS_WHILE", when}}});
+  }
+
+  static void expectEnded(const ProgramResult& result, const std::string& text) {
+    EXPECT_EQ(result.exitStatus, -SIGABRT);
+    ASSERT_EQ(result.errorLines().size(), 1U) << result.errors;
+    EXPECT_TRUE(result.errorLines().front().starts_with("*** Assertion failure in "))
+        << result.errors;
+    EXPECT_TRUE(result.errorLines().front().ends_with(text)) << result.errors;
+  }
+};
+
+TEST_F(ThrowingFramework, WhileItRegistersEndsTheProcessWithItsWords) {
+  expectEnded(notifyWhereItThrows("registering"),
+              ": Could not load the account creator framework " + std::string(kLibrary) +
+                  ". Error It threw an exception: no\\nservice");
+}
+
+TEST_F(ThrowingFramework, WhileItIsNotifiedEndsTheProcessWithItsWords) {
+  const std::string words = ": The class MailAccountNotifier threw an exception: ";
+  expectEnded(notifyWhereItThrows("announced"), words + "no\\nservice");
+  expectEnded(notifyWhereItThrows("notified"), words + "no\\nservice");
+}
+
+TEST_F(ThrowingFramework, SomethingThatHasNoWordsEndsTheProcess) {
+  expectEnded(notifyWhereItThrows("without words"),
+              ": Could not load the account creator framework " + std::string(kLibrary) +
+                  ". Error It threw an exception without words");
+}
+
+TEST_F(ThrowingFramework, ThatDoesNotThrowIsNotified) {
+  const ProgramResult result = notifyWhereItThrows("");
+  EXPECT_EQ(result.exitStatus, 0) << result.errors;
 }
 
 std::string nameOfKind(const testing::TestParamInfo<HostileKind>& information) {
