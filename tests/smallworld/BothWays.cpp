@@ -37,6 +37,9 @@ struct Services : FakePlatform {
     if (device.runsOneProgram) {
       deviceInfoService.answers.insert_or_assign("CPUArchitecture", "armv6");
     }
+    if (device.usesGoogleMail) {
+      deviceInfoService.answers.insert_or_assign("RegionalBehaviorGoogleMail", true);
+    }
     for (const SyncDataType each : {SyncDataType::Bookmarks, SyncDataType::Calendars,
                                     SyncDataType::Contacts, SyncDataType::Notes}) {
       externalSyncSources.answers[each] = device.syncSources;

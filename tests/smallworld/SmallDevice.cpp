@@ -77,10 +77,10 @@ PropertyDictionary principalPath(std::string_view path) {
 
 /// Nothing, and then every key that a rule reads: absent, of the right kind, of a wrong one.
 const std::vector<Deviation>& deviations() {
-  static const PropertyArray all = {kAccountDataclassMail,      kAccountDataclassCalendars,
-                                    kAccountDataclassReminders, kAccountDataclassBookmarks,
-                                    kAccountDataclassNotes,     kAccountDataclassUbiquity,
-                                    kAccountDataclassKeyValue,  kAccountDataclassShoebox};
+  static const PropertyArray all = {
+      kAccountDataclassMail,      kAccountDataclassCalendars, kAccountDataclassReminders,
+      kAccountDataclassBookmarks, kAccountDataclassNotes,     kAccountDataclassUbiquity,
+      kAccountDataclassKeyValue,  kAccountDataclassShoebox,   kAccountDataclassDeviceLocator};
   static const PropertyDictionary child = {{kAccountIdentifier, "child"},
                                            {kAccountType, kVelmoraAccountType},
                                            {kAccountClass, kVelmoraAccountClass},
@@ -113,6 +113,7 @@ const std::vector<Deviation>& deviations() {
       {kAccountEnabledDataclasses, PropertyArray()},
       {kAccountEnabledDataclasses, PropertyArray{"com.quarx.Dataclass.Unheard", 7}},
       {kAccountEnabledDataclasses, PropertyArray{kAccountDataclassNotes}},
+      {kAccountEnabledDataclasses, PropertyArray{kAccountDataclassKeyValue}},
       {kAccountEnabledDataclasses, all},
       {kAccountEnabledDataclasses, "none"},
       {kAccountProvisionedDataclasses, PropertyArray()},
@@ -283,8 +284,8 @@ SmallDevice mailAndCalendars(const Digits& d) {
   return device;
 }
 
-/// A root that is no dictionary, an empty one, and a list that is none.
-constexpr std::size_t kOddStores = 4;
+/// A root that is no dictionary, an empty one, a list that is none, and lists of what is none.
+constexpr std::size_t kOddStores = 5;
 PropertyValue oddStore(std::size_t which, std::string_view list) {
   switch (which) {
     case 0:
@@ -293,6 +294,8 @@ PropertyValue oddStore(std::size_t which, std::string_view list) {
       return PropertyDictionary();
     case 2:
       return PropertyDictionary{{list, "no list"}};
+    case 3:
+      return PropertyDictionary{{kLegacyOutgoingAccounts, PropertyArray{7}}};
     default:
       return PropertyDictionary{{list, PropertyArray{7}}};
   }
@@ -316,6 +319,7 @@ const std::vector<Deviation>& descriptionDeviations() {
       {kLegacyExchangeIdentifier, "one"},
       {kLegacyExchangeClass, {}},
       {kLegacyExchangeSwitches[0], false},
+      {kLegacyExchangeSwitches[1], true},
       {kLegacyExchangeSwitches[2], "no"},
   };
   return list;
@@ -393,6 +397,7 @@ SmallDevice bothStores(const Digits& d) {
       put(device, place, "left by another program");
     }
   }
+  device.usesGoogleMail = d[3] > 0;
   if (d[4] > 0) {
     device.files[DevicePlace::RemovalSentinel] = kRemovalSentinelContents;
     device.description += "an interrupted removal\n";
@@ -406,8 +411,9 @@ SmallDevice services(const Digits& d) {
       oneAccount(d[0], account(d[5] == 0 ? "one" : kDeviceLocalAccountClass, kKinds[d[1]]));
   device.runsOneProgram = d[2] > 0;
   device.savesInformation = d[3] > 0;
-  const std::array<ExternalSyncSourcesAnswer, 5> answers = {{
+  const std::array<ExternalSyncSourcesAnswer, 6> answers = {{
       {},
+      {{}, ""},
       {PropertyArray(), {}},
       {PropertyArray{"a source"}, {}},
       {PropertyArray{"a source", "DenyTethered"}, {}},
@@ -434,7 +440,7 @@ const std::vector<Part>& parts() {
       {{kSettingsBesideStores, kinds, specialDescriptions, 2}, mailStore},
       {{kSettingsBesideStores, specialDescriptions}, exchangeStore},
       {{kSettingsBesideStores, oddDescriptions, oddDescriptions, 2, 2}, bothStores},
-      {{kVersions, kinds, 2, 2, 5, 2}, services},
+      {{kVersions, kinds, 2, 2, 6, 2}, services},
   };
   return list;
 }

@@ -19,6 +19,8 @@ struct SmallDevice {
   /// A processor that runs one program at a time.
   bool runsOneProgram = false;
   bool savesInformation = false;
+  /// A region where a mail service has another name.
+  bool usesGoogleMail = false;
   /// The answer for each kind of data.
   ExternalSyncSourcesAnswer syncSources = {};
 };

@@ -172,5 +172,9 @@ TEST(SecretKeys, KeysInOtherScriptsAreNoWords) {
   }
 }
 
+TEST(SecretKeys, WhatStandsBehindAKeyIsNoneOfIt) {
+  EXPECT_FALSE(isSecretKey(std::string_view("pin").substr(0, 2)));
+}
+
 }  // namespace
 }  // namespace accounts
