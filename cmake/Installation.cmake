@@ -16,6 +16,7 @@ install(TARGETS AccountsDataMigrator
 install(DIRECTORY ${PROJECT_SOURCE_DIR}/resources/
   DESTINATION ${library_directory}/accounts.migrator/Resources COMPONENT ${programs_component})
 install(FILES ${PROJECT_SOURCE_DIR}/README.md ${PROJECT_SOURCE_DIR}/CHANGELOG.md
+  ${PROJECT_SOURCE_DIR}/CONTRIBUTING.md
   DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration COMPONENT ${programs_component})
 install(DIRECTORY ${PROJECT_SOURCE_DIR}/docs
   DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration COMPONENT ${programs_component}
@@ -28,11 +29,37 @@ foreach(library libcli11-dev libfmt-dev nlohmann-json3-dev)
     COMPONENT ${programs_component})
 endforeach()
 
-install(DIRECTORY ${PROJECT_SOURCE_DIR}/examples/fleet
+# The sample device, and the commands of ./demo that work without a build.
+install(DIRECTORY ${PROJECT_SOURCE_DIR}/examples/fleet ${PROJECT_SOURCE_DIR}/examples/sample-device
   DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration/examples
   COMPONENT ${programs_component} USE_SOURCE_PERMISSIONS)
-install(FILES ${PROJECT_SOURCE_DIR}/docs/man/migration-host.1 ${PROJECT_SOURCE_DIR}/docs/man/accountsctl.1
-  DESTINATION ${CMAKE_INSTALL_MANDIR}/man1 COMPONENT ${programs_component})
+install(PROGRAMS ${PROJECT_SOURCE_DIR}/examples/complete-device-root ${PROJECT_SOURCE_DIR}/examples/show-accounts
+  DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration/examples COMPONENT ${programs_component})
+install(FILES ${PROJECT_SOURCE_DIR}/examples/README.md
+  DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration/examples COMPONENT ${programs_component})
+
+# Manual pages and the packages' changelog are compressed, as Debian wants them.
+set(compressed_directory ${PROJECT_BINARY_DIR}/compressed)
+file(MAKE_DIRECTORY ${compressed_directory})
+function(compress file)
+  cmake_path(GET file FILENAME name)
+  execute_process(COMMAND gzip -9nc ${file} OUTPUT_FILE ${compressed_directory}/${name}.gz
+    COMMAND_ERROR_IS_FATAL ANY)
+  set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${file})
+endfunction()
+foreach(page migration-host.1 accountsctl.1)
+  compress(${PROJECT_SOURCE_DIR}/docs/man/${page})
+  install(FILES ${compressed_directory}/${page}.gz
+    DESTINATION ${CMAKE_INSTALL_MANDIR}/man1 COMPONENT ${programs_component})
+endforeach()
+set(CPACK_PACKAGE_CONTACT "Accounts Migration <accounts-migration@quarx.example>")
+file(TIMESTAMP ${PROJECT_SOURCE_DIR}/CHANGELOG.md changelog_date "%a, %d %b %Y %H:%M:%S +0000" UTC)
+configure_file(${CMAKE_CURRENT_LIST_DIR}/changelog.in ${compressed_directory}/changelog @ONLY)
+compress(${compressed_directory}/changelog)
+foreach(component ${programs_component} ${development_component})
+  install(FILES ${compressed_directory}/changelog.gz
+    DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/${component} COMPONENT ${component})
+endforeach()
 install(FILES ${PROJECT_SOURCE_DIR}/completion/migration-host ${PROJECT_SOURCE_DIR}/completion/accountsctl
   DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/bash-completion/completions COMPONENT ${programs_component})
 
@@ -70,7 +97,6 @@ install(DIRECTORY ${PROJECT_SOURCE_DIR}/examples/frameworks
 
 # Two Debian packages, one a component.
 set(CPACK_GENERATOR DEB)
-set(CPACK_PACKAGE_CONTACT "Accounts Migration <accounts-migration@quarx.example>")
 set(CPACK_PACKAGE_DIRECTORY ${PROJECT_BINARY_DIR}/packages)
 set(CPACK_PACKAGING_INSTALL_PREFIX /usr)
 set(CPACK_STRIP_FILES ON)

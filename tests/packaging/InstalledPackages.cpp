@@ -12,17 +12,6 @@ namespace fs = std::filesystem;
 constexpr const char* kDatabase = "var/lib/dpkg";
 constexpr const char* kMachinesDatabase = "/var/lib/dpkg/status";
 
-/// The file of the package with a name, which a version follows.
-fs::path fileOfPackage(const std::string& package) {
-  for (const fs::directory_entry& entry : fs::directory_iterator(PACKAGES_DIRECTORY)) {
-    if (entry.path().filename().string().starts_with(package + "_")) {
-      return entry.path();
-    }
-  }
-  ADD_FAILURE() << "no package " << package << " in " << PACKAGES_DIRECTORY;
-  return {};
-}
-
 }  // namespace
 
 InstalledPackages::InstalledPackages()
@@ -40,9 +29,20 @@ InstalledPackages::~InstalledPackages() {
   fs::remove_all(directory_, error);
 }
 
+std::string InstalledPackages::packageFile(const std::string& package) {
+  for (const fs::directory_entry& entry : fs::directory_iterator(PACKAGES_DIRECTORY)) {
+    // A version follows the name.
+    if (entry.path().filename().string().starts_with(package + "_")) {
+      return entry.path().string();
+    }
+  }
+  ADD_FAILURE() << "no package " << package << " in " << PACKAGES_DIRECTORY;
+  return {};
+}
+
 void InstalledPackages::install() const {
-  const ProgramResult result = dpkg({"--install", fileOfPackage("accounts-migration").string(),
-                                     fileOfPackage("accounts-migration-dev").string()});
+  const ProgramResult result =
+      dpkg({"--install", packageFile("accounts-migration"), packageFile("accounts-migration-dev")});
   ASSERT_EQ(result.exitStatus, 0) << result.errors;
 }
 
@@ -52,8 +52,8 @@ void InstalledPackages::remove(const std::string& package) const {
 }
 
 std::string InstalledPackages::field(const std::string& package, const std::string& name) {
-  const ProgramResult result = succeed(
-      {.program = "dpkg-deb", .arguments = {"--field", fileOfPackage(package).string(), name}});
+  const ProgramResult result =
+      succeed({.program = "dpkg-deb", .arguments = {"--field", packageFile(package), name}});
   return result.output.substr(0, result.output.find('\n'));
 }
 

@@ -33,6 +33,8 @@ class InstalledPackages : public testing::Test {
   void install() const;
   /// Removes one package.
   void remove(const std::string& package) const;
+  /// The file of the package that has this name.
+  [[nodiscard]] static std::string packageFile(const std::string& package);
   /// A field of the package that has this name.
   [[nodiscard]] static std::string field(const std::string& package, const std::string& name);
 

@@ -1,6 +1,7 @@
 #include <fstream>
 #include <iostream>
 #include <iterator>
+#include <regex>
 
 #include "tests/packaging/InstalledPackages.h"
 
@@ -39,6 +40,51 @@ TEST_F(InstalledPackages, HoldTheNoticesOfTheLibrariesThatAreCompiledIn) {
     const std::string text(std::istreambuf_iterator<char>(notice), {});
     EXPECT_NE(text.find("Copyright: "), std::string::npos) << library;
   }
+}
+
+TEST_F(InstalledPackages, LackNothingThatDebianAsksForButALicence) {
+  const ProgramResult result = runProgram(
+      {.program = "lintian",
+       .arguments = {"--suppress-tags", "no-copyright-file", packageFile("accounts-migration"),
+                     packageFile("accounts-migration-dev")},
+       .timeLimit = std::chrono::seconds(120)});
+  EXPECT_EQ(result.output, "");
+  EXPECT_EQ(result.exitStatus, 0) << result.errors;
+}
+
+TEST_F(InstalledPackages, BringASampleDeviceThatTheirProgramsMigrate) {
+  install();
+  const fs::path examples = prefix() / "share/doc/accounts-migration/examples";
+  const std::string device = (directory() / "device").string();
+  fs::copy(examples / "sample-device", device, fs::copy_options::recursive);
+  succeed({.program = (examples / "complete-device-root").string(), .arguments = {device}});
+
+  succeed({.program = (prefix() / "bin/migration-host").string(),
+           .arguments = {"run", "--root", device}});
+
+  const ProgramResult shown =
+      succeed({.program = (examples / "show-accounts").string(), .arguments = {device}});
+  EXPECT_NE(shown.output.find("version 12"), std::string::npos) << shown.output;
+}
+
+TEST_F(InstalledPackages, HoldDocumentsWhoseLinksLeadSomewhere) {
+  install();
+  const std::regex link("\\]\\(([^)#: ]+[.]md)");
+  std::size_t links = 0;
+  for (const fs::directory_entry& entry :
+       fs::recursive_directory_iterator(prefix() / "share/doc/accounts-migration")) {
+    if (entry.path().extension() != ".md") {
+      continue;
+    }
+    std::ifstream document(entry.path());
+    const std::string text(std::istreambuf_iterator<char>(document), {});
+    for (std::sregex_iterator found(text.begin(), text.end(), link), end; found != end; ++found) {
+      ++links;
+      EXPECT_TRUE(fs::exists(entry.path().parent_path() / (*found)[1].str()))
+          << entry.path() << ": " << (*found)[1];
+    }
+  }
+  EXPECT_GT(links, 20u);
 }
 
 TEST_F(InstalledPackages, PassTheEndToEndTestsOfTheBuild) {
