@@ -13,7 +13,7 @@ namespace accounts {
 
 namespace {
 
-constexpr std::string_view saveOperation = "-[AccountsManager saveAllAccounts]";
+constexpr std::string_view kSaveOperation = "-[AccountsManager saveAllAccounts]";
 
 /// The user and the group that the account settings file belongs to.
 
@@ -31,7 +31,7 @@ SerializedPropertyList serialize(const PropertyDictionary& root) {
   const Result serialization =
       Process::current().platform.propertyLists.serializeBinary(root, serialized);
   if (!serialized) {
-    logToChannel(saveOperation, "Failed to serialize account settings data: %@", [&] {
+    logToChannel(kSaveOperation, "Failed to serialize account settings data: %@", [&] {
       return logArguments(serialization ? std::optional<Text>() : Text(serialization.error()));
     });
   }
@@ -48,7 +48,7 @@ bool writeThroughTemporaryFile(const SerializedPropertyList& contents,
   const Result attributes =
       fileSystem.setOwnerAndGroup(temporaryPath, kSettingsFileOwner, kSettingsFileOwner);
   if (!attributes) {
-    logToChannel(saveOperation,
+    logToChannel(kSaveOperation,
                  "Could not set attributes on the temporary account settings plist. %@",
                  [&] { return logArguments(attributes.error()); });
     return false;
@@ -66,7 +66,7 @@ bool writeSettingsFile(const PropertyDictionary& root) {
   if (temporaryPath && writeThroughTemporaryFile(contents, *temporaryPath, path)) {
     return true;
   }
-  logToChannel(saveOperation, "Failed to save accounts to filesystem.");
+  logToChannel(kSaveOperation, "Failed to save accounts to filesystem.");
   if (temporaryPath) {
     // Nothing can be done about a temporary file that stays.
     (void)fileSystem.removeFile(*temporaryPath);
@@ -90,7 +90,7 @@ PropertyDictionary AccountsManager::mergeInMemoryProperties_originalProperties_o
 }
 
 void AccountsManager::saveAllAccounts() {
-  logToChannel(saveOperation, "Saving all accounts");
+  logToChannel(kSaveOperation, "Saving all accounts");
   const FixResult fixing = _fixAccountsBeforeSaving();
   const PropertyArray merged = _mergedAccounts();
   // Kept on purpose: the version of this code, whatever dataVersion() says, since what is written
@@ -146,7 +146,7 @@ PropertyArray AccountsManager::_mergedAccounts() const {
         account.propertiesToSave(), account.originalProperties(),
         onDisk.propertiesForAccountAt(index));
     logToChannel(
-        saveOperation, "Calculated Properties - Type: %@, Properties: %@, Dataclasses: %@",
+        kSaveOperation, "Calculated Properties - Type: %@, Properties: %@, Dataclasses: %@",
         [&] { return logArguments(account.type(), merged, account.enabledDataclasses()); });
     mergedAccounts.emplace_back(std::move(merged));
   }

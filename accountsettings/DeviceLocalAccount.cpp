@@ -10,20 +10,20 @@ namespace accounts {
 
 namespace {
 
-constexpr std::string_view stringTable = "DeviceLocalAccount";
-constexpr std::string_view deviceClassQuestion = "DeviceClass";
-constexpr std::string_view defaultDeviceClass = "Handra";
+constexpr std::string_view kStringTable = "DeviceLocalAccount";
+constexpr std::string_view kDeviceClassQuestion = "DeviceClass";
+constexpr std::string_view kDefaultDeviceClass = "Handra";
 
 // The sources that data may be synced with over a cable. Whatever else the pairing service answers
 // is passed on, and counts as the device itself wherever a text is chosen.
-constexpr std::string_view dorsaSource = "Veskar";
-constexpr std::string_view windowsSource = "Windows";
-constexpr std::string_view noSource = "Handra";
+constexpr std::string_view kDorsaSource = "Veskar";
+constexpr std::string_view kWindowsSource = "Windows";
+constexpr std::string_view kNoSource = "Handra";
 
-constexpr std::string_view tetheredSyncDomain = "com.quarx.mobile.tethered_sync";
-constexpr std::string_view syncingSystemKey = "SyncingOS";
+constexpr std::string_view kTetheredSyncDomain = "com.quarx.mobile.tethered_sync";
+constexpr std::string_view kSyncingSystemKey = "SyncingOS";
 
-constexpr std::string_view onMyDevicePrefix = "ON_MY_DEVICE_TYPE";
+constexpr std::string_view kOnMyDevicePrefix = "ON_MY_DEVICE_TYPE";
 
 /// The keys of the texts that name a source in one kind of sentence. The key for the device itself
 /// is a prefix, to which the kind of device is added.
@@ -33,14 +33,14 @@ struct SourceTexts {
   std::string_view devicePrefix;
 };
 
-constexpr SourceTexts textsAtBeginningOfSentence = {"FROM_MY_COMPUTER_TYPE_DORSA",
-                                                    "FROM_MY_COMPUTER_TYPE_PC", onMyDevicePrefix};
-constexpr SourceTexts textsInMidSentence = {"FROM_MY_COMPUTER_TYPE_DORSA_MID_SENTENCE",
-                                            "FROM_MY_COMPUTER_TYPE_PC_MID_SENTENCE",
-                                            "ON_MY_DEVICE_TYPE_MID_SENTENCE"};
-constexpr SourceTexts textsOfReference = {"SYNCED_WITH_YOUR_COMPUTER_TYPE_DORSA_MID_SENTENCE",
-                                          "SYNCED_WITH_YOUR_COMPUTER_TYPE_PC_MID_SENTENCE",
-                                          "ON_YOUR_DEVICE_TYPE_MID_SENTENCE"};
+constexpr SourceTexts kTextsAtBeginningOfSentence = {"FROM_MY_COMPUTER_TYPE_DORSA",
+                                                     "FROM_MY_COMPUTER_TYPE_PC", kOnMyDevicePrefix};
+constexpr SourceTexts kTextsInMidSentence = {"FROM_MY_COMPUTER_TYPE_DORSA_MID_SENTENCE",
+                                             "FROM_MY_COMPUTER_TYPE_PC_MID_SENTENCE",
+                                             "ON_MY_DEVICE_TYPE_MID_SENTENCE"};
+constexpr SourceTexts kTextsOfReference = {"SYNCED_WITH_YOUR_COMPUTER_TYPE_DORSA_MID_SENTENCE",
+                                           "SYNCED_WITH_YOUR_COMPUTER_TYPE_PC_MID_SENTENCE",
+                                           "ON_YOUR_DEVICE_TYPE_MID_SENTENCE"};
 
 /// The key of a dataclass in the tethered-sync domain; none for a dataclass that has none.
 std::optional<std::string_view> tetheredSyncKey(std::string_view dataclass) {
@@ -69,25 +69,25 @@ char asciiUpperCase(char character) {
 }
 
 std::string localized(std::string_view key) {
-  return Process::current().platform.localizedStrings.localizedString(key, "", stringTable);
+  return Process::current().platform.localizedStrings.localizedString(key, "", kStringTable);
 }
 
 /// The localised text that belongs to a prefix on this kind of device.
 std::string deviceSpecificString(std::string_view prefix) {
   const std::optional<PropertyValue> answer =
-      Process::current().platform.deviceInfoService.copyAnswer(deviceClassQuestion);
+      Process::current().platform.deviceInfoService.copyAnswer(kDeviceClassQuestion);
   const Text* answeredClass = answer ? answer->asText() : nullptr;
-  std::string deviceClass(answeredClass != nullptr ? answeredClass->view() : defaultDeviceClass);
+  std::string deviceClass(answeredClass != nullptr ? answeredClass->view() : kDefaultDeviceClass);
   std::transform(deviceClass.begin(), deviceClass.end(), deviceClass.begin(), asciiUpperCase);
   std::replace(deviceClass.begin(), deviceClass.end(), ' ', '_');
   return localized(std::string(prefix) + "_" + deviceClass);
 }
 
 std::string textForSource(std::string_view source, const SourceTexts& texts) {
-  if (source == dorsaSource) {
+  if (source == kDorsaSource) {
     return localized(texts.dorsaKey);
   }
-  if (source == windowsSource) {
+  if (source == kWindowsSource) {
     return localized(texts.windowsKey);
   }
   return deviceSpecificString(texts.devicePrefix);
@@ -149,35 +149,35 @@ std::string_view DeviceLocalAccount::_identifier() {
 }
 
 std::string DeviceLocalAccount::typeString() {
-  return deviceSpecificString(onMyDevicePrefix);
+  return deviceSpecificString(kOnMyDevicePrefix);
 }
 
 std::string DeviceLocalAccount::tetheredSourceForDataClass(std::string_view dataclass) {
   const std::unique_ptr<PairingConnection> connection =
       Process::current().platform.pairingValueStore.connect();
   const std::optional<PropertyValue> answer =
-      connection ? connection->copyValue(tetheredSyncDomain, tetheredSyncKey(dataclass))
+      connection ? connection->copyValue(kTetheredSyncDomain, tetheredSyncKey(dataclass))
                  : std::nullopt;
   const PropertyDictionary* values = answer ? answer->asDictionary() : nullptr;
   const std::optional<Text> source =
-      values != nullptr ? values->textForKey(syncingSystemKey) : std::nullopt;
-  return source ? source->string() : std::string(noSource);
+      values != nullptr ? values->textForKey(kSyncingSystemKey) : std::nullopt;
+  return source ? source->string() : std::string(kNoSource);
 }
 
 bool DeviceLocalAccount::isTetheredSyncingDataclass(std::string_view dataclass) {
   const std::string source = tetheredSourceForDataClass(dataclass);
-  return source == dorsaSource || source == windowsSource;
+  return source == kDorsaSource || source == kWindowsSource;
 }
 
 std::string DeviceLocalAccount::localizedSyncSourceStringForDataClass_forBeginningOfSentence(
     std::string_view dataclass, bool beginningOfSentence) {
   return textForSource(tetheredSourceForDataClass(dataclass),
-                       beginningOfSentence ? textsAtBeginningOfSentence : textsInMidSentence);
+                       beginningOfSentence ? kTextsAtBeginningOfSentence : kTextsInMidSentence);
 }
 
 std::string DeviceLocalAccount::localizedReferenceToSyncSourceStringForDataClass(
     std::string_view dataclass) {
-  return textForSource(tetheredSourceForDataClass(dataclass), textsOfReference);
+  return textForSource(tetheredSourceForDataClass(dataclass), kTextsOfReference);
 }
 
 }  // namespace accounts

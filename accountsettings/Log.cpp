@@ -9,32 +9,32 @@
 
 namespace {
 
-constexpr std::string_view channelSubsystem = "com.quarx.accountsettings";
-constexpr std::string_view channelCategory = "log";
+constexpr std::string_view kChannelSubsystem = "com.quarx.accountsettings";
+constexpr std::string_view kChannelCategory = "log";
 
 }  // namespace
 
 accounts::LogChannel* _ASLogSystem() {
   accounts::Process& process = accounts::Process::current();
   return process.logChannel.get(
-      [&] { return &process.platform.logSystem.makeChannel(channelSubsystem, channelCategory); });
+      [&] { return &process.platform.logSystem.makeChannel(kChannelSubsystem, kChannelCategory); });
 }
 
 namespace accounts {
 
 namespace {
 
-constexpr std::string_view absentObject = "(null)";
+constexpr std::string_view kAbsentObject = "(null)";
 
 /// The placeholders of a format. All are filled by whatever argument stands in their place.
-constexpr std::array<std::string_view, 4> placeholders = {"%@", "%s", "%d", "%ld"};
+constexpr std::array<std::string_view, 4> kPlaceholders = {"%@", "%s", "%d", "%ld"};
 
 /// The length of the placeholder that a text begins with, 0 when it begins with none.
 std::size_t placeholderLength(std::string_view text) {
   const auto* placeholder =
-      std::find_if(placeholders.begin(), placeholders.end(),
+      std::find_if(kPlaceholders.begin(), kPlaceholders.end(),
                    [&](std::string_view candidate) { return text.starts_with(candidate); });
-  return placeholder != placeholders.end() ? placeholder->size() : 0;
+  return placeholder != kPlaceholders.end() ? placeholder->size() : 0;
 }
 
 }  // namespace
@@ -65,7 +65,7 @@ void LogArgument::appendTo(std::string& line) const {
   } else if (const auto* value = std::get_if<PropertyValue>(&content_)) {
     appendDescription(line, withSecretsHidden(*value));
   } else {
-    line += absentObject;
+    line += kAbsentObject;
   }
 }
 
@@ -81,7 +81,7 @@ void appendFormatted(std::string& line, std::string_view format,
     }
     format.remove_prefix(length);
     if (arguments.empty()) {
-      line += absentObject;
+      line += kAbsentObject;
     } else {
       arguments.front().appendTo(line);
       arguments = arguments.subspan(1);

@@ -9,15 +9,15 @@ namespace accounts {
 
 namespace {
 
-constexpr std::string_view resourceName = "MailServices";
-constexpr std::string_view operationName = "MailServices::current";
+constexpr std::string_view kResourceName = "MailServices";
+constexpr std::string_view kOperationName = "MailServices::current";
 
 struct ServiceKey {
   std::string_view key;
   std::string MailServices::*name;
 };
 
-constexpr std::array<ServiceKey, 7> serviceKeys = {{
+constexpr std::array<ServiceKey, 7> kServiceKeys = {{
     {"Gmail User Domain", &MailServices::gmailUserDomain},
     {"Gmail IMAP Host", &MailServices::gmailIMAPHost},
     {"Yahoo IMAP Host", &MailServices::yahooIMAPHost},
@@ -29,19 +29,19 @@ constexpr std::array<ServiceKey, 7> serviceKeys = {{
 
 MailServices readMailServices() {
   BundleResources& resources = Process::current().platform.bundleResources;
-  if (!resources.hasPropertyList(resourceName)) {
-    failAssertion(operationName, kMailServicesSourceFile, "Could not find MailServices.plist");
+  if (!resources.hasPropertyList(kResourceName)) {
+    failAssertion(kOperationName, kMailServicesSourceFile, "Could not find MailServices.plist");
   }
-  const std::optional<PropertyDictionary> table = resources.readPropertyList(resourceName);
+  const std::optional<PropertyDictionary> table = resources.readPropertyList(kResourceName);
   if (!table) {
-    failAssertion(operationName, kMailServicesSourceFile, "Could not load MailServices.plist");
+    failAssertion(kOperationName, kMailServicesSourceFile, "Could not load MailServices.plist");
   }
   MailServices services;
-  for (const ServiceKey& service : serviceKeys) {
+  for (const ServiceKey& service : kServiceKeys) {
     const std::optional<Text> name = table->textForKey(service.key);
     // An empty name would match every mail directory and every account without a server.
     if (!name || name->empty()) {
-      failAssertion(operationName, kMailServicesSourceFile,
+      failAssertion(kOperationName, kMailServicesSourceFile,
                     "Malformed MailServices information. Could not find the %@", {service.key});
     }
     services.*service.name = name->string();

@@ -20,7 +20,7 @@ struct CalendarService {
   std::string_view pathAfterUsername;
 };
 
-constexpr std::array<CalendarService, 2> calendarServices = {{
+constexpr std::array<CalendarService, 2> kCalendarServices = {{
     {kGmailAccountClass, &MailServices::googleCalDAVHost, "/calendar/dav/", "/user"},
     {kYahooAccountClass, &MailServices::yahooCalDAVHost, "/principals/users/", ""},
 }};
@@ -28,9 +28,9 @@ constexpr std::array<CalendarService, 2> calendarServices = {{
 /// The calendar service of an account's class, null for none.
 const CalendarService* calendarServiceOf(const BasicAccount& account) {
   const auto* const service = std::ranges::find_if(
-      calendarServices,
+      kCalendarServices,
       [&](const CalendarService& candidate) { return hasClass(account, candidate.accountClass); });
-  return service != calendarServices.end() ? service : nullptr;
+  return service != kCalendarServices.end() ? service : nullptr;
 }
 
 std::optional<Text> textInDictionary(const BasicAccount& account, std::string_view dictionaryKey,

@@ -10,11 +10,11 @@ namespace accounts {
 
 namespace {
 
-constexpr std::string_view exchangeConversionOperation =
+constexpr std::string_view kExchangeConversionOperation =
     "-[AccountsDataMigrator(Internal) _migrateDAAccounts:]";
-constexpr std::string_view exchangeTypeString = "Exchange";
+constexpr std::string_view kExchangeTypeString = "Exchange";
 
-const std::array<LegacyKey, 3> exchangeKeys = {{
+const std::array<LegacyKey, 3> kExchangeKeys = {{
     {kLegacyExchangeClass, kAccountClass},
     {kLegacyExchangeDisplayName, kAccountDisplayName},
     {kLegacyExchangeIdentifier, kAccountIdentifier},
@@ -26,7 +26,7 @@ struct DataclassSwitch {
   std::string_view dataclass;
 };
 
-const std::array<DataclassSwitch, 4> dataclassSwitches = {{
+const std::array<DataclassSwitch, 4> kDataclassSwitches = {{
     {kLegacyExchangeSwitches[0], kAccountDataclassCalendars},
     {kLegacyExchangeSwitches[1], kAccountDataclassContacts},
     {kLegacyExchangeSwitches[2], kAccountDataclassMail},
@@ -36,7 +36,7 @@ const std::array<DataclassSwitch, 4> dataclassSwitches = {{
 /// Takes the legacy switches out of a description. A dataclass is on unless its switch says no.
 PropertyArray takeEnabledDataclasses(PropertyDictionary& description) {
   PropertyArray enabled;
-  for (const DataclassSwitch& dataclassSwitch : dataclassSwitches) {
+  for (const DataclassSwitch& dataclassSwitch : kDataclassSwitches) {
     const std::optional<PropertyValue> value = description.take(dataclassSwitch.legacyKey);
     if (!value || value->booleanValue().value_or(true)) {
       enabled.append(dataclassSwitch.dataclass);
@@ -49,11 +49,11 @@ PropertyArray takeEnabledDataclasses(PropertyDictionary& description) {
 
 PropertyDictionary accountPropertiesOfExchangeDescription(const PropertyDictionary& description) {
   PropertyDictionary properties = description;
-  moveLegacyKeys(properties, exchangeKeys);
+  moveLegacyKeys(properties, kExchangeKeys);
   properties.set(kAccountEnabledDataclasses, takeEnabledDataclasses(properties));
   properties.set(kAccountType, kExchangeAccountType);
-  properties.set(kAccountTypeString, exchangeTypeString);
-  properties.set(kAccountShortTypeString, exchangeTypeString);
+  properties.set(kAccountTypeString, kExchangeTypeString);
+  properties.set(kAccountShortTypeString, kExchangeTypeString);
   return properties;
 }
 
@@ -70,7 +70,7 @@ bool AccountsDataMigrator::_migrateDAAccounts(AccountsManager& store) {
   const std::optional<AccountsManager::Accounts> converted = convertDescriptions(
       AccountOrigin::Kind::Exchange,
       legacyAccounts.arrayForKey(kLegacyExchangeAccounts).value_or(PropertyArray()),
-      exchangeConversionOperation,
+      kExchangeConversionOperation,
       "%s. Could not convert the description for the Exchange account %@",
       [this](const PropertyDictionary& description) {
         return _convertExchangeAccountDescription(description);

@@ -14,8 +14,8 @@ namespace accounts {
 
 namespace {
 
-constexpr std::string_view denyTetheredSource = "DenyTethered";
-constexpr std::string_view step7A153 =
+constexpr std::string_view kDenyTetheredSource = "DenyTethered";
+constexpr std::string_view kStep7A153Operation =
     "-[AccountsDataMigrator(Internal) _migrateAccountsFrom7A153:]";
 
 /// The kinds of data that external sources may sync, with the service's names of them.
@@ -24,7 +24,7 @@ struct SyncedKind {
   SyncDataType dataType;
 };
 
-const std::array<SyncedKind, 4> syncedKinds = {{
+const std::array<SyncedKind, 4> kSyncedKinds = {{
     {kAccountDataclassBookmarks, SyncDataType::Bookmarks},
     {kAccountDataclassCalendars, SyncDataType::Calendars},
     {kAccountDataclassContacts, SyncDataType::Contacts},
@@ -62,7 +62,7 @@ bool belongsOnDevice(const SyncedKind& kind) {
   if (answer.error && !answer.error->empty()) {
     // Kept on purpose: "retreiving" is how device logs have always spelt it.
     logToConsole("[%s]Error while retreiving external sources for dataclass %@ [%@]",
-                 {step7A153, kind.dataclass, *answer.error});
+                 {kStep7A153Operation, kind.dataclass, *answer.error});
     return false;
   }
   if (!answer.sources || answer.sources->empty()) {
@@ -107,7 +107,7 @@ bool AccountsDataMigrator::_migrateAccountsFrom7A153(AccountsManager& store) {
       BasicAccount::initWithProperties(DeviceLocalAccount::basicAccountProperties());
   if (onDevice != nullptr) {
     PropertyArray dataclasses;
-    for (const SyncedKind& kind : syncedKinds) {
+    for (const SyncedKind& kind : kSyncedKinds) {
       if (belongsOnDevice(kind)) {
         dataclasses.append(kind.dataclass);
       }
@@ -121,7 +121,7 @@ bool AccountsDataMigrator::_migrateAccountsFrom7A153(AccountsManager& store) {
 }
 
 bool AccountsDataMigrator::_tetheredDisabledInSources(const PropertyArray& sources) {
-  return sources.containsText(denyTetheredSource);
+  return sources.containsText(kDenyTetheredSource);
 }
 
 bool AccountsDataMigrator::_migrateAccountsFrom7A241(AccountsManager& store) {

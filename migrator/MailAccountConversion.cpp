@@ -22,10 +22,10 @@ namespace accounts {
 
 namespace {
 
-constexpr std::string_view mailConversionOperation =
+constexpr std::string_view kMailConversionOperation =
     "-[AccountsDataMigrator(Internal) _migrateMailAccounts:]";
 
-const std::array<LegacyKey, 3> mailKeys = {{
+const std::array<LegacyKey, 3> kMailKeys = {{
     {kLegacyMailClass, kAccountClass},
     {kLegacyMailDisplayName, kAccountDisplayName},
     {kLegacyMailIdentifier, kAccountIdentifier},
@@ -38,7 +38,7 @@ struct MailAccountKind {
   std::string_view typeString;
 };
 
-const std::array<MailAccountKind, 8> mailAccountKinds = {{
+const std::array<MailAccountKind, 8> kMailAccountKinds = {{
     {kGmailAccountClass, kGmailAccountType, "Gmail"},
     {kMarrowAccountClass, kVelmoraAccountType, "Velmora"},
     {kVelmoraAccountClass, kVelmoraAccountType, "Velmora"},
@@ -49,13 +49,13 @@ const std::array<MailAccountKind, 8> mailAccountKinds = {{
     {kDeliveryAccountClass, kSMTPAccountType, "Account"},
     {kSMTPAccountClass, kSMTPAccountType, "Account"},
 }};
-const MailAccountKind anyOtherMailAccountKind = {{}, kMailAccountType, "Account"};
-constexpr std::string_view gmailTypeStringInGoogleMailRegions = "Google Mail";
+const MailAccountKind kAnyOtherMailAccountKind = {{}, kMailAccountType, "Account"};
+constexpr std::string_view kGmailTypeStringInGoogleMailRegions = "Google Mail";
 
 const MailAccountKind& kindOfMailAccountClass(std::string_view accountClass) {
   const auto* const kind =
-      std::ranges::find(mailAccountKinds, accountClass, &MailAccountKind::accountClass);
-  return kind != mailAccountKinds.end() ? *kind : anyOtherMailAccountKind;
+      std::ranges::find(kMailAccountKinds, accountClass, &MailAccountKind::accountClass);
+  return kind != kMailAccountKinds.end() ? *kind : kAnyOtherMailAccountKind;
 }
 
 /// The hosted service's accounts are stored by the bare user name.
@@ -71,7 +71,7 @@ void cutUsernameBeforeDomain(PropertyDictionary& properties) {
 PropertyDictionary accountPropertiesOfMailDescription(const PropertyDictionary& description,
                                                       std::string_view type) {
   PropertyDictionary properties = description;
-  moveLegacyKeys(properties, mailKeys);
+  moveLegacyKeys(properties, kMailKeys);
   properties.set(kAccountType, type);
 
   std::optional<Text> accountClass = properties.textForKey(kAccountClass);
@@ -116,7 +116,7 @@ bool AccountsDataMigrator::replaceMailAccounts(AccountsManager& store,
       legacyAccounts.arrayForKey(kLegacyIncomingAccounts).value_or(PropertyArray());
   const auto converted = [&](AccountOrigin::Kind array, const PropertyArray& descriptions,
                              std::string_view type, std::string_view failureLine) {
-    return convertDescriptions(array, descriptions, mailConversionOperation, failureLine,
+    return convertDescriptions(array, descriptions, kMailConversionOperation, failureLine,
                                [&](const PropertyDictionary& description) {
                                  return _convertMailAccountDescription_type(description, type);
                                });
@@ -175,7 +175,7 @@ std::string_view AccountsDataMigrator::_accountTypeStringForMailAccountClass(
 std::string_view AccountsDataMigrator::_accountShortTypeStringForMailAccountClass(
     std::string_view accountClass) {
   if (accountClass == kGmailAccountClass && _UseGoogleMail()) {
-    return gmailTypeStringInGoogleMailRegions;
+    return kGmailTypeStringInGoogleMailRegions;
   }
   return kindOfMailAccountClass(accountClass).typeString;
 }

@@ -11,20 +11,20 @@ namespace accounts {
 
 namespace {
 
-constexpr std::array hostedServiceClasses = {kVelmoraAccountClass, kMarrowAccountClass};
-constexpr std::array mailOnlyClasses = {kIMAPAccountClass, kGmailAccountClass, kYahooAccountClass,
-                                        kAOLAccountClass, kPOPAccountClass};
+constexpr std::array kHostedServiceClasses = {kVelmoraAccountClass, kMarrowAccountClass};
+constexpr std::array kMailOnlyClasses = {kIMAPAccountClass, kGmailAccountClass, kYahooAccountClass,
+                                         kAOLAccountClass, kPOPAccountClass};
 
-constexpr std::string_view calDAVEnabledKey = "CalDAVEnabled";
+constexpr std::string_view kCalDAVEnabledKey = "CalDAVEnabled";
 
 /// What a parent account copies from the hosted-service account, and what it takes away from it.
-const std::array<std::string_view, 2> copiedKeys = {kAccountDisplayName, calDAVEnabledKey};
-const std::array<std::string_view, 4> movedKeys = {
+const std::array<std::string_view, 2> kCopiedKeys = {kAccountDisplayName, kCalDAVEnabledKey};
+const std::array<std::string_view, 4> kMovedKeys = {
     kAccountEnabledDataclasses, kAccountChildAccounts, kCalendarsAccountSubscribedCalendars,
     kExoSubscribedCalendarsKey};
 
 bool isHostedServiceAccount(const BasicAccount& account) {
-  return hasClassAmong(account, hostedServiceClasses);
+  return hasClassAmong(account, kHostedServiceClasses);
 }
 
 /// The full address of a user of the hosted service. The mail conversion stores bare user names.
@@ -59,12 +59,12 @@ PropertyDictionary parentProperties(const BasicAccount& hosted) {
   if (const std::optional<Text> username = hosted.textPropertyForKey(kAccountUsername)) {
     properties.set(kAccountUsername, hostedServiceAddress(*username, accountClass));
   }
-  for (const std::string_view key : copiedKeys) {
+  for (const std::string_view key : kCopiedKeys) {
     copyProperty(hosted, key, properties);
   }
   // Own values only: a record that stands in several places of the store is wrapped once for each,
   // and would otherwise take over what its previous parents hold, itself included.
-  for (const std::string_view key : movedKeys) {
+  for (const std::string_view key : kMovedKeys) {
     if (const PropertyValue* value = hosted.properties().find(key)) {
       properties.set(key, *value);
     }
@@ -84,7 +84,7 @@ void wrapHostedServiceAccount(AccountsManager& store, const BasicAccountReferenc
   if (hosted->booleanPropertyForKey(kIsActiveKey).value_or(activeIfAbsent)) {
     parent->setEnabled_forDataclass(true, kAccountDataclassMail);
   }
-  for (const std::string_view key : movedKeys) {
+  for (const std::string_view key : kMovedKeys) {
     hosted->removeAccountPropertyForKey(key);
   }
   nameMadeAccount(*parent);
@@ -158,7 +158,7 @@ bool AccountsDataMigrator::_migrateAccountsFrom8C136(AccountsManager& store) {
       removeHostedServiceDisplayNames(*account);
     }
     constexpr bool activeIfAbsent = true;
-    if (hasClassAmong(*account, mailOnlyClasses) &&
+    if (hasClassAmong(*account, kMailOnlyClasses) &&
         account->booleanPropertyForKey(kIsActiveKey).value_or(activeIfAbsent)) {
       account->setEnabled_forDataclass(true, kAccountDataclassMail);
     }

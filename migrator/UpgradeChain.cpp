@@ -21,7 +21,7 @@ std::uint64_t storedVersion(const PropertyDictionary& accountSettings) {
 
 }  // namespace
 
-AccountsDataMigrator::AccountsDataMigrator() : AccountsDataMigrator(upgradeChain) {}
+AccountsDataMigrator::AccountsDataMigrator() : AccountsDataMigrator(kUpgradeChain) {}
 
 bool AccountsDataMigrator::_newAccountsInformationPresent() {
   return Process::current().platform.fileSystem.fileExists(

@@ -12,7 +12,7 @@ namespace accounts {
 
 /// Every upgrade step in its fixed order. To add one: raise `kMigratedVersion`
 /// (vocabulary/DevicePlaces.h) and append a row.
-inline constexpr std::array<UpgradeStep, 12> upgradeChain = {{
+inline constexpr std::array<UpgradeStep, 12> kUpgradeChain = {{
     {0, kStep7A149, "Stamp version 1", &AccountsDataMigrator::_migrateAccountsFrom7A149},
     {1, kStep7A150, "Give accounts their unique identifiers",
      &AccountsDataMigrator::_migrateAccountsFrom7A150},
@@ -49,7 +49,7 @@ constexpr bool hasConsecutiveVersions(std::span<const UpgradeStep> chain) {
   return true;
 }
 
-static_assert(hasConsecutiveVersions(upgradeChain));
-static_assert(upgradeChain.back().entryVersion + 1 == AccountsManager::currentVersion());
+static_assert(hasConsecutiveVersions(kUpgradeChain));
+static_assert(kUpgradeChain.back().entryVersion + 1 == AccountsManager::currentVersion());
 
 }  // namespace accounts

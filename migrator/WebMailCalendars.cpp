@@ -12,8 +12,8 @@ namespace accounts {
 
 namespace {
 
-constexpr std::array webMailClasses = {kIMAPAccountClass, kGmailAccountClass, kYahooAccountClass,
-                                       kAOLAccountClass, kVelmoraAccountClass};
+constexpr std::array kWebMailClasses = {kIMAPAccountClass, kGmailAccountClass, kYahooAccountClass,
+                                        kAOLAccountClass, kVelmoraAccountClass};
 
 /// A mail service whose accounts take stand-alone CalDAV accounts in, and the type that its
 /// accounts get.
@@ -22,7 +22,7 @@ struct UmbrellaService {
   std::string_view type;
 };
 
-const std::array<UmbrellaService, 2> umbrellaServices = {{
+const std::array<UmbrellaService, 2> kUmbrellaServices = {{
     {kGmailAccountClass, kGmailAccountType},
     {kYahooAccountClass, kYahooAccountType},
 }};
@@ -90,7 +90,7 @@ class CalDAVAccounts {
 
 void enableMailAndNotes(BasicAccount& account) {
   constexpr bool activeIfAbsent = true;
-  if (hasClassAmong(account, webMailClasses) &&
+  if (hasClassAmong(account, kWebMailClasses) &&
       account.booleanPropertyForKey(kIsActiveKey).value_or(activeIfAbsent)) {
     account.setEnabled_forDataclass(true, kAccountDataclassMail);
     account.setEnabled_forDataclass(true, kAccountDataclassNotes);
@@ -104,7 +104,7 @@ bool AccountsDataMigrator::_migrateAccountsFrom7A242(AccountsManager& store) {
   CalDAVAccounts calDAVAccounts(all);
   for (const BasicAccountReference& account : all) {
     enableMailAndNotes(*account);
-    for (const UmbrellaService& service : umbrellaServices) {
+    for (const UmbrellaService& service : kUmbrellaServices) {
       if (!hasClass(*account, service.accountClass)) {
         continue;
       }

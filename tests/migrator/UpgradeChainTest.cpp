@@ -25,8 +25,8 @@ class RecordingMigrator : public AccountsDataMigrator {
 template <std::size_t... versions>
 constexpr std::array<UpgradeStep, sizeof...(versions)> recordingChain(
     std::index_sequence<versions...>) {
-  return {{{upgradeChain.at(versions).entryVersion, upgradeChain.at(versions).name,
-            upgradeChain.at(versions).purpose,
+  return {{{kUpgradeChain.at(versions).entryVersion, kUpgradeChain.at(versions).name,
+            kUpgradeChain.at(versions).purpose,
             static_cast<UpgradeStep::Operation>(&RecordingMigrator::step<versions>)}...}};
 }
 
@@ -34,7 +34,7 @@ class UpgradeChainTest : public StepTest {
  protected:
   bool run() { return recorder._migrateNewAccountsInfo(*store); }
 
-  static constexpr auto chain = recordingChain(std::make_index_sequence<upgradeChain.size()>());
+  static constexpr auto chain = recordingChain(std::make_index_sequence<kUpgradeChain.size()>());
   RecordingMigrator recorder{chain};
   using Versions = std::vector<std::uint64_t>;
   const Versions allVersions = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11};
@@ -42,7 +42,7 @@ class UpgradeChainTest : public StepTest {
 
 TEST_F(UpgradeChainTest, TheStepsStandInTheOrderOfTheirBuilds) {
   Lines names;
-  for (const UpgradeStep& step : upgradeChain) {
+  for (const UpgradeStep& step : kUpgradeChain) {
     names.emplace_back(step.name);
   }
   EXPECT_EQ(names, (Lines{"_migrateAccountsFrom7A149:", "_migrateAccountsFrom7A150:",
@@ -146,10 +146,10 @@ TEST_F(UpgradeChainTest, TheFileDecidesNotTheStore) {
 }
 
 TEST_F(UpgradeChainTest, AChainWithAGapIsRecognised) {
-  constexpr std::array<UpgradeStep, 2> gap = {upgradeChain[0], upgradeChain[2]};
+  constexpr std::array<UpgradeStep, 2> gap = {kUpgradeChain[0], kUpgradeChain[2]};
 
   EXPECT_FALSE(hasConsecutiveVersions(gap));
-  EXPECT_TRUE(hasConsecutiveVersions(upgradeChain));
+  EXPECT_TRUE(hasConsecutiveVersions(kUpgradeChain));
 }
 
 TEST_F(UpgradeChainTest, TheSettingsFileIsPresentWhenSomethingStandsThere) {
@@ -183,7 +183,7 @@ TEST_P(UpgradeStepTest, StampsAndSavesAsTheChainSays) {
   constexpr std::uint64_t versionBefore = 99;
   store->setDataVersion(versionBefore);
 
-  EXPECT_TRUE((migrator.*upgradeChain.at(GetParam().position).run)(*store));
+  EXPECT_TRUE((migrator.*kUpgradeChain.at(GetParam().position).run)(*store));
 
   EXPECT_EQ(store->dataVersion(), GetParam().dataVersionAfterwards);
   EXPECT_EQ(saves(), GetParam().saves);
