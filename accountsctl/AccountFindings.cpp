@@ -147,7 +147,7 @@ ExaminedAccount examineChild(const ListedAccount& child, const BasicAccountRefer
     return examined;
   }
   examined.record->setParentAccount(parent);
-  if (child.properties->arrayForKey(kAccountChildAccounts).value_or(PropertyArray()).size() > 0) {
+  if (!child.properties->arrayForKey(kAccountChildAccounts).value_or(PropertyArray()).empty()) {
     addFinding(examined.findings, about, Effect::Ignored, "childrenOfChild",
                "Its own children are carried along but are no accounts");
   }

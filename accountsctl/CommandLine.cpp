@@ -48,7 +48,7 @@ constexpr std::size_t kMostDigitsOfACount = 9;
 
 std::string requireCount(const std::string& value) {
   const bool isCount = !value.empty() && value.size() <= kMostDigitsOfACount &&
-                       value.find_first_not_of("0123456789") == value.npos;
+                       value.find_first_not_of("0123456789") == std::string::npos;
   return isCount ? "" : "must be a whole number, at most 999999999";
 }
 

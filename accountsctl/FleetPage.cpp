@@ -58,7 +58,7 @@ std::string urlOf(const std::string& path) {
       "ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789-._~/";
   std::string url;
   for (const char character : path) {
-    if (kPlain.find(character) != kPlain.npos) {
+    if (kPlain.find(character) != std::string_view::npos) {
       url += character;
     } else {
       url += fmt::format("%{:02X}", static_cast<unsigned char>(character));

@@ -59,7 +59,7 @@ std::vector<std::string> filesOf(const std::string& name) {
   }
   std::vector<std::string> files;
   for (const auto& entry : std::filesystem::directory_iterator(name, error)) {
-    const std::filesystem::path path = entry.path();
+    const std::filesystem::path& path = entry.path();
     if (path.extension() == ".json" && !path.filename().string().starts_with('.')) {
       files.push_back(path.string());
     }
@@ -103,7 +103,7 @@ std::variant<std::vector<std::string>, ProgramError> readRoots(const std::string
     if (line.ends_with('\r')) {
       line.pop_back();
     }
-    if (line.find_first_not_of(" \t") != line.npos && known.insert(line).second) {
+    if (line.find_first_not_of(" \t") != std::string::npos && known.insert(line).second) {
       roots.push_back(line);
     }
   }

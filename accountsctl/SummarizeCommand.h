@@ -40,6 +40,6 @@ struct SummarizeOptions {
 /// Counts what runs of migration-host on many images reported: by outcome, stage and error. While
 /// it reads, a terminal at standard error shows how far the fleet has come. The exit status of the
 /// report is ExitStatus::Attention unless every image is migrated; that of a list is success.
-CommandResult summarize(const SummarizeOptions& options, const Terminal& terminal);
+CommandResult summarize(const SummarizeOptions& asked, const Terminal& terminal);
 
 }  // namespace accounts

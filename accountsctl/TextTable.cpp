@@ -38,7 +38,8 @@ std::size_t lengthOfLine(std::string_view text, std::size_t width) {
       return afterBreaker > 0 ? afterBreaker : length;
     }
     length += std::max<std::size_t>(next.length, 1);
-    if (next.value < 0x80 && kBreakers.find(static_cast<char>(next.value)) != kBreakers.npos) {
+    if (next.value < 0x80 &&
+        kBreakers.find(static_cast<char>(next.value)) != std::string_view::npos) {
       afterBreaker = length;
     }
   }

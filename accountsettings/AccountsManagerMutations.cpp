@@ -31,6 +31,8 @@ std::optional<Text> identifierOfChildElement(const PropertyValue& element) {
 void AccountsManager::updateAccount(const BasicAccountReference& account) {
   logToChannel("-[AccountsManager updateAccount:]", "Updating account: %@",
                [&] { return logArguments(propertiesToLog(account)); });
+  // The argument may stand in the store itself, which is about to change.
+  // NOLINTNEXTLINE(performance-unnecessary-copy-initialization)
   const BasicAccountReference updated = account;
   const std::optional<Text> identifier = updated->identifier();
   const std::size_t places =
@@ -47,6 +49,7 @@ void AccountsManager::updateAccount(const BasicAccountReference& account) {
 void AccountsManager::insertAccount(const BasicAccountReference& account) {
   logToChannel("-[AccountsManager insertAccount:]", "Inserting account: %@",
                [&] { return logArguments(propertiesToLog(account)); });
+  // NOLINTNEXTLINE(performance-unnecessary-copy-initialization): as in updateAccount().
   const BasicAccountReference inserted = account;
   const std::optional<Text> identifier = inserted->identifier();
   if (!identifier || !_topLevelAccountsByID.contains(*identifier)) {
@@ -75,7 +78,7 @@ void AccountsManager::deleteAccountWithIdentifier(std::string_view identifier) {
 void AccountsManager::replaceAccount_withAccount(const BasicAccountReference& oldAccount,
                                                  const BasicAccountReference& newAccount) {
   const std::optional<Text> oldIdentifier = oldAccount->identifier();
-  // NOLINTNEXTLINE(performance-unnecessary-copy-initialization): see above.
+  // NOLINTNEXTLINE(performance-unnecessary-copy-initialization): as in updateAccount().
   const BasicAccountReference replacement = newAccount;
   _removeChildrenForAccountWithIdentifier(oldIdentifier);
   if (oldIdentifier) {

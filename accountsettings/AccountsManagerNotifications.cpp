@@ -196,7 +196,7 @@ void AccountsManager::
       {kASChangeAccountTypeKey, *type},
       {kASChangeAccountOriginallyEnabledDataclassesKey, enabledDataclassesOf(original)}};
   for (const Text& name : classNames) {
-    batch[name].push_back(record);
+    batch[name].emplace_back(record);
   }
 }
 

@@ -130,9 +130,9 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   [[nodiscard]] std::optional<Text> shortTypeString() const;
 
   /// Changes "Class"; the class that the account already has changes nothing.
-  void setAccountClass(std::string_view accountClass);
+  void setAccountClass(std::string_view newClass);
   /// Changes the own "DisplayName"; the name already stored there changes nothing.
-  void setDisplayName(std::optional<Text> displayName);
+  void setDisplayName(std::optional<Text> newName);
 
   [[nodiscard]] const BasicAccountReference& parentAccount() const { return _parentAccount; }
   void setParentAccount(BasicAccountReference parent);

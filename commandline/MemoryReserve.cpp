@@ -33,6 +33,7 @@ const char* endingProgram = "";
     }
     _exit(static_cast<int>(ExitStatus::TemporaryFailure));
   } catch (...) {
+    std::abort();
   }
   std::abort();
 }

@@ -114,7 +114,8 @@ std::optional<std::string> problemOfOption(const CLI::Option& option) {
 std::optional<std::string> problemOfValue(const CLI::App& part, std::string_view error) {
   const std::size_t colon = error.find(": ");
   const CLI::Option* const option =
-      colon != error.npos ? part.get_option_no_throw(std::string(error.substr(0, colon))) : nullptr;
+      colon != std::string::npos ? part.get_option_no_throw(std::string(error.substr(0, colon)))
+                                 : nullptr;
   if (option == nullptr || isGivenTooOften(*option)) {
     return std::nullopt;
   }

@@ -43,6 +43,7 @@ void endOnForbiddenCall(int /*signal*/, siginfo_t* information, void* /*context*
   } catch (const std::bad_alloc&) {
     endWith(FrameKind::OutOfMemory, {});
   } catch (...) {
+    std::abort();
   }
   std::abort();
 }

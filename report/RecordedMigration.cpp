@@ -77,7 +77,7 @@ RecordedMigration RecordedMigration::fromLines(const std::vector<std::string>& l
     constexpr bool allowExceptions = false;
     JSON object = JSON::parse(line, nullptr, allowExceptions);
     if (object.is_object()) {
-      for (auto& [event, content] : object.items()) {
+      for (auto&& [event, content] : object.items()) {
         if (content.is_object()) {
           assembly.add(event, std::move(content));
         }

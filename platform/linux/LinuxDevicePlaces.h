@@ -34,7 +34,7 @@ class LinuxDevicePlaces final : public DevicePlaces {
                                                                 const NewFile& file) override;
   std::variant<std::unique_ptr<StagedFile>, PlaceFailure> stageKept(
       DevicePlace place, std::string_view keptPath) override;
-  PlaceOutcome put(DevicePlace place, StagedFile& staged, const FileIdentity& expected) override;
+  PlaceOutcome put(DevicePlace place, StagedFile& file, const FileIdentity& expected) override;
   PlaceOutcome remove(DevicePlace place, const FileIdentity& expected) override;
   PlaceOutcome keep(DevicePlace place, std::string_view keptPath,
                     const FileIdentity& expected) override;

@@ -37,14 +37,14 @@ bool canBeSecret(const PropertyValue& value) {
 std::optional<std::string> textShownInstead(std::string_view text) {
   std::optional<std::string> shown;
   std::size_t taken = 0;
-  for (std::size_t found = text.find(kBeforeAuthority); found != text.npos;
+  for (std::size_t found = text.find(kBeforeAuthority); found != std::string_view::npos;
        found = text.find(kBeforeAuthority, found)) {
     found += kBeforeAuthority.size();
     const std::string_view authority =
         text.substr(found, text.substr(found).find_first_of(kAfterAuthority));
     // An "@" within the user information should be escaped, but people forget it.
     const std::size_t at = authority.rfind('@');
-    if (at != authority.npos && at > 0) {
+    if (at != std::string_view::npos && at > 0) {
       shown = shown.value_or("");
       shown->append(text.substr(taken, found - taken)).append(kHiddenValue);
       taken = found + at;

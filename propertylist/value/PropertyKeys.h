@@ -66,7 +66,7 @@ class PropertyKeys {
   [[nodiscard]] const PropertyKeys* knownChange(std::string_view key, std::size_t index,
                                                 std::size_t newSize) const;
   [[nodiscard]] PropertyKeys changed(std::span<const Text> ordered, std::size_t index) const;
-  static void destroyNode(SharedNodeBase* node);
+  static void destroyNode(SharedNodeBase* base);
 
   SharedNode<PropertyKeys> node_;
 };

@@ -67,7 +67,8 @@ bool textMeansTrue(std::string_view text) {
   while (!text.empty() && text.front() == '0') {
     text.remove_prefix(1);
   }
-  return !text.empty() && std::string_view("YyTt123456789").find(text.front()) != text.npos;
+  return !text.empty() &&
+         std::string_view("YyTt123456789").find(text.front()) != std::string_view::npos;
 }
 
 }  // namespace

@@ -81,8 +81,9 @@ std::string withoutInnocentWords(std::string text) {
 
 template <std::size_t Count>
 bool holdsAny(std::string_view text, const std::string_view (&parts)[Count]) {
-  return std::any_of(std::begin(parts), std::end(parts),
-                     [&](std::string_view part) { return text.find(part) != text.npos; });
+  return std::any_of(std::begin(parts), std::end(parts), [&](std::string_view part) {
+    return text.find(part) != std::string_view::npos;
+  });
 }
 
 bool holdsSecretWord(const SpeltKey& key) {

@@ -61,7 +61,8 @@ class SharedNode {
     }
   }
   SharedNode(SharedNode&& other) noexcept : node_(std::exchange(other.node_, nullptr)) {}
-  SharedNode& operator=(const SharedNode& other) {
+  // The copy makes it safe to assign to oneself.
+  SharedNode& operator=(const SharedNode& other) {  // NOLINT(bugprone-unhandled-self-assignment)
     SharedNode copy(other);
     std::swap(node_, copy.node_);
     return *this;

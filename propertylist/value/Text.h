@@ -42,7 +42,7 @@ class SharedBytes {
    private:
     const std::uint32_t size_;
   };
-  static void destroyNode(SharedNodeBase* node);
+  static void destroyNode(SharedNodeBase* base);
   [[nodiscard]] Node& node() const { return *static_cast<Node*>(node_.get()); }
 
   SharedNode<SharedBytes> node_;

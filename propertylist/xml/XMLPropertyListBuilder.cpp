@@ -85,7 +85,7 @@ bool ValueBuilder::start(std::string_view elementName) {
     case Element::Array:
       return openContainer(*element);
     default:
-      scalar_ = *element;
+      scalar_ = element;
       characters_.clear();
       return true;
   }
