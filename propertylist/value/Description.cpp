@@ -259,7 +259,8 @@ std::string escapedJSON(std::string json) {
   constexpr std::string_view kBeginnings = "\x7F\xC2\xE2";
   std::string_view rest = json;
   std::string line;
-  for (std::size_t place = 0; (place = rest.find_first_of(kBeginnings)) != rest.npos;) {
+  for (std::size_t place = 0;
+       (place = rest.find_first_of(kBeginnings)) != std::string_view::npos;) {
     line.append(rest.substr(0, place));
     rest.remove_prefix(place);
     const DecodedCodePoint decoded = decodeCodePoint(rest);
