@@ -1,10 +1,10 @@
 #include "accountsctl/ExplainCommand.h"
 
-#include <cerrno>
 #include <optional>
 #include <utility>
 
 #include "accountsctl/JSONText.h"
+#include "commandline/PlatformError.h"
 #include "platform/linux/FileContents.h"
 #include "report/AccountStory.h"
 
@@ -14,8 +14,7 @@ CommandResult explain(const ExplainOptions& options) {
   PathError error;
   const std::optional<std::string> text = readHostFile(options.report, error);
   if (!text) {
-    return ProgramError{
-        error.number == EIO ? ExitStatus::InputOutputError : ExitStatus::MissingInput, error.text};
+    return programErrorOf(error, ExitStatus::MissingInput);
   }
   const JSON report = JSON::parse(*text, nullptr, /*allow_exceptions=*/false);
   if (!report.is_object() || !report.contains("stages")) {

@@ -1,8 +1,8 @@
 #include "accountsctl/PropertyListInput.h"
 
-#include <cerrno>
 #include <optional>
 
+#include "commandline/PlatformError.h"
 #include "platform/linux/FileContents.h"
 #include "propertylist/PropertyListFile.h"
 
@@ -12,9 +12,7 @@ std::variant<PropertyValue, ProgramError> readPropertyListInput(const std::strin
   PathError error;
   const std::optional<std::string> bytes = readHostFile(file, error);
   if (!bytes) {
-    const bool isHardwareError = error.number == EIO;
-    return ProgramError{isHardwareError ? ExitStatus::InputOutputError : ExitStatus::MissingInput,
-                        error.text};
+    return programErrorOf(error, ExitStatus::MissingInput);
   }
   PropertyListError malformed;
   std::optional<PropertyValue> value = readPropertyList(*bytes, malformed);

@@ -4,7 +4,6 @@
 
 #include <algorithm>
 #include <cerrno>
-#include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <iostream>
@@ -85,8 +84,7 @@ std::optional<ProgramError> addFile(const std::string& file, const SummarizeOpti
   if (isRead) {
     return std::nullopt;
   }
-  return ProgramError{ExitStatus::MissingInput,
-                      fmt::format("Cannot read {}: {}", file, std::strerror(errno))};
+  return programErrorOf(pathError("read", file, errno), ExitStatus::MissingInput);
 }
 
 /// The roots in a file, each once. Lines may end as on another system, and blank ones are none.

@@ -3,6 +3,7 @@
 #include <fcntl.h>
 
 #include <algorithm>
+#include <cerrno>
 #include <string>
 
 #include "vocabulary/DevicePlaces.h"
@@ -35,7 +36,10 @@ ProgramError programErrorOf(const LinuxPlatformError& error) {
 }
 
 ProgramError programErrorOf(const PathError& error, ExitStatus lasting) {
-  return {exitStatusOf(failureKind(error.number), lasting), error.text};
+  const bool isOfTheMedium = error.number == EIO;
+  return {exitStatusOf(isOfTheMedium ? FailureKind::Lasting : failureKind(error.number),
+                       isOfTheMedium ? ExitStatus::InputOutputError : lasting),
+          error.text};
 }
 
 ProgramError programErrorOf(const Result& failure, ExitStatus lasting) {

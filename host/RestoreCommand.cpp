@@ -1,8 +1,11 @@
 #include "host/RestoreCommand.h"
 
+#include <fcntl.h>
+
 #include <algorithm>
 #include <utility>
 
+#include "commandline/PlatformError.h"
 #include "commandline/StandardStreams.h"
 #include "host/CommandLine.h"
 #include "host/CurrentTime.h"
@@ -60,6 +63,16 @@ RestoreResult failed(ProgramError error) {
   return result;
 }
 
+/// Why it cannot be told at the moment what is kept: that is not the same as nothing.
+std::optional<ProgramError> whyUnknown(const DeviceRoot& root) {
+  PathError error;
+  if (root.open(kAccountMigrationDirectory, O_RDONLY | O_DIRECTORY, error) ||
+      failureKind(error.number) == FailureKind::Lasting) {
+    return std::nullopt;
+  }
+  return programErrorOf(error, ExitStatus::MissingInput);
+}
+
 RestoreResult listFolders(const KeptFolders& folders, const RestoreOptions& options) {
   RestoreResult result;
   std::vector<std::string> paths;
@@ -88,7 +101,7 @@ RestoreResult discardFolder(KeptFolders& folders, const RestoreOptions& options)
   RestoreResult result;
   std::string& folder = std::get<std::string>(chosen);
   if (const Result discarded = folders.discard(folder); !discarded) {
-    return failed({ExitStatus::InputOutputError,
+    return failed({programErrorOf(discarded, ExitStatus::InputOutputError).exitStatus,
                    "The folder cannot be removed and is still whole: " + discarded.error()});
   }
   result.discarded = std::move(folder);
@@ -101,7 +114,7 @@ RestoreResult runRestoration(const RestoreOptions& options) {
   PathError error;
   const auto root = DeviceRoot::openRoot(options.root, error);
   if (!root) {
-    return failed({ExitStatus::MissingInput, error.text});
+    return failed(programErrorOf(error, ExitStatus::MissingInput));
   }
   // No temporary file is made; the directory is only named.
   const std::string home = homeOf(options);
@@ -109,7 +122,8 @@ RestoreResult runRestoration(const RestoreOptions& options) {
   LinuxDevicePlaces places(*root, files, home);
   KeptFolders folders(files, places);
   if (options.action == RestoreAction::List) {
-    return listFolders(folders, options);
+    auto unknown = whyUnknown(*root);
+    return unknown ? failed(*std::move(unknown)) : listFolders(folders, options);
   }
   StopSignals stop;
   LinuxHostLocks locks(
@@ -121,6 +135,9 @@ RestoreResult runRestoration(const RestoreOptions& options) {
   }
   if (end != LockEnd::Taken) {
     return failed(lockErrorOf(end, locks));
+  }
+  if (auto unknown = whyUnknown(*root)) {
+    return failed(*std::move(unknown));
   }
   if (options.action == RestoreAction::Discard) {
     return discardFolder(folders, options);

@@ -12,6 +12,8 @@ enum class LockEnd : std::uint8_t {
   Taken,
   /// No lock can be made.
   Impossible,
+  /// What it takes, such as a descriptor, is wanting at the moment.
+  Wanting,
   TimeIsUp,
   /// The process was asked to stop.
   Stopped
@@ -31,7 +33,7 @@ class HostLocks {
   virtual bool canTakeMigration() = 0;
   /// Gives the migration's lock back, if it was taken.
   virtual void giveMigrationBack() = 0;
-  /// Why the last lock was not taken, after `Impossible` or `TimeIsUp`, or could not be.
+  /// Why the last lock was not taken, after `Impossible`, `Wanting` or `TimeIsUp`, or could not be.
   [[nodiscard]] virtual std::string reason() const = 0;
 };
 

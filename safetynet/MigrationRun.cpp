@@ -16,6 +16,7 @@ constexpr int kMostAttempts = 5;
 ProgramError lockErrorOf(LockEnd end, const HostLocks& locks) {
   switch (end) {
     case LockEnd::TimeIsUp:
+    case LockEnd::Wanting:
       return {ExitStatus::TemporaryFailure, locks.reason()};
     case LockEnd::Stopped:
       return {ExitStatus::TemporaryFailure, kStopped};

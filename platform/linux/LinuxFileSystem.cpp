@@ -194,7 +194,11 @@ Result LinuxFileSystem::renameDirectory(std::string_view source, std::string_vie
   if (!to) {
     return asResult(error);
   }
-  if (kindOfEntry(source) != EntryKind::Directory) {
+  struct stat status = {};
+  if (::fstatat(from->directory(), from->name(), &status, AT_SYMLINK_NOFOLLOW) != 0) {
+    return asResult("rename", source, errno);
+  }
+  if (!S_ISDIR(status.st_mode)) {
     return asResult("rename", source, ENOTDIR);
   }
   return moveOver(*from, *to);

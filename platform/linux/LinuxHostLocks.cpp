@@ -21,6 +21,12 @@ constexpr timeval kInterval = {.tv_sec = 0, .tv_usec = 50'000};
 
 constexpr std::chrono::seconds kPatience(1);
 
+/// How an attempt ended that failed with this number.
+LockEnd endWith(int number) {
+  return number == EMFILE || number == ENFILE || number == ENOMEM ? LockEnd::Wanting
+                                                                  : LockEnd::Impossible;
+}
+
 /// Interrupts system calls of this process at intervals, as long as it lives.
 class Interruptions {
  public:
@@ -95,7 +101,7 @@ LockEnd LinuxHostLocks::takeRoot(std::optional<std::chrono::seconds> timeLimit) 
   directory_ = root_.open("/", O_RDONLY | O_DIRECTORY, error);
   if (!directory_) {
     reason_ = error.text;
-    return LockEnd::Impossible;
+    return endWith(error.number);
   }
   return wait(*directory_, "the device root", timeLimit);
 }
@@ -105,7 +111,7 @@ LockEnd LinuxHostLocks::takeMigration(std::optional<std::chrono::seconds> timeLi
   migration_ = openLockFile(root_, kMigrationLockName, error);
   if (!migration_) {
     reason_ = error.text;
-    return LockEnd::Impossible;
+    return endWith(error.number);
   }
   const LockEnd end = wait(*migration_, "the migration lock", timeLimit);
   if (end != LockEnd::Taken) {

@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <filesystem>
 #include <iostream>
 
 #include "propertylist/xml/XMLPropertyList.h"
@@ -9,7 +10,8 @@
 #include "tests/program/ExitStatuses.h"
 #include "tests/program/Programs.h"
 
-// Every program and subcommand with ever more memory, from too little to start to enough.
+// Every program and subcommand with ever more memory, and with ever more descriptors, from too
+// little to start to enough.
 
 namespace accounts {
 namespace {
@@ -36,7 +38,20 @@ void PrintTo(const Use& use, std::ostream* stream) {
 class LittleMemory : public DeviceRootFixture,
                      public testing::WithParamInterface<std::tuple<Use, Format>> {
  protected:
-  LittleMemory() : DeviceRootFixture(Medium::Memory) { makeSettings(); }
+  LittleMemory() : DeviceRootFixture(Medium::Memory) { prepare(); }
+
+  [[nodiscard]] static bool isOf(std::string_view subcommand) {
+    return std::get<Use>(GetParam()).arguments.front() == subcommand;
+  }
+
+  /// Makes the device as it is before a use: for restoring, with files that a run kept.
+  void prepare() const {
+    std::filesystem::remove_all(onThisMachine("/var/mobile/Library/AccountMigration"));
+    makeSettings();
+    if (isOf("restore")) {
+      EXPECT_EQ(migrate({"--keep"}).exitStatus, 0);
+    }
+  }
 
   void makeSettings() const {
     PropertyArray accounts;
@@ -72,8 +87,26 @@ class LittleMemory : public DeviceRootFixture,
   }
 
   [[nodiscard]] static bool takesLittle() {
-    return std::get<Format>(GetParam()) == Format::Binary ||
-           std::get<Use>(GetParam()).name == "RestoreList";
+    return std::get<Format>(GetParam()) == Format::Binary || isOf("restore");
+  }
+
+  [[nodiscard]] static bool changesTheDevice() {
+    return isOf("run") || (isOf("restore") && std::get<Use>(GetParam()).name != "RestoreList");
+  }
+
+  /// Whether the use puts kept files back.
+  [[nodiscard]] static bool isPutBack() { return std::get<Use>(GetParam()).name == "Restore"; }
+
+  static void expectOneClearLine(const ProgramResult& result, std::string_view cause) {
+    EXPECT_EQ(result.exitStatus, kMayPass) << result.errors;
+    std::size_t lines = 0;
+    for (const std::string& line : result.errorLines()) {
+      const bool isOfTheProgram =
+          line.starts_with("migration-host: ") || line.starts_with("accountsctl: ");
+      lines += isOfTheProgram ? 1 : 0;
+      EXPECT_TRUE(!isOfTheProgram || line.find(cause) != std::string::npos) << line;
+    }
+    EXPECT_EQ(lines, 1u) << result.errors;
   }
 
   /// The least memory with which the program starts: the system's own loader speaks before.
@@ -93,10 +126,9 @@ TEST_P(LittleMemory, EndsWithOneClearLineOrAsWithEnough) {
   if (kWithSanitizers) {
     GTEST_SKIP() << "Sanitizers take address space without end.";
   }
-  const bool isRun = std::get<Use>(GetParam()).arguments.front() == "run";
   const ProgramResult enough = runProgram(call(std::nullopt));
-  if (isRun) {
-    makeSettings();
+  if (changesTheDevice()) {
+    prepare();
   }
   const std::string before = readText(kSettingsPath);
   std::uint64_t memory = leastMemory();
@@ -104,9 +136,10 @@ TEST_P(LittleMemory, EndsWithOneClearLineOrAsWithEnough) {
   for (int step = 0; step < kMostSteps; ++step, memory += kLimitStep) {
     const ProgramResult result = runProgram(call(memory));
     if (result.exitStatus == enough.exitStatus) {
-      if (!std::get<Use>(GetParam()).isHost) {
+      if (!changesTheDevice() && !isOf("plan")) {
         EXPECT_EQ(result.output, enough.output);
       }
+      EXPECT_EQ(readText(kSettingsPath) != before, isOf("run") || isPutBack());
       std::cout << failures << " limits too low\n";
       // Some take no more than starting.
       EXPECT_TRUE(failures > 0 || takesLittle());
@@ -114,15 +147,40 @@ TEST_P(LittleMemory, EndsWithOneClearLineOrAsWithEnough) {
     }
     ++failures;
     SCOPED_TRACE(std::to_string(memory / kKibibyte) + " KiB");
-    EXPECT_EQ(result.exitStatus, kMayPass) << result.errors;
-    std::size_t lines = 0;
-    for (const std::string& line : result.errorLines()) {
-      const bool isOfTheProgram =
-          line.starts_with("migration-host: ") || line.starts_with("accountsctl: ");
-      lines += isOfTheProgram ? 1 : 0;
-      EXPECT_TRUE(!isOfTheProgram || line.find("memory") != std::string::npos) << line;
+    expectOneClearLine(result, "memory");
+    EXPECT_EQ(readText(kSettingsPath), before);
+    if (HasFailure()) {
+      return;
     }
-    EXPECT_EQ(lines, 1u) << result.errors;
+  }
+  ADD_FAILURE() << "no limit was enough";
+}
+
+TEST_P(LittleMemory, SoItIsWithFewDescriptors) {
+  constexpr int kStandardStreamsAndALibrary = 4;
+  constexpr int kMostDescriptors = 64;
+  const ProgramResult enough = runProgram(call(std::nullopt));
+  if (changesTheDevice()) {
+    prepare();
+  }
+  const std::string before = readText(kSettingsPath);
+  for (int count = kStandardStreamsAndALibrary; count < kMostDescriptors; ++count) {
+    SCOPED_TRACE(std::to_string(count) + " descriptors");
+    ProgramCall limited = call(std::nullopt);
+    limited.arguments.insert(limited.arguments.begin(), {"-c", "ulimit -n \"$0\"; exec \"$@\"",
+                                                         std::to_string(count), limited.program});
+    limited.program = "sh";
+
+    const ProgramResult result = runProgram(limited);
+
+    if (result.exitStatus == enough.exitStatus) {
+      if (!changesTheDevice() && !isOf("plan")) {
+        EXPECT_EQ(result.output, enough.output);
+      }
+      EXPECT_EQ(readText(kSettingsPath) != before, isOf("run") || isPutBack());
+      return;
+    }
+    expectOneClearLine(result, "Too many open files");
     EXPECT_EQ(readText(kSettingsPath), before);
     if (HasFailure()) {
       return;
@@ -137,7 +195,9 @@ INSTANTIATE_TEST_SUITE_P(
         testing::Values(Use{"Run", true, {"run", "--root", "ROOT"}},
                         Use{"Plan", true, {"plan", "--root", "ROOT"}},
                         Use{"PlanAsJSON", true, {"plan", "--root", "ROOT", "--json"}},
+                        Use{"Restore", true, {"restore", "--root", "ROOT"}},
                         Use{"RestoreList", true, {"restore", "--root", "ROOT", "--list"}},
+                        Use{"Discard", true, {"restore", "--root", "ROOT", "--discard"}},
                         Use{"Show", false, {"show", "FILE"}},
                         Use{"ShowAsJSON", false, {"show", "FILE", "--json"}},
                         Use{"Check", false, {"check", "FILE"}},
