@@ -140,14 +140,15 @@ TEST(BinaryScalars, AnUnpairedUTF16UnitIsKeptAndWrittenBackAsItWas) {
 }
 
 TEST(BinaryScalars, AKindThatPropertyListsDoNotHaveIsRefusedByName) {
-  EXPECT_TRUE(contains(errorOf("\0"s), "a null"));
-  EXPECT_TRUE(contains(errorOf("\x0F"), "a fill byte"));
-  EXPECT_TRUE(contains(errorOf("\x0C\x50"), "a URL"));
-  EXPECT_TRUE(contains(errorOf("\x0D\x50\x50"), "a URL"));
-  EXPECT_TRUE(contains(errorOf("\x0E" + std::string(16, 'u')), "a UUID"));
-  EXPECT_TRUE(contains(errorOf("\x80\x01"), "a UID"));
-  EXPECT_TRUE(contains(errorOf("\xB0"), "an ordered set"));
-  EXPECT_TRUE(contains(errorOf("\xC0"), "a set"));
+  EXPECT_TRUE(contains(errorOf("\0"s), "a null, which no property list of ours has"));
+  EXPECT_TRUE(contains(errorOf("\x0F"), "a fill byte in place of an object"));
+  EXPECT_TRUE(contains(errorOf("\x0C\x50"), "a URL, which no property list of ours has"));
+  EXPECT_TRUE(contains(errorOf("\x0D\x50\x50"), "a URL, which no property list of ours has"));
+  EXPECT_TRUE(contains(errorOf("\x0E" + std::string(16, 'u')),
+                       "a UUID, which no property list of ours has"));
+  EXPECT_TRUE(contains(errorOf("\x80\x01"), "a UID, which no property list of ours has"));
+  EXPECT_TRUE(contains(errorOf("\xB0"), "an ordered set, which no property list of ours has"));
+  EXPECT_TRUE(contains(errorOf("\xC0"), "a set, which no property list of ours has"));
   EXPECT_TRUE(contains(errorOf("\x01"), "an object of unknown kind"));
   EXPECT_TRUE(contains(errorOf("\x71"), "an object of unknown kind"));
   EXPECT_TRUE(contains(errorOf("\xF0"), "an object of unknown kind"));
