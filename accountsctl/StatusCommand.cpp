@@ -128,6 +128,12 @@ CommandResult status(const StatusOptions& options, const Terminal& terminal) {
   const ExitStatus exitStatus =
       options.failsIfPending && found.isPending() ? ExitStatus::Attention : ExitStatus::Success;
   const Rehearsed rehearsed = rehearseDevice(*device);
+  // What this machine lacks or its medium does not give says nothing of the device.
+  const auto* const error = std::get_if<ProgramError>(&rehearsed);
+  if (error != nullptr && (error->exitStatus == ExitStatus::TemporaryFailure ||
+                           error->exitStatus == ExitStatus::InputOutputError)) {
+    return *error;
+  }
   return CommandReport{options.reportsJSON ? objectLine(options, found, rehearsed, exitStatus)
                                            : textOf(found, rehearsed, terminal),
                        exitStatus};
