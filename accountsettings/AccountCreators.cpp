@@ -37,7 +37,7 @@ void loadCreatorFramework(std::string_view relativePath, std::string_view operat
 
 void failOnException(const std::optional<Text>& className, std::string_view operation,
                      std::string_view sourceFile) {
-  std::string words = "one without words";
+  std::string words;
   try {
     throw;
   } catch (const std::bad_alloc&) {
@@ -45,6 +45,7 @@ void failOnException(const std::optional<Text>& className, std::string_view oper
   } catch (const std::exception& exception) {
     words = exception.what();
   } catch (...) {
+    words = "one without words";
   }
   failAssertion(operation, sourceFile, "The class %@ threw an exception: %@", {className, words});
 }
