@@ -144,9 +144,7 @@ TEST_F(CreatorAssertionsDeathTest, AClassThatThrowsWhileItMakesAnAccount) {
     throw std::runtime_error("no\nserver");
   };
   frameworkLoader.registerClass("Creator", creator);
-  expectDeathOfFullAccount(
-      "-[BasicAccount fullAccountUsingLoader:], BasicAccount: The class Creator threw an "
-      "exception: no\\nserver\n");
+  expectDeathOfFullAccount("The class Creator threw an exception: no\\nserver\n");
   const BasicAccountReference record = account("A", kMailAccountType);
   EXPECT_EXIT(static_cast<void>(record->_cachedSyncAccount()), testing::KilledBySignal(SIGABRT),
               testing::HasSubstr("The class Creator threw an exception: no\\nserver\n"));

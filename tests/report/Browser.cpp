@@ -39,7 +39,7 @@ constexpr std::string_view kDriverStart = R"js(
   };
   const drive = async () => {
     // A long report is expanded first.
-    while (one("#report").type === "application/gzip" && one("h1") === null) {
+    while (one("#report")?.type === "application/gzip" && one("h1") === null) {
       await pause();
     }
 )js";
