@@ -40,6 +40,8 @@ bool needsFixing(const PropertyDictionary& properties) {
 void NewestSave::note(const PropertyArray& written, const OrderedAccounts& inMemory,
                       FixResult fixing) {
   const PropertyArray before = std::exchange(written_, PropertyArray());
+  std::vector<Text> identifiers;
+  // Empty beside an empty array, which others may write, too.
   identifiers_.clear();
   if (fixing == FixResult::CannotBeKept) {
     return;
@@ -62,9 +64,10 @@ void NewestSave::note(const PropertyArray& written, const OrderedAccounts& inMem
     if (std::exchange(known[*identifier], true)) {
       return;
     }
-    identifiers_.push_back(*identifier);
+    identifiers.push_back(*identifier);
   }
   written_ = written;
+  identifiers_ = std::move(identifiers);
 }
 
 bool NewestSave::isThere(const PropertyArray& onDisk, const OrderedAccounts& inMemory) const {

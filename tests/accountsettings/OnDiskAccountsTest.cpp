@@ -66,6 +66,14 @@ TEST_F(OnDiskAccountsTest, AChildsIdentifierFindsItsParent) {
   EXPECT_EQ(onDisk.propertiesForAccountAt(1), std::nullopt);
 }
 
+TEST_F(OnDiskAccountsTest, AFileThatAnotherProgramEmptiedHasNoAccountOfTheLastSave) {
+  const OrderedAccounts saved = memoryOf({mail("A"), mail("B")});
+  NewestSave lastSave;
+  lastSave.note({mail("A"), mail("B").without(kAccountIdentifier)}, saved, FixResult::Unchanged);
+  const OrderedAccounts memory = memoryOf({mail("A")});
+  EXPECT_EQ(OnDiskAccounts({}, lastSave, memory).propertiesForAccountAt(0), std::nullopt);
+}
+
 // A store of the same few identifiers in every kind of state, and the file that it saved last, to
 // which the disk may have contributed. Most have changed since.
 TEST_F(OnDiskAccountsTest, WhateverWasSavedTheAnswersAreThoseOfAStoreMadeFromTheFile) {
@@ -105,7 +113,7 @@ TEST_F(OnDiskAccountsTest, WhateverWasSavedTheAnswersAreThoseOfAStoreMadeFromThe
       elements.emplace_back(isContributed ? dictionary() : account->properties());
       memory.append(account);
     }
-    const PropertyArray file(std::move(elements));
+    PropertyArray file(std::move(elements));
     lastSave.note(file, memory, fixing);
     for (const BasicAccountReference& account : memory.accounts()) {
       account->setAccountProperty_forKey(identifier(), "Username");
@@ -115,6 +123,12 @@ TEST_F(OnDiskAccountsTest, WhateverWasSavedTheAnswersAreThoseOfAStoreMadeFromThe
     }
     if (below(8) == 0) {
       memory.append(mail(identifier()).record());
+    }
+    if (below(8) == 0) {
+      memory.removeLast(identifier());
+    }
+    if (below(8) == 0) {
+      file = PropertyArray();
     }
     unloadedCount += lastSave.isThere(file, memory) && !file.empty() ? 1 : 0;
     const Store store = AccountsManager::initWithAccounsInfoArray(file);
