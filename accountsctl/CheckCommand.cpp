@@ -48,9 +48,8 @@ LinuxPlatformOptions platformOptions(const CheckOptions& options) {
   return result;
 }
 
-std::string textOf(const std::vector<Finding>& findings, const Rehearsed& rehearsed,
+std::string textOf(const std::vector<Finding>& findings, const std::string& losses,
                    const Terminal& terminal) {
-  const std::string losses = linesOf(rehearsed);
   if (findings.empty()) {
     return losses.empty() ? "Nothing found\n" : losses;
   }
@@ -109,11 +108,12 @@ CommandResult check(const CheckOptions& options, const Terminal& terminal) {
   const std::vector<Finding> findings = checked->findings(*content.asDictionary());
   const Rehearsed rehearsed = rehearseFile(*std::get<std::unique_ptr<DevicePlatform>>(platform),
                                            kind, content, options.file);
-  const bool isGood = findings.empty() && linesOf(rehearsed).empty();
+  const std::string losses = linesOf(rehearsed);
+  const bool isGood = findings.empty() && losses.empty();
   const ExitStatus exitStatus = isGood ? ExitStatus::Success : ExitStatus::Attention;
   return CommandReport{options.reportsJSON
                            ? objectLine(options, kind, findings, rehearsed, exitStatus)
-                           : textOf(findings, rehearsed, terminal),
+                           : textOf(findings, losses, terminal),
                        exitStatus};
 }
 

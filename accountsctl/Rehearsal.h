@@ -14,11 +14,13 @@ namespace accounts {
 /// written; or why a run would fail.
 using Rehearsed = std::variant<AccountLedger, ProgramError>;
 
-/// Rehearses the migration of a device.
+/// Rehearses the migration of a device. A snapshot that cannot be taken is an error too, with the
+/// status of what cannot be read.
 Rehearsed rehearseDevice(DevicePlatform& device);
 
 /// Rehearses the migration of a device that has one file alone: account settings or a legacy store.
-/// `name` is what the ledger calls the file.
+/// `name` is what the ledger calls the file. A value that no settings file can hold is malformed
+/// input.
 Rehearsed rehearseFile(DevicePlatform& device, FileKind kind, const PropertyValue& content,
                        const std::string& name);
 

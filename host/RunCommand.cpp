@@ -175,6 +175,7 @@ class OpenedRun {
         return tell(options_, finished, nullptr);
       }
     }
+    places_.removeAbandonedTemporaryFiles();
     WorkerProcess worker([this](const WorkerSide& side, const DeviceSnapshot&,
                                 const WorkerTask&) { workOnDevice(work_, side); },
                          stop_, WorkerRights::ThoseOfTheHost);

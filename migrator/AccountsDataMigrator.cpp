@@ -41,7 +41,6 @@ bool AccountsDataMigrator::performMigration() {
   std::unique_ptr<NamedLock> lock = AccountsManager::createAndLockMigrationLock();
   bool succeeded = false;
   if (lock != nullptr) {
-    removeAbandonedTemporaryFiles();
     succeeded = executeMigrationSteps();
   }
   AccountsManager::releaseMigrationLock(std::move(lock));

@@ -124,9 +124,6 @@ class AccountsDataMigrator : public MigrationPluginBase {
  private:
   struct Needs;
 
-  /// Removes the temporary files of a migration that was killed, wherever one can leave any. The
-  /// lock being held, no other migration uses one.
-  static void removeAbandonedTemporaryFiles();
   /// Runs the conversions that are needed and the upgrade chain, whose result is returned.
   bool runMigrations(AccountsManager& store, const Needs& needs);
   /// Cleans up after a migration that succeeded and tells others of it.

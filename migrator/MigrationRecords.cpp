@@ -55,14 +55,6 @@ bool makeInformationDirectory(FileSystem& files, const std::string& directory) {
 
 }  // namespace
 
-void AccountsDataMigrator::removeAbandonedTemporaryFiles() {
-  // Beside the default directory, those of the files that are written atomically: the sentinel and
-  // the information files.
-  const std::string sentinel = pathInHomeDirectory(DevicePlace::RemovalSentinel);
-  Process::current().platform.fileSystem.removeAbandonedTemporaryFiles(
-      {std::string(splitPath(sentinel).directory), informationDirectory()});
-}
-
 void AccountsDataMigrator::_copyAsideAccountsPlist() {
   Platform& platform = Process::current().platform;
   const std::string source = AccountsManager::fullPathToAccountSettingsPlist();

@@ -14,6 +14,10 @@ struct AccountOrigin {
   /// else is told of.
   std::uint32_t number = 0;
   bool operator==(const AccountOrigin&) const = default;
+  /// Both in one number, to look an account up by.
+  [[nodiscard]] std::uint64_t key() const {
+    return (static_cast<std::uint64_t>(kind) << 32U) | number;
+  }
 };
 
 /// What becomes of a top-level account or a legacy description, as far as it does not simply end up

@@ -4,7 +4,6 @@
 #include <optional>
 #include <string>
 #include <string_view>
-#include <vector>
 
 #include "platform/Result.h"
 #include "propertylist/value/SerializedPropertyList.h"
@@ -36,11 +35,6 @@ class FileSystem {
   /// Makes a new, empty file with a unique name in the default temporary directory, readable by its
   /// owner alone, and gives its path; none when it cannot be made.
   virtual std::optional<std::string> makeTemporaryFile() = 0;
-  /// Removes temporary files whose makers ended without removing them, from the default temporary
-  /// directory and from further directories, where writeFileAtomically puts its own. A file whose
-  /// maker still runs stays, and so does everything else. Failures leave a file for the next time.
-  virtual void removeAbandonedTemporaryFiles(
-      const std::vector<std::string>& furtherDirectories) = 0;
   /// Writes a property list to a path in place: after a failure the file may hold a part of it.
   virtual Result writeFile(std::string_view path, const SerializedPropertyList& contents) = 0;
   /// Writes a property list to a path so that a reader sees the old file or the whole new one,

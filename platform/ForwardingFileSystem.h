@@ -24,9 +24,6 @@ class ForwardingFileSystem : public FileSystem {
     return files_.createDirectoryWithIntermediates(path, permissions);
   }
   std::optional<std::string> makeTemporaryFile() override { return files_.makeTemporaryFile(); }
-  void removeAbandonedTemporaryFiles(const std::vector<std::string>& furtherDirectories) override {
-    files_.removeAbandonedTemporaryFiles(furtherDirectories);
-  }
   Result writeFile(std::string_view path, const SerializedPropertyList& contents) override {
     return files_.writeFile(path, contents);
   }

@@ -6,6 +6,7 @@
 
 #include "inspection/DifferenceText.h"
 #include "propertylist/value/Description.h"
+#include "propertylist/value/GeneralisedUTF8.h"
 
 namespace accounts {
 namespace {
@@ -81,16 +82,10 @@ std::string valueText(const JSON& property, const char* key) {
   if (value.is_null()) {
     return "none";
   }
-  std::string text = escapedText(value.is_string() ? value.get<std::string>() : lineOf(value));
-  if (text.size() > kLongestValue) {
-    text.resize(kLongestValue);
-    // Not in the middle of a character.
-    while (!text.empty() && (static_cast<unsigned char>(text.back()) & 0xc0U) == 0x80U) {
-      text.pop_back();
-    }
-    text += "…";
-  }
-  return text;
+  const std::string text =
+      escapedText(value.is_string() ? value.get<std::string>() : lineOf(value));
+  const std::string_view beginning = wholeCodePoints(text, kLongestValue);
+  return std::string(beginning) + (beginning.size() < text.size() ? "…" : "");
 }
 
 std::string originLine(const JSON& account) {

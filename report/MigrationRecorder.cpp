@@ -5,6 +5,7 @@
 
 #include "inspection/AccountTree.h"
 #include "inspection/DifferenceJSON.h"
+#include "propertylist/value/GeneralisedUTF8.h"
 #include "report/RecordedEvents.h"
 #include "safetynet/AccountLedger.h"
 #include "vocabulary/AccountVocabulary.h"
@@ -22,11 +23,8 @@ std::string shortened(std::string_view line) {
   if (line.size() <= kLongestLogLine) {
     return std::string(line);
   }
-  std::size_t end = kLongestLogLine;
-  while (end > 0 && (static_cast<unsigned char>(line[end]) & 0xC0) == 0x80) {
-    --end;
-  }
-  return std::string(line.substr(0, end)) + "… (" + std::to_string(line.size() - end) +
+  const std::string_view beginning = wholeCodePoints(line, kLongestLogLine);
+  return std::string(beginning) + "… (" + std::to_string(line.size() - beginning.size()) +
          " bytes more)";
 }
 
@@ -48,19 +46,16 @@ std::vector<AccountOrigin> originsIn(const PropertyDictionary& settings) {
 /// Of each account the place where it stood before.
 Partners partnersOf(const std::vector<AccountOrigin>& accounts,
                     const std::vector<AccountOrigin>& before) {
-  const auto keyOf = [](AccountOrigin origin) {
-    return (static_cast<std::uint64_t>(origin.kind) << 32U) | origin.number;
-  };
   std::unordered_map<std::uint64_t, std::size_t> places;
   for (std::size_t index = 0; index < before.size(); ++index) {
     // Of made accounts that nothing is told of there may be several.
     if (before[index] != AccountOrigin()) {
-      places.emplace(keyOf(before[index]), index);
+      places.emplace(before[index].key(), index);
     }
   }
   Partners partners(accounts.size());
   for (std::size_t index = 0; index < accounts.size(); ++index) {
-    if (const auto found = places.find(keyOf(accounts[index])); found != places.end()) {
+    if (const auto found = places.find(accounts[index].key()); found != places.end()) {
       partners[index] = found->second;
     }
   }

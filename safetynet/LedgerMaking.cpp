@@ -20,10 +20,6 @@ using Kind = AccountOrigin::Kind;
 constexpr std::array kInputKinds = {Kind::Exchange, Kind::OutgoingMail, Kind::IncomingMail,
                                     Kind::Settings};
 
-std::uint64_t keyOf(AccountOrigin origin) {
-  return (static_cast<std::uint64_t>(origin.kind) << 32U) | origin.number;
-}
-
 const PropertyDictionary* dictionaryAt(const PropertyArray& accounts, std::size_t index) {
   return index < accounts.size() ? accounts.at(index).asDictionary() : nullptr;
 }
@@ -108,7 +104,7 @@ class LedgerMaker {
     const PropertyArray& accounts = inputsOf(Kind::Settings);
     for (std::size_t index = 0; index < accounts.size(); ++index) {
       const auto number = static_cast<std::uint32_t>(index);
-      now_[keyOf({Kind::Settings, number})] = number;
+      now_[AccountOrigin{Kind::Settings, number}.key()] = number;
     }
     accountFor(DevicePlace::Settings);
   }
@@ -146,11 +142,11 @@ class LedgerMaker {
     if (told_.saved() && told_.saved()->size() == ledger_.result.size()) {
       now_.reserve(told_.saved()->size());
       for (std::size_t index = 0; index < told_.saved()->size(); ++index) {
-        now_.emplace(keyOf((*told_.saved())[index]), static_cast<std::uint32_t>(index));
+        now_.emplace((*told_.saved())[index].key(), static_cast<std::uint32_t>(index));
       }
     }
     for (const KeptEvent& event : told_.events()) {
-      events_[keyOf(event.account)].push_back(&event);
+      events_[event.account.key()].push_back(&event);
     }
   }
 
@@ -165,12 +161,12 @@ class LedgerMaker {
   }
 
   [[nodiscard]] std::optional<std::uint32_t> placeNow(AccountOrigin origin) const {
-    const auto found = now_.find(keyOf(origin));
+    const auto found = now_.find(origin.key());
     return found != now_.end() ? std::optional(found->second) : std::nullopt;
   }
 
   [[nodiscard]] std::span<const KeptEvent* const> eventsOf(AccountOrigin origin) const {
-    const auto found = events_.find(keyOf(origin));
+    const auto found = events_.find(origin.key());
     return found != events_.end() ? std::span<const KeptEvent* const>(found->second)
                                   : std::span<const KeptEvent* const>();
   }

@@ -133,9 +133,6 @@ std::optional<std::string> TransactionFileSystem::makeTemporaryFile() {
   return path;
 }
 
-void TransactionFileSystem::removeAbandonedTemporaryFiles(
-    const std::vector<std::string>& /*furtherDirectories*/) {}
-
 Result TransactionFileSystem::writeFile(std::string_view path,
                                         const SerializedPropertyList& contents) {
   const auto temporary = temporaryFiles_.find(path);

@@ -6,7 +6,6 @@
 #include <string>
 #include <string_view>
 #include <variant>
-#include <vector>
 
 #include "platform/FileSystem.h"
 #include "transaction/Transaction.h"
@@ -43,8 +42,6 @@ class TransactionFileSystem final : public FileSystem {
   Result createFile(std::string_view path, std::string_view contents) override;
   Result createDirectoryWithIntermediates(std::string_view path, unsigned permissions) override;
   std::optional<std::string> makeTemporaryFile() override;
-  /// Does nothing: what killed runs left is dealt with by whoever commits.
-  void removeAbandonedTemporaryFiles(const std::vector<std::string>& furtherDirectories) override;
   Result writeFile(std::string_view path, const SerializedPropertyList& contents) override;
   Result writeFileAtomically(std::string_view path,
                              const SerializedPropertyList& contents) override;

@@ -43,6 +43,10 @@ class LinuxDevicePlaces final : public DevicePlaces {
   std::optional<PlaceFailure> writeInformationFile(std::string_view name,
                                                    const ReadableBytes& contents) override;
   std::vector<std::string> settleLeftovers() override;
+  /// Only removes the temporary files of killed runs that no commit knows of, as those of a plug-in
+  /// that works on the device itself. Needs no lock. What cannot be removed stays for the next
+  /// time.
+  void removeAbandonedTemporaryFiles();
 
  private:
   /// An error number of a change, or 0 where it is that of a mount that is overlooked.

@@ -70,10 +70,17 @@ std::vector<std::string> LinuxDevicePlaces::settleLeftovers() {
       }
     }
   }
-  // An information file is made beside others of its directory, which is a place itself.
-  seen.insert(pathOf(DevicePlace::InformationDirectory));
-  files_.removeAbandonedTemporaryFiles({seen.begin(), seen.end()});
+  removeAbandonedTemporaryFiles();
   return sentences;
+}
+
+void LinuxDevicePlaces::removeAbandonedTemporaryFiles() {
+  // An information file is made beside others of its directory, which is a place itself.
+  std::set<std::string, std::less<>> directories = {pathOf(DevicePlace::InformationDirectory)};
+  for (const ListedPlace& each : kDevicePlaces) {
+    directories.emplace(splitPath(pathOf(each.place)).directory);
+  }
+  files_.removeAbandonedTemporaryFiles({directories.begin(), directories.end()});
 }
 
 }  // namespace accounts

@@ -46,9 +46,12 @@ class LinuxFileSystem final : public FileSystem, public FileKeeping {
   Result synchronizeDirectory(std::string_view path) override;
 
   std::optional<std::string> makeTemporaryFile() override;
-  /// A maker holds a lock (flock) on its file until it renames or removes it, or ends. Where the
-  /// file system has no such locks, no file counts as abandoned.
-  void removeAbandonedTemporaryFiles(const std::vector<std::string>& furtherDirectories) override;
+  /// Removes temporary files whose makers ended without removing them, from the default temporary
+  /// directory and from further directories, where writeFileAtomically() puts its own. A maker
+  /// holds a lock (flock) on its file until it renames or removes it, or ends; where the file
+  /// system has no such locks, no file counts as abandoned. Failures leave a file for the next
+  /// time.
+  void removeAbandonedTemporaryFiles(const std::vector<std::string>& furtherDirectories);
   Result writeFile(std::string_view path, const SerializedPropertyList& contents) override;
   Result writeFileAtomically(std::string_view path,
                              const SerializedPropertyList& contents) override;

@@ -98,6 +98,16 @@ inline bool isGeneralisedUTF8(std::string_view text) {
   return true;
 }
 
+/// As much of a well-formed text's beginning as is at most `size` bytes long and ends with a code
+/// point.
+inline std::string_view wholeCodePoints(std::string_view text, std::size_t size) {
+  std::size_t end = std::min(size, text.size());
+  while (end > 0 && end < text.size() && (static_cast<unsigned char>(text[end]) & 0xC0) == 0x80) {
+    --end;
+  }
+  return text.substr(0, end);
+}
+
 /// Appends a code point, surrogates included, as generalised UTF-8.
 inline void appendCodePoint(std::string& text, char32_t codePoint) {
   const auto append = [&](char32_t byte) { text.push_back(static_cast<char>(byte)); };

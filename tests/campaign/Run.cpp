@@ -98,6 +98,7 @@ class Host {
         return;
       }
     }
+    places_.removeAbandonedTemporaryFiles();
     run_.succeeded = AccountsDataMigrator().performMigration();
   }
 

@@ -62,7 +62,6 @@ void FakeFileSystem::removeFaults() {
 }
 
 void FakeFileSystem::stopWorld() {
-  ownTemporaryFiles_.clear();
   throw WorldStopped();
 }
 
@@ -142,7 +141,6 @@ Result FakeFileSystem::removeFile(std::string_view path) {
     if (file == files.end()) {
       return noSuchFile(path);
     }
-    ownTemporaryFiles_.erase(file->first);
     files.erase(file);
     return Result::success();
   });
@@ -171,7 +169,6 @@ std::optional<std::string> FakeFileSystem::makeTemporaryFile() {
     Result made = put(path, "");
     if (made) {
       files[path].permissions = 0600;
-      ownTemporaryFiles_.insert(path);
     }
     return made;
   });
@@ -213,7 +210,6 @@ Result FakeFileSystem::renameFile(std::string_view source, std::string_view dest
       return Result::failure(std::string(destination) + ": Is a directory");
     }
     FakeFile moved = std::move(file->second);
-    ownTemporaryFiles_.erase(file->first);
     files.erase(file);
     files.insert_or_assign(std::string(destination), std::move(moved));
     return Result::success();
@@ -228,18 +224,6 @@ EntryKind FakeFileSystem::kindOf(std::string_view path) const {
     return EntryKind::Directory;
   }
   return files.contains(path) ? EntryKind::RegularFile : EntryKind::Nothing;
-}
-
-void FakeFileSystem::removeAbandonedTemporaryFiles(
-    const std::vector<std::string>& /*furtherDirectories*/) {
-  (void)perform("removeAbandonedTemporaryFiles", [&] {
-    for (const std::string& path : temporaryFiles()) {
-      if (!ownTemporaryFiles_.contains(path)) {
-        files.erase(path);
-      }
-    }
-    return Result::success();
-  });
 }
 
 }  // namespace accounts

@@ -74,9 +74,6 @@ class FakeFileSystem : public FileSystem {
   Result createFile(std::string_view path, std::string_view contents) override;
   Result createDirectoryWithIntermediates(std::string_view path, unsigned permissions) override;
   std::optional<std::string> makeTemporaryFile() override;
-  /// A temporary file is abandoned unless the running process, which ends when the world stops,
-  /// made it.
-  void removeAbandonedTemporaryFiles(const std::vector<std::string>& furtherDirectories) override;
   Result writeFile(std::string_view path, const SerializedPropertyList& contents) override;
   Result writeFileAtomically(std::string_view path,
                              const SerializedPropertyList& contents) override;
@@ -95,7 +92,6 @@ class FakeFileSystem : public FileSystem {
   std::vector<std::string>& journal_;
   std::size_t operationCount_ = 0;
   std::size_t temporaryFileCount_ = 0;
-  std::set<std::string, std::less<>> ownTemporaryFiles_;
   std::set<std::string> failingBeginnings_;
   std::optional<std::size_t> failAt_, failFrom_, stopBefore_, stopAfter_;
 };

@@ -30,31 +30,6 @@ TEST_F(PerformMigrationTest, WithoutALockObjectNothingIsDone) {
   EXPECT_FALSE(device.process.shouldSkipNotifications);
 }
 
-TEST_F(PerformMigrationTest, TemporaryFilesOfAKilledMigrationAreRemovedOnceTheLockIsHeld) {
-  device.fileSystem.addFile("/var/mobile/tmp/temporary-of-a-killed-migration", "half a file");
-
-  EXPECT_TRUE(migrator.performMigration());
-
-  EXPECT_TRUE(device.fileSystem.temporaryFiles().empty());
-  ASSERT_GE(device.journal.size(), 2u);
-  EXPECT_EQ(device.journal[1], "removeAbandonedTemporaryFiles");
-}
-
-TEST_F(PerformMigrationTest, AMigrationKilledWhileSavingLeavesItsFileToTheNext) {
-  addSettingsFile(11, {});
-  std::size_t killedAfter = 0;
-  while (device.fileSystem.temporaryFiles().empty()) {
-    // One operation further at each attempt.
-    device.fileSystem.stopAfter(device.fileSystem.operationCount() + killedAfter++);
-    EXPECT_THROW(static_cast<void>(migrator.performMigration()), WorldStopped);
-  }
-  device.fileSystem.removeFaults();
-
-  EXPECT_TRUE(AccountsDataMigrator().performMigration());
-
-  EXPECT_TRUE(device.fileSystem.temporaryFiles().empty());
-}
-
 TEST_F(PerformMigrationTest, TheResultIsThatOfTheMigrationSteps) {
   addSettingsFile(11, {});
 

@@ -73,6 +73,19 @@ TEST_F(AccountStory, IsNotThatOfAnotherAccountThatGotTheIdentifier) {
   EXPECT_EQ(story.find("C → A"), std::string::npos) << story;
 }
 
+TEST_F(AccountStory, CutsALongValueBeforeACharacterAndNotInIt) {
+  const std::string whole(59, 'a');
+  write(kSettingsPath,
+        PropertyDictionary{
+            {"Version", 1},
+            {"Accounts", PropertyArray{PropertyDictionary{{"Identifier", "OLD"},
+                                                          {"uniqueId", whole + "éé"},
+                                                          {"Type", "Mail"},
+                                                          {"Class", "IMAPAccount"}}}}});
+
+  EXPECT_THAT(plan({"--account", "OLD"}).output, HasSubstr("Identifier: OLD → " + whole + "…\n"));
+}
+
 TEST_F(AccountStory, OfNobodySaysSo) {
   EXPECT_EQ(plan({"--account", "NOBODY"}).output,
             "No account has, or had, the identifier NOBODY\n");

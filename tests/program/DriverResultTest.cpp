@@ -32,6 +32,25 @@ class DriverResult : public DeviceRootFixture {
   }
 };
 
+TEST_F(DriverResult, TheTemporaryFilesOfAKilledMigrationAreGoneAfterTheNextOneBareOrNot) {
+  const std::vector<std::string> abandoned = {
+      "/var/mobile/tmp/.accounts-migration-0123456789abcdef",
+      "/var/mobile/Library/Preferences/.accounts-migration-0123456789abcdef",
+      std::string(kInformationDirectory) + "/.accounts-migration-0123456789abcdef"};
+  for (const std::vector<std::string>& arguments :
+       {std::vector<std::string>(), std::vector<std::string>{"--bare"}}) {
+    for (const std::string& each : abandoned) {
+      writeText(each, "half a file");
+    }
+
+    EXPECT_EQ(migrate(arguments).exitStatus, 0);
+
+    for (const std::string& each : abandoned) {
+      EXPECT_FALSE(exists(each)) << each;
+    }
+  }
+}
+
 TEST_F(DriverResult, WithoutADirectoryForTheLockItIsFalse) {
   std::filesystem::remove(onThisMachine("/tmp"));
 

@@ -34,33 +34,26 @@ TEST(OverviewTest, OneSentenceSaysWhatCameOfARunOrAPlan) {
   const json current = {{"before", 12}, {"after", 12}};
   const json none = {{"before", nullptr}, {"after", 12}};
 
+  const auto succeeded = [](const char* command, const json& versions, json more = json::object()) {
+    more.update(
+        {{"command", command}, {"result", true}, {"exitStatus", 0}, {"versions", versions}});
+    return more;
+  };
+  const auto withLedger = [&](const char* fate) {
+    return json{{"accountsBefore", account}, {"accountsAfter", account}, {"ledger", ledger(fate)}};
+  };
+
   const std::vector<std::string> sentences = sentencesOf(json::array({
-      {{"command", "run"}, {"result", true}, {"exitStatus", 0}, {"versions", upgrade}},
-      {{"command", "run"}, {"result", true}, {"exitStatus", 0}, {"versions", none}},
-      {{"command", "run"},
-       {"result", true},
-       {"exitStatus", 0},
-       {"versions", current},
-       {"accountsBefore", account},
-       {"accountsAfter", account},
-       {"ledger", ledger("kept")}},
-      {{"command", "run"},
-       {"result", true},
-       {"exitStatus", 0},
-       {"versions", current},
-       {"accountsBefore", account},
-       {"accountsAfter", account},
-       {"ledger", ledger("changed")}},
-      {{"command", "run"}, {"result", true}, {"exitStatus", 0}, {"versions", current}},
+      succeeded("run", upgrade),
+      succeeded("run", none),
+      succeeded("run", current, withLedger("kept")),
+      succeeded("run", current, withLedger("changed")),
+      succeeded("run", current),
       {{"command", "run"}, {"result", true}, {"exitStatus", 2}, {"versions", upgrade}},
       {{"command", "run"}, {"result", false}, {"exitStatus", 1}, {"versions", upgrade}},
       {{"command", "run"}, {"result", true}, {"exitStatus", 74}},
-      {{"command", "plan"}, {"result", true}, {"exitStatus", 0}, {"versions", upgrade}},
-      {{"command", "plan"},
-       {"result", true},
-       {"exitStatus", 0},
-       {"versions", current},
-       {"ledger", ledger("kept")}},
+      succeeded("plan", upgrade),
+      succeeded("plan", current, {{"ledger", ledger("kept")}}),
       {{"command", "plan"}, {"result", false}, {"exitStatus", 1}},
       json::object(),
   }));

@@ -70,28 +70,6 @@ TEST(HostileBinaryFile, AMillionNestedContainersAreRefused) {
       contains(errorOfReadingBinary(nestedArraysFile(1'000'000)), "nested deeper than the limit"));
 }
 
-TEST(HostileBinaryFile, AChildReadAtALowerLevelCountsWithItsWholeHeightAtAHigherOne) {
-  // Object 0 holds first the chain's lower half, then its upper half, which leads to the lower.
-  const std::size_t half = kMaximumNestingDepth - 2;
-  BinaryFile file;
-  file.setReferenceSize(2);
-  const auto addArray = [&](const std::vector<std::size_t>& children) {
-    std::string array(1, static_cast<char>(0xA0 + children.size()));
-    for (const std::size_t child : children) {
-      BinaryFile::appendNumber(array, child, 2);
-    }
-    file.add(array);
-  };
-  addArray({half, 1});
-  for (std::size_t object = 1; object < 2 * half; ++object) {
-    addArray({object + 1});
-  }
-  addArray({});
-  file.setTopObject(0);
-
-  EXPECT_TRUE(contains(errorOfReadingBinary(file.build()), "nested deeper than the limit"));
-}
-
 TEST(HostileBinaryFile, SharedChildrenMayStandForAsManyValuesAsInAnyFile) {
   // Depth n stands for 2^n - 1 values.
   const PropertyValue value = readBinary(doublingArraysFile(13));

@@ -133,6 +133,12 @@ TEST(BinaryLimits, ASharedChildMayReachAsDeepAsTheLimit) {
   EXPECT_EQ(readBinary(fileWithSharedLowerHalf(kMaximumNestingDepth)).kind(), PropertyKind::Array);
 }
 
+TEST(BinaryLimits, AChildReadAtALowerLevelCountsWithItsWholeHeightAtAHigherOne) {
+  // Neither half is too deep.
+  EXPECT_TRUE(contains(errorOfReadingBinary(fileWithSharedLowerHalf(2 * kMaximumNestingDepth - 3)),
+                       "nested deeper than the limit"));
+}
+
 TEST(BinaryLimits, ASharedChildThatReachesOneLevelDeeperIsRefused) {
   EXPECT_TRUE(contains(errorOfReadingBinary(fileWithSharedLowerHalf(kMaximumNestingDepth + 1)),
                        "containers nested deeper than the limit"));

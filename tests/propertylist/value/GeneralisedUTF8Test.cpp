@@ -54,6 +54,15 @@ TEST(GeneralisedUTF8, IllFormedSequencesHaveNoLength) {
   }
 }
 
+TEST(GeneralisedUTF8, ABeginningIsNotCutInTheMiddleOfACodePoint) {
+  EXPECT_EQ(wholeCodePoints("aé€", 7), "aé€");
+  EXPECT_EQ(wholeCodePoints("aé€", 6), "aé€");
+  EXPECT_EQ(wholeCodePoints("aé€", 5), "aé");
+  EXPECT_EQ(wholeCodePoints("aé€", 3), "aé");
+  EXPECT_EQ(wholeCodePoints("aé€", 2), "a");
+  EXPECT_EQ(wholeCodePoints("é", 1), "");
+}
+
 TEST(GeneralisedUTF8, SurrogatesAreHighOrLowOrNeither) {
   for (const char32_t codePoint :
        {U'\uD7FF', U'\xD800', U'\xDBFF', U'\xDC00', U'\xDFFF', U'\uE000'}) {
