@@ -19,7 +19,7 @@ constexpr std::string_view kTemporaryPlaces[] = {"tmp", "Library/Preferences",
 
 void lookAtSettings(LinuxPlatform& platform, DeviceStatus& status) {
   status.settingsPath = AccountsManager::fullPathToAccountSettingsPlist();
-  PathError error;
+  Failure error;
   const std::optional<PropertyDictionary> root =
       platform.propertyLists().readDictionary(status.settingsPath, error);
   status.hasSettings = root || !error.isMissing();
@@ -68,7 +68,7 @@ std::vector<std::string> pathsWithPrefix(LinuxPlatform& platform, std::string_vi
 
 /// Whether no process has a temporary file in its hands. The lock that tells is given back at once.
 bool isAbandoned(const DeviceRoot& root, const std::string& path) {
-  PathError error;
+  Failure error;
   const std::optional<DirectoryEntry> entry = root.locate(path, error);
   const std::optional<FileDescriptor> file =
       entry ? entry->openRegularFile(O_RDONLY, error) : std::nullopt;

@@ -11,7 +11,7 @@
 namespace accounts {
 
 CommandResult explain(const ExplainOptions& options) {
-  PathError error;
+  Failure error;
   const std::optional<std::string> text = readHostFile(options.report, error);
   if (!text) {
     return programErrorOf(error, ExitStatus::MissingInput);
@@ -19,8 +19,8 @@ CommandResult explain(const ExplainOptions& options) {
   const JSON report = JSON::parse(*text, nullptr, /*allow_exceptions=*/false);
   if (!report.is_object() || !report.contains("stages")) {
     return ProgramError{ExitStatus::MalformedInput,
-                        pathError("read the report", nameOfInput(options.report),
-                                  "It is none that plan or run --report wrote")
+                        pathFailure("read the report", nameOfInput(options.report),
+                                    "It is none that plan or run --report wrote")
                             .text};
   }
   std::optional<std::string> story = accountStory(report, options.identifier);

@@ -9,7 +9,7 @@
 namespace accounts {
 
 std::variant<PropertyValue, ProgramError> readPropertyListInput(const std::string& file) {
-  PathError error;
+  Failure error;
   const std::optional<std::string> bytes = readHostFile(file, error);
   if (!bytes) {
     return programErrorOf(error, ExitStatus::MissingInput);
@@ -19,7 +19,7 @@ std::variant<PropertyValue, ProgramError> readPropertyListInput(const std::strin
   if (!value) {
     return ProgramError{
         ExitStatus::MalformedInput,
-        pathError("read the property list", nameOfInput(file), malformed.text).text};
+        pathFailure("read the property list", nameOfInput(file), malformed.text).text};
   }
   return *std::move(value);
 }

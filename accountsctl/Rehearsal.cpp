@@ -21,7 +21,7 @@ namespace {
 /// Lets everybody have a file: who looks at an image is not who will migrate it.
 class AnyOwner final : public OwnershipRule {
  public:
-  std::variant<FileOwner, PlaceFailure> ownerNamed(std::string_view, std::string_view) override {
+  std::variant<FileOwner, Failure> ownerNamed(std::string_view, std::string_view) override {
     return FileOwner();
   }
 };
@@ -34,7 +34,7 @@ class SilentConsole final : public ConsoleLog {
 class OwnedBytes final : public ReadableBytes {
  public:
   explicit OwnedBytes(std::string bytes) : bytes_(std::move(bytes)) {}
-  std::optional<PlaceFailure> giveTo(const Taker& take) const override {
+  std::optional<Failure> giveTo(const Taker& take) const override {
     static_cast<void>(take(bytes_));
     return std::nullopt;
   }
@@ -60,7 +60,7 @@ DeviceSnapshot snapshotOf(DevicePlace place, std::string bytes, std::string_view
   for (const ListedPlace& each : kDevicePlaces) {
     PlaceState& state = snapshot.places[indexOf(each.place)];
     state.path = pathOfPlace(each.place, home);
-    state.whyNotRead = PlaceFailure{ENOENT, "There is no " + state.path};
+    state.whyNotRead = Failure{ENOENT, "There is no " + state.path};
     state.whyNotRemoved = state.whyNotRead;
   }
   PlaceState& state = snapshot.places[indexOf(place)];
@@ -97,7 +97,7 @@ Rehearsed rehearseDevice(DevicePlatform& device) {
   LinuxPlatform& linux = device.linuxPlatform();
   LinuxDevicePlaces places(linux.root(), linux.fileSystem(), linux.platform().homeDirectory.path());
   const auto snapshot = places.takeSnapshot();
-  if (const auto* failure = std::get_if<PlaceFailure>(&snapshot)) {
+  if (const auto* failure = std::get_if<Failure>(&snapshot)) {
     return readingError(*failure);
   }
   return rehearse(linux, std::get<DeviceSnapshot>(snapshot));

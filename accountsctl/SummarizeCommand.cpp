@@ -84,12 +84,12 @@ std::optional<ProgramError> addFile(const std::string& file, const SummarizeOpti
   if (isRead) {
     return std::nullopt;
   }
-  return programErrorOf(pathError("read", file, errno), ExitStatus::MissingInput);
+  return programErrorOf(pathFailure("read", file, errno), ExitStatus::MissingInput);
 }
 
 /// The roots in a file, each once. Lines may end as on another system, and blank ones are none.
 std::variant<std::vector<std::string>, ProgramError> readRoots(const std::string& file) {
-  PathError error;
+  Failure error;
   const std::optional<std::string> text = readHostFile(file, error);
   if (!text) {
     return programErrorOf(error, ExitStatus::MissingInput);

@@ -4,6 +4,8 @@
 
 #include <string>
 
+#include "platform/Failure.h"
+
 namespace accounts {
 
 /// What the programs tell their callers. Errors have the numbers of sysexits.h.
@@ -32,6 +34,20 @@ enum class ExitStatus : int {
   /// What stands in the way may pass: the same again may succeed.
   TemporaryFailure = EX_TEMPFAIL
 };
+
+/// What a program tells of a failure: one of a medium is an input/output error, one that may pass
+/// is a temporary failure, and every other is `lasting`.
+inline ExitStatus exitStatusOf(const Failure& failure, ExitStatus lasting) {
+  switch (failure.kind()) {
+    case FailureKind::OfTheMedium:
+      return ExitStatus::InputOutputError;
+    case FailureKind::MayPass:
+      return ExitStatus::TemporaryFailure;
+    case FailureKind::Lasting:
+      break;
+  }
+  return lasting;
+}
 
 /// Why a program could not do what it was asked to.
 struct ProgramError {

@@ -25,31 +25,20 @@ ExitStatus exitStatusOf(LinuxPlatformError::Kind kind) {
   return ExitStatus::InputOutputError;
 }
 
-ExitStatus exitStatusOf(FailureKind kind, ExitStatus lasting) {
-  return kind == FailureKind::MayPass ? ExitStatus::TemporaryFailure : lasting;
-}
-
 }  // namespace
 
 ProgramError programErrorOf(const LinuxPlatformError& error) {
-  return {exitStatusOf(error.failure, exitStatusOf(error.kind)), error.text};
+  return programErrorOf(error.failure, exitStatusOf(error.kind));
 }
 
-ProgramError programErrorOf(const PathError& error, ExitStatus lasting) {
-  const bool isOfTheMedium = error.number == EIO;
-  return {exitStatusOf(isOfTheMedium ? FailureKind::Lasting : failureKind(error.number),
-                       isOfTheMedium ? ExitStatus::InputOutputError : lasting),
-          error.text};
-}
-
-ProgramError programErrorOf(const Result& failure, ExitStatus lasting) {
-  return {exitStatusOf(failure.kind(), lasting), failure.error()};
+ProgramError programErrorOf(const Failure& failure, ExitStatus lasting) {
+  return {exitStatusOf(failure, lasting), failure.text};
 }
 
 std::optional<ProgramError> whyNoDevice(const DeviceRoot& root, std::string_view name) {
   std::string missing;
   for (const std::string_view each : kDeviceDirectories) {
-    PathError error;
+    Failure error;
     // What cannot be looked at is there, as far as this is concerned.
     if (root.open(each, O_PATH | O_DIRECTORY, error) || error.number != ENOENT) {
       return std::nullopt;

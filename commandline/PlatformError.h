@@ -11,10 +11,8 @@ namespace accounts {
 /// What stands in the way of a platform, as the program's error.
 ProgramError programErrorOf(const LinuxPlatformError& error);
 
-/// A failure as the program's error: one that may pass has the exit status for that, every other
-/// one `lasting`.
-ProgramError programErrorOf(const PathError& error, ExitStatus lasting);
-ProgramError programErrorOf(const Result& failure, ExitStatus lasting);
+/// A failure as the program's error, with the exit status for its kind.
+ProgramError programErrorOf(const Failure& failure, ExitStatus lasting);
 
 /// Why a root is no device's, such as the empty directory on which an image was to be mounted; none
 /// when it has any of the directories that every device has. `name` is the root as it was named.

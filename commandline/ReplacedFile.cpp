@@ -21,11 +21,11 @@ namespace {
 
 constexpr mode_t kPermissionBits = 07777;
 
-ProgramError cannotCreate(const PathError& error) {
+ProgramError cannotCreate(const Failure& error) {
   return programErrorOf(error, ExitStatus::CannotCreate);
 }
 
-ProgramError cannotWrite(const PathError& error) {
+ProgramError cannotWrite(const Failure& error) {
   return programErrorOf(error, ExitStatus::InputOutputError);
 }
 
@@ -38,11 +38,11 @@ std::optional<ProgramError> examine(const std::string& path, struct stat& status
     const bool isDanglingLink = number == ENOENT && ::lstat(path.c_str(), &link) == 0;
     return number == ENOENT && !isDanglingLink
                ? std::nullopt
-               : std::optional(cannotCreate(pathError("write", path, number)));
+               : std::optional(cannotCreate(pathFailure("write", path, number)));
   }
   return S_ISREG(status.st_mode) || S_ISFIFO(status.st_mode)
              ? std::nullopt
-             : std::optional(cannotCreate(notRegularError("write", path, status.st_mode)));
+             : std::optional(cannotCreate(notRegularFailure("write", path, status.st_mode)));
 }
 
 /// The path from the machine's root, without links, of a file that is there or is to be made; a
@@ -65,12 +65,13 @@ std::string resolved(const std::string& path, bool exists, std::error_code& erro
 std::optional<ProgramError> writeToPipe(const std::string& path, std::string_view contents) {
   const int opened = ::open(path.c_str(), O_WRONLY | O_NONBLOCK | O_NOCTTY | O_CLOEXEC);
   if (opened < 0) {
-    return cannotCreate(errno == ENXIO ? pathError("write", path, "Nobody reads this pipe")
-                                       : pathError("write", path, errno));
+    return cannotCreate(errno == ENXIO ? pathFailure("write", path, "Nobody reads this pipe")
+                                       : pathFailure("write", path, errno));
   }
   const FileDescriptor pipe(opened);
   const int number = writeAll(pipe.number(), contents);
-  return number == 0 ? std::nullopt : std::optional(cannotWrite(pathError("write", path, number)));
+  return number == 0 ? std::nullopt
+                     : std::optional(cannotWrite(pathFailure("write", path, number)));
 }
 
 /// Fills a temporary file; returns 0 or the error number.
@@ -99,9 +100,9 @@ std::variant<Replacement, ProgramError> makeReplacement(const std::string& path,
   std::error_code unresolved;
   std::string target = resolved(path, replaced.st_mode != 0, unresolved);
   if (unresolved) {
-    return cannotCreate(pathError("write", path, unresolved.value()));
+    return cannotCreate(pathFailure("write", path, unresolved.value()));
   }
-  PathError error;
+  Failure error;
   std::optional<DeviceRoot> machine = DeviceRoot::openRoot("/", error);
   if (!machine) {
     return cannotWrite(error);
@@ -133,14 +134,14 @@ std::optional<ProgramError> replaceFile(const std::string& path, std::string_vie
   const auto& [machine, temporary, directory, target, replaced] = std::get<Replacement>(made);
   const int number = fill(temporary.file, contents, replaced);
   const Result moved =
-      number != 0 ? Result::failure(pathError("write", path, number).text, failureKind(number))
+      number != 0 ? pathFailure("write", path, number)
                   : LinuxFileSystem(machine, directory).renameFile(temporary.entry.path(), target);
   if (moved) {
     return std::nullopt;
   }
   // Gone already when only the directory could not be flushed; then there is nothing to remove.
   (void)temporary.entry.remove();
-  return programErrorOf(moved, ExitStatus::InputOutputError);
+  return programErrorOf(moved.failure(), ExitStatus::InputOutputError);
 }
 
 std::optional<ProgramError> whyNotReplaceable(const std::string& path) {
@@ -152,7 +153,7 @@ std::optional<ProgramError> whyNotReplaceable(const std::string& path) {
     // Not opened: closing it again would be the end for whoever reads it.
     return ::access(path.c_str(), W_OK) == 0
                ? std::nullopt
-               : std::optional(cannotCreate(pathError("write", path, errno)));
+               : std::optional(cannotCreate(pathFailure("write", path, errno)));
   }
   const std::variant<Replacement, ProgramError> made = makeReplacement(path, status);
   if (const auto* error = std::get_if<ProgramError>(&made)) {

@@ -5,24 +5,24 @@
 #include <cerrno>
 #include <string>
 
-#include "platform/linux/PlaceFailures.h"
+#include "platform/linux/EntryIdentity.h"
 
 namespace accounts {
 
 KernelOwnershipRule::KernelOwnershipRule(const DeviceRoot& root)
     : names_(root), self_{::geteuid(), ::getegid()} {}
 
-std::variant<FileOwner, PlaceFailure> KernelOwnershipRule::ownerNamed(std::string_view ownerName,
-                                                                      std::string_view groupName) {
-  PathError error;
+std::variant<FileOwner, Failure> KernelOwnershipRule::ownerNamed(std::string_view ownerName,
+                                                                 std::string_view groupName) {
+  Failure error;
   const auto user = names_.userIdentifier(std::string(ownerName), error);
   const auto group = user ? names_.groupIdentifier(std::string(groupName), error) : std::nullopt;
   if (!group) {
-    return placeFailure(error);
+    return error;
   }
   const FileOwner owner = {*user, *group};
   if (self_.user != 0 && owner != self_) {
-    return PlaceFailure{
+    return Failure{
         EPERM, "A file cannot be given to " + std::string(ownerName) + ": Operation not permitted"};
   }
   return owner;

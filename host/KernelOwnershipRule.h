@@ -20,8 +20,8 @@ class KernelOwnershipRule final : public OwnershipRule {
   /// Opens now what tells who `name` is; no other name is known afterwards.
   void readAhead(const std::string& name) { names_.readAhead(name); }
 
-  std::variant<FileOwner, PlaceFailure> ownerNamed(std::string_view ownerName,
-                                                   std::string_view groupName) override;
+  std::variant<FileOwner, Failure> ownerNamed(std::string_view ownerName,
+                                              std::string_view groupName) override;
 
  private:
   OwnerNames names_;

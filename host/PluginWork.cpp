@@ -285,7 +285,7 @@ void workInMemory(const PluginWork& work, const WorkerSide& side, const DeviceSn
       const ProgramError error =
           number != 0
               ? ProgramError{ExitStatus::TemporaryFailure,
-                             pathError("write", "the migration's result in memory", number).text}
+                             pathFailure("write", "the migration's result in memory", number).text}
               : ProgramError{ExitStatus::NotVerified,
                              "The result stands for more values than a file of its size may"};
       proposal.status = error.exitStatus;

@@ -65,9 +65,9 @@ RestoreResult failed(ProgramError error) {
 
 /// Why it cannot be told at the moment what is kept: that is not the same as nothing.
 std::optional<ProgramError> whyUnknown(const DeviceRoot& root) {
-  PathError error;
+  Failure error;
   if (root.open(kAccountMigrationDirectory, O_RDONLY | O_DIRECTORY, error) ||
-      failureKind(error.number) == FailureKind::Lasting) {
+      error.kind() == FailureKind::Lasting) {
     return std::nullopt;
   }
   return programErrorOf(error, ExitStatus::MissingInput);
@@ -101,7 +101,7 @@ RestoreResult discardFolder(KeptFolders& folders, const RestoreOptions& options)
   RestoreResult result;
   std::string& folder = std::get<std::string>(chosen);
   if (const Result discarded = folders.discard(folder); !discarded) {
-    return failed({programErrorOf(discarded, ExitStatus::InputOutputError).exitStatus,
+    return failed({programErrorOf(discarded.failure(), ExitStatus::InputOutputError).exitStatus,
                    "The folder cannot be removed and is still whole: " + discarded.error()});
   }
   result.discarded = std::move(folder);
@@ -111,7 +111,7 @@ RestoreResult discardFolder(KeptFolders& folders, const RestoreOptions& options)
 }  // namespace
 
 RestoreResult runRestoration(const RestoreOptions& options) {
-  PathError error;
+  Failure error;
   const auto root = DeviceRoot::openRoot(options.root, error);
   if (!root) {
     return failed(programErrorOf(error, ExitStatus::MissingInput));

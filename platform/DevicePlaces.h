@@ -21,7 +21,7 @@ struct PlaceOutcome {
   };
   Kind kind = Kind::Done;
   /// Of a failure.
-  PlaceFailure failure = {};
+  Failure failure = {};
   /// Of somebody else's file that was met: whether the new file stood at the place for a moment, so
   /// that what stands there now may come from it.
   bool hasStood = false;
@@ -29,7 +29,7 @@ struct PlaceOutcome {
   static PlaceOutcome done() { return {}; }
   static PlaceOutcome disturbed() { return {.kind = Kind::Disturbed}; }
   static PlaceOutcome overtaken() { return {.kind = Kind::Disturbed, .hasStood = true}; }
-  static PlaceOutcome failed(PlaceFailure failure) {
+  static PlaceOutcome failed(Failure failure) {
     return {.kind = Kind::Failed, .failure = std::move(failure)};
   }
   [[nodiscard]] bool isDone() const { return kind == Kind::Done; }
@@ -63,17 +63,17 @@ class DevicePlaces {
   /// What stands at all places now. A failure when that cannot be told, when a file that a
   /// migration reads cannot be opened for another reason than that none is there, or when two
   /// places are one.
-  virtual std::variant<DeviceSnapshot, PlaceFailure> takeSnapshot() = 0;
+  virtual std::variant<DeviceSnapshot, Failure> takeSnapshot() = 0;
 
   /// What stands at a place now; a failure when that cannot be told.
-  virtual std::variant<FileIdentity, PlaceFailure> identityAt(DevicePlace place) = 0;
+  virtual std::variant<FileIdentity, Failure> identityAt(DevicePlace place) = 0;
 
   /// Makes a new file beside a place.
-  virtual std::variant<std::unique_ptr<StagedFile>, PlaceFailure> stage(DevicePlace place,
-                                                                        const NewFile& file) = 0;
+  virtual std::variant<std::unique_ptr<StagedFile>, Failure> stage(DevicePlace place,
+                                                                   const NewFile& file) = 0;
   /// The same with a second name of the kept file at a device path; with a copy that has its
   /// contents, owner, permissions and time, where the file can have no second name.
-  virtual std::variant<std::unique_ptr<StagedFile>, PlaceFailure> stageKept(
+  virtual std::variant<std::unique_ptr<StagedFile>, Failure> stageKept(
       DevicePlace place, std::string_view keptPath) = 0;
 
   /// Gives a staged file its place, in one step, if what stands there is `expected` but for the
@@ -92,14 +92,14 @@ class DevicePlaces {
 
   /// Waits until the names in a place's directory are on the medium; there are none where it has no
   /// directory.
-  virtual std::optional<PlaceFailure> flush(DevicePlace place) = 0;
+  virtual std::optional<Failure> flush(DevicePlace place) = 0;
 
   /// Makes the directory of the migration-information files, with its missing parents, if nothing
   /// is there.
-  virtual std::optional<PlaceFailure> makeInformationDirectory() = 0;
+  virtual std::optional<Failure> makeInformationDirectory() = 0;
   /// Does the same, and makes a file in it. `name` is one component.
-  virtual std::optional<PlaceFailure> writeInformationFile(std::string_view name,
-                                                           const ReadableBytes& contents) = 0;
+  virtual std::optional<Failure> writeInformationFile(std::string_view name,
+                                                      const ReadableBytes& contents) = 0;
 
   /// Deals with what killed runs left beside the places: their own files go, what they had moved
   /// away of others comes back. A sentence for each file that could not be dealt with.

@@ -8,18 +8,11 @@
 #include <string>
 #include <string_view>
 
+#include "platform/Failure.h"
 #include "platform/FileIdentity.h"
 #include "vocabulary/DevicePlaces.h"
 
 namespace accounts {
-
-/// Why something at a place cannot be done.
-struct PlaceFailure {
-  /// The system's error number; 0 when the reason is not the system's.
-  int number = 0;
-  /// "Cannot OPERATION PATH: REASON", for an engineer.
-  std::string text;
-};
 
 /// Bytes that can be read any number of times, such as those of an open file.
 class ReadableBytes {
@@ -31,7 +24,7 @@ class ReadableBytes {
 
   /// Passes the bytes to `take`, piece by piece, until it wants no more. A failure when they cannot
   /// be read; pieces may have been passed before.
-  [[nodiscard]] virtual std::optional<PlaceFailure> giveTo(const Taker& take) const = 0;
+  [[nodiscard]] virtual std::optional<Failure> giveTo(const Taker& take) const = 0;
 };
 
 /// Who a file belongs to, as numbers.
@@ -54,14 +47,14 @@ struct PlaceState {
   /// The contents of the regular file that the path leads to; null when there is none.
   std::shared_ptr<const ReadableBytes> contents;
   /// Why the path cannot be read as a file; set exactly when `contents` is null.
-  std::optional<PlaceFailure> whyNotRead;
+  std::optional<Failure> whyNotRead;
   /// Why no file could be made under the name or put in the place of what has it: the directory
   /// is missing, may not be written, or something stands there that no file replaces.
-  std::optional<PlaceFailure> whyNotReplaced;
+  std::optional<Failure> whyNotReplaced;
   /// Why what has the name could not be removed; also when nothing has it.
-  std::optional<PlaceFailure> whyNotRemoved;
+  std::optional<Failure> whyNotRemoved;
   /// For a directory: why it could not be made.
-  std::optional<PlaceFailure> whyNotMade;
+  std::optional<Failure> whyNotMade;
 };
 
 /// The places of a device at one moment: all that a migration in memory knows of its files.

@@ -4,33 +4,26 @@
 #include <string>
 #include <utility>
 
+#include "platform/Failure.h"
+
 namespace accounts {
 
-/// Whether doing the same again may help without anybody changing anything: there may be room
-/// again, or a medium may answer again.
-enum class FailureKind { Lasting, MayPass };
-
-/// What an operation of the platform that can fail gives back: success, or an error text for an
-/// engineer.
+/// What an operation of the platform that can fail gives back: success, or the failure.
 class [[nodiscard]] Result {
  public:
-  static Result success() { return Result(std::nullopt); }
-  /// `error` says in words what went wrong, with the path or name concerned.
-  static Result failure(std::string error, FailureKind kind = FailureKind::Lasting) {
-    return Result(std::move(error), kind);
-  }
+  static Result success() { return Result(); }
+  /// A failure whose reason is not the system's.
+  static Result failure(std::string text) { return Failure{0, std::move(text)}; }
+  Result(Failure failure) : failure_(std::move(failure)) {}
 
-  explicit operator bool() const { return !error_.has_value(); }
-  /// The error text; only a failure has one.
-  [[nodiscard]] const std::string& error() const { return *error_; }
-  /// Of which kind a failure is.
-  [[nodiscard]] FailureKind kind() const { return kind_; }
+  explicit operator bool() const { return !failure_.has_value(); }
+  /// Only of a failure.
+  [[nodiscard]] const Failure& failure() const { return *failure_; }
+  [[nodiscard]] const std::string& error() const { return failure_->text; }
 
  private:
-  explicit Result(std::optional<std::string> error, FailureKind kind = FailureKind::Lasting)
-      : error_(std::move(error)), kind_(kind) {}
-  std::optional<std::string> error_;
-  FailureKind kind_;
+  Result() = default;
+  std::optional<Failure> failure_;
 };
 
 }  // namespace accounts

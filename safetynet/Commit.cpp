@@ -24,7 +24,7 @@ constexpr std::array kKeptPlaces = {
 class TextBytes final : public ReadableBytes {
  public:
   explicit TextBytes(std::string_view text) : text_(text) {}
-  std::optional<PlaceFailure> giveTo(const Taker& take) const override {
+  std::optional<Failure> giveTo(const Taker& take) const override {
     static_cast<void>(take(text_));
     return std::nullopt;
   }
@@ -89,7 +89,7 @@ std::optional<CommitOutcome> Commit::replaceSettings() {
   if (change != nullptr) {
     const auto contents = contentsOf_(*change);
     auto made = places_.stage(change->place, {.contents = contents.get(), .owner = change->owner});
-    if (const auto* failure = std::get_if<PlaceFailure>(&made)) {
+    if (const auto* failure = std::get_if<Failure>(&made)) {
       return failed(writingError("The settings file cannot be written", *failure));
     }
     staged = std::move(std::get<std::unique_ptr<StagedFile>>(made));
@@ -125,7 +125,7 @@ std::optional<CommitOutcome> Commit::whyNotUndisturbed() {
       continue;
     }
     const auto now = places_.identityAt(each.place);
-    if (const auto* failure = std::get_if<PlaceFailure>(&now)) {
+    if (const auto* failure = std::get_if<Failure>(&now)) {
       const PlaceState& state = snapshot_.at(each.place);
       if (!state.identity.exists() && state.whyNotReplaced) {
         // Nothing could be told of it before either, and nothing is done there.
@@ -175,7 +175,7 @@ std::optional<CommitOutcome> Commit::writeRecord() {
   }
   constexpr std::string_view kOperation = "The commit record cannot be written";
   if (const Result made = folders_.makeDirectory(); !made) {
-    return failed(writingError(kOperation, placeFailureOf(made)));
+    return failed(writingError(kOperation, made.failure()));
   }
   if (isWritten) {
     const auto contents = contentsOf_(*change);
@@ -192,7 +192,7 @@ std::optional<CommitOutcome> Commit::writeRecord() {
 
 PlaceOutcome Commit::write(DevicePlace place, const NewFile& file, FileIdentity& written) {
   auto made = places_.stage(place, file);
-  if (auto* failure = std::get_if<PlaceFailure>(&made)) {
+  if (auto* failure = std::get_if<Failure>(&made)) {
     return PlaceOutcome::failed(std::move(*failure));
   }
   StagedFile& staged = *std::get<std::unique_ptr<StagedFile>>(made);

@@ -63,7 +63,7 @@ std::string_view prefixOf(KeptFor purpose) {
 }
 
 PlaceOutcome outcomeOf(const Result& result) {
-  return result ? PlaceOutcome::done() : PlaceOutcome::failed(placeFailureOf(result));
+  return result ? PlaceOutcome::done() : PlaceOutcome::failed(result.failure());
 }
 
 /// The time, made unique by a number where folders of that time exist; none when that cannot be

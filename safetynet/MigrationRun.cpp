@@ -69,7 +69,7 @@ std::optional<ProgramError> MigrationRun::takeLocks(RunPurpose purpose) {
 
 MigrationRun::Attempt MigrationRun::attempt(RunPurpose purpose, KeepFiles keep) {
   auto taken = means_.places.takeSnapshot();
-  if (const auto* failure = std::get_if<PlaceFailure>(&taken)) {
+  if (const auto* failure = std::get_if<Failure>(&taken)) {
     return fail(readingError(*failure));
   }
   const auto& snapshot = std::get<DeviceSnapshot>(taken);

@@ -3,22 +3,17 @@
 #include <string_view>
 
 #include "commandline/ExitStatus.h"
-#include "platform/DeviceSnapshot.h"
-#include "platform/Result.h"
 
 namespace accounts {
 
 /// What a program says when something at a place could not be read: that of no permission, of too
 /// many links or too much is lasting, that of a medium an input/output error; want of memory or of
 /// descriptors may pass.
-ProgramError readingError(const PlaceFailure& failure);
+ProgramError readingError(const Failure& failure);
 
 /// The same when something could not be written or removed. `operation` says what for, such as
 /// "The settings file cannot be written"; a failure with no system error number cannot be mended by
 /// trying again.
-ProgramError writingError(std::string_view operation, const PlaceFailure& failure);
-
-/// A failure of the platform as one at a place: whether it may pass is all that is known of it.
-PlaceFailure placeFailureOf(const Result& failure);
+ProgramError writingError(std::string_view operation, const Failure& failure);
 
 }  // namespace accounts

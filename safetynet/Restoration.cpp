@@ -72,7 +72,7 @@ class Restorer {
         continue;
       }
       const auto now = places_.identityAt(place);
-      if (const auto* failure = std::get_if<PlaceFailure>(&now)) {
+      if (const auto* failure = std::get_if<Failure>(&now)) {
         return writingError(kOperation, *failure);
       }
       const auto& identity = std::get<FileIdentity>(now);
@@ -111,7 +111,7 @@ class Restorer {
     const auto* identity = std::get_if<FileIdentity>(&now);
     PlaceOutcome outcome;
     if (identity == nullptr) {
-      outcome = PlaceOutcome::failed(std::get<PlaceFailure>(now));
+      outcome = PlaceOutcome::failed(std::get<Failure>(now));
     } else if (identity->exists()) {
       outcome = places_.remove(place, *identity);
       if (outcome.isDone()) {
@@ -128,8 +128,8 @@ class Restorer {
     } else {
       auto staged = places_.stageKept(difference.place,
                                       KeptFolders::pathIn(*restoration_.folder, difference.place));
-      outcome = std::holds_alternative<PlaceFailure>(staged)
-                    ? PlaceOutcome::failed(std::get<PlaceFailure>(std::move(staged)))
+      outcome = std::holds_alternative<Failure>(staged)
+                    ? PlaceOutcome::failed(std::get<Failure>(std::move(staged)))
                     : places_.put(difference.place, *std::get<std::unique_ptr<StagedFile>>(staged),
                                   difference.now);
     }
@@ -150,10 +150,10 @@ class Restorer {
     }
   }
 
-  static PlaceFailure failureOf(const PlaceOutcome& outcome) {
+  static Failure failureOf(const PlaceOutcome& outcome) {
     constexpr int kNoNumber = 0;
     return outcome.kind == PlaceOutcome::Kind::Disturbed
-               ? PlaceFailure{kNoNumber, "Another program wrote meanwhile"}
+               ? Failure{kNoNumber, "Another program wrote meanwhile"}
                : outcome.failure;
   }
 

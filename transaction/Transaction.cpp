@@ -37,7 +37,7 @@ std::optional<std::string> Transaction::bytesBefore(DevicePlace place) {
   }
   std::string bytes;
   bytes.reserve(state.identity.size);
-  std::optional<PlaceFailure> failure = state.contents->giveTo([&bytes](std::string_view piece) {
+  std::optional<Failure> failure = state.contents->giveTo([&bytes](std::string_view piece) {
     bytes.append(piece);
     return true;
   });

@@ -83,7 +83,7 @@ class Transaction {
   /// The bytes that a place held in the snapshot; none as with dictionaries.
   [[nodiscard]] std::optional<std::string> bytesBefore(DevicePlace place);
   /// Why a file that was there could not be read, the first time; none when all could.
-  [[nodiscard]] const std::optional<PlaceFailure>& readFailure() const { return readFailure_; }
+  [[nodiscard]] const std::optional<Failure>& readFailure() const { return readFailure_; }
 
   /// A save has begun, or ended.
   void noteSave(LastSave save) { lastSave_ = save; }
@@ -109,7 +109,7 @@ class Transaction {
   };
   /// What was read is not read again.
   std::array<Decoded, kDevicePlaceCount> decoded_;
-  std::optional<PlaceFailure> readFailure_;
+  std::optional<Failure> readFailure_;
   LastSave lastSave_ = LastSave::None;
   std::optional<std::string> saveFailure_;
   bool madeInformationDirectory_ = false;

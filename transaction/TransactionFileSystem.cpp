@@ -17,8 +17,8 @@ Result failure(std::string_view operation, std::string_view path, int number) {
       std::generic_category().message(number)));
 }
 
-Result resultOf(const std::optional<PlaceFailure>& whyNot) {
-  return whyNot ? Result::failure(whyNot->text) : Result::success();
+Result resultOf(const std::optional<Failure>& whyNot) {
+  return whyNot ? Result(*whyNot) : Result::success();
 }
 
 }  // namespace
@@ -173,8 +173,8 @@ Result TransactionFileSystem::setOwnerAndGroup(std::string_view path, std::strin
     return failure("set the owner of", path, ENOENT);
   }
   const auto owner = ownership_.ownerNamed(ownerName, groupName);
-  if (const auto* whyNot = std::get_if<PlaceFailure>(&owner)) {
-    return ofSave(Result::failure(whyNot->text));
+  if (const auto* whyNot = std::get_if<Failure>(&owner)) {
+    return ofSave(*whyNot);
   }
   temporary->second.owner = std::get<FileOwner>(owner);
   return Result::success();

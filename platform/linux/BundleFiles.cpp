@@ -41,13 +41,13 @@ bool BundleFiles::exists(const std::string& name) const {
   return found_ ? found_->contains(name) : ::access(pathOf(name).c_str(), F_OK) == 0;
 }
 
-std::optional<std::string> BundleFiles::read(const std::string& name, PathError& error) const {
+std::optional<std::string> BundleFiles::read(const std::string& name, Failure& error) const {
   if (!found_) {
     return readHostFile(pathOf(name), error, Pipes::Refuse);
   }
   const auto file = found_->find(name);
   if (file == found_->end()) {
-    error = pathError("open", pathOf(name), ENOENT);
+    error = pathFailure("open", pathOf(name), ENOENT);
     return std::nullopt;
   }
   if (!file->second.bytes) {

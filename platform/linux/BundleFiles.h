@@ -5,7 +5,7 @@
 #include <string>
 #include <utility>
 
-#include "platform/linux/PathError.h"
+#include "platform/linux/PathFailure.h"
 
 namespace accounts {
 
@@ -21,7 +21,7 @@ class BundleFiles {
 
   [[nodiscard]] bool exists(const std::string& name) const;
   /// The bytes of a regular file; none, with `error` set, when it is missing or cannot be read.
-  [[nodiscard]] std::optional<std::string> read(const std::string& name, PathError& error) const;
+  [[nodiscard]] std::optional<std::string> read(const std::string& name, Failure& error) const;
 
  private:
   [[nodiscard]] std::string pathOf(const std::string& name) const;
@@ -29,7 +29,7 @@ class BundleFiles {
   struct Found {
     std::optional<std::string> bytes;
     /// Why there are no bytes.
-    PathError error;
+    Failure error;
   };
   std::string directory_;
   /// By name; none as long as files are opened when they are asked for.

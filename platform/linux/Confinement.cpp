@@ -27,8 +27,8 @@ constexpr unsigned kNobody = 65534;
 /// More than a worker has open, and the few that it may still get.
 constexpr rlim_t kMostDescriptors = 64;
 
-PathError cannotGiveUp(std::string_view right, int number) {
-  return pathError("give up", right, number);
+Failure cannotGiveUp(std::string_view right, int number) {
+  return pathFailure("give up", right, number);
 }
 
 /// Closes all descriptors but the standard output and error streams and those of a list.
@@ -103,7 +103,7 @@ bool dropCapabilities() {
 
 }  // namespace
 
-std::optional<PathError> giveUpRights(const Confinement& kept) {
+std::optional<Failure> giveUpRights(const Confinement& kept) {
   if (kIsExemptFromConfinement) {
     return std::nullopt;
   }

@@ -5,7 +5,7 @@
 #include <optional>
 #include <vector>
 
-#include "platform/linux/PathError.h"
+#include "platform/linux/PathFailure.h"
 
 namespace accounts {
 
@@ -40,6 +40,6 @@ struct Confinement {
 /// has it), memory and time without end, and every system call that `SystemCallFilter.h` does not
 /// list. The process dies with its parent. It must have one thread; a lower limit that it has
 /// already stays. An error when that cannot be done: the process must not go on then.
-std::optional<PathError> giveUpRights(const Confinement& kept);
+std::optional<Failure> giveUpRights(const Confinement& kept);
 
 }  // namespace accounts

@@ -98,8 +98,8 @@ DeviceDescription deviceDescriptionFromDictionary(const PropertyDictionary& dict
   return description;
 }
 
-std::optional<DescriptionBytes> readDeviceDescription(const DeviceRoot& root, PathError& error) {
-  PathError failure;
+std::optional<DescriptionBytes> readDeviceDescription(const DeviceRoot& root, Failure& error) {
+  Failure failure;
   std::optional<std::string> bytes = root.readFile(kDeviceDescriptionPath, failure);
   if (!bytes && !failure.isMissing()) {
     error = failure;
@@ -108,15 +108,14 @@ std::optional<DescriptionBytes> readDeviceDescription(const DeviceRoot& root, Pa
   return DescriptionBytes{std::move(bytes), std::string(kDeviceDescriptionPath)};
 }
 
-std::optional<DescriptionBytes> readHostDeviceDescription(const std::string& path,
-                                                          PathError& error) {
+std::optional<DescriptionBytes> readHostDeviceDescription(const std::string& path, Failure& error) {
   std::optional<std::string> bytes = readHostFile(path, error);
   return bytes ? std::optional(DescriptionBytes{std::move(bytes), nameOfInput(path)})
                : std::nullopt;
 }
 
 std::optional<DeviceDescription> decodeDeviceDescription(const DescriptionBytes& read,
-                                                         PathError& error) {
+                                                         Failure& error) {
   if (!read.bytes) {
     return DeviceDescription();
   }

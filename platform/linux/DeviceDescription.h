@@ -8,7 +8,7 @@
 #include "platform/ExternalSyncSources.h"
 #include "platform/ProfileRestrictions.h"
 #include "platform/linux/DeviceRoot.h"
-#include "platform/linux/PathError.h"
+#include "platform/linux/PathFailure.h"
 #include "propertylist/value/PropertyValue.h"
 #include "vocabulary/DeviceServices.h"
 
@@ -60,16 +60,15 @@ struct DescriptionBytes {
 
 /// The description that the device holds itself, at kDeviceDescriptionPath; it may be missing.
 /// None, with `error` set, when it cannot be read.
-std::optional<DescriptionBytes> readDeviceDescription(const DeviceRoot& root, PathError& error);
+std::optional<DescriptionBytes> readDeviceDescription(const DeviceRoot& root, Failure& error);
 
 /// The description in a file of the host. None, with `error` set, when the file is missing
 /// (`error.isMissing()`) or cannot be read.
-std::optional<DescriptionBytes> readHostDeviceDescription(const std::string& path,
-                                                          PathError& error);
+std::optional<DescriptionBytes> readHostDeviceDescription(const std::string& path, Failure& error);
 
 /// What a description says; one that is missing has no answers. None, with `error` set, when the
 /// bytes hold no dictionary.
 std::optional<DeviceDescription> decodeDeviceDescription(const DescriptionBytes& read,
-                                                         PathError& error);
+                                                         Failure& error);
 
 }  // namespace accounts

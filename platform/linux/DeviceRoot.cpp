@@ -42,16 +42,16 @@ bool isRootOfTheSystem(const FileDescriptor& directory) {
 
 }  // namespace
 
-std::optional<DeviceRoot> DeviceRoot::openRoot(const std::string& hostDirectory, PathError& error) {
+std::optional<DeviceRoot> DeviceRoot::openRoot(const std::string& hostDirectory, Failure& error) {
   const int number = ::open(hostDirectory.c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC);
   if (number < 0) {
-    error = pathError("open the device root", hostDirectory, errno);
+    error = pathFailure("open the device root", hostDirectory, errno);
     return std::nullopt;
   }
   FileDescriptor directory(number);
   const int probe = openBeneath(directory.number(), "/", O_PATH | O_DIRECTORY);
   if (probe < 0) {
-    error = pathError("resolve paths beneath the device root", hostDirectory, errno);
+    error = pathFailure("resolve paths beneath the device root", hostDirectory, errno);
     error.text += " (openat2, of Linux 5.6 or later, is needed)";
     return std::nullopt;
   }
@@ -61,21 +61,21 @@ std::optional<DeviceRoot> DeviceRoot::openRoot(const std::string& hostDirectory,
 }
 
 std::optional<FileDescriptor> DeviceRoot::open(std::string_view path, int flags,
-                                               PathError& error) const {
+                                               Failure& error) const {
   if (path.find('\0') != std::string_view::npos) {
-    error = pathError("open", path, EINVAL);
+    error = pathFailure("open", path, EINVAL);
     return std::nullopt;
   }
   const int number = openBeneath(directory_.number(), std::string(path), flags);
   if (number < 0) {
-    error = pathError("open", path, errno);
+    error = pathFailure("open", path, errno);
     return std::nullopt;
   }
   return FileDescriptor(number);
 }
 
 std::optional<FileDescriptor> DeviceRoot::openIfRegular(std::string_view path, int flags,
-                                                        PathError& error) const {
+                                                        Failure& error) const {
   auto file = open(path, flags, error);
   if (!file) {
     return std::nullopt;
@@ -85,14 +85,14 @@ std::optional<FileDescriptor> DeviceRoot::openIfRegular(std::string_view path, i
     return std::nullopt;
   }
   if (!S_ISREG(status->st_mode)) {
-    error = notRegularError("open", path, status->st_mode);
+    error = notRegularFailure("open", path, status->st_mode);
     return std::nullopt;
   }
   return file;
 }
 
 std::optional<FileDescriptor> DeviceRoot::openRegularFile(std::string_view path,
-                                                          PathError& error) const {
+                                                          Failure& error) const {
   // First for its path alone: opening a device can already have an effect.
   if (!openIfRegular(path, O_PATH, error)) {
     return std::nullopt;
@@ -100,16 +100,16 @@ std::optional<FileDescriptor> DeviceRoot::openRegularFile(std::string_view path,
   return openIfRegular(path, O_RDONLY | O_NONBLOCK | O_NOCTTY, error);
 }
 
-std::optional<std::string> DeviceRoot::readFile(std::string_view path, PathError& error) const {
+std::optional<std::string> DeviceRoot::readFile(std::string_view path, Failure& error) const {
   const auto file = openRegularFile(path, error);
   return file ? readContents(*file, path, error) : std::nullopt;
 }
 
-std::optional<DirectoryEntry> DeviceRoot::locate(std::string_view path, PathError& error) const {
+std::optional<DirectoryEntry> DeviceRoot::locate(std::string_view path, Failure& error) const {
   const SplitPath split = splitPath(path);
   if (split.name.empty() || split.name == "." || split.name == ".." ||
       split.name.find('\0') != std::string_view::npos) {
-    error = pathError("find a name in", path, EINVAL);
+    error = pathFailure("find a name in", path, EINVAL);
     return std::nullopt;
   }
   auto directory = open(split.directory, O_PATH | O_DIRECTORY, error);

@@ -8,7 +8,7 @@
 #include <utility>
 
 #include "platform/linux/FileDescriptor.h"
-#include "platform/linux/PathError.h"
+#include "platform/linux/PathFailure.h"
 
 namespace accounts {
 
@@ -39,20 +39,19 @@ class DirectoryEntry {
 
   /// Opens the regular file of this name with open's `flags`, without waiting. None, with `error`
   /// set, when it is missing, may not be opened or is anything but a regular file.
-  [[nodiscard]] std::optional<FileDescriptor> openRegularFile(int flags, PathError& error) const;
+  [[nodiscard]] std::optional<FileDescriptor> openRegularFile(int flags, Failure& error) const;
 
   /// Opens what has this name for its path alone, whatever it is; none, with `error` set, when
   /// nothing has it.
-  [[nodiscard]] std::optional<FileDescriptor> openForItsPath(PathError& error) const;
+  [[nodiscard]] std::optional<FileDescriptor> openForItsPath(Failure& error) const;
 
   /// Creates a file of this name with the given permission bits (less the process's mask), open for
   /// reading and writing. None, with `error` set, when anything exists there or creating fails.
-  [[nodiscard]] std::optional<FileDescriptor> createFile(mode_t permissions,
-                                                         PathError& error) const;
+  [[nodiscard]] std::optional<FileDescriptor> createFile(mode_t permissions, Failure& error) const;
 
   /// Creates a directory of this name with exactly the given permission bits. Returns whether it
   /// did; after a failure, which `error` explains, there is no new directory.
-  [[nodiscard]] bool createDirectory(mode_t permissions, PathError& error) const;
+  [[nodiscard]] bool createDirectory(mode_t permissions, Failure& error) const;
 
   /// Removes the file or symbolic link of this name, never a directory. Returns 0 or the error
   /// number.
@@ -60,7 +59,7 @@ class DirectoryEntry {
 
   /// Opens the directory that holds the name so that it can be flushed; none, with `error` set,
   /// when it may not be read.
-  [[nodiscard]] std::optional<FileDescriptor> openDirectory(PathError& error) const;
+  [[nodiscard]] std::optional<FileDescriptor> openDirectory(Failure& error) const;
 
  private:
   std::shared_ptr<const FileDescriptor> directory_;

@@ -16,14 +16,14 @@ constexpr std::size_t kBlockSize = std::size_t{64} << 10;
 // Passes the bytes of an open file to `take` block by block, with the size that the file says it
 // has; `take` returns whether to go on.
 template <class Take>
-bool readBlocks(const FileDescriptor& file, std::string_view path, PathError& error, Take take) {
+bool readBlocks(const FileDescriptor& file, std::string_view path, Failure& error, Take take) {
   const auto status = fileStatus(file, path, error);
   if (!status) {
     return false;
   }
   // Seen before anything is read; the count below is for files that grow or hide their size.
   if (status->st_size > static_cast<off_t>(kLargestFileSize)) {
-    error = pathError("read", path, EFBIG);
+    error = pathFailure("read", path, EFBIG);
     return false;
   }
   std::array<char, kBlockSize> block;
@@ -34,7 +34,7 @@ bool readBlocks(const FileDescriptor& file, std::string_view path, PathError& er
       continue;
     }
     if (count < 0) {
-      error = pathError("read", path, errno);
+      error = pathFailure("read", path, errno);
       return false;
     }
     if (count == 0) {
@@ -42,7 +42,7 @@ bool readBlocks(const FileDescriptor& file, std::string_view path, PathError& er
     }
     total += static_cast<std::size_t>(count);
     if (total > kLargestFileSize) {
-      error = pathError("read", path, EFBIG);
+      error = pathFailure("read", path, EFBIG);
       return false;
     }
     if (!take(std::string_view(block.data(), static_cast<std::size_t>(count)),
@@ -55,17 +55,17 @@ bool readBlocks(const FileDescriptor& file, std::string_view path, PathError& er
 }  // namespace
 
 std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_view path,
-                                      PathError& error) {
+                                      Failure& error) {
   struct stat status = {};
   if (::fstat(file.number(), &status) != 0) {
-    error = pathError("examine", path, errno);
+    error = pathFailure("examine", path, errno);
     return std::nullopt;
   }
   return status;
 }
 
 std::optional<std::string> readContents(const FileDescriptor& file, std::string_view path,
-                                        PathError& error) {
+                                        Failure& error) {
   std::string bytes;
   const bool isRead = readBlocks(file, path, error, [&](std::string_view block, std::size_t size) {
     if (bytes.empty()) {
@@ -77,7 +77,7 @@ std::optional<std::string> readContents(const FileDescriptor& file, std::string_
   return isRead ? std::optional(std::move(bytes)) : std::nullopt;
 }
 
-std::optional<std::string> readHostFile(const std::string& path, PathError& error, Pipes pipes) {
+std::optional<std::string> readHostFile(const std::string& path, Failure& error, Pipes pipes) {
   if (path == kStandardStream) {
     // A duplicate, since closing the standard stream itself would free its number.
     const FileDescriptor input(::fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, 0));
@@ -90,7 +90,7 @@ std::optional<std::string> readHostFile(const std::string& path, PathError& erro
   const int flags = O_RDONLY | O_CLOEXEC | O_NOCTTY | (isPipe ? 0 : O_NONBLOCK);
   const int number = ::open(path.c_str(), flags);
   if (number < 0) {
-    error = pathError("open", path, errno);
+    error = pathFailure("open", path, errno);
     return std::nullopt;
   }
   const FileDescriptor file(number);
@@ -99,7 +99,7 @@ std::optional<std::string> readHostFile(const std::string& path, PathError& erro
     return std::nullopt;
   }
   if (!S_ISREG(status->st_mode) && !(isPipe && S_ISFIFO(status->st_mode))) {
-    error = notRegularError("read", path, status->st_mode);
+    error = notRegularFailure("read", path, status->st_mode);
     return std::nullopt;
   }
   return readContents(file, path, error);
@@ -137,11 +137,11 @@ int writeAll(int descriptor, const SerializedPropertyList& contents) {
 
 bool copyContents(const FileDescriptor& source, std::string_view sourcePath,
                   const FileDescriptor& destination, std::string_view destinationPath,
-                  PathError& error) {
+                  Failure& error) {
   return readBlocks(source, sourcePath, error, [&](std::string_view block, std::size_t) {
     const int number = writeAll(destination.number(), block);
     if (number != 0) {
-      error = pathError("write", destinationPath, number);
+      error = pathFailure("write", destinationPath, number);
     }
     return number == 0;
   });

@@ -7,7 +7,7 @@
 #include <string_view>
 
 #include "platform/linux/FileDescriptor.h"
-#include "platform/linux/PathError.h"
+#include "platform/linux/PathFailure.h"
 #include "propertylist/PropertyListLimits.h"
 #include "propertylist/value/SerializedPropertyList.h"
 
@@ -18,12 +18,12 @@ inline constexpr std::size_t kLargestFileSize = kMaximumFileSize;
 
 /// What stat says of an open file; none, with `error` set, when it says nothing.
 std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_view path,
-                                      PathError& error);
+                                      Failure& error);
 
 /// The bytes of an open regular file from its position to its end. None, with `error` set, when
 /// reading fails or there are more than kLargestFileSize. `path` is for the error's text.
 std::optional<std::string> readContents(const FileDescriptor& file, std::string_view path,
-                                        PathError& error);
+                                        Failure& error);
 
 /// The name that stands for standard input, or output, where a file of the host is named.
 inline constexpr const char* kStandardStream = "-";
@@ -34,7 +34,7 @@ enum class Pipes : std::uint8_t { Read, Refuse };
 /// The bytes of a file of the host, outside any device root: of a regular file, of standard input
 /// (kStandardStream) or of a pipe, which is read to its end. None, with `error` set, when it is
 /// missing, unreadable, too large or something else. Only for a pipe opening waits.
-std::optional<std::string> readHostFile(const std::string& path, PathError& error,
+std::optional<std::string> readHostFile(const std::string& path, Failure& error,
                                         Pipes pipes = Pipes::Read);
 
 /// How a message names what readHostFile() reads.
@@ -50,7 +50,7 @@ int writeAll(int descriptor, const SerializedPropertyList& contents);
 /// it did; `error` says why not.
 bool copyContents(const FileDescriptor& source, std::string_view sourcePath,
                   const FileDescriptor& destination, std::string_view destinationPath,
-                  PathError& error);
+                  Failure& error);
 
 /// Waits until the contents of an open file or directory are on the medium, and returns 0 or the
 /// error number.

@@ -44,11 +44,11 @@ class JournalLogSystem::Channel final : public LogChannel {
 };
 
 std::unique_ptr<JournalLogSystem> JournalLogSystem::connect(const std::string& socketPath,
-                                                            PathError& error) {
+                                                            Failure& error) {
   sockaddr_un address = {};
   address.sun_family = AF_UNIX;
   if (socketPath.size() >= sizeof(address.sun_path)) {
-    error = pathError(kOpenOperation, socketPath, ENAMETOOLONG);
+    error = pathFailure(kOpenOperation, socketPath, ENAMETOOLONG);
     return nullptr;
   }
   std::memcpy(address.sun_path, socketPath.data(), socketPath.size());
@@ -58,7 +58,7 @@ std::unique_ptr<JournalLogSystem> JournalLogSystem::connect(const std::string& s
           0 ||
       ::connect(socket.number(), reinterpret_cast<const sockaddr*>(&address), sizeof(address)) !=
           0) {
-    error = pathError(kOpenOperation, socketPath, errno);
+    error = pathFailure(kOpenOperation, socketPath, errno);
     return nullptr;
   }
   return std::unique_ptr<JournalLogSystem>(new JournalLogSystem(std::move(socket)));

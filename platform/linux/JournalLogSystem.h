@@ -10,7 +10,7 @@
 
 #include "platform/LogSystem.h"
 #include "platform/linux/FileDescriptor.h"
-#include "platform/linux/PathError.h"
+#include "platform/linux/PathFailure.h"
 
 namespace accounts {
 
@@ -27,7 +27,7 @@ class JournalLogSystem final : public LogSystem {
  public:
   /// A log to the journal whose socket is at a path of the host. Null, with `error` set, when
   /// nothing takes entries there.
-  static std::unique_ptr<JournalLogSystem> connect(const std::string& socketPath, PathError& error);
+  static std::unique_ptr<JournalLogSystem> connect(const std::string& socketPath, Failure& error);
 
   /// The journal's socket.
   [[nodiscard]] int descriptor() const { return socket_.number(); }

@@ -21,7 +21,7 @@ int copyAttributes(const FileDescriptor& copy, const struct stat& status) {
 }
 
 bool copyWithAttributes(const DirectoryEntry& source, const DirectoryEntry& destination,
-                        PathError& error) {
+                        Failure& error) {
   const auto original = source.openRegularFile(O_RDONLY, error);
   const auto status = original ? fileStatus(*original, source.path(), error) : std::nullopt;
   const auto copy = status ? destination.createFile(kOwnerOnlyFile, error) : std::nullopt;
@@ -36,7 +36,7 @@ bool copyWithAttributes(const DirectoryEntry& source, const DirectoryEntry& dest
     if (number == 0) {
       return true;
     }
-    error = pathError("copy to", destination.path(), number);
+    error = pathFailure("copy to", destination.path(), number);
   }
   (void)destination.remove();
   return false;
@@ -44,7 +44,7 @@ bool copyWithAttributes(const DirectoryEntry& source, const DirectoryEntry& dest
 
 }  // namespace
 
-bool linkOrCopy(const DirectoryEntry& source, const DirectoryEntry& destination, PathError& error) {
+bool linkOrCopy(const DirectoryEntry& source, const DirectoryEntry& destination, Failure& error) {
   if (::linkat(source.directory(), source.name(), destination.directory(), destination.name(), 0) !=
       0) {
     return copyWithAttributes(source, destination, error);
@@ -56,7 +56,7 @@ bool linkOrCopy(const DirectoryEntry& source, const DirectoryEntry& destination,
   const auto file = isRegular ? destination.openRegularFile(O_RDONLY, error) : std::nullopt;
   const int number = file ? flush(*file) : 0;
   if (number != 0) {
-    error = pathError("flush", source.path(), number);
+    error = pathFailure("flush", source.path(), number);
     (void)destination.remove();
   }
   return number == 0;

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "platform/linux/DirectoryEntry.h"
-#include "platform/linux/PathError.h"
+#include "platform/linux/PathFailure.h"
 
 namespace accounts {
 
@@ -10,6 +10,6 @@ namespace accounts {
 /// and time; a copy stays the user's own when that user may give no file away. The contents are on
 /// the medium afterwards, but for a file that may not be read: whoever wrote it had to see to that.
 /// False, with `error` set and nothing made, when neither can be done.
-bool linkOrCopy(const DirectoryEntry& source, const DirectoryEntry& destination, PathError& error);
+bool linkOrCopy(const DirectoryEntry& source, const DirectoryEntry& destination, Failure& error);
 
 }  // namespace accounts

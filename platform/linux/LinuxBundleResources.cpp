@@ -17,7 +17,7 @@ bool LinuxBundleResources::hasPropertyList(std::string_view name) {
 }
 
 std::optional<PropertyDictionary> LinuxBundleResources::readPropertyList(std::string_view name) {
-  PathError error;
+  Failure error;
   const std::optional<std::string> bytes = files_.read(fileName(name), error);
   return bytes ? dictionaryFromBytes(*bytes, name, error) : std::nullopt;
 }

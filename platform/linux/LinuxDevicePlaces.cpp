@@ -8,9 +8,9 @@
 #include <cerrno>
 #include <utility>
 
+#include "platform/linux/EntryIdentity.h"
 #include "platform/linux/FileContents.h"
 #include "platform/linux/OpenedBytes.h"
-#include "platform/linux/PlaceFailures.h"
 #include "vocabulary/DevicePath.h"
 
 namespace accounts {
@@ -48,12 +48,12 @@ bool isImmutable(const FileDescriptor& directory, const char* name) {
 
 /// Opens a file that was found to be a regular one.
 std::optional<FileDescriptor> openIn(const FileDescriptor& directory, const std::string& path,
-                                     PathError& error) {
+                                     Failure& error) {
   const std::string name(splitPath(path).name);
   const int flags = O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC | O_NOCTTY;
   const int number = ::openat(directory.number(), name.c_str(), flags);
   if (number < 0) {
-    error = pathError("open", path, errno);
+    error = pathFailure("open", path, errno);
     return std::nullopt;
   }
   return FileDescriptor(number);
@@ -72,7 +72,7 @@ LinuxDevicePlaces::LinuxDevicePlaces(const DeviceRoot& root, LinuxFileSystem& fi
                                      std::string home, ReadOnlyMounts readOnlyMounts)
     : root_(root), files_(files), home_(std::move(home)), readOnlyMounts_(readOnlyMounts) {}
 
-std::variant<DeviceSnapshot, PlaceFailure> LinuxDevicePlaces::takeSnapshot() {
+std::variant<DeviceSnapshot, Failure> LinuxDevicePlaces::takeSnapshot() {
   directories_ = {};
   opened_.clear();
   metReadOnlyMount_ = false;
@@ -96,7 +96,7 @@ int LinuxDevicePlaces::numberThatCounts(int number) const {
 }
 
 std::shared_ptr<const LinuxDevicePlaces::Directory> LinuxDevicePlaces::directoryOf(
-    const std::string& path, PathError& error) {
+    const std::string& path, Failure& error) {
   const std::string_view parent = splitPath(path).directory;
   if (const auto known = opened_.find(parent); known != opened_.end()) {
     return known->second;
@@ -116,7 +116,7 @@ std::shared_ptr<const LinuxDevicePlaces::Directory> LinuxDevicePlaces::directory
 }
 
 const LinuxDevicePlaces::Directory* LinuxDevicePlaces::openDirectoryAt(DevicePlace place,
-                                                                       PathError& error) {
+                                                                       Failure& error) {
   auto& directory = directories_[indexOf(place)];
   if (directory == nullptr) {
     directory = directoryOf(pathOf(place), error);
@@ -124,21 +124,21 @@ const LinuxDevicePlaces::Directory* LinuxDevicePlaces::openDirectoryAt(DevicePla
   return directory.get();
 }
 
-std::optional<PlaceFailure> LinuxDevicePlaces::look(DevicePlace place, PlaceState& state) {
-  PathError error;
+std::optional<Failure> LinuxDevicePlaces::look(DevicePlace place, PlaceState& state) {
+  Failure error;
   const auto directory = directoryOf(state.path, error);
   directories_[indexOf(place)] = directory;
   if (directory == nullptr) {
     if (isDecisive(place) && !isMissing(error.number)) {
-      return placeFailure(error);
+      return error;
     }
-    state.whyNotRead = placeFailure("open", state.path, error.number);
-    state.whyNotRemoved = placeFailure(error);
+    state.whyNotRead = pathFailure("open", state.path, error.number);
+    state.whyNotRemoved = error;
     if (place == DevicePlace::InformationDirectory) {
       // It is made with its parents; a file is then made in what is the system's own.
       foreseeInformationDirectory(state);
     } else {
-      state.whyNotReplaced = placeFailure(error);
+      state.whyNotReplaced = error;
     }
     return std::nullopt;
   }
@@ -148,12 +148,12 @@ std::optional<PlaceFailure> LinuxDevicePlaces::look(DevicePlace place, PlaceStat
     state.identity = identityOf(status);
   } else if (const int number = errno; number != ENOENT) {
     if (isDecisive(place)) {
-      return placeFailure("examine", state.path, number);
+      return pathFailure("examine", state.path, number);
     }
-    state.whyNotRead = placeFailure("open", state.path, number);
-    state.whyNotReplaced = placeFailure("create", state.path, number);
-    state.whyNotRemoved = placeFailure("remove", state.path, number);
-    state.whyNotMade = placeFailure("create the directory", state.path, number);
+    state.whyNotRead = pathFailure("open", state.path, number);
+    state.whyNotReplaced = pathFailure("create", state.path, number);
+    state.whyNotRemoved = pathFailure("remove", state.path, number);
+    state.whyNotMade = pathFailure("create the directory", state.path, number);
     return std::nullopt;
   }
   if (auto failure = lookAtTarget(place, state)) {
@@ -163,13 +163,13 @@ std::optional<PlaceFailure> LinuxDevicePlaces::look(DevicePlace place, PlaceStat
   return std::nullopt;
 }
 
-std::optional<PlaceFailure> LinuxDevicePlaces::lookAtTarget(DevicePlace place, PlaceState& state) {
+std::optional<Failure> LinuxDevicePlaces::lookAtTarget(DevicePlace place, PlaceState& state) {
   state.target = state.identity.kind;
   if (!isRead(place)) {
     return state.target == EntryKind::Other ? lookThroughLink(place, state) : std::nullopt;
   }
   // A regular file is opened where it was found; anything else might be a link to one.
-  PathError error;
+  Failure error;
   auto file = state.identity.kind == EntryKind::RegularFile
                   ? openIn(*directoryAt(place)->descriptor, state.path, error)
                   : root_.openRegularFile(state.path, error);
@@ -177,13 +177,13 @@ std::optional<PlaceFailure> LinuxDevicePlaces::lookAtTarget(DevicePlace place, P
   if (!opened) {
     // An error without a number says that it is no regular file.
     if (error.number != 0 && !isMissing(error.number) && isDecisive(place)) {
-      return placeFailure(error);
+      return error;
     }
     state.target = error.number == 0 ? EntryKind::Other : EntryKind::Nothing;
     if (files_.isDirectory(state.path)) {
       state.target = EntryKind::Directory;
     }
-    state.whyNotRead = placeFailure(error);
+    state.whyNotRead = error;
     return std::nullopt;
   }
   if (state.identity.kind == EntryKind::RegularFile) {
@@ -191,20 +191,19 @@ std::optional<PlaceFailure> LinuxDevicePlaces::lookAtTarget(DevicePlace place, P
   }
   state.target = EntryKind::RegularFile;
   if (opened->st_size > static_cast<off_t>(kLargestFileSize)) {
-    return placeFailure("read", state.path, EFBIG);
+    return pathFailure("read", state.path, EFBIG);
   }
   state.permissions = opened->st_mode & kPermissionBits;
   state.contents = std::make_shared<OpenedBytes>(std::move(*file), state.path);
   return std::nullopt;
 }
 
-std::optional<PlaceFailure> LinuxDevicePlaces::lookThroughLink(DevicePlace place,
-                                                               PlaceState& state) {
-  PathError error;
+std::optional<Failure> LinuxDevicePlaces::lookThroughLink(DevicePlace place, PlaceState& state) {
+  Failure error;
   const auto entry = root_.open(state.path, O_PATH, error);
   const auto status = entry ? fileStatus(*entry, state.path, error) : std::nullopt;
   if (!status && isDecisive(place) && !isMissing(error.number)) {
-    return placeFailure(error);
+    return error;
   }
   state.target = status ? kindOfMode(status->st_mode) : EntryKind::Nothing;
   return std::nullopt;
@@ -220,7 +219,7 @@ void LinuxDevicePlaces::foresee(DevicePlace place, const Directory& directory,
     number = isKept ? EPERM : 0;
   }
   const auto why = [&](std::string_view operation, int reason) {
-    return reason == 0 ? std::nullopt : std::optional(placeFailure(operation, state.path, reason));
+    return reason == 0 ? std::nullopt : std::optional(pathFailure(operation, state.path, reason));
   };
   const bool isDirectory = state.identity.kind == EntryKind::Directory;
   // Where nothing may be written, the kernel does not look whether the file is there.
@@ -234,7 +233,7 @@ void LinuxDevicePlaces::foresee(DevicePlace place, const Directory& directory,
     state.whyNotMade = state.identity.exists()
                            ? std::nullopt
                            : why("create the directory", directory.whyNotChanged);
-    PathError error;
+    Failure error;
     const auto own = root_.open(state.path, O_PATH | O_DIRECTORY, error);
     state.whyNotReplaced =
         own ? why("create a file in", numberThatCounts(whyNotChanged(*own))) : std::nullopt;
@@ -247,7 +246,7 @@ void LinuxDevicePlaces::foreseeInformationDirectory(PlaceState& state) {
   std::size_t end = state.path.find('/', 1);
   for (; end != std::string::npos; end = state.path.find('/', end + 1)) {
     const std::string parent = state.path.substr(0, end);
-    PathError error;
+    Failure error;
     if (root_.open(parent, O_PATH | O_DIRECTORY, error)) {
       continue;
     }
@@ -259,17 +258,17 @@ void LinuxDevicePlaces::foreseeInformationDirectory(PlaceState& state) {
                        AT_SYMLINK_NOFOLLOW) == 0;
     };
     if (directory == nullptr) {
-      state.whyNotMade = placeFailure(error);
+      state.whyNotMade = error;
     } else if (isThere()) {
-      state.whyNotMade = placeFailure("create the directory", parent, EEXIST);
+      state.whyNotMade = pathFailure("create the directory", parent, EEXIST);
     } else if (directory->whyNotChanged != 0) {
-      state.whyNotMade = placeFailure("create the directory", parent, directory->whyNotChanged);
+      state.whyNotMade = pathFailure("create the directory", parent, directory->whyNotChanged);
     }
     return;
   }
 }
 
-std::optional<PlaceFailure> LinuxDevicePlaces::whyTwoAreOne() const {
+std::optional<Failure> LinuxDevicePlaces::whyTwoAreOne() const {
   for (std::size_t one = 0; one < kDevicePlaceCount; ++one) {
     for (std::size_t other = one + 1; other < kDevicePlaceCount; ++other) {
       const auto& first = directories_[one];
@@ -279,27 +278,25 @@ std::optional<PlaceFailure> LinuxDevicePlaces::whyTwoAreOne() const {
       if (first != nullptr && second != nullptr && first->status.st_dev == second->status.st_dev &&
           first->status.st_ino == second->status.st_ino &&
           splitPath(firstPath).name == splitPath(secondPath).name) {
-        return PlaceFailure{0, firstPath + " and " + secondPath +
-                                   " are one file: their directories lead to one "
-                                   "another"};
+        return Failure{0, firstPath + " and " + secondPath +
+                              " are one file: their directories lead to one "
+                              "another"};
       }
     }
   }
   return std::nullopt;
 }
 
-std::variant<FileIdentity, PlaceFailure> LinuxDevicePlaces::identityAt(DevicePlace place) {
-  PathError error;
+std::variant<FileIdentity, Failure> LinuxDevicePlaces::identityAt(DevicePlace place) {
+  Failure error;
   const Directory* const directory = openDirectoryAt(place, error);
   const std::string path = pathOf(place);
   if (directory == nullptr) {
-    return isMissing(error.number) ? std::variant<FileIdentity, PlaceFailure>(FileIdentity())
-                                   : placeFailure(error);
+    return isMissing(error.number) ? std::variant<FileIdentity, Failure>(FileIdentity()) : error;
   }
   const std::string name(splitPath(path).name);
   const auto found = entryIn(directory->descriptor->number(), name.c_str());
-  return found ? std::variant<FileIdentity, PlaceFailure>(*found)
-               : placeFailure("examine", path, errno);
+  return found ? std::variant<FileIdentity, Failure>(*found) : pathFailure("examine", path, errno);
 }
 
 }  // namespace accounts

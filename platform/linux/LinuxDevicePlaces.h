@@ -13,7 +13,7 @@
 #include "platform/linux/DeviceRoot.h"
 #include "platform/linux/DirectoryEntry.h"
 #include "platform/linux/LinuxFileSystem.h"
-#include "platform/linux/PathError.h"
+#include "platform/linux/PathFailure.h"
 
 namespace accounts {
 
@@ -28,20 +28,20 @@ class LinuxDevicePlaces final : public DevicePlaces {
   LinuxDevicePlaces(const DeviceRoot& root, LinuxFileSystem& files, std::string home,
                     ReadOnlyMounts readOnlyMounts = ReadOnlyMounts::Refuse);
 
-  std::variant<DeviceSnapshot, PlaceFailure> takeSnapshot() override;
-  std::variant<FileIdentity, PlaceFailure> identityAt(DevicePlace place) override;
-  std::variant<std::unique_ptr<StagedFile>, PlaceFailure> stage(DevicePlace place,
-                                                                const NewFile& file) override;
-  std::variant<std::unique_ptr<StagedFile>, PlaceFailure> stageKept(
-      DevicePlace place, std::string_view keptPath) override;
+  std::variant<DeviceSnapshot, Failure> takeSnapshot() override;
+  std::variant<FileIdentity, Failure> identityAt(DevicePlace place) override;
+  std::variant<std::unique_ptr<StagedFile>, Failure> stage(DevicePlace place,
+                                                           const NewFile& file) override;
+  std::variant<std::unique_ptr<StagedFile>, Failure> stageKept(DevicePlace place,
+                                                               std::string_view keptPath) override;
   PlaceOutcome put(DevicePlace place, StagedFile& file, const FileIdentity& expected) override;
   PlaceOutcome remove(DevicePlace place, const FileIdentity& expected) override;
   PlaceOutcome keep(DevicePlace place, std::string_view keptPath,
                     const FileIdentity& expected) override;
-  std::optional<PlaceFailure> flush(DevicePlace place) override;
-  std::optional<PlaceFailure> makeInformationDirectory() override;
-  std::optional<PlaceFailure> writeInformationFile(std::string_view name,
-                                                   const ReadableBytes& contents) override;
+  std::optional<Failure> flush(DevicePlace place) override;
+  std::optional<Failure> makeInformationDirectory() override;
+  std::optional<Failure> writeInformationFile(std::string_view name,
+                                              const ReadableBytes& contents) override;
   std::vector<std::string> settleLeftovers() override;
   /// Only removes the temporary files of killed runs that no commit knows of, as those of a plug-in
   /// that works on the device itself. Needs no lock. What cannot be removed stays for the next
@@ -61,22 +61,22 @@ class LinuxDevicePlaces final : public DevicePlaces {
 
   [[nodiscard]] std::string pathOf(DevicePlace place) const { return pathOfPlace(place, home_); }
   /// The directory of a path; null, with `error` set, when it cannot be opened.
-  std::shared_ptr<const Directory> directoryOf(const std::string& path, PathError& error);
+  std::shared_ptr<const Directory> directoryOf(const std::string& path, Failure& error);
   /// The directory of a place of the snapshot; null for one that could not be opened.
   [[nodiscard]] const Directory* directoryAt(DevicePlace place) const {
     return directories_[indexOf(place)].get();
   }
   /// The directory of a place, opened now where it was missing; null, with `error` set, for none.
-  const Directory* openDirectoryAt(DevicePlace place, PathError& error);
+  const Directory* openDirectoryAt(DevicePlace place, Failure& error);
   /// Looks at one place. A failure when what stands there cannot be told or opened and the
   /// migration would read it.
-  std::optional<PlaceFailure> look(DevicePlace place, PlaceState& state);
-  std::optional<PlaceFailure> lookAtTarget(DevicePlace place, PlaceState& state);
-  std::optional<PlaceFailure> lookThroughLink(DevicePlace place, PlaceState& state);
+  std::optional<Failure> look(DevicePlace place, PlaceState& state);
+  std::optional<Failure> lookAtTarget(DevicePlace place, PlaceState& state);
+  std::optional<Failure> lookThroughLink(DevicePlace place, PlaceState& state);
   void foresee(DevicePlace place, const Directory& directory, const struct stat& status,
                PlaceState& state) const;
   void foreseeInformationDirectory(PlaceState& state);
-  [[nodiscard]] std::optional<PlaceFailure> whyTwoAreOne() const;
+  [[nodiscard]] std::optional<Failure> whyTwoAreOne() const;
 
   const DeviceRoot& root_;
   LinuxFileSystem& files_;

@@ -6,10 +6,10 @@
 #include <cstdio>
 #include <utility>
 
+#include "platform/linux/EntryIdentity.h"
 #include "platform/linux/FileContents.h"
 #include "platform/linux/LinkedOrCopied.h"
 #include "platform/linux/LinuxDevicePlaces.h"
-#include "platform/linux/PlaceFailures.h"
 #include "platform/linux/RenameToNothing.h"
 #include "platform/linux/StagedName.h"
 #include "platform/linux/TemporaryFile.h"
@@ -51,14 +51,14 @@ bool isSameInode(const FileIdentity& one, const FileIdentity& other) {
 }
 
 /// Writes all into a new file.
-std::optional<PlaceFailure> writeContents(const ReadableBytes& contents, const FileDescriptor& file,
-                                          std::string_view path) {
+std::optional<Failure> writeContents(const ReadableBytes& contents, const FileDescriptor& file,
+                                     std::string_view path) {
   int number = 0;
   auto failure = contents.giveTo([&](std::string_view piece) {
     number = writeAll(file.number(), piece);
     return number == 0;
   });
-  return number == 0 ? failure : placeFailure("write", path, number);
+  return number == 0 ? failure : pathFailure("write", path, number);
 }
 
 /// A file that has a name of its own beside its place.
@@ -112,16 +112,16 @@ void handBack(DevicePlace place, DirectoryEntry& own, const char* name, FileIden
 
 }  // namespace
 
-std::variant<std::unique_ptr<StagedFile>, PlaceFailure> LinuxDevicePlaces::stage(
-    DevicePlace place, const NewFile& file) {
-  PathError error;
+std::variant<std::unique_ptr<StagedFile>, Failure> LinuxDevicePlaces::stage(DevicePlace place,
+                                                                            const NewFile& file) {
+  Failure error;
   const std::string path = pathOf(place);
   const Directory* const directory = openDirectoryAt(place, error);
   auto made = directory != nullptr
                   ? makeTemporaryFileIn(directory->descriptor, splitPath(path).directory, error)
                   : std::nullopt;
   if (!made) {
-    return placeFailure(error);
+    return error;
   }
   const int descriptor = made->file.number();
   auto staged = std::make_unique<StagedEntry>(std::move(made->entry), std::move(made->file));
@@ -130,25 +130,25 @@ std::variant<std::unique_ptr<StagedFile>, PlaceFailure> LinuxDevicePlaces::stage
   }
   // All by the descriptor: whatever another process puts under the name, only this file changes.
   if (file.owner && ::fchown(descriptor, file.owner->user, file.owner->group) != 0) {
-    return placeFailure("set the owner of", path, errno);
+    return pathFailure("set the owner of", path, errno);
   }
   if (::fchmod(descriptor, file.permissions & kPermissionBits) != 0) {
-    return placeFailure("set the permissions of", path, errno);
+    return pathFailure("set the permissions of", path, errno);
   }
   if (const int number = accounts::flush(staged->file); number != 0) {
-    return placeFailure("write", path, number);
+    return pathFailure("write", path, number);
   }
   const auto status = fileStatus(staged->file, path, error);
   if (!status) {
-    return placeFailure(error);
+    return error;
   }
   staged->identity = identityOf(*status);
   return staged;
 }
 
-std::variant<std::unique_ptr<StagedFile>, PlaceFailure> LinuxDevicePlaces::stageKept(
+std::variant<std::unique_ptr<StagedFile>, Failure> LinuxDevicePlaces::stageKept(
     DevicePlace place, std::string_view keptPath) {
-  PathError error;
+  Failure error;
   const std::string path = pathOf(place);
   const auto kept = root_.locate(keptPath, error);
   const Directory* const directory = kept ? openDirectoryAt(place, error) : nullptr;
@@ -156,13 +156,13 @@ std::variant<std::unique_ptr<StagedFile>, PlaceFailure> LinuxDevicePlaces::stage
                    ? freeEntryIn(directory->descriptor, splitPath(path).directory, error)
                    : std::nullopt;
   if (!entry || !linkOrCopy(*kept, *entry, error)) {
-    return placeFailure(error);
+    return error;
   }
   auto file = entry->openForItsPath(error);
   const auto status = file ? fileStatus(*file, path, error) : std::nullopt;
   if (!status) {
     (void)entry->remove();
-    return placeFailure(error);
+    return error;
   }
   auto staged = std::make_unique<StagedEntry>(std::move(*entry), std::move(*file));
   staged->identity = identityOf(*status);
@@ -176,12 +176,12 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
   const std::string name(splitPath(path).name);
   if (expected.kind == EntryKind::Directory) {
     // It could be exchanged, but not be removed afterwards.
-    return PlaceOutcome::failed(placeFailure("replace", path, EISDIR));
+    return PlaceOutcome::failed(pathFailure("replace", path, EISDIR));
   }
   const FileIdentity& made = staged.identity;
   if (const int number = renameTo({place, markOf(made), markOf(expected)}, staged.entry);
       number != 0) {
-    return PlaceOutcome::failed(placeFailure("rename a file to", path, number));
+    return PlaceOutcome::failed(pathFailure("rename a file to", path, number));
   }
   const int directory = staged.entry.directory();
   const char* const own = staged.entry.name();
@@ -191,7 +191,7 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
       return PlaceOutcome::disturbed();
     }
     if (number != 0) {
-      return PlaceOutcome::failed(placeFailure("rename a file to", path, number));
+      return PlaceOutcome::failed(pathFailure("rename a file to", path, number));
     }
     staged.isThere = false;
     const std::optional<FileIdentity> in = entryIn(directory, name.c_str());
@@ -202,7 +202,7 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
       return PlaceOutcome::disturbed();
     }
     if (!cannotExchange(errno)) {
-      return PlaceOutcome::failed(placeFailure("exchange a file with", path, errno));
+      return PlaceOutcome::failed(pathFailure("exchange a file with", path, errno));
     }
     // The window that is left: what another program puts there from here on is replaced.
     if (!isSameInode(identityIn(directory, own), made) ||
@@ -210,7 +210,7 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
       return PlaceOutcome::disturbed();
     }
     if (::renameat(directory, own, directory, name.c_str()) != 0) {
-      return PlaceOutcome::failed(placeFailure("rename a file to", path, errno));
+      return PlaceOutcome::failed(pathFailure("rename a file to", path, errno));
     }
     staged.isThere = false;
     return PlaceOutcome::done();
@@ -243,14 +243,14 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
 }
 
 PlaceOutcome LinuxDevicePlaces::remove(DevicePlace place, const FileIdentity& expected) {
-  PathError error;
+  Failure error;
   const std::string path = pathOf(place);
   const Directory* const opened = openDirectoryAt(place, error);
   if (opened == nullptr) {
-    return PlaceOutcome::failed(placeFailure(error));
+    return PlaceOutcome::failed(error);
   }
   if (expected.kind == EntryKind::Directory) {
-    return PlaceOutcome::failed(placeFailure("remove", path, EISDIR));
+    return PlaceOutcome::failed(pathFailure("remove", path, EISDIR));
   }
   const std::string name(splitPath(path).name);
   DirectoryEntry aside(opened->descriptor, name, path);
@@ -267,24 +267,24 @@ PlaceOutcome LinuxDevicePlaces::remove(DevicePlace place, const FileIdentity& ex
   }
   number = number == 0 ? aside.remove() : number;
   return number == 0 ? PlaceOutcome::done()
-                     : PlaceOutcome::failed(placeFailure("remove", path, number));
+                     : PlaceOutcome::failed(pathFailure("remove", path, number));
 }
 
 PlaceOutcome LinuxDevicePlaces::keep(DevicePlace place, std::string_view keptPath,
                                      const FileIdentity& expected) {
-  PathError error;
+  Failure error;
   const std::string path = pathOf(place);
   const auto source = root_.locate(path, error);
   const auto kept = source ? root_.locate(keptPath, error) : std::nullopt;
   if (!kept) {
-    return PlaceOutcome::failed(placeFailure(error));
+    return PlaceOutcome::failed(error);
   }
   const bool isSame = identityIn(source->directory(), source->name()).isSameFileAs(expected);
   if (!isSame) {
     return PlaceOutcome::disturbed();
   }
   if (!linkOrCopy(*source, *kept, error)) {
-    return PlaceOutcome::failed(placeFailure(error));
+    return PlaceOutcome::failed(error);
   }
   const FileIdentity made = identityIn(kept->directory(), kept->name());
   const bool isOther = made.inode == expected.inode
@@ -297,8 +297,8 @@ PlaceOutcome LinuxDevicePlaces::keep(DevicePlace place, std::string_view keptPat
   return PlaceOutcome::done();
 }
 
-std::optional<PlaceFailure> LinuxDevicePlaces::flush(DevicePlace place) {
-  PathError error;
+std::optional<Failure> LinuxDevicePlaces::flush(DevicePlace place) {
+  Failure error;
   const std::string path = pathOf(place);
   const Directory* const opened = openDirectoryAt(place, error);
   const auto directory = opened != nullptr ? DirectoryEntry(opened->descriptor,
@@ -307,35 +307,35 @@ std::optional<PlaceFailure> LinuxDevicePlaces::flush(DevicePlace place) {
                                            : std::nullopt;
   if (!directory) {
     const bool isMissing = error.number == ENOENT || error.number == ENOTDIR;
-    return isMissing ? std::nullopt : std::optional(placeFailure(error));
+    return isMissing ? std::nullopt : std::optional(error);
   }
   const int number = flushDirectory(*directory);
   return number == 0 ? std::nullopt
-                     : std::optional(placeFailure("flush the directory of", path, number));
+                     : std::optional(pathFailure("flush the directory of", path, number));
 }
 
-std::optional<PlaceFailure> LinuxDevicePlaces::makeInformationDirectory() {
+std::optional<Failure> LinuxDevicePlaces::makeInformationDirectory() {
   const std::string directory = pathOf(DevicePlace::InformationDirectory);
   if (files_.isDirectory(directory)) {
     return std::nullopt;
   }
   constexpr unsigned kEverybody = 0777;
   const Result made = files_.createDirectoryWithIntermediates(directory, kEverybody);
-  return made ? std::nullopt : std::optional(PlaceFailure{0, made.error()});
+  return made ? std::nullopt : std::optional(Failure{0, made.error()});
 }
 
-std::optional<PlaceFailure> LinuxDevicePlaces::writeInformationFile(std::string_view name,
-                                                                    const ReadableBytes& contents) {
+std::optional<Failure> LinuxDevicePlaces::writeInformationFile(std::string_view name,
+                                                               const ReadableBytes& contents) {
   if (auto failure = makeInformationDirectory()) {
     return failure;
   }
   const std::string directory = pathOf(DevicePlace::InformationDirectory);
-  PathError error;
+  Failure error;
   const std::string path = joinedPath(directory, name);
   const auto entry = root_.locate(path, error);
   auto temporary = entry ? makeTemporaryFileIn(root_, directory, error) : std::nullopt;
   if (!temporary) {
-    return placeFailure(error);
+    return error;
   }
   auto failure = writeContents(contents, temporary->file, path);
   int number = failure ? 0 : accounts::flush(temporary->file);
@@ -345,7 +345,7 @@ std::optional<PlaceFailure> LinuxDevicePlaces::writeInformationFile(std::string_
     number = errno;
   }
   if (number != 0) {
-    failure = placeFailure("write", path, number);
+    failure = pathFailure("write", path, number);
   }
   if (failure) {
     (void)temporary->entry.remove();

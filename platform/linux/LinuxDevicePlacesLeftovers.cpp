@@ -6,8 +6,8 @@
 #include <cstdio>
 #include <set>
 
+#include "platform/linux/EntryIdentity.h"
 #include "platform/linux/LinuxDevicePlaces.h"
-#include "platform/linux/PlaceFailures.h"
 #include "platform/linux/RenameToNothing.h"
 #include "platform/linux/StagedName.h"
 #include "vocabulary/DevicePath.h"
@@ -58,15 +58,15 @@ std::vector<std::string> LinuxDevicePlaces::settleLeftovers() {
       if (!staged || splitPath(standing).directory != directory) {
         continue;
       }
-      PathError error;
+      Failure error;
       const std::string name(splitPath(standing).name);
       const auto entry = root_.locate(joinedPath(directory, own), error);
       const int number =
           entry ? settle(entry->directory(), *staged, own.c_str(), name.c_str()) : error.number;
       if (number != 0) {
-        sentences.push_back(
-            pathError("settle what an interrupted run left at", joinedPath(directory, own), number)
-                .text);
+        sentences.push_back(pathFailure("settle what an interrupted run left at",
+                                        joinedPath(directory, own), number)
+                                .text);
       }
     }
   }

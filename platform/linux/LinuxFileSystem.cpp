@@ -9,7 +9,7 @@
 #include <utility>
 
 #include "platform/linux/FileContents.h"
-#include "platform/linux/PathResult.h"
+#include "platform/linux/PathFailure.h"
 #include "vocabulary/DevicePath.h"
 
 namespace accounts {
@@ -18,10 +18,10 @@ namespace {
 // Moves an entry, whose contents are flushed already, over another and waits until that is on the
 // medium. The directory is opened before the move so that little can fail after it.
 Result moveOver(const DirectoryEntry& source, const DirectoryEntry& destination) {
-  PathError error;
+  Failure error;
   const auto directory = destination.openDirectory(error);
   if (!directory) {
-    return asResult(error);
+    return error;
   }
   if (::renameat(source.directory(), source.name(), destination.directory(), destination.name()) !=
       0) {
@@ -36,27 +36,27 @@ LinuxFileSystem::LinuxFileSystem(const DeviceRoot& root, std::string temporaryDi
     : root_(root), ownerNames_(root), temporaryDirectory_(std::move(temporaryDirectory)) {}
 
 bool LinuxFileSystem::fileExists(std::string_view path) {
-  PathError error;
+  Failure error;
   return root_.open(path, O_PATH, error).has_value();
 }
 
 bool LinuxFileSystem::isDirectory(std::string_view path) {
-  PathError error;
+  Failure error;
   return root_.open(path, O_PATH | O_DIRECTORY, error).has_value();
 }
 
 Result LinuxFileSystem::copyFile(std::string_view source, std::string_view destination) {
-  PathError error;
+  Failure error;
   const auto original = root_.openRegularFile(source, error);
   const auto status = original ? fileStatus(*original, source, error) : std::nullopt;
   const auto entry = status ? root_.locate(destination, error) : std::nullopt;
   const auto copy = entry ? entry->createFile(kOwnerOnlyFile, error) : std::nullopt;
   if (!copy) {
-    return asResult(error);
+    return error;
   }
   if (!copyContents(*original, source, *copy, destination, error)) {
     (void)entry->remove();
-    return asResult(error);
+    return error;
   }
   if (::fchmod(copy->number(), status->st_mode & kPermissionBits) != 0) {
     const int number = errno;
@@ -67,9 +67,9 @@ Result LinuxFileSystem::copyFile(std::string_view source, std::string_view desti
 }
 
 Result LinuxFileSystem::removeFile(std::string_view path) {
-  PathError error;
+  Failure error;
   const auto entry = entryOf(path, error);
-  const Result result = entry ? asResult("remove", path, entry->remove()) : asResult(error);
+  const Result result = entry ? asResult("remove", path, entry->remove()) : error;
   temporaryFiles_.erase(std::string(path));
   return result;
 }
@@ -81,7 +81,7 @@ Result LinuxFileSystem::createFile(std::string_view path, std::string_view conte
 Result LinuxFileSystem::createDirectoryWithIntermediates(std::string_view path,
                                                          unsigned permissions) {
   const std::string_view whole = withoutTrailingSeparators(path);
-  PathError error;
+  Failure error;
   for (std::size_t end = whole.find('/', 1); end != std::string_view::npos;
        end = whole.find('/', end + 1)) {
     const std::string_view parent = whole.substr(0, end);
@@ -90,7 +90,7 @@ Result LinuxFileSystem::createDirectoryWithIntermediates(std::string_view path,
     }
     const auto entry = root_.locate(parent, error);
     if (!entry) {
-      return asResult(error);
+      return error;
     }
     if (::mkdirat(entry->directory(), entry->name(), kPermissionBits) != 0) {
       const int number = errno;
@@ -102,21 +102,21 @@ Result LinuxFileSystem::createDirectoryWithIntermediates(std::string_view path,
   }
   const auto entry = root_.locate(whole, error);
   return entry && entry->createDirectory(permissions & kPermissionBits, error) ? Result::success()
-                                                                               : asResult(error);
+                                                                               : error;
 }
 
 Result LinuxFileSystem::writeFile(std::string_view path, const SerializedPropertyList& contents) {
-  PathError error;
+  Failure error;
   const auto entry = entryOf(path, error);
   if (!entry) {
-    return asResult(error);
+    return error;
   }
   auto file = entry->openRegularFile(O_WRONLY, error);
   if (!file && error.number == ENOENT) {
     file = entry->createFile(kOwnerOnlyFile, error);
   }
   if (!file) {
-    return asResult(error);
+    return error;
   }
   if (::ftruncate(file->number(), 0) != 0) {
     return asResult("empty", path, errno);
@@ -131,13 +131,13 @@ Result LinuxFileSystem::writeFileAtomically(std::string_view path,
 
 template <class Contents>
 Result LinuxFileSystem::replaceFile(std::string_view path, const Contents& contents) {
-  PathError error;
+  Failure error;
   const auto destination = root_.locate(path, error);
   // In the target's own directory, so that both are on one file system.
   const auto temporary =
       destination ? makeTemporaryFileIn(root_, splitPath(path).directory, error) : std::nullopt;
   if (!temporary) {
-    return asResult(error);
+    return error;
   }
   int number = writeAll(temporary->file.number(), contents);
   if (number == 0) {
@@ -156,14 +156,14 @@ Result LinuxFileSystem::replaceFile(std::string_view path, const Contents& conte
 
 Result LinuxFileSystem::setOwnerAndGroup(std::string_view path, std::string_view ownerName,
                                          std::string_view groupName) {
-  PathError error;
+  Failure error;
   const auto user = ownerNames_.userIdentifier(std::string(ownerName), error);
   const auto group =
       user ? ownerNames_.groupIdentifier(std::string(groupName), error) : std::nullopt;
   const auto entry = group ? entryOf(path, error) : nullptr;
   const auto file = entry ? entry->openRegularFile(O_RDONLY, error) : std::nullopt;
   if (!file) {
-    return asResult(error);
+    return error;
   }
   if (::fchown(file->number(), *user, *group) != 0) {
     return asResult("set the owner of", path, errno);
@@ -172,12 +172,12 @@ Result LinuxFileSystem::setOwnerAndGroup(std::string_view path, std::string_view
 }
 
 Result LinuxFileSystem::renameFile(std::string_view source, std::string_view destination) {
-  PathError error;
+  Failure error;
   const auto from = entryOf(source, error);
   const auto to = from ? root_.locate(destination, error) : std::nullopt;
   const auto file = to ? from->openRegularFile(O_RDONLY, error) : std::nullopt;
   if (!file) {
-    return asResult(error);
+    return error;
   }
   const int number = flush(*file);
   const Result result = number == 0 ? moveOver(*from, *to) : asResult("flush", source, number);
@@ -188,11 +188,11 @@ Result LinuxFileSystem::renameFile(std::string_view source, std::string_view des
 }
 
 Result LinuxFileSystem::renameDirectory(std::string_view source, std::string_view destination) {
-  PathError error;
+  Failure error;
   const auto from = root_.locate(source, error);
   const auto to = from ? root_.locate(destination, error) : std::nullopt;
   if (!to) {
-    return asResult(error);
+    return error;
   }
   struct stat status = {};
   if (::fstatat(from->directory(), from->name(), &status, AT_SYMLINK_NOFOLLOW) != 0) {

@@ -68,7 +68,7 @@ class LinuxFileSystem final : public FileSystem, public FileKeeping {
   /// As `DeviceRoot::locate`, but a temporary file is found in the directory in which it was made,
   /// without looking the directory up again. Null, with `error` set, for none.
   [[nodiscard]] std::shared_ptr<const DirectoryEntry> entryOf(std::string_view path,
-                                                              PathError& error) const;
+                                                              Failure& error) const;
 
   const DeviceRoot& root_;
   OwnerNames ownerNames_;

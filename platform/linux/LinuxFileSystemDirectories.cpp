@@ -7,10 +7,10 @@
 #include <cerrno>
 #include <memory>
 
+#include "platform/linux/EntryIdentity.h"
 #include "platform/linux/FileContents.h"
 #include "platform/linux/LinuxFileSystem.h"
-#include "platform/linux/PathResult.h"
-#include "platform/linux/PlaceFailures.h"
+#include "platform/linux/PathFailure.h"
 
 namespace accounts {
 namespace {
@@ -22,7 +22,7 @@ struct CloseDirectory {
 }  // namespace
 
 std::optional<EntryKind> LinuxFileSystem::kindOfEntry(std::string_view path) {
-  PathError error;
+  Failure error;
   const auto entry = root_.locate(path, error);
   struct stat status = {};
   if (entry && ::fstatat(entry->directory(), entry->name(), &status, AT_SYMLINK_NOFOLLOW) == 0) {
@@ -33,7 +33,7 @@ std::optional<EntryKind> LinuxFileSystem::kindOfEntry(std::string_view path) {
 }
 
 std::optional<std::vector<std::string>> LinuxFileSystem::directoryEntries(std::string_view path) {
-  PathError error;
+  Failure error;
   auto file = root_.open(path, O_RDONLY | O_DIRECTORY, error);
   if (!file) {
     return std::nullopt;
@@ -64,7 +64,7 @@ std::optional<std::vector<std::string>> LinuxFileSystem::directoryEntries(std::s
 }
 
 std::optional<std::string> LinuxFileSystem::shortContents(std::string_view path, std::size_t most) {
-  PathError error;
+  Failure error;
   const auto file = root_.openRegularFile(path, error);
   const auto status = file ? fileStatus(*file, path, error) : std::nullopt;
   return status && static_cast<std::size_t>(status->st_size) <= most
@@ -73,20 +73,19 @@ std::optional<std::string> LinuxFileSystem::shortContents(std::string_view path,
 }
 
 Result LinuxFileSystem::removeDirectory(std::string_view path) {
-  PathError error;
+  Failure error;
   const auto entry = root_.locate(path, error);
   if (!entry) {
-    return asResult(error);
+    return error;
   }
   const bool removed = ::unlinkat(entry->directory(), entry->name(), AT_REMOVEDIR) == 0;
   return asResult("remove the directory", path, removed ? 0 : errno);
 }
 
 Result LinuxFileSystem::synchronizeDirectory(std::string_view path) {
-  PathError error;
+  Failure error;
   const auto directory = root_.open(path, O_RDONLY | O_DIRECTORY, error);
-  return directory ? asResult("flush the directory", path, flushDirectory(*directory))
-                   : asResult(error);
+  return directory ? asResult("flush the directory", path, flushDirectory(*directory)) : error;
 }
 
 }  // namespace accounts

@@ -19,7 +19,7 @@ constexpr mode_t kOwnerOnlyDirectory = 0700;
 }  // namespace
 
 std::optional<std::string> LinuxFileSystem::makeTemporaryFile() {
-  PathError error;
+  Failure error;
   auto temporary = makeTemporaryFileIn(root_, temporaryDirectory_, error);
   if (!temporary && error.isMissing()) {
     const auto entry = root_.locate(temporaryDirectory_, error);
@@ -39,7 +39,7 @@ std::optional<std::string> LinuxFileSystem::makeTemporaryFile() {
 }
 
 std::shared_ptr<const DirectoryEntry> LinuxFileSystem::entryOf(std::string_view path,
-                                                               PathError& error) const {
+                                                               Failure& error) const {
   if (const auto temporary = temporaryFiles_.find(path); temporary != temporaryFiles_.end()) {
     return {temporary->second, &temporary->second->entry};
   }
@@ -57,7 +57,7 @@ void LinuxFileSystem::removeAbandonedTemporaryFiles(
 
 void LinuxFileSystem::removeAbandonedTemporaryFilesIn(const std::string& directory) {
   for (const std::string& name : directoryEntries(directory).value_or(std::vector<std::string>())) {
-    PathError error;
+    Failure error;
     // What a commit left is dealt with by those who know what it replaced.
     const auto entry = name.starts_with(kTemporaryFilePrefix) && !StagedName::parse(name)
                            ? root_.locate(joinedPath(directory, name), error)

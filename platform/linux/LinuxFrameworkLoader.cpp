@@ -33,14 +33,14 @@ Result registerClassesOf(void* entryPoint, ClassRegistry& registry) {
 }  // namespace
 
 Result LinuxFrameworkLoader::loadFramework(std::string_view path) {
-  PathError error;
+  Failure error;
   std::optional<FileDescriptor> file = root_.openRegularFile(path, error);
   if (!file) {
-    return Result::failure(error.text);
+    return error;
   }
   struct stat status = {};
   if (::fstat(file->number(), &status) != 0) {
-    return Result::failure(pathError("look at", path, errno).text);
+    return pathFailure("look at", path, errno);
   }
   const std::pair identity(status.st_dev, status.st_ino);
   if (loaded_.contains(identity)) {

@@ -65,7 +65,7 @@ LockEnd LinuxHostLocks::wait(const FileDescriptor& file, std::string_view what,
     return LockEnd::Taken;
   }
   if (errno != EWOULDBLOCK && errno != EINTR) {
-    reason_ = pathError("lock", what, errno).text;
+    reason_ = pathFailure("lock", what, errno).text;
     return LockEnd::Impossible;
   }
   const Clock::time_point start = Clock::now();
@@ -90,14 +90,14 @@ LockEnd LinuxHostLocks::wait(const FileDescriptor& file, std::string_view what,
       return LockEnd::Taken;
     }
     if (errno != EINTR) {
-      reason_ = pathError("lock", what, errno).text;
+      reason_ = pathFailure("lock", what, errno).text;
       return LockEnd::Impossible;
     }
   }
 }
 
 LockEnd LinuxHostLocks::takeRoot(std::optional<std::chrono::seconds> timeLimit) {
-  PathError error;
+  Failure error;
   directory_ = root_.open("/", O_RDONLY | O_DIRECTORY, error);
   if (!directory_) {
     reason_ = error.text;
@@ -107,7 +107,7 @@ LockEnd LinuxHostLocks::takeRoot(std::optional<std::chrono::seconds> timeLimit) 
 }
 
 LockEnd LinuxHostLocks::takeMigration(std::optional<std::chrono::seconds> timeLimit) {
-  PathError error;
+  Failure error;
   migration_ = openLockFile(root_, kMigrationLockName, error);
   if (!migration_) {
     reason_ = error.text;
@@ -121,7 +121,7 @@ LockEnd LinuxHostLocks::takeMigration(std::optional<std::chrono::seconds> timeLi
 }
 
 bool LinuxHostLocks::canTakeMigration() {
-  PathError error;
+  Failure error;
   const auto entry = root_.locate(joinedPath(kLockDirectory, kMigrationLockName), error);
   if (entry && entry->openRegularFile(O_RDONLY, error)) {
     return true;
@@ -131,7 +131,7 @@ bool LinuxHostLocks::canTakeMigration() {
     if (::faccessat(entry->directory(), ".", W_OK | X_OK, AT_EACCESS) == 0 || errno == EROFS) {
       return true;
     }
-    error = pathError("create", entry->path(), errno);
+    error = pathFailure("create", entry->path(), errno);
   }
   reason_ = error.text;
   return false;

@@ -25,7 +25,7 @@ const PropertyDictionary& LinuxLocalizedStrings::stringTable(const std::string& 
   if (known != tablesByName_.end()) {
     return known->second;
   }
-  PathError error;
+  Failure error;
   const std::optional<std::string> bytes = files_.read(name, error);
   auto read = bytes ? dictionaryFromBytes(*bytes, name, error) : std::nullopt;
   // A table that cannot be read translates nothing.

@@ -49,11 +49,11 @@ void LinuxLogSystem::writeLine(std::string_view prefix, std::string_view line) {
   (void)writeAll(output_->number(), text);
 }
 
-std::optional<FileDescriptor> openLogOutput(const std::string& path, PathError& error) {
+std::optional<FileDescriptor> openLogOutput(const std::string& path, Failure& error) {
   if (path == kStandardError) {
     const int duplicate = ::fcntl(STDERR_FILENO, F_DUPFD_CLOEXEC, 0);
     if (duplicate < 0) {
-      error = pathError("open", "standard error", errno);
+      error = pathFailure("open", "standard error", errno);
       return std::nullopt;
     }
     return FileDescriptor(duplicate);
@@ -62,7 +62,7 @@ std::optional<FileDescriptor> openLogOutput(const std::string& path, PathError& 
   const int flags = O_WRONLY | O_CREAT | O_APPEND | O_CLOEXEC | O_NOCTTY | O_NONBLOCK;
   const int number = ::open(path.c_str(), flags, kOwnerReadsAndWrites);
   if (number < 0) {
-    error = pathError("open the log channel", path, errno);
+    error = pathFailure("open the log channel", path, errno);
     return std::nullopt;
   }
   return FileDescriptor(number);

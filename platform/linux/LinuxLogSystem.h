@@ -10,7 +10,7 @@
 
 #include "platform/LogSystem.h"
 #include "platform/linux/FileDescriptor.h"
-#include "platform/linux/PathError.h"
+#include "platform/linux/PathFailure.h"
 
 namespace accounts {
 
@@ -36,6 +36,6 @@ class LinuxLogSystem final : public LogSystem {
 /// Opens the file that channel lines are appended to, by its path on the host; it is made, readable
 /// by its owner alone, if missing. "-" stands for standard error. None, with `error` set, when it
 /// cannot be written.
-std::optional<FileDescriptor> openLogOutput(const std::string& path, PathError& error);
+std::optional<FileDescriptor> openLogOutput(const std::string& path, Failure& error);
 
 }  // namespace accounts

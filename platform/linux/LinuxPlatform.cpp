@@ -36,17 +36,8 @@ using Kind = LinuxPlatformError::Kind;
 constexpr std::string_view kTemporaryDirectoryInHome = "tmp";
 constexpr std::string_view kJournal = "journal";
 
-bool fail(LinuxPlatformError& error, Kind kind, std::string text) {
-  error = {.kind = kind, .text = std::move(text)};
-  return false;
-}
-
-bool fail(LinuxPlatformError& error, Kind kind, const PathError& reason) {
-  error = {.kind = kind, .failure = failureKind(reason.number), .text = reason.text};
-  if (reason.number == EIO) {
-    error.kind = Kind::InputOutput;
-    error.failure = FailureKind::Lasting;
-  }
+bool fail(LinuxPlatformError& error, Kind kind, Failure failure) {
+  error = {kind, std::move(failure)};
   return false;
 }
 
@@ -56,14 +47,14 @@ bool checkDevicePath(std::string_view option, const std::string& path, LinuxPlat
   }
   std::string text = "The ";
   text.append(option).append(" \"").append(path).append("\" is not an absolute path of the device");
-  return fail(error, Kind::UnusableOption, std::move(text));
+  return fail(error, Kind::UnusableOption, {0, std::move(text)});
 }
 
 bool checkResources(const std::string& directory, LinuxPlatformError& error) {
   const int number = ::open(directory.c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC);
   if (number < 0) {
     return fail(error, Kind::MissingInput,
-                pathError("open the bundle's resources", directory, errno));
+                pathFailure("open the bundle's resources", directory, errno));
   }
   ::close(number);
   return true;
@@ -76,7 +67,7 @@ struct OpenedLog {
 };
 
 /// Without a log, with `error` set, when the channel cannot be opened.
-OpenedLog openLog(const LinuxPlatformOptions& options, PathError& error) {
+OpenedLog openLog(const LinuxPlatformOptions& options, Failure& error) {
   if (!options.channel) {
     return {std::make_unique<LinuxLogSystem>()};
   }
@@ -95,7 +86,7 @@ OpenedLog openLog(const LinuxPlatformOptions& options, PathError& error) {
 
 /// The device description as it stands in its file; null, with `error` set, when it cannot be read.
 std::optional<DescriptionBytes> readDescription(const LinuxPlatformOptions& options,
-                                                const DeviceRoot& root, PathError& error) {
+                                                const DeviceRoot& root, Failure& error) {
   return options.deviceDescriptionFile
              ? readHostDeviceDescription(*options.deviceDescriptionFile, error)
              : readDeviceDescription(root, error);
@@ -183,7 +174,7 @@ std::unique_ptr<LinuxPlatform> LinuxPlatform::create(const LinuxPlatformOptions&
       !checkResources(options.bundleResourcesDirectory, error)) {
     return nullptr;
   }
-  PathError failure;
+  Failure failure;
   auto root = DeviceRoot::openRoot(options.rootDirectory, failure);
   if (!root) {
     fail(error, failure.number == ENOSYS ? Kind::InputOutput : Kind::MissingInput, failure);
@@ -207,7 +198,7 @@ std::unique_ptr<LinuxPlatform> LinuxPlatform::create(const LinuxPlatformOptions&
 }
 
 bool LinuxPlatform::decodeDescription(LinuxPlatformError& error) {
-  PathError failure;
+  Failure failure;
   auto description = decodeDeviceDescription(parts_->descriptionBytes, failure);
   if (!description) {
     return fail(error, Kind::MissingInput, failure);

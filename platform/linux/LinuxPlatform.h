@@ -56,10 +56,8 @@ struct LinuxPlatformError {
     InputOutput
   };
   Kind kind = Kind::InputOutput;
-  /// Whether trying again may help.
-  FailureKind failure = FailureKind::Lasting;
-  /// One line for a person, without a full stop.
-  std::string text;
+  /// Its text is one line for a person, without a full stop.
+  Failure failure = {};
 };
 
 /// One Linux implementation of each interface of the platform, on one device root. Making it

@@ -7,12 +7,12 @@
 namespace accounts {
 
 std::optional<PropertyDictionary> LinuxPropertyLists::readDictionary(std::string_view path) {
-  PathError error;
+  Failure error;
   return readDictionary(path, error);
 }
 
 std::optional<PropertyDictionary> LinuxPropertyLists::readDictionary(std::string_view path,
-                                                                     PathError& error) {
+                                                                     Failure& error) {
   return readDictionaryFile(root_, path, error);
 }
 

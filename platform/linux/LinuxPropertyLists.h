@@ -5,7 +5,7 @@
 
 #include "platform/PropertyLists.h"
 #include "platform/linux/DeviceRoot.h"
-#include "platform/linux/PathError.h"
+#include "platform/linux/PathFailure.h"
 #include "propertylist/binary/BinaryPropertyListSerializer.h"
 
 namespace accounts {
@@ -20,7 +20,7 @@ class LinuxPropertyLists final : public PropertyLists {
 
   /// Like `readDictionary`, and says in `error` why there is none: `error.isMissing()` tells a
   /// missing file from an unreadable one.
-  std::optional<PropertyDictionary> readDictionary(std::string_view path, PathError& error);
+  std::optional<PropertyDictionary> readDictionary(std::string_view path, Failure& error);
 
  private:
   const DeviceRoot& root_;

@@ -44,12 +44,12 @@ class FileLock final : public NamedLock {
 // Opened for writing where that is allowed: some network file systems lock no other files. Never
 // with O_CREAT where the file exists: the kernel can refuse that in a directory such as /tmp when
 // the file is another user's.
-std::optional<FileDescriptor> openExisting(const DirectoryEntry& entry, PathError& error) {
+std::optional<FileDescriptor> openExisting(const DirectoryEntry& entry, Failure& error) {
   auto file = entry.openRegularFile(O_RDWR, error);
   return file || error.number == ENOENT ? std::move(file) : entry.openRegularFile(O_RDONLY, error);
 }
 
-std::optional<FileDescriptor> openOrCreate(const DirectoryEntry& entry, PathError& error) {
+std::optional<FileDescriptor> openOrCreate(const DirectoryEntry& entry, Failure& error) {
   auto file = openExisting(entry, error);
   if (file || error.number != ENOENT) {
     return file;
@@ -74,7 +74,7 @@ bool canBeLocked(const FileDescriptor& file) {
 }  // namespace
 
 std::optional<FileDescriptor> openLockFile(const DeviceRoot& root, std::string_view name,
-                                           PathError& error) {
+                                           Failure& error) {
   const auto entry = root.locate(joinedPath(kLockDirectory, name), error);
   return entry ? openOrCreate(*entry, error) : std::nullopt;
 }
@@ -91,7 +91,7 @@ std::unique_ptr<NamedLock> LinuxSharedResources::makeLock(std::string_view name)
   if (name.find('/') != std::string_view::npos) {
     return nullptr;
   }
-  PathError error;
+  Failure error;
   auto file = openLockFile(root_, name, error);
   if (!file || !canBeLocked(*file)) {
     return nullptr;

@@ -8,7 +8,7 @@
 #include "platform/SharedResources.h"
 #include "platform/linux/DeviceRoot.h"
 #include "platform/linux/FileDescriptor.h"
-#include "platform/linux/PathError.h"
+#include "platform/linux/PathFailure.h"
 
 namespace accounts {
 
@@ -18,7 +18,7 @@ inline constexpr std::string_view kLockDirectory = "/tmp";
 /// Opens the file of a named lock, made if missing. None, with `error` set, when that cannot be
 /// done or something else than a regular file is there.
 std::optional<FileDescriptor> openLockFile(const DeviceRoot& root, std::string_view name,
-                                           PathError& error);
+                                           Failure& error);
 
 /// Places and locks of the device beneath a root, which must outlive this. The lock NAME is an
 /// exclusive flock on the regular file /tmp/NAME. The file is made if missing, never changed and

@@ -6,8 +6,8 @@
 #include <array>
 #include <cerrno>
 
+#include "platform/linux/EntryIdentity.h"
 #include "platform/linux/FileContents.h"
-#include "platform/linux/PlaceFailures.h"
 
 namespace accounts {
 namespace {
@@ -16,12 +16,12 @@ constexpr std::size_t kBlockSize = std::size_t{128} << 10;
 
 }  // namespace
 
-std::optional<PlaceFailure> OpenedBytes::giveTo(const Taker& take) const {
+std::optional<Failure> OpenedBytes::giveTo(const Taker& take) const {
   // A file that grows is read as far as no reader would take it.
   return PartOfOpenedBytes(file_, 0, kLargestFileSize + 1, path_).giveTo(take);
 }
 
-std::optional<PlaceFailure> PartOfOpenedBytes::giveTo(const Taker& take) const {
+std::optional<Failure> PartOfOpenedBytes::giveTo(const Taker& take) const {
   std::string block(static_cast<std::size_t>(std::min<std::uint64_t>(kBlockSize, length_)), '\0');
   for (std::uint64_t done = 0; done < length_;) {
     const std::size_t wanted =
@@ -32,7 +32,7 @@ std::optional<PlaceFailure> PartOfOpenedBytes::giveTo(const Taker& take) const {
       continue;
     }
     if (count < 0) {
-      return placeFailure("read", path_, errno);
+      return pathFailure("read", path_, errno);
     }
     const auto given = static_cast<std::size_t>(count);
     if (count == 0 || !take(std::string_view(block.data(), given))) {

@@ -38,9 +38,9 @@ std::optional<std::uint32_t> parseIdentifier(std::string_view text) {
   return number;
 }
 
-PathError unknownName(std::string_view database, std::string_view name) {
-  return pathError(std::string("find \"").append(name).append("\" in"), database,
-                   "There is no usable entry");
+Failure unknownName(std::string_view database, std::string_view name) {
+  return pathFailure(std::string("find \"").append(name).append("\" in"), database,
+                     "There is no usable entry");
 }
 
 // Asks one of the C library's two lookups, which share their shape, with a buffer that grows until
@@ -48,7 +48,7 @@ PathError unknownName(std::string_view database, std::string_view name) {
 template <class Entry, class LookUp, class Number>
 std::optional<std::uint32_t> askNameService(LookUp lookUp, Number Entry::*number,
                                             std::string_view database, const std::string& name,
-                                            PathError& error) {
+                                            Failure& error) {
   for (std::size_t size = kFirstBufferSize; size <= kLargestBufferSize; size *= 2) {
     std::vector<char> buffer(size);
     Entry entry = {};
@@ -63,7 +63,7 @@ std::optional<std::uint32_t> askNameService(LookUp lookUp, Number Entry::*number
     }
     return entry.*number;
   }
-  error = pathError("read the entry \"" + name + "\" of", database, ERANGE);
+  error = pathFailure("read the entry \"" + name + "\" of", database, ERANGE);
   return std::nullopt;
 }
 
@@ -87,7 +87,7 @@ std::optional<std::uint32_t> identifierInDatabase(std::string_view database,
 void OwnerNames::readAhead(const std::string& name) {
   if (root_.isSystemRoot()) {
     // The name service keeps no promise of what it opens; its numbers are remembered.
-    PathError error;
+    Failure error;
     static_cast<void>(userIdentifier(name, error));
     static_cast<void>(groupIdentifier(name, error));
     isNameServiceAsked_ = true;
@@ -100,7 +100,7 @@ void OwnerNames::readAhead(const std::string& name) {
   }
 }
 
-std::optional<std::string> OwnerNames::databaseAt(std::string_view path, PathError& error) const {
+std::optional<std::string> OwnerNames::databaseAt(std::string_view path, Failure& error) const {
   const auto database = databases_.find(path);
   if (database == databases_.end()) {
     return root_.readFile(path, error);
@@ -113,7 +113,7 @@ std::optional<std::string> OwnerNames::databaseAt(std::string_view path, PathErr
 
 std::optional<std::uint32_t> OwnerNames::numberInDatabase(std::string_view databasePath,
                                                           const std::string& name,
-                                                          PathError& error) const {
+                                                          Failure& error) const {
   const auto database = databaseAt(databasePath, error);
   if (!database) {
     return std::nullopt;
@@ -129,7 +129,7 @@ template <class Entry, class LookUp, class Number>
 std::optional<std::uint32_t> OwnerNames::askIfPossible(LookUp lookUp, Number Entry::*number,
                                                        std::string_view database,
                                                        const std::string& name,
-                                                       PathError& error) const {
+                                                       Failure& error) const {
   if (isNameServiceAsked_) {
     error = unknownName(database, name);
     return std::nullopt;
@@ -150,7 +150,7 @@ std::optional<std::uint32_t> OwnerNames::rememberedOr(const LookUp& lookUp, cons
   return identifier;
 }
 
-std::optional<std::uint32_t> OwnerNames::userIdentifier(const std::string& name, PathError& error) {
+std::optional<std::uint32_t> OwnerNames::userIdentifier(const std::string& name, Failure& error) {
   const auto lookUpUser = [&] {
     return root_.isSystemRoot()
                ? askIfPossible<passwd>(::getpwnam_r, &passwd::pw_uid, kUserDatabase, name, error)
@@ -159,8 +159,7 @@ std::optional<std::uint32_t> OwnerNames::userIdentifier(const std::string& name,
   return rememberedOr(lookUpUser, name, users_);
 }
 
-std::optional<std::uint32_t> OwnerNames::groupIdentifier(const std::string& name,
-                                                         PathError& error) {
+std::optional<std::uint32_t> OwnerNames::groupIdentifier(const std::string& name, Failure& error) {
   const auto lookUpGroup = [&] {
     return root_.isSystemRoot()
                ? askIfPossible<group>(::getgrnam_r, &group::gr_gid, kGroupDatabase, name, error)

@@ -7,7 +7,7 @@
 #include <string_view>
 
 #include "platform/linux/DeviceRoot.h"
-#include "platform/linux/PathError.h"
+#include "platform/linux/PathFailure.h"
 
 namespace accounts {
 
@@ -29,9 +29,9 @@ class OwnerNames {
 
   /// The number of a user or group; none, with `error` set, when the device does not know the name.
   [[nodiscard]] std::optional<std::uint32_t> userIdentifier(const std::string& name,
-                                                            PathError& error);
+                                                            Failure& error);
   [[nodiscard]] std::optional<std::uint32_t> groupIdentifier(const std::string& name,
-                                                             PathError& error);
+                                                             Failure& error);
 
  private:
   using Found = std::map<std::string, std::uint32_t>;
@@ -39,22 +39,21 @@ class OwnerNames {
   [[nodiscard]] std::optional<std::uint32_t> askIfPossible(LookUp lookUp, Number Entry::*number,
                                                            std::string_view database,
                                                            const std::string& name,
-                                                           PathError& error) const;
+                                                           Failure& error) const;
   template <class LookUp>
   static std::optional<std::uint32_t> rememberedOr(const LookUp& lookUp, const std::string& name,
                                                    Found& found);
   [[nodiscard]] std::optional<std::uint32_t> numberInDatabase(std::string_view databasePath,
                                                               const std::string& name,
-                                                              PathError& error) const;
+                                                              Failure& error) const;
 
   /// The bytes of a database, read ahead or now; none, with `error` set, for none.
-  [[nodiscard]] std::optional<std::string> databaseAt(std::string_view path,
-                                                      PathError& error) const;
+  [[nodiscard]] std::optional<std::string> databaseAt(std::string_view path, Failure& error) const;
 
   struct Database {
     std::optional<std::string> bytes;
     /// Why there are no bytes.
-    PathError error;
+    Failure error;
   };
   const DeviceRoot& root_;
   /// Whether the running system's name service has been asked for the last time.

@@ -49,10 +49,10 @@ std::optional<std::string> randomDigits() {
 }
 
 std::optional<DirectoryEntry> freeEntryIn(const std::shared_ptr<const FileDescriptor>& directory,
-                                          std::string_view directoryPath, PathError& error) {
+                                          std::string_view directoryPath, Failure& error) {
   auto name = uniqueName();
   if (!name) {
-    error = pathError("make a temporary name in", directoryPath, errno);
+    error = pathFailure("make a temporary name in", directoryPath, errno);
     return std::nullopt;
   }
   std::string path = joinedPath(directoryPath, *name);
@@ -61,7 +61,7 @@ std::optional<DirectoryEntry> freeEntryIn(const std::shared_ptr<const FileDescri
 
 std::optional<TemporaryFile> makeTemporaryFileIn(
     const std::shared_ptr<const FileDescriptor>& directory, std::string_view directoryPath,
-    PathError& error) {
+    Failure& error) {
   for (int attempt = 0; attempt < kMostNames; ++attempt) {
     auto entry = freeEntryIn(directory, directoryPath, error);
     if (!entry) {
@@ -70,7 +70,7 @@ std::optional<TemporaryFile> makeTemporaryFileIn(
     auto file = entry->createFile(kOwnerOnlyFile, error);
     // The process's mask applies to open but not to fchmod.
     if (file && ::fchmod(file->number(), kOwnerOnlyFile) != 0) {
-      error = pathError("set the permissions of", entry->path(), errno);
+      error = pathFailure("set the permissions of", entry->path(), errno);
       (void)entry->remove();
       return std::nullopt;
     }
@@ -85,7 +85,7 @@ std::optional<TemporaryFile> makeTemporaryFileIn(
 }
 
 std::optional<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::string_view directory,
-                                                 PathError& error) {
+                                                 Failure& error) {
   auto opened = root.open(directory, O_PATH | O_DIRECTORY, error);
   return opened ? makeTemporaryFileIn(std::make_shared<const FileDescriptor>(*std::move(opened)),
                                       directory, error)

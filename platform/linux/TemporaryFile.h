@@ -8,7 +8,7 @@
 #include "platform/linux/DeviceRoot.h"
 #include "platform/linux/DirectoryEntry.h"
 #include "platform/linux/FileDescriptor.h"
-#include "platform/linux/PathError.h"
+#include "platform/linux/PathFailure.h"
 
 namespace accounts {
 
@@ -29,15 +29,15 @@ struct TemporaryFile {
 /// A temporary name in an open directory that nothing has yet. None, with `error` set, when the
 /// system has no random bytes.
 std::optional<DirectoryEntry> freeEntryIn(const std::shared_ptr<const FileDescriptor>& directory,
-                                          std::string_view directoryPath, PathError& error);
+                                          std::string_view directoryPath, Failure& error);
 
 /// Makes a temporary file in an open directory. None, with `error` set, when it cannot be made.
 std::optional<TemporaryFile> makeTemporaryFileIn(
     const std::shared_ptr<const FileDescriptor>& directory, std::string_view directoryPath,
-    PathError& error);
+    Failure& error);
 /// Makes a temporary file in a directory that exists. None, with `error` set, when it cannot be
 /// made.
 std::optional<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::string_view directory,
-                                                 PathError& error);
+                                                 Failure& error);
 
 }  // namespace accounts

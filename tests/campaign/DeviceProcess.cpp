@@ -14,7 +14,7 @@ namespace accounts {
 namespace {
 
 DeviceRoot openDevice() {
-  PathError error;
+  Failure error;
   std::optional<DeviceRoot> root =
       DeviceRoot::openRoot(std::string(SimulatedKernel::kDeviceDirectory), error);
   if (!root) {

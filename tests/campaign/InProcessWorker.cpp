@@ -26,7 +26,7 @@ ProgramError ended() {
 class PartOfText final : public ReadableBytes {
  public:
   explicit PartOfText(std::string_view text) : text_(text) {}
-  std::optional<PlaceFailure> giveTo(const Taker& take) const override {
+  std::optional<Failure> giveTo(const Taker& take) const override {
     static_cast<void>(take(text_));
     return std::nullopt;
   }

@@ -16,10 +16,10 @@ namespace accounts {
 /// Bytes to read; with a failure set, the ones before it can be read and no more.
 class FakeBytes final : public ReadableBytes {
  public:
-  explicit FakeBytes(std::string bytes, std::optional<PlaceFailure> failure = std::nullopt)
+  explicit FakeBytes(std::string bytes, std::optional<Failure> failure = std::nullopt)
       : bytes_(std::move(bytes)), failure_(std::move(failure)) {}
 
-  std::optional<PlaceFailure> giveTo(const Taker& take) const override {
+  std::optional<Failure> giveTo(const Taker& take) const override {
     ++readings;
     // In two pieces: nobody may count on getting all at once.
     const std::string_view all = bytes_;
@@ -34,11 +34,11 @@ class FakeBytes final : public ReadableBytes {
 
  private:
   std::string bytes_;
-  std::optional<PlaceFailure> failure_;
+  std::optional<Failure> failure_;
 };
 
 /// The failure that the system gives for an operation on a path.
-inline PlaceFailure failureOf(std::string_view operation, std::string_view path, int number) {
+inline Failure failureOf(std::string_view operation, std::string_view path, int number) {
   return {number,
           std::string("Cannot ").append(operation).append(" ").append(path).append(": ").append(
               std::generic_category().message(number))};

@@ -34,7 +34,7 @@ TEST_F(DevelopmentFiles, AreAllThatTheSmallestFrameworkIsBuiltFrom) {
            .arguments = {"--build", build().string(), "--target", "DeviceAndCloudAccounts"},
            .timeLimit = std::chrono::seconds(240)});
 
-  PathError error;
+  Failure error;
   const auto device = DeviceRoot::openRoot((build() / "frameworks").string(), error);
   ASSERT_TRUE(device) << error.text;
   LinuxConsoleLog log;

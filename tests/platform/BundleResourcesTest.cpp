@@ -58,7 +58,7 @@ TEST_F(BundleResourcesTest, WhatWasReadAheadNeedsNoFileAnyMore) {
 
   EXPECT_TRUE(resources.hasPropertyList("Types"));
   EXPECT_EQ(resources.readPropertyList("Types"), (PropertyDictionary{{"Mail", "IMAP"}}));
-  PathError error;
+  Failure error;
   EXPECT_EQ(files.read("en.lproj/Table.strings", error), "a table");
 }
 
@@ -70,7 +70,7 @@ TEST_F(BundleResourcesTest, WhatCannotBeReadAheadIsThereButHoldsNothing) {
   EXPECT_TRUE(resources.hasPropertyList("Types"));
   EXPECT_FALSE(resources.readPropertyList("Types"));
   EXPECT_FALSE(resources.hasPropertyList("Others"));
-  PathError error;
+  Failure error;
   EXPECT_FALSE(files.read("Others.plist", error));
   EXPECT_TRUE(error.isMissing());
 }

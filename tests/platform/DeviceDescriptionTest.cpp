@@ -19,7 +19,7 @@ class DeviceDescriptionTest : public DeviceFixture {
   }
 
   DeviceRoot root = openImage();
-  PathError error;
+  Failure error;
 };
 
 TEST_F(DeviceDescriptionTest, ADeviceWithoutDescriptionHasNoAnswers) {

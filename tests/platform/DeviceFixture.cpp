@@ -105,7 +105,7 @@ std::vector<std::string> DeviceFixture::namesIn(std::string_view devicePath) con
 }
 
 DeviceRoot DeviceFixture::openImage() const {
-  PathError error;
+  Failure error;
   auto root = DeviceRoot::openRoot(image().string(), error);
   require(root.has_value(), error.text);
   return std::move(*root);

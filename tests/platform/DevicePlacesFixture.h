@@ -39,7 +39,7 @@ class DevicePlacesTest : public DeviceFixture {
   /// The snapshot; a failure of the test and an empty one where none can be taken.
   DeviceSnapshot snapshot() {
     auto taken = places.takeSnapshot();
-    if (const auto* failure = std::get_if<PlaceFailure>(&taken)) {
+    if (const auto* failure = std::get_if<Failure>(&taken)) {
       ADD_FAILURE() << failure->text;
       return {};
     }
@@ -48,7 +48,7 @@ class DevicePlacesTest : public DeviceFixture {
   /// Why no snapshot can be taken.
   std::string whyNoSnapshot() {
     const auto taken = places.takeSnapshot();
-    const auto* failure = std::get_if<PlaceFailure>(&taken);
+    const auto* failure = std::get_if<Failure>(&taken);
     return failure != nullptr ? failure->text : "(there is one)";
   }
   FileIdentity identity(DevicePlace place) {
@@ -63,7 +63,7 @@ class DevicePlacesTest : public DeviceFixture {
     const FakeBytes contents(text);
     auto staged =
         places.stage(place, {.contents = &contents, .permissions = permissions, .owner = owner});
-    if (const auto* failure = std::get_if<PlaceFailure>(&staged)) {
+    if (const auto* failure = std::get_if<Failure>(&staged)) {
       ADD_FAILURE() << failure->text;
       return nullptr;
     }
@@ -87,7 +87,7 @@ class DevicePlacesTest : public DeviceFixture {
     }
     return "";
   }
-  static std::string textOf(const std::optional<PlaceFailure>& failure) {
+  static std::string textOf(const std::optional<Failure>& failure) {
     return failure ? failure->text : "(none)";
   }
   static std::string bytesOf(const PlaceState& state) {

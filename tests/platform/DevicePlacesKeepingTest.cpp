@@ -104,8 +104,8 @@ TEST_F(DevicePlacesKeepingTest, AKeptFileThatGetsNoPlaceIsKeptAlone) {
 
 TEST_F(DevicePlacesKeepingTest, AMissingKeptFileIsAFailure) {
   const auto staged = places.stageKept(kStore, kKept);
-  ASSERT_TRUE(std::holds_alternative<PlaceFailure>(staged));
-  EXPECT_EQ(std::get<PlaceFailure>(staged).number, ENOENT);
+  ASSERT_TRUE(std::holds_alternative<Failure>(staged));
+  EXPECT_EQ(std::get<Failure>(staged).number, ENOENT);
 }
 
 /// Where a file can have no second name: these tests end their process, in which link() fails.

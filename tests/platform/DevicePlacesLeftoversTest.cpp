@@ -2,7 +2,7 @@
 
 #include <cstdlib>
 
-#include "platform/linux/PlaceFailures.h"
+#include "platform/linux/EntryIdentity.h"
 #include "platform/linux/StagedName.h"
 #include "platform/linux/TemporaryFile.h"
 #include "tests/platform/DevicePlacesFixture.h"

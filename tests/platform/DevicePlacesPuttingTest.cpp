@@ -93,17 +93,17 @@ TEST_F(DevicePlacesPuttingTest, AFileThatCannotBeGivenAwayIsAFailureAndLeavesNot
   const FakeBytes contents("new");
   const auto staged =
       places.stage(kReplacedSettings, {.contents = &contents, .owner = FileOwner{12345, 12345}});
-  ASSERT_TRUE(std::holds_alternative<PlaceFailure>(staged));
-  EXPECT_EQ(std::get<PlaceFailure>(staged).text,
+  ASSERT_TRUE(std::holds_alternative<Failure>(staged));
+  EXPECT_EQ(std::get<Failure>(staged).text,
             "Cannot set the owner of " + path(kReplacedSettings) + ": Operation not permitted");
   EXPECT_TRUE(namesIn(kPreferences).empty());
 }
 
 TEST_F(DevicePlacesPuttingTest, BytesThatCannotBeReadAreAFailureAndLeaveNothing) {
-  const FakeBytes contents("half of it", PlaceFailure{EIO, "Cannot read it"});
+  const FakeBytes contents("half of it", Failure{EIO, "Cannot read it"});
   const auto staged = places.stage(kReplacedSettings, {.contents = &contents});
-  ASSERT_TRUE(std::holds_alternative<PlaceFailure>(staged));
-  EXPECT_EQ(std::get<PlaceFailure>(staged).text, "Cannot read it");
+  ASSERT_TRUE(std::holds_alternative<Failure>(staged));
+  EXPECT_EQ(std::get<Failure>(staged).text, "Cannot read it");
   EXPECT_TRUE(namesIn(kPreferences).empty());
 }
 
@@ -111,8 +111,8 @@ TEST_F(DevicePlacesPuttingTest, AFullDiskIsAFailureAndLeavesNothing) {
   const WithLargestWrittenFile limit(4);
   const FakeBytes contents("more than four");
   const auto staged = places.stage(kReplacedSettings, {.contents = &contents});
-  ASSERT_TRUE(std::holds_alternative<PlaceFailure>(staged));
-  EXPECT_EQ(std::get<PlaceFailure>(staged).number, EFBIG);
+  ASSERT_TRUE(std::holds_alternative<Failure>(staged));
+  EXPECT_EQ(std::get<Failure>(staged).number, EFBIG);
   EXPECT_TRUE(namesIn(kPreferences).empty());
 }
 
@@ -120,7 +120,7 @@ TEST_F(DevicePlacesPuttingTest, AMissingDirectoryIsAFailure) {
   fs::remove(onHost(kMail));
   static_cast<void>(snapshot());
   const FakeBytes contents("new");
-  EXPECT_TRUE(std::holds_alternative<PlaceFailure>(
+  EXPECT_TRUE(std::holds_alternative<Failure>(
       places.stage(DevicePlace::LegacyMail, {.contents = &contents})));
 }
 

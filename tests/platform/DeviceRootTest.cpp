@@ -24,7 +24,7 @@ class DeviceRootTest : public DeviceFixture {
   std::optional<std::string> read(std::string_view path) { return root.readFile(path, error); }
 
   DeviceRoot root = openImage();
-  PathError error;
+  Failure error;
 };
 
 TEST_F(DeviceRootTest, AnAbsolutePathStartsAtTheRoot) {

@@ -31,7 +31,7 @@ struct Pipe {
 
 class FileContentsTest : public DeviceFixture {
  protected:
-  PathError error;
+  Failure error;
 };
 
 TEST_F(FileContentsTest, AFileOfTheLargestSizeIsRead) {

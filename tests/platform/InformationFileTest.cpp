@@ -66,7 +66,7 @@ TEST_F(InformationFileTest, AFailureLeavesNothing) {
   makeDirectory(directory + "/name.txt");
   EXPECT_EQ(write("information"), "Cannot write " + directory + "/name.txt: Is a directory");
   EXPECT_EQ(textOf(places.writeInformationFile(
-                "other.txt", FakeBytes("half of it", PlaceFailure{EIO, "Cannot read it"}))),
+                "other.txt", FakeBytes("half of it", Failure{EIO, "Cannot read it"}))),
             "Cannot read it");
   EXPECT_EQ(namesIn(directory), std::vector<std::string>{"name.txt"});
 }

@@ -55,7 +55,7 @@ class Journal : public DeviceFixture {
 
   const std::string path = (outside() / "journal").string();
   FileDescriptor receiver{::socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0)};
-  PathError error;
+  Failure error;
 };
 
 TEST_F(Journal, ALineIsOneEntryWithWhatItIsMadeOfInFieldsOfTheirOwn) {

@@ -20,7 +20,7 @@ class LinkedOrCopiedTest : public DeviceFixture {
 
   /// Why /kept/file was not made of what is at a path; nothing when it was.
   std::string keep(const char* source = "/file") {
-    PathError error;
+    Failure error;
     const auto from = root.locate(source, error);
     const auto to = root.locate("/kept/file", error);
     return from && to && linkOrCopy(*from, *to, error) ? "" : error.text;

@@ -155,7 +155,7 @@ TEST_F(LinuxPlatformTest, AMissingRootIsAMissingInputThatIsNamed) {
   options.rootDirectory = (outside() / "none").string();
   EXPECT_FALSE(create());
   EXPECT_EQ(error.kind, Kind::MissingInput);
-  EXPECT_EQ(error.text,
+  EXPECT_EQ(error.failure.text,
             "Cannot open the device root " + options.rootDirectory + ": No such file or directory");
 }
 
@@ -191,7 +191,8 @@ TEST_F(LinuxPlatformTest, DirectoriesThatAreNoAbsoluteDevicePathsAreUnusable) {
   options.homeDirectory = "var/mobile";
   EXPECT_FALSE(create());
   EXPECT_EQ(error.kind, Kind::UnusableOption);
-  EXPECT_EQ(error.text, "The home directory \"var/mobile\" is not an absolute path of the device");
+  EXPECT_EQ(error.failure.text,
+            "The home directory \"var/mobile\" is not an absolute path of the device");
   options.homeDirectory = "/var/mobile";
   options.temporaryDirectory = "";
   EXPECT_FALSE(create());

@@ -71,7 +71,7 @@ class LogSystemTest : public DeviceFixture {
   std::optional<FileDescriptor> open(const std::string& file) { return openLogOutput(file, error); }
 
   const std::string path = (outside() / "channel.log").string();
-  PathError error;
+  Failure error;
 };
 
 TEST_F(LogSystemTest, WithoutAnOutputNoChannelIsEnabled) {

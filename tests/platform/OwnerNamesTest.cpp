@@ -51,7 +51,7 @@ class OwnerNamesTest : public DeviceFixture {
  protected:
   DeviceRoot root = openImage();
   OwnerNames names{root};
-  PathError error;
+  Failure error;
 };
 
 TEST_F(OwnerNamesTest, NamesComeFromTheRootsOwnDatabases) {

@@ -13,7 +13,7 @@ class PropertyListsTest : public DeviceFixture {
  protected:
   DeviceRoot root = openImage();
   LinuxPropertyLists propertyLists{root};
-  PathError error;
+  Failure error;
 
   SerializedPropertyList serialize(const PropertyValue& value) {
     SerializedPropertyList serialized;

@@ -34,7 +34,7 @@ class ReadOnlyMountTest : public DevicePlacesTest {
   }
   /// Takes a snapshot with a view of the mounts of its own.
   static DeviceSnapshot taken(const std::string& directory, ReadOnlyMounts mounts) {
-    PathError error;
+    Failure error;
     const DeviceRoot device = DeviceRoot::openRoot(directory, error).value();
     LinuxFileSystem system(device, "/var/mobile/tmp");
     return std::get<DeviceSnapshot>(

@@ -180,6 +180,11 @@ TEST_F(CommitTest, AFailureSaysWhatForAndWhy) {
   EXPECT_EQ(outcome.error.message, "The settings file cannot be written: Cannot stage Settings");
 }
 
+TEST_F(CommitTest, AMediumThatDoesNotAnswerIsNoPassingFailure) {
+  device.failWhenLineBegins("stage Settings", EIO);
+  EXPECT_EQ(commit().error.exitStatus, ExitStatus::InputOutputError);
+}
+
 TEST_F(CommitTest, ASettingsFileThatCannotBePutInPlaceIsAFailureToo) {
   device.failWhenLineBegins("put Settings");
   EXPECT_EQ(commit().error.message, "The settings file cannot be replaced: Cannot put Settings");

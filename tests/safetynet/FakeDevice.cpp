@@ -30,8 +30,8 @@ bool isIn(std::string_view path, std::string_view directory) {
          path[directory.size()] == '/';
 }
 
-Result resultOf(const std::optional<PlaceFailure>& failure) {
-  return failure ? Result::failure(failure->text) : Result::success();
+Result resultOf(const std::optional<Failure>& failure) {
+  return failure ? Result(*failure) : Result::success();
 }
 
 }  // namespace
@@ -118,7 +118,7 @@ void FakeDevice::removeFaults() {
   stopBefore_.reset();
 }
 
-std::optional<PlaceFailure> FakeDevice::begin(const std::string& text, Recorded recorded) {
+std::optional<Failure> FakeDevice::begin(const std::string& text, Recorded recorded) {
   const std::size_t number = operationCount_++;
   if (number == stopBefore_) {
     throw WorldStopped();
@@ -131,10 +131,10 @@ std::optional<PlaceFailure> FakeDevice::begin(const std::string& text, Recorded 
   }
   for (const auto& [beginning, error] : failing_) {
     if (text.starts_with(beginning)) {
-      return PlaceFailure{error, "Cannot " + text};
+      return Failure{error, "Cannot " + text};
     }
   }
-  return number == failAt_ ? std::optional(PlaceFailure{EIO, "Cannot " + text}) : std::nullopt;
+  return number == failAt_ ? std::optional(Failure{EIO, "Cannot " + text}) : std::nullopt;
 }
 
 FileIdentity FakeDevice::identityOf(std::string_view path) const {
@@ -142,7 +142,7 @@ FileIdentity FakeDevice::identityOf(std::string_view path) const {
   return found != entries.end() ? found->second->identity : FileIdentity();
 }
 
-std::variant<DeviceSnapshot, PlaceFailure> FakeDevice::takeSnapshot() {
+std::variant<DeviceSnapshot, Failure> FakeDevice::takeSnapshot() {
   if (auto failure = begin("takeSnapshot", Recorded::No)) {
     return *failure;
   }
@@ -166,15 +166,15 @@ std::variant<DeviceSnapshot, PlaceFailure> FakeDevice::takeSnapshot() {
   return snapshot;
 }
 
-std::variant<FileIdentity, PlaceFailure> FakeDevice::identityAt(DevicePlace place) {
+std::variant<FileIdentity, Failure> FakeDevice::identityAt(DevicePlace place) {
   if (auto failure = begin(line("identityAt", nameOf(place)), Recorded::No)) {
     return *failure;
   }
   return identityOf(pathOf(place));
 }
 
-std::variant<std::unique_ptr<StagedFile>, PlaceFailure> FakeDevice::stage(DevicePlace place,
-                                                                          const NewFile& file) {
+std::variant<std::unique_ptr<StagedFile>, Failure> FakeDevice::stage(DevicePlace place,
+                                                                     const NewFile& file) {
   if (auto failure = begin(line("stage", nameOf(place)))) {
     return *failure;
   }
@@ -191,7 +191,7 @@ std::variant<std::unique_ptr<StagedFile>, PlaceFailure> FakeDevice::stage(Device
   return std::make_unique<FakeStagedFile>(std::move(entry));
 }
 
-std::variant<std::unique_ptr<StagedFile>, PlaceFailure> FakeDevice::stageKept(
+std::variant<std::unique_ptr<StagedFile>, Failure> FakeDevice::stageKept(
     DevicePlace place, std::string_view keptPath) {
   if (auto failure = begin(line("stageKept", keptPath, nameOf(place)))) {
     return *failure;
@@ -242,11 +242,11 @@ PlaceOutcome FakeDevice::keep(DevicePlace place, std::string_view keptPath,
   return PlaceOutcome::done();
 }
 
-std::optional<PlaceFailure> FakeDevice::flush(DevicePlace place) {
+std::optional<Failure> FakeDevice::flush(DevicePlace place) {
   return begin(line("flush", nameOf(place)));
 }
 
-std::optional<PlaceFailure> FakeDevice::makeInformationDirectory() {
+std::optional<Failure> FakeDevice::makeInformationDirectory() {
   if (auto failure = begin("makeInformationDirectory")) {
     return failure;
   }
@@ -254,8 +254,8 @@ std::optional<PlaceFailure> FakeDevice::makeInformationDirectory() {
   return std::nullopt;
 }
 
-std::optional<PlaceFailure> FakeDevice::writeInformationFile(std::string_view name,
-                                                             const ReadableBytes& contents) {
+std::optional<Failure> FakeDevice::writeInformationFile(std::string_view name,
+                                                        const ReadableBytes& contents) {
   if (auto failure = begin(line("writeInformationFile", name))) {
     return failure;
   }

@@ -32,7 +32,7 @@ class FakeDevice final : public DevicePlaces, public FileKeeping {
   std::map<std::string, std::shared_ptr<Entry>, std::less<>> entries;
   std::vector<std::string> journal;
   /// What each place cannot be told of, or removed for, as the snapshot foresees it.
-  std::map<DevicePlace, PlaceFailure> unremovable;
+  std::map<DevicePlace, Failure> unremovable;
   /// The sentences that settling leftovers gives.
   std::vector<std::string> leftovers;
   /// Called before each operation with its line, those that only look included.
@@ -65,20 +65,20 @@ class FakeDevice final : public DevicePlaces, public FileKeeping {
   void removeFaults();
   [[nodiscard]] std::size_t operationCount() const { return operationCount_; }
 
-  std::variant<DeviceSnapshot, PlaceFailure> takeSnapshot() override;
-  std::variant<FileIdentity, PlaceFailure> identityAt(DevicePlace place) override;
-  std::variant<std::unique_ptr<StagedFile>, PlaceFailure> stage(DevicePlace place,
-                                                                const NewFile& file) override;
-  std::variant<std::unique_ptr<StagedFile>, PlaceFailure> stageKept(
-      DevicePlace place, std::string_view keptPath) override;
+  std::variant<DeviceSnapshot, Failure> takeSnapshot() override;
+  std::variant<FileIdentity, Failure> identityAt(DevicePlace place) override;
+  std::variant<std::unique_ptr<StagedFile>, Failure> stage(DevicePlace place,
+                                                           const NewFile& file) override;
+  std::variant<std::unique_ptr<StagedFile>, Failure> stageKept(DevicePlace place,
+                                                               std::string_view keptPath) override;
   PlaceOutcome put(DevicePlace place, StagedFile& staged, const FileIdentity& expected) override;
   PlaceOutcome remove(DevicePlace place, const FileIdentity& expected) override;
   PlaceOutcome keep(DevicePlace place, std::string_view keptPath,
                     const FileIdentity& expected) override;
-  std::optional<PlaceFailure> flush(DevicePlace place) override;
-  std::optional<PlaceFailure> makeInformationDirectory() override;
-  std::optional<PlaceFailure> writeInformationFile(std::string_view name,
-                                                   const ReadableBytes& contents) override;
+  std::optional<Failure> flush(DevicePlace place) override;
+  std::optional<Failure> makeInformationDirectory() override;
+  std::optional<Failure> writeInformationFile(std::string_view name,
+                                              const ReadableBytes& contents) override;
   std::vector<std::string> settleLeftovers() override;
 
   std::optional<EntryKind> kindOfEntry(std::string_view path) override;
@@ -94,7 +94,7 @@ class FakeDevice final : public DevicePlaces, public FileKeeping {
  private:
   enum class Recorded { Yes, No };
   /// The failure of an operation that a fault hits.
-  std::optional<PlaceFailure> begin(const std::string& line, Recorded recorded = Recorded::Yes);
+  std::optional<Failure> begin(const std::string& line, Recorded recorded = Recorded::Yes);
   [[nodiscard]] FileIdentity identityOf(std::string_view path) const;
   std::shared_ptr<Entry> make(EntryKind kind, std::string contents);
 

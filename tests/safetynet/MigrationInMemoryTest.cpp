@@ -182,7 +182,7 @@ TEST_F(MigrationInMemoryTest, ARemovalWithoutASaveVouchesForWhatAnEarlierRunCarr
 }
 
 TEST_F(MigrationInMemoryTest, AStoreThatThePluginCouldNotRemoveIsForeseenAndTheRecordStays) {
-  snapshot[DevicePlace::LegacyMail].whyNotRemoved = PlaceFailure{EPERM, "Cannot remove it: why"};
+  snapshot[DevicePlace::LegacyMail].whyNotRemoved = Failure{EPERM, "Cannot remove it: why"};
   MigrationInMemory& migration = begin();
   save(settingsWith(12, {"one", "mail"}));
   migration.verify(PluginResult::GaveTrue, {});
@@ -213,7 +213,7 @@ TEST_F(MigrationInMemoryTest, AnInterruptedCommitIsFinishedWithoutThePlugin) {
 
 TEST_F(MigrationInMemoryTest, AStoreThatWasCarriedOverBeforeIsVouchedForAgain) {
   addInterruptedCommit();
-  snapshot[DevicePlace::LegacyMail].whyNotRemoved = PlaceFailure{EPERM, "Cannot remove it: why"};
+  snapshot[DevicePlace::LegacyMail].whyNotRemoved = Failure{EPERM, "Cannot remove it: why"};
   MigrationInMemory& migration = begin();
   migration.verify(PluginResult::GaveTrue, {});
   EXPECT_FALSE(migration.error());

@@ -198,7 +198,7 @@ TEST_F(RestorationTest, WithoutAPlaceForWhatIsReplacedNothingIsReplaced) {
   device.failWhenLineBegins("createDirectory ");
   const Restoration restoration = restore();
   ASSERT_TRUE(restoration.error);
-  EXPECT_EQ(restoration.error->exitStatus, ExitStatus::CannotCreate);
+  EXPECT_EQ(restoration.error->exitStatus, ExitStatus::InputOutputError);
   EXPECT_THAT(restoration.error->message, HasSubstr("What would be replaced cannot be kept: "));
   EXPECT_EQ(device.at(kSettings), "newer settings");
   EXPECT_FALSE(device.exists(kMail));

@@ -34,7 +34,7 @@ class SameAsTheDeviceTest : public DeviceFixture {
   }
   [[nodiscard]] std::string inMemory(const Operation& operation) {
     auto taken = LinuxDevicePlaces(root, files, std::string(kHome)).takeSnapshot();
-    if (const auto* failure = std::get_if<PlaceFailure>(&taken)) {
+    if (const auto* failure = std::get_if<Failure>(&taken)) {
       return "no snapshot: " + failure->text;
     }
     Transaction transaction(std::get<DeviceSnapshot>(taken), kHome);

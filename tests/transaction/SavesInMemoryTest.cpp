@@ -43,7 +43,7 @@ TEST_F(SavesInMemoryTest, ASaveThatIsWrittenAfterOneThatFailedCounts) {
 
 TEST_F(SavesInMemoryTest, ASettingsFileThatCannotBeReplacedSaysWhyTheSaveFailed) {
   snapshot.addPropertyList(DevicePlace::Settings, kOld);
-  snapshot[DevicePlace::Settings].whyNotReplaced = PlaceFailure{EROFS, "Cannot create it: why"};
+  snapshot[DevicePlace::Settings].whyNotReplaced = Failure{EROFS, "Cannot create it: why"};
 
   const Result result = save(kNew);
 

@@ -50,7 +50,7 @@ TEST_F(TransactionFileSystemTest, AFileThatIsRemovedIsGone) {
 
 TEST_F(TransactionFileSystemTest, WhatTheDeviceWouldNotRemoveStays) {
   snapshot.addFile(DevicePlace::LegacyMail, "store");
-  snapshot[DevicePlace::LegacyMail].whyNotRemoved = PlaceFailure{EPERM, "Cannot remove it: why"};
+  snapshot[DevicePlace::LegacyMail].whyNotRemoved = Failure{EPERM, "Cannot remove it: why"};
 
   const Result result = files.removeFile(path(DevicePlace::LegacyMail));
 
@@ -60,7 +60,7 @@ TEST_F(TransactionFileSystemTest, WhatTheDeviceWouldNotRemoveStays) {
 }
 
 TEST_F(TransactionFileSystemTest, WhatTheDeviceWouldNotReplaceIsNotMade) {
-  snapshot[DevicePlace::RemovalSentinel].whyNotReplaced = PlaceFailure{EACCES, "why"};
+  snapshot[DevicePlace::RemovalSentinel].whyNotReplaced = Failure{EACCES, "why"};
 
   const Result result = files.createFile(path(DevicePlace::RemovalSentinel), "removing");
 
@@ -140,7 +140,7 @@ TEST_F(TransactionFileSystemTest, TheInformationDirectoryIsMadeOnce) {
 }
 
 TEST_F(TransactionFileSystemTest, AnInformationDirectoryThatCannotBeMadeSaysWhy) {
-  snapshot[DevicePlace::InformationDirectory].whyNotMade = PlaceFailure{EACCES, "why"};
+  snapshot[DevicePlace::InformationDirectory].whyNotMade = Failure{EACCES, "why"};
   const Result result =
       files.createDirectoryWithIntermediates(path(DevicePlace::InformationDirectory), 0777);
   ASSERT_FALSE(result);
@@ -158,7 +158,7 @@ TEST_F(TransactionFileSystemTest, NoInformationFileIsMadeWithoutItsDirectory) {
 
 TEST_F(TransactionFileSystemTest, NoInformationFileIsMadeInADirectoryThatMayNotBeWritten) {
   snapshot.addEntry(DevicePlace::InformationDirectory, EntryKind::Directory);
-  snapshot[DevicePlace::InformationDirectory].whyNotReplaced = PlaceFailure{EACCES, "why"};
+  snapshot[DevicePlace::InformationDirectory].whyNotReplaced = Failure{EACCES, "why"};
   const Result result = files.writeFileAtomically(
       path(DevicePlace::InformationDirectory) + "/name.txt", serialized(kOldVersion));
   ASSERT_FALSE(result);

@@ -17,12 +17,12 @@ namespace accounts {
 /// Files can be given to user 501 and group 502, who are called "mobile".
 class MobileAlone final : public OwnershipRule {
  public:
-  std::variant<FileOwner, PlaceFailure> ownerNamed(std::string_view ownerName,
-                                                   std::string_view groupName) override {
+  std::variant<FileOwner, Failure> ownerNamed(std::string_view ownerName,
+                                              std::string_view groupName) override {
     if (ownerName == "mobile" && groupName == "mobile") {
       return FileOwner{501, 502};
     }
-    return PlaceFailure{EPERM, "Not to " + std::string(ownerName)};
+    return Failure{EPERM, "Not to " + std::string(ownerName)};
   }
 };
 

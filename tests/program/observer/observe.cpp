@@ -48,7 +48,7 @@ int main(int argc, char** argv) {
   LinuxPlatformError error;
   const std::unique_ptr<LinuxPlatform> platform = LinuxPlatform::create(options, error);
   if (platform == nullptr) {
-    std::fprintf(stderr, "observe: %s\n", error.text.c_str());
+    std::fprintf(stderr, "observe: %s\n", error.failure.text.c_str());
     return 1;
   }
   Process process(platform->platform());

@@ -5,22 +5,10 @@
 
 #include <cerrno>
 #include <optional>
-#include <string_view>
 
-#include "platform/DeviceSnapshot.h"
-#include "platform/linux/PathError.h"
+#include "platform/FileIdentity.h"
 
 namespace accounts {
-
-/// The failure of a place that an error on its path stands for.
-inline PlaceFailure placeFailure(const PathError& error) {
-  return {error.number, error.text};
-}
-
-/// The failure "Cannot OPERATION PATH: REASON" for a system error number.
-inline PlaceFailure placeFailure(std::string_view operation, std::string_view path, int number) {
-  return placeFailure(pathError(operation, path, number));
-}
 
 inline EntryKind kindOfMode(mode_t mode) {
   switch (mode & S_IFMT) {

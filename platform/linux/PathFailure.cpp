@@ -1,8 +1,6 @@
-#include "platform/linux/PathError.h"
+#include "platform/linux/PathFailure.h"
 
-#include <algorithm>
-#include <cerrno>
-#include <iterator>
+#include <string>
 #include <system_error>
 
 namespace accounts {
@@ -17,10 +15,6 @@ constexpr FileKind kOtherKinds[] = {
     {S_IFDIR, "a directory"}, {S_IFLNK, "a symbolic link"},    {S_IFIFO, "a named pipe"},
     {S_IFSOCK, "a socket"},   {S_IFCHR, "a character device"}, {S_IFBLK, "a block device"},
 };
-
-// Room, media, and what the system has too little of at times.
-constexpr int kPassingNumbers[] = {EAGAIN, EDQUOT, EIO,    EMFILE,   ENFILE,
-                                   ENOMEM, ENOSPC, ESTALE, ETIMEDOUT};
 
 std::string_view nameOfKind(mode_t mode) {
   for (const FileKind& kind : kOtherKinds) {
@@ -39,29 +33,18 @@ std::string text(std::string_view operation, std::string_view path, std::string_
 
 }  // namespace
 
-FailureKind failureKind(int number) {
-  return std::find(std::begin(kPassingNumbers), std::end(kPassingNumbers), number) !=
-                 std::end(kPassingNumbers)
-             ? FailureKind::MayPass
-             : FailureKind::Lasting;
-}
-
-bool PathError::isMissing() const {
-  return number == ENOENT || number == ENOTDIR;
-}
-
-PathError pathError(std::string_view operation, std::string_view path, int number) {
+Failure pathFailure(std::string_view operation, std::string_view path, int number) {
   return {number, text(operation, path, std::generic_category().message(number))};
 }
 
-PathError pathError(std::string_view operation, std::string_view path, std::string_view reason) {
+Failure pathFailure(std::string_view operation, std::string_view path, std::string_view reason) {
   return {0, text(operation, path, reason)};
 }
 
-PathError notRegularError(std::string_view operation, std::string_view path, mode_t mode) {
+Failure notRegularFailure(std::string_view operation, std::string_view path, mode_t mode) {
   std::string reason = "It is ";
   reason.append(nameOfKind(mode)).append(", not a regular file");
-  return pathError(operation, path, reason);
+  return pathFailure(operation, path, reason);
 }
 
 }  // namespace accounts
