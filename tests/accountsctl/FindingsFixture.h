@@ -9,8 +9,8 @@
 #include "accountsctl/Finding.h"
 #include "accountsctl/LegacyFindings.h"
 #include "accountsctl/SettingsFindings.h"
-#include "tests/accountsctl/SettingsFiles.h"
 #include "tests/fakes/FakePlatform.h"
+#include "tests/inspection/SettingsFiles.h"
 
 namespace accounts {
 

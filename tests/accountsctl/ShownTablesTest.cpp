@@ -2,7 +2,7 @@
 
 #include "accountsctl/ShowCommand.h"
 #include "inspection/StoreLayout.h"
-#include "tests/accountsctl/SettingsFiles.h"
+#include "tests/inspection/SettingsFiles.h"
 
 namespace accounts {
 namespace {

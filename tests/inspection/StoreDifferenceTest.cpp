@@ -4,7 +4,7 @@
 
 #include "inspection/DifferenceJSON.h"
 #include "inspection/DifferenceText.h"
-#include "tests/accountsctl/SettingsFiles.h"
+#include "tests/inspection/SettingsFiles.h"
 
 namespace accounts {
 namespace {

@@ -1,0 +1,67 @@
+#include "host/WorkerEnd.h"
+
+#include <sys/syscall.h>
+
+#include <csignal>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include "host/WorkerLimits.h"
+
+namespace accounts {
+namespace {
+
+// What waitpid() gives for an exit and for a signal.
+constexpr int exited(int status) {
+  return status << 8;
+}
+
+constexpr std::uint64_t kMebibyte = std::uint64_t{1} << 20;
+
+TEST(WorkerEnd, AForbiddenCallIsNamed) {
+  const int number = SYS_ptrace;
+  const ProgramError error =
+      forbiddenCallError({reinterpret_cast<const char*>(&number), sizeof number});
+  EXPECT_EQ(error.exitStatus, ExitStatus::PluginEnded);
+  EXPECT_EQ(error.message, "The plug-in made a system call that it may not make: ptrace");
+}
+
+TEST(WorkerEnd, OfACallOnlyAsManyBytesAreTakenAsItsNumberHas) {
+  const int number = SYS_ptrace;
+  std::string longer(reinterpret_cast<const char*>(&number), sizeof number);
+  longer.append(1000, 'x');
+  EXPECT_THAT(forbiddenCallError(longer).message, testing::EndsWith(": ptrace"));
+  EXPECT_THAT(forbiddenCallError("").message, testing::HasSubstr("may not make: "));
+}
+
+TEST(WorkerEnd, AnExitAndASignalAreTold) {
+  EXPECT_EQ(endedWorkerError(exited(7), std::nullopt).message,
+            "The plug-in ended the process with exit status 7");
+  EXPECT_EQ(endedWorkerError(SIGSEGV, std::nullopt).message,
+            "The plug-in ended by signal 11 (Segmentation fault)");
+}
+
+TEST(WorkerEnd, TheEndOfItsProcessorTimeIsToldWithHowMuchItHad) {
+  EXPECT_EQ(
+      endedWorkerError(SIGXCPU, workerLimitsFor(0)).message,
+      "The plug-in needs more than the 5 s of processor time that files of this size allow it");
+  EXPECT_EQ(endedWorkerError(SIGXCPU, std::nullopt).message,
+            "The plug-in ended by signal 24 (CPU time limit exceeded)");
+}
+
+TEST(WorkerEnd, WithoutALimitOfItsOwnTheEndOfMemoryMayPass) {
+  const ProgramError error = outOfMemoryError(std::nullopt);
+  EXPECT_EQ(error.exitStatus, ExitStatus::TemporaryFailure);
+  EXPECT_EQ(error.message, "No memory for the migration");
+}
+
+TEST(WorkerLimits, GrowWithTheFiles) {
+  EXPECT_EQ(workerLimitsFor(0).memory, 256 * kMebibyte);
+  EXPECT_EQ(workerLimitsFor(kMebibyte).memory, (256 + 2048) * kMebibyte);
+  EXPECT_EQ(workerLimitsFor(0).processorTime, std::chrono::seconds(5));
+  EXPECT_EQ(workerLimitsFor(2 * kMebibyte).processorTime, std::chrono::seconds(245));
+}
+
+}  // namespace
+}  // namespace accounts
