@@ -88,7 +88,6 @@ bool AccountsDataMigrator::executeMigrationSteps() {
 }
 
 bool AccountsDataMigrator::runMigrations(AccountsManager& store, const Needs& needs) {
-  _collatedMigrationData.reset();
   if (_saveMigrationInformation()) {
     _collatedMigrationData.emplace();
   }

@@ -34,7 +34,7 @@ std::string textOfUTF16(std::string_view bytes) {
     if (isHighSurrogate(codePoint) && next < bytes.size()) {
       const auto second = static_cast<char32_t>(load(bytes.data() + next, kUTF16UnitSize));
       if (isLowSurrogate(second)) {
-        codePoint = 0x10000 + ((codePoint - 0xD800) << 10) + (second - 0xDC00);
+        codePoint = 0x10000 + ((codePoint & 0x3FF) << 10 | (second & 0x3FF));
         index = next;
       }
     }

@@ -113,7 +113,7 @@ void appendPadded(std::string& line, std::int64_t number, std::size_t width) {
   char digits[32];
   const auto result = std::to_chars(std::begin(digits), std::end(digits), number);
   const auto count = static_cast<std::size_t>(result.ptr - digits);
-  line.append(count < width ? width - count : 0, '0');
+  line.append(width - std::min(count, width), '0');
   line.append(digits, count);
 }
 

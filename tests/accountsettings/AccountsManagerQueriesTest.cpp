@@ -114,6 +114,7 @@ TEST_F(AccountsManagerQueries, AChildWithoutASyncIdentifierFollowsItsParents) {
   ASSERT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("s")), "A");
   const BasicAccountReference child = store->allBasicSyncableAccounts().back();
   store->deleteAccountWithIdentifier("B");
+  ASSERT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("u")), "none");
   child->setParentAccount(syncing(mail("elsewhere"), "u").record());
   EXPECT_EQ(store->syncableAccountWithSyncIdentifier("u"), child);
 }

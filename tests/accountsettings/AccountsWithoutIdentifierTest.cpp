@@ -102,7 +102,7 @@ TEST_F(AccountsWithoutIdentifierDeathTest, HaveNoFullAccount) {
   const Store store = storeOf({nameless(mail(""))});
 
   EXPECT_DEATH(static_cast<void>(store->accountsWithTypes({kMailAccountType})),
-               "The account with id \\(null\\) has no full account");
+               "The account with id \\(null\\) has no full account\n");
 }
 
 // Only a caller that forces it can take the type or the class from a record.

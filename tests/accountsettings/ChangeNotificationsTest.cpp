@@ -101,6 +101,19 @@ TEST_F(ChangeNotificationsTest, ADataclassSwitchedOffBesideAnotherChangeNotifies
   EXPECT_EQ(calls_, (Calls{{"GroupwareNotifier", changes}, {"MailNotifier", changes}}));
 }
 
+TEST_F(ChangeNotificationsTest, ADataclassThatIsListedTwiceNotifiesOnce) {
+  account_->setAccountProperty_forKey(
+      PropertyArray{kAccountDataclassNotes, kAccountDataclassContacts, kAccountDataclassMail,
+                    kAccountDataclassContacts, kAccountDataclassNotes},
+      kAccountEnabledDataclasses);
+  AccountsManager::NotificationBatch batch;
+  AccountsManager::_addNotificationToDictionary_forChangeType_originalProperties_currentProperties(
+      batch, AccountChangeType::Added, std::nullopt, account_->properties());
+  const std::vector<PropertyValue> once = {record(0, {})};
+  EXPECT_EQ(batch, (AccountsManager::NotificationBatch{{"GroupwareNotifier", once},
+                                                       {"MailNotifier", once}}));
+}
+
 TEST_F(ChangeNotificationsTest, ARecordNamesTheTypeAndTheIdentifierThatTheAccountHasNow) {
   const PropertyArray mailOn = {kAccountDataclassMail};
   AccountsManager::NotificationBatch batch;

@@ -168,10 +168,17 @@ TEST_F(CreatorAssertionsDeathTest, AnAccountThatThrowsWhenItIsAsked) {
   expectDeathOfFullAccount("The class Creator threw an exception: one without words\n");
   const BasicAccountReference record = account("A", kMailAccountType);
   const auto dies = testing::KilledBySignal(SIGABRT);
-  const auto says = testing::HasSubstr("The class Creator threw an exception: no\\nserver\n");
-  EXPECT_EXIT(record->refreshContainersForDataclass("Mail"), dies, says);
-  EXPECT_EXIT(record->refreshContainerListForDataclass("Mail"), dies, says);
-  EXPECT_EXIT(record->refreshContainerWithIdentifier_forDataclass("A", "Mail"), dies, says);
+  const auto says = [](const std::string& operation) {
+    return testing::AllOf(
+        testing::HasSubstr("-[BasicAccount " + operation + ":isUserRequested:], "),
+        testing::HasSubstr("The class Creator threw an exception: no\\nserver\n"));
+  };
+  EXPECT_EXIT(record->refreshContainersForDataclass("Mail"), dies,
+              says("refreshContainersForDataclass"));
+  EXPECT_EXIT(record->refreshContainerListForDataclass("Mail"), dies,
+              says("refreshContainerListForDataclass"));
+  EXPECT_EXIT(record->refreshContainerWithIdentifier_forDataclass("A", "Mail"), dies,
+              says("refreshContainerWithIdentifier:forDataclass"));
 }
 
 }  // namespace

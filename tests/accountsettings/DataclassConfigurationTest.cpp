@@ -40,6 +40,12 @@ TEST(DataclassConfiguration, EachAnswerHasItsOwnEntry) {
   EXPECT_TRUE(BasicAccount::userConfirmationIsRequiredByDataclass(kAccountDataclassContacts));
 }
 
+TEST(DataclassConfiguration, ASwitchIsDisplayedWhereTheEntrySaysSo) {
+  FakeProcess device;
+  configureContacts(device, {{kDataclassDisplaySwitch, true}});
+  EXPECT_TRUE(BasicAccount::displayToggleForDataclass(kAccountDataclassContacts));
+}
+
 TEST(DataclassConfiguration, MissingEntriesAnswerFalse) {
   FakeProcess device;
   configureContacts(device, {});

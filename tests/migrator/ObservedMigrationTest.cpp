@@ -8,6 +8,7 @@ class Observer final : public MigrationObserver {
  public:
   struct Stage {
     std::string operation;
+    std::string purpose;
     bool succeeded = false;
     std::optional<PropertyDictionary> accountSettings;
   };
@@ -17,8 +18,9 @@ class Observer final : public MigrationObserver {
     EXPECT_TRUE(hasEnded_) << operation << " began within another stage";
     EXPECT_FALSE(purpose.empty());
     hasEnded_ = false;
-    stages.push_back({std::string(operation), false, std::nullopt});
+    stages.push_back({std::string(operation), std::string(purpose), false, std::nullopt});
   }
+  void accountFared(const AccountEvent& event) override { told.push_back(event.account); }
   void stageEnded(bool succeeded, const std::optional<AccountsInMemory>& accounts) override {
     EXPECT_FALSE(hasEnded_);
     hasEnded_ = true;
@@ -33,12 +35,21 @@ class Observer final : public MigrationObserver {
     }
     return result;
   }
+  /// Each operation with what it is for.
+  [[nodiscard]] TextList purposes() const {
+    TextList result;
+    for (const Stage& stage : stages) {
+      result.push_back(stage.operation + ": " + stage.purpose);
+    }
+    return result;
+  }
   [[nodiscard]] const Stage& stage(std::string_view operation) const {
     return *std::find_if(stages.begin(), stages.end(),
                          [&](const Stage& each) { return each.operation == operation; });
   }
 
   std::vector<Stage> stages;
+  std::vector<AccountOrigin> told;
   bool wants = true;
 
  private:
@@ -75,6 +86,46 @@ TEST_F(ObservedMigration, TellsEachStepOfTheChainThatRuns) {
             (TextList{"_copyAsideAccountsPlist", "initInsideOfMigration",
                       "_migrateAccountsFrom9A334:", "_migrateAccountsFrom9B176:", "saveAllAccounts",
                       "announceChange"}));
+}
+
+TEST_F(ObservedMigration, TellsOnceOfEachDescriptionThatStaysOutWithItsStore) {
+  const PropertyDictionary good = {{"uniqueId", "A"}, {"Class", "IMAPAccount"}};
+  device.addPropertyList(kLegacyMailPath,
+                         PropertyDictionary{{"MailAccounts", PropertyArray{good, "bad", good}}});
+  migrator.performMigration();
+  using Kind = AccountOrigin::Kind;
+  std::vector<std::uint32_t> numbers;
+  for (const AccountOrigin& each : observer.told) {
+    EXPECT_EQ(each.kind, Kind::IncomingMail);
+    numbers.push_back(each.number);
+  }
+  std::ranges::sort(numbers);
+  EXPECT_EQ(numbers, (std::vector<std::uint32_t>{0, 1, 2}));
+}
+
+TEST_F(ObservedMigration, TellsPeopleWhatEachStageIsFor) {
+  addSettings(12);
+  device.addPropertyList(kLegacyMailPath, PropertyDictionary{{"MailAccounts", PropertyArray{}}});
+  device.addPropertyList(kLegacyExchangePath,
+                         PropertyDictionary{{"DAAccountsKey", PropertyArray{}}});
+  switchMigrationInformationOn();
+  migrator.performMigration();
+  EXPECT_EQ(observer.purposes(),
+            (TextList{"_copyAsideAccountsPlist: Keep a copy of the settings file for engineers",
+                      "initInsideOfMigration: Open the settings file",
+                      "_migrateDAAccounts:: Convert the legacy Exchange accounts",
+                      "_migrateMailAccounts:: Convert the legacy mail accounts",
+                      "saveAllAccounts: Save the accounts",
+                      "_removeOldAccountsInfo: Remove the legacy stores",
+                      "_saveCollatedMigrationInformation: Write the migration-information file",
+                      "announceChange: Tell the mail application that its accounts changed"}));
+}
+
+TEST_F(ObservedMigration, TellsPeopleThatARemovalIsFinished) {
+  device.fileSystem.addFile(kSentinelPath, "");
+  migrator.performMigration();
+  EXPECT_EQ(observer.purposes().back(),
+            "_removeOldAccountsInfo: Finish the removal of the legacy stores");
 }
 
 TEST_F(ObservedMigration, TellsTheConversionsAndTheRemovalOfTheLegacyStores) {

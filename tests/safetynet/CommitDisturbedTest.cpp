@@ -80,6 +80,13 @@ TEST_F(CommitDisturbedTest, AStoreThatIsWrittenMeanwhileStaysWithAWarningAndTheR
   EXPECT_TRUE(device.exists(DevicePlace::CommitRecord));
 }
 
+TEST_F(CommitDisturbedTest, ASettingsFileThatStoodForAMomentLeavesTheRecordForTheNextAttempt) {
+  const DeviceSnapshot before = snapshotOf(device);
+  device.overtakesPut = DevicePlace::Settings;
+  EXPECT_EQ(commit(device, before).kind, Kind::Disturbed);
+  EXPECT_TRUE(device.exists(DevicePlace::CommitRecord));
+}
+
 /// Lets another program write a place before each operation of a commit.
 class AnotherWriterTest : public CommitTest, public testing::WithParamInterface<DevicePlace> {};
 

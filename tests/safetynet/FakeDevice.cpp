@@ -210,6 +210,10 @@ PlaceOutcome FakeDevice::put(DevicePlace place, StagedFile& staged, const FileId
   if (!identityOf(pathOf(place)).isSameFileAs(expected)) {
     return PlaceOutcome::disturbed();
   }
+  if (overtakesPut == place) {
+    write(place, "of another program");
+    return PlaceOutcome::overtaken();
+  }
   entries[pathOf(place)] = static_cast<FakeStagedFile&>(staged).entry;
   return PlaceOutcome::done();
 }

@@ -33,6 +33,8 @@ class FakeDevice final : public DevicePlaces, public FileKeeping {
   std::vector<std::string> journal;
   /// What each place cannot be told of, or removed for, as the snapshot foresees it.
   std::map<DevicePlace, Failure> unremovable;
+  /// Where another program's file takes the place as soon as a new one stands there.
+  std::optional<DevicePlace> overtakesPut;
   /// The sentences that settling leftovers gives.
   std::vector<std::string> leftovers;
   /// Called before each operation with its line, those that only look included.

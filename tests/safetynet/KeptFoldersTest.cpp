@@ -51,6 +51,18 @@ TEST_F(KeptFoldersTest, WhatStandsIsKeptUnderTheNameOfItsPlace) {
   EXPECT_EQ(device.entries.at(folder)->identity.mode, 0700u);
 }
 
+TEST_F(KeptFoldersTest, EverybodyMayListTheDirectoryAndOnlyItsOwnerReadAFolder) {
+  device.write(kSettings, "settings");
+  ASSERT_EQ(keep(), folder);
+  EXPECT_EQ(device.entries.at(std::string(kAccountMigrationDirectory))->identity.mode & 07777U,
+            0755U);
+  EXPECT_EQ(device.entries.at(folder)->identity.mode & 07777U, 0700U);
+}
+
+TEST_F(KeptFoldersTest, AFolderThatIsGoneIsDiscarded) {
+  EXPECT_TRUE(folders.discard(folder));
+}
+
 TEST_F(KeptFoldersTest, AListSaysWhatStoodAtEachPlaceNothingIncluded) {
   device.write(kSettings, "settings");
   ASSERT_EQ(keep(), folder);

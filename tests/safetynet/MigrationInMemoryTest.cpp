@@ -190,7 +190,27 @@ TEST_F(MigrationInMemoryTest, AStoreThatThePluginCouldNotRemoveIsForeseenAndTheR
               ElementsAre(snapshot.pathOf(DevicePlace::LegacyMail) +
                           " stays, although it is carried over; a later run removes it: Cannot "
                           "remove it: why"));
+  EXPECT_EQ(proposal().changeOf(DevicePlace::LegacyMail), nullptr);
   EXPECT_TRUE(proposal().recordStays);
+}
+
+TEST_F(MigrationInMemoryTest, AnyOtherFileThatCannotBeRemovedIsProposedAllTheSame) {
+  snapshot.addFile(DevicePlace::AutoFetchEnabled, "");
+  snapshot[DevicePlace::AutoFetchEnabled].whyNotRemoved = Failure{EPERM, "Cannot remove it"};
+  migrate();
+  remove(DevicePlace::AutoFetchEnabled);
+  const Proposal proposed = proposal();
+  ASSERT_NE(proposed.changeOf(DevicePlace::AutoFetchEnabled), nullptr);
+  EXPECT_EQ(proposed.changeOf(DevicePlace::AutoFetchEnabled)->action, Action::Remove);
+}
+
+TEST_F(MigrationInMemoryTest, ANewRecordTakesThePlaceOfAStaleOneAtOnce) {
+  snapshot.addFile(DevicePlace::CommitRecord, "malformed");
+  migrate();
+  const Proposal proposed = proposal();
+  EXPECT_EQ(std::ranges::count(proposed.changes, DevicePlace::CommitRecord, &ProposedChange::place),
+            1);
+  EXPECT_EQ(proposed.changeOf(DevicePlace::CommitRecord)->action, Action::Write);
 }
 
 TEST_F(MigrationInMemoryTest, AnInterruptedCommitIsFinishedBeforeThePluginSeesTheDevice) {
@@ -222,6 +242,41 @@ TEST_F(MigrationInMemoryTest, AStoreThatWasCarriedOverBeforeIsVouchedForAgain) {
   EXPECT_NE(proposal().changeOf(DevicePlace::CommitRecord)->action, Action::Write)
       << "since it says the same";
   EXPECT_TRUE(proposal().recordStays);
+}
+
+TEST_F(MigrationInMemoryTest, ARecordVouchesForAnAccountThatIsNoLongerInTheSettingsFile) {
+  addInterruptedCommit();
+  // As a person may have deleted one of them since.
+  snapshot.addPropertyList(DevicePlace::LegacyMail, mailStoreWith({"mail", "deleted since"}));
+  CommitRecord record;
+  record.stores.push_back({DevicePlace::LegacyMail,
+                           CommitRecord::traceOf(snapshot.at(DevicePlace::LegacyMail).identity),
+                           CommitRecord::Proof{.accounts = {"mail", "deleted since"}}});
+  snapshot.addFile(DevicePlace::CommitRecord, record.text());
+  MigrationInMemory& migration = begin();
+  migration.verify(PluginResult::GaveTrue, {});
+
+  EXPECT_THAT(migration.ledger().losses(), IsEmpty());
+  const std::vector<LedgerEntry>& entries = migration.ledger().entries;
+  ASSERT_GE(entries.size(), 2u);
+  EXPECT_EQ(entries[0].fate, AccountFate::CarriedOverEarlier);
+  EXPECT_THAT(entries[0].now, ElementsAre(LedgerPlace{1}));
+  EXPECT_EQ(entries[1].fate, AccountFate::CarriedOverEarlier);
+  EXPECT_THAT(entries[1].now, IsEmpty());
+  EXPECT_EQ(entries[1].reason, "");
+}
+
+TEST_F(MigrationInMemoryTest, WhatCouldNotBeReadOfAStoreThatWasCarriedOverIsNotToldAgain) {
+  snapshot.addPropertyList(DevicePlace::Settings, settingsWith(12, {"one", "mail"}));
+  snapshot.addFile(DevicePlace::LegacyMail, "no property list");
+  CommitRecord record;
+  record.stores.push_back({DevicePlace::LegacyMail,
+                           CommitRecord::traceOf(snapshot.at(DevicePlace::LegacyMail).identity),
+                           CommitRecord::Proof{.accounts = {"mail"}}});
+  snapshot.addFile(DevicePlace::CommitRecord, record.text());
+  MigrationInMemory& migration = begin();
+  migration.verify(PluginResult::GaveTrue, {});
+  EXPECT_THAT(migration.ledger().losses(), IsEmpty());
 }
 
 TEST_F(MigrationInMemoryTest, AStaleRecordEndsWithThisRun) {

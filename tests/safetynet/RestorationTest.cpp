@@ -169,8 +169,8 @@ TEST_F(RestorationTest, OnlyAFolderOfKeptFilesIsTaken) {
   device.write("/elsewhere/Kept-1", "", EntryKind::Directory);
   addFolder("Other-1", "file\tSettings\n");
   addFolder("Unfinished-1", "file\tSettings\n");
-  for (const char* name : {"Kept-missing", "/elsewhere/Kept-1", "Other-1", "Unfinished-1", "..",
-                           "Kept-20260102T030405Z/", "/", ""}) {
+  for (const char* name : {"Kept-missing", "/elsewhere/Kept-1", "/elsewhere/Kept-20260102T030405Z",
+                           "Other-1", "Unfinished-1", "..", "Kept-20260102T030405Z/", "/", ""}) {
     expectError(restore(name), ExitStatus::MissingInput,
                 std::string("No folder of kept files: ") + name);
   }

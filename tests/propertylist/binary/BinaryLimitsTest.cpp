@@ -67,6 +67,25 @@ TEST(BinaryLimits, OneValueMoreThanTheLimitIsRefused) {
   EXPECT_TRUE(contains(errorOfReadingBinary(file), kTooManyValues));
 }
 
+TEST(BinaryLimits, AScalarCountsOnce) {
+  const auto fileOf = [](std::string_view scalar, bool isOneTooMany) {
+    return fileWith([&](BinaryFile& file) {
+      const std::size_t child = file.add(scalar);
+      // Twice half of the limit less one, and the array: room for one more.
+      const std::size_t half = addDoublingArrays(file, kDepthOfNearlyAllValues - 1);
+      if (isOneTooMany) {
+        file.addContainer('\xA4', {half, half, child, child});
+      } else {
+        file.addContainer('\xA3', {half, half, child});
+      }
+    });
+  };
+  for (const std::string_view scalar : {"\x09", "\x10\x07", "\x41z", "\x51z"}) {
+    EXPECT_EQ(readBinary(fileOf(scalar, false)).kind(), PropertyKind::Array);
+    EXPECT_TRUE(contains(errorOfReadingBinary(fileOf(scalar, true)), kTooManyValues));
+  }
+}
+
 /// A text of some length below 256 as it stands in a file.
 std::string encodedText(std::size_t length, char character) {
   using namespace std::string_literals;

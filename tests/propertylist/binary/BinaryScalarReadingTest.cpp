@@ -139,6 +139,15 @@ TEST(BinaryScalars, AnUnpairedUTF16UnitIsKeptAndWrittenBackAsItWas) {
   }
 }
 
+TEST(BinaryScalars, AHighUnitAtTheEndOfATextMakesNoPairWithWhatFollowsTheText) {
+  BinaryFile file;
+  file.add("\x61\xD8\x3D");
+  file.add("\xDC\x00"s);  // as a low unit would be stored
+  file.setTopObject(0);
+
+  EXPECT_EQ(readBinary(file.build()), read("\x61\xD8\x3D"));
+}
+
 TEST(BinaryScalars, AKindThatPropertyListsDoNotHaveIsRefusedByName) {
   EXPECT_TRUE(contains(errorOf("\0"s), "a null, which no property list of ours has"));
   EXPECT_TRUE(contains(errorOf("\x0F"), "a fill byte in place of an object"));
@@ -159,6 +168,23 @@ TEST(BinaryScalars, NumbersOfOtherSizesAreRefused) {
   EXPECT_TRUE(contains(errorOf("\x20\x01"), "neither 4 nor 8 bytes"));
   EXPECT_TRUE(contains(errorOf("\x24" + std::string(16, 'x')), "neither 4 nor 8 bytes"));
   EXPECT_TRUE(contains(errorOf("\x32\0\0\0\0"s), "a date of other than 8 bytes"));
+}
+
+TEST(BinaryScalars, WhatIsCutOffIsRefusedWithTheWholeReason) {
+  const std::pair<std::string, std::string> reasons[] = {
+      {"\x5F", "an object whose length is cut off"},
+      {"\x5F\x11\x01", "an object whose length is cut off"},
+      {"\x52z", "a text or data that ends beyond the objects"},
+      {"\x11\x01", "an integer that ends beyond the objects"},
+      {"\x22\x01", "a real that ends beyond the objects"},
+      {"\x33\x01", "a date that ends beyond the objects"},
+      {"\x5F\x50", "an object whose length is no integer of 1 to 8 bytes"},
+      {"\x15", "an integer of more than 16 bytes"},
+      {"\x20\x01", "a real of neither 4 nor 8 bytes"},
+      {"\x32", "a date of other than 8 bytes"}};
+  for (const auto& [object, reason] : reasons) {
+    EXPECT_EQ(errorOf(object), "binary property list: " + reason + " at byte offset 8");
+  }
 }
 
 TEST(BinaryScalars, ALengthThatIsNoIntegerIsRefused) {

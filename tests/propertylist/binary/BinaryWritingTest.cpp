@@ -128,6 +128,18 @@ TEST(BinaryWriting, ReferencesAndOffsetsAreAsSmallAsTheObjectsAllow) {
   EXPECT_EQ(sizes(66'000), std::pair(std::uint64_t{4}, std::uint64_t{4}));
 }
 
+TEST(BinaryWriting, AnOffsetHasRoomForTheTablesOwnToo) {
+  // A text of this length has a head of four bytes behind the header of eight.
+  const auto offsetSizeWithTableAt = [](std::size_t offset) {
+    const std::string file = writeBinary(std::string(offset - 12 + 1, 'x'));
+    EXPECT_EQ(trailerNumber(file, 24, 8), offset);
+    return trailerNumber(file, 6, 1);
+  };
+
+  EXPECT_EQ(offsetSizeWithTableAt(255), 1U);
+  EXPECT_EQ(offsetSizeWithTableAt(256), 2U);
+}
+
 TEST(BinaryWriting, ATextIsASCIIIfItCanBeAndUTF16Otherwise) {
   EXPECT_EQ(writeBinary("ab\0"s).substr(8, 4),
             "\x53"

@@ -37,6 +37,19 @@ TEST(PropertyKeysSearch, EachKeyIsFoundAtItsIndex) {
   }
 }
 
+TEST(PropertyKeysSearch, AKeyIsFoundWhateverStandsAroundItInMemory) {
+  for (const std::string_view key : {"a"sv, "ab"sv, "abc"sv, "abcd"sv, "abcdefghi"sv}) {
+    const std::vector<Text> ordered = {Text("A"), Text(key), Text("z")};
+    for (const char around : {'\0', 'm', '\xFF'}) {
+      const std::string memory = std::string(9, around).append(key).append(9, around);
+      const PropertyKeys::Place place =
+          keysOf(ordered).find(std::string_view(memory).substr(9, key.size()));
+      EXPECT_TRUE(place.isThere) << key;
+      EXPECT_EQ(place.index, 1U);
+    }
+  }
+}
+
 TEST(PropertyKeysSearch, ShortKeysStandInTheOrderOfTheirBytes) {
   std::vector<Text> ordered;
   for (const std::string_view first : {"", "A", "B", "\x7F", "\xFE"}) {

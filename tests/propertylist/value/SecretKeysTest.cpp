@@ -138,6 +138,10 @@ constexpr const char* kOtherKeys[] = {"",
                                       "AccountPath",
                                       "uniqueId"};
 
+TEST(SecretKeys, AKeyEndsWhereItEndsWhateverFollowsInMemory) {
+  EXPECT_TRUE(isSecretKey(std::string_view("userPINs").substr(0, 7)));
+}
+
 TEST(SecretKeys, KeysThatNameASecretAreTold) {
   for (const char* key : kSecretKeys) {
     EXPECT_TRUE(isSecretKey(key)) << key;

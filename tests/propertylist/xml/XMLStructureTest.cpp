@@ -112,7 +112,8 @@ TEST(XMLStructure, AMillionNestedContainersAreRefused) {
 
 TEST(XMLStructure, AMissingPropertyListElementIsRefused) {
   EXPECT_TRUE(contains(errorOfReadingXML("<dict></dict>"), "outermost element is not <plist>"));
-  EXPECT_TRUE(contains(errorOfReadingXML("<html/>"), "an element that property lists do not have"));
+  EXPECT_EQ(errorOfReadingXML("<html/>"),
+            "XML property list: an element that property lists do not have in line 1");
   EXPECT_TRUE(contains(errorOfReadingXML(""), "no element found"));
   EXPECT_TRUE(contains(errorOfReadingXML("<?xml version=\"1.0\"?>\n"), "no element found"));
 }
