@@ -1,4 +1,8 @@
 #include <gtest/gtest.h>
+#include <sys/syscall.h>
+
+#include <cerrno>
+#include <cstdlib>
 
 #include "platform/linux/FileContents.h"
 #include "platform/linux/LinuxFileSystem.h"
@@ -24,6 +28,22 @@ TEST_F(FileSystemCopyTest, ACopyHasTheBytesAndPermissionsOfItsSource) {
   EXPECT_EQ(contentsOf("/copy"), contents);
   EXPECT_EQ(permissionsOf("/copy"), 0640u);
   EXPECT_EQ(contentsOf("/source"), contents);
+}
+
+using FileSystemCopyDeathTest = FileSystemCopyTest;
+
+TEST_F(FileSystemCopyDeathTest, ACopyIsItsOwnersAloneUntilItIsWhole) {
+  makeFile("/source", "contents");
+  fs::permissions(onHost("/source"), fs::perms(0644));
+  const auto copyHalf = [&] {
+    makeSystemCallFail(SYS_fchmod, EIO);
+    // So that what was made stays as it was made.
+    makeSystemCallFail(SYS_unlinkat, EIO);
+    const WithMask masked(0);
+    std::_Exit(files.copyFile("/source", "/copy") ? 0 : 1);
+  };
+  EXPECT_EXIT(copyHalf(), testing::ExitedWithCode(1), "");
+  EXPECT_EQ(permissionsOf("/copy"), 0600u);
 }
 
 TEST_F(FileSystemCopyTest, AnExistingFileIsNotCopiedOver) {

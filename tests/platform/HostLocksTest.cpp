@@ -94,6 +94,22 @@ TEST_F(HostLocksTest, AProcessThatWasForkedAndHasForgottenThemHoldsNone) {
   ::waitpid(child, nullptr, 0);
 }
 
+TEST_F(HostLocksTest, AProcessThatWasLeftBehindWithThemOpenKeepsNone) {
+  ASSERT_EQ(locks->takeRoot(seconds(0)), LockEnd::Taken);
+  ASSERT_EQ(locks->takeMigration(seconds(0)), LockEnd::Taken);
+  const pid_t child = ::fork();
+  if (child == 0) {
+    for (;;) {
+      ::pause();
+    }
+  }
+  locks.reset();
+  EXPECT_TRUE(isFree(image()));
+  EXPECT_TRUE(isFree(onHost(kLockFile)));
+  ::kill(child, SIGKILL);
+  ::waitpid(child, nullptr, 0);
+}
+
 TEST_F(HostLocksTest, WaitingEndsWhenItsTimeIsUp) {
   const FileDescriptor holder = held(image());
   EXPECT_EQ(locks->takeRoot(seconds(0)), LockEnd::TimeIsUp);

@@ -122,6 +122,18 @@ TEST_F(FileSystemWithoutLinksDeathTest, ACopyThatCannotBeMadeLeavesNothing) {
   EXPECT_TRUE(namesIn("/kept").empty());
 }
 
+TEST_F(FileSystemWithoutLinksDeathTest, ACopyIsItsOwnersAloneUntilItIsWhole) {
+  makeFile("/file", "contents");
+  fs::permissions(onHost("/file"), fs::perms(0644));
+  const auto keepHalf = [&] {
+    // So that what was made stays as it was made.
+    makeSystemCallFail(SYS_unlinkat, EIO);
+    keepWhereACallFails(SYS_fchmod, EIO, 0);
+  };
+  EXPECT_EXIT(keepHalf(), testing::ExitedWithCode(1), "");
+  EXPECT_EQ(permissionsOf("/kept/file"), 0600u);
+}
+
 TEST_F(FileSystemWithoutLinksDeathTest, ALinkWhoseContentsCannotBeFlushedIsNone) {
   makeFile("/file", "contents");
   const auto keepUnflushed = [&] {
