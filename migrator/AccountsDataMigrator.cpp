@@ -88,6 +88,7 @@ bool AccountsDataMigrator::executeMigrationSteps() {
 }
 
 bool AccountsDataMigrator::runMigrations(AccountsManager& store, const Needs& needs) {
+  _collatedMigrationData.reset();
   if (_saveMigrationInformation()) {
     _collatedMigrationData.emplace();
   }
