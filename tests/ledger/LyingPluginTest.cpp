@@ -317,5 +317,62 @@ TEST(LyingPlugin, AChildThatIsGoneIsALoss) {
               ElementsAre(EndsWith("it is not among the children of its parent any more")));
 }
 
+/// What is lost of an account with the child K where the plug-in leaves another dictionary for it.
+std::vector<std::string> lossesWhereAParentBecomes(
+    const std::function<PropertyDictionary(const PropertyDictionary&)>& changed) {
+  const PropertyDictionary parent = with(anAccount("Q", kQuarxAccountType, kCloudAccountClass),
+                                         kAccountChildAccounts, PropertyArray{ldap("K")});
+  return MigratedInMemory({.settings = settings(12, {parent})}, nullptr,
+                          [&](PropertyArray& accounts) {
+                            accounts.replace(0, changed(*accounts.at(0).asDictionary()));
+                          })
+      .losses();
+}
+
+TEST(LyingPlugin, AValueOfAParentThatIsGoneIsALossWhateverItsChildrenAre) {
+  EXPECT_THAT(lossesWhereAParentBecomes(
+                  [](const PropertyDictionary& parent) { return without(parent, "Hostname"); }),
+              ElementsAre(EndsWith(": its \"Hostname\" is gone")));
+}
+
+TEST(LyingPlugin, AValueOfAChildThatIsGoneIsALoss) {
+  EXPECT_THAT(lossesWhereAParentBecomes([](const PropertyDictionary& parent) {
+                return with(parent, kAccountChildAccounts,
+                            PropertyArray{without(ldap("K"), "Hostname")});
+              }),
+              ElementsAre(EndsWith(": its \"Hostname\" is gone")));
+}
+
+TEST(LyingPlugin, SomethingElseInAChildsPlaceIsALoss) {
+  EXPECT_THAT(lossesWhereAParentBecomes([](const PropertyDictionary& parent) {
+                return with(parent, kAccountChildAccounts, PropertyArray{"no account"});
+              }),
+              ElementsAre(EndsWith(": something else stands in its place")));
+}
+
+TEST(LyingPlugin, AChildThatNobodyGaveIsALossOfItsParent) {
+  EXPECT_THAT(lossesWhereAParentBecomes([](const PropertyDictionary& parent) {
+                return with(parent, kAccountChildAccounts, PropertyArray{ldap("K"), ldap("L")});
+              }),
+              ElementsAre(EndsWith(": it has children that it did not have")));
+}
+
+TEST(LyingPlugin, AnIdentifierThatAChildHasTooIsNamedWithWhatIsGone) {
+  const PropertyDictionary parent = with(anAccount("Q", kQuarxAccountType, kCloudAccountClass),
+                                         kAccountChildAccounts, PropertyArray{ldap("A")});
+  const MigratedInMemory migrated(
+      {.settings = settings(12, {ldap("A"), parent})}, nullptr, [](PropertyArray& accounts) {
+        accounts.replace(0, without(*accounts.at(0).asDictionary(), "Hostname"));
+      });
+  EXPECT_THAT(migrated.losses(), ElementsAre(EndsWith(": its \"Hostname\" is gone; another account "
+                                                      "has its identifier")));
+}
+
+TEST(LyingPlugin, ARefusalWithoutAReasonIsALossAllTheSame) {
+  OtherFates withoutReason([](AccountEvent& event) { event.reason = {}; });
+  const MigratedInMemory migrated({.settings = settings(12, {"no account"})}, &withoutReason);
+  EXPECT_THAT(migrated.losses(), ElementsAre(EndsWith(": it was refused")));
+}
+
 }  // namespace
 }  // namespace accounts
