@@ -14,7 +14,7 @@ LITERAL_OR_COMMENT = (r'R"(\w*)\(.*?\)\1"|"(?:\\.|[^"\\\n])*"|(?<!\w)\'(?:\\[^\'
 OPERATOR = r"(?<= )(==|!=|<=?|>=?|&&|\|\||\+=?|-=?)(?=\s)"
 OTHER_OPERATOR = {"==": "!=", "!=": "==", "<": "<=", "<=": "<", ">": ">=", ">=": ">", "&&": "||",
                   "||": "&&", "+": "-", "-": "+", "+=": "-=", "-=": "+="}
-NO_STATEMENT = r"(constexpr|static|using|typedef|template|friend|extern|else|if|for|while)\b"
+NO_STATEMENT = r"(constexpr|static|static_assert|using|typedef|template|friend|extern|else|if|for|while)\b"
 # Without which a test sees the same: room for what comes, and memory given back, for which the build
 # with the sanitizers looks.
 UNSEEN = r"(\w+(\.|->))*reserve\(|(\w+::|::operator )*(delete|destroy(_n|_at)?)\b|\w+->~"

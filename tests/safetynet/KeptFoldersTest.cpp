@@ -59,6 +59,15 @@ TEST_F(KeptFoldersTest, EverybodyMayListTheDirectoryAndOnlyItsOwnerReadAFolder) 
   EXPECT_EQ(device.entries.at(folder)->identity.mode & 07777U, 0700U);
 }
 
+TEST_F(KeptFoldersTest, AFolderThatIsDiscardedIsAnUnfinishedOneBeforeAnythingInItGoes) {
+  device.write(kSettings, "settings");
+  ASSERT_EQ(keep(), folder);
+  device.journal.clear();
+  EXPECT_TRUE(folders.discard(folder));
+  EXPECT_EQ(device.journal.at(0), "renameDirectory " + folder + " -> " +
+                                      folderPath("Unfinished-20260102T030405Z"));
+}
+
 TEST_F(KeptFoldersTest, AFolderThatIsGoneIsDiscarded) {
   EXPECT_TRUE(folders.discard(folder));
 }
