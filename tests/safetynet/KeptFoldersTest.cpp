@@ -64,8 +64,8 @@ TEST_F(KeptFoldersTest, AFolderThatIsDiscardedIsAnUnfinishedOneBeforeAnythingInI
   ASSERT_EQ(keep(), folder);
   device.journal.clear();
   EXPECT_TRUE(folders.discard(folder));
-  EXPECT_EQ(device.journal.at(0), "renameDirectory " + folder + " -> " +
-                                      folderPath("Unfinished-20260102T030405Z"));
+  EXPECT_EQ(device.journal.at(0),
+            "renameDirectory " + folder + " -> " + folderPath("Unfinished-20260102T030405Z"));
 }
 
 TEST_F(KeptFoldersTest, AFolderThatIsGoneIsDiscarded) {
