@@ -88,12 +88,18 @@ std::string objectLine(const CheckOptions& options, FileKind kind,
 
 }  // namespace
 
-CommandResult check(const CheckOptions& options, const Terminal& terminal) {
-  const std::variant<PropertyValue, ProgramError> input = readPropertyListInput(options.file);
+CommandResult check(const CheckOptions& options, const Terminal& terminal,
+                    const CommandWorker& worker) {
+  const auto opened = DevicePlatform::open(platformOptions(options));
+  if (const auto* error = std::get_if<ProgramError>(&opened)) {
+    return *error;
+  }
+  DevicePlatform& platform = *std::get<std::unique_ptr<DevicePlatform>>(opened);
+  const auto input = readPropertyListInputs({options.file}, worker);
   if (const auto* error = std::get_if<ProgramError>(&input)) {
     return *error;
   }
-  const auto& content = std::get<PropertyValue>(input);
+  const PropertyValue& content = std::get<std::vector<PropertyValue>>(input).front();
   const FileKind kind = kindOf(content);
   const CheckedKind* checked = checkedKind(kind);
   if (checked == nullptr) {
@@ -101,13 +107,11 @@ CommandResult check(const CheckOptions& options, const Terminal& terminal) {
                         fmt::format("Neither account settings nor a legacy store: {} ({})",
                                     options.file, nameOf(kind))};
   }
-  const auto platform = DevicePlatform::make(platformOptions(options));
-  if (const auto* error = std::get_if<ProgramError>(&platform)) {
-    return *error;
+  if (auto error = platform.decode()) {
+    return *std::move(error);
   }
   const std::vector<Finding> findings = checked->findings(*content.asDictionary());
-  const Rehearsed rehearsed = rehearseFile(*std::get<std::unique_ptr<DevicePlatform>>(platform),
-                                           kind, content, options.file);
+  const Rehearsed rehearsed = rehearseFile(platform, kind, content, options.file);
   const std::string losses = linesOf(rehearsed);
   const bool isGood = findings.empty() && losses.empty();
   const ExitStatus exitStatus = isGood ? ExitStatus::Success : ExitStatus::Attention;

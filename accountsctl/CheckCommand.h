@@ -4,6 +4,7 @@
 #include <string>
 
 #include "accountsctl/CommandResult.h"
+#include "accountsctl/CommandWorker.h"
 #include "commandline/Terminal.h"
 
 namespace accounts {
@@ -21,6 +22,7 @@ struct CheckOptions {
 /// Says what a migration would not carry over from an account settings file or a legacy store as it
 /// stands. The exit status of the report is ExitStatus::Attention when there is something. Other
 /// kinds of files are an error.
-CommandResult check(const CheckOptions& options, const Terminal& terminal);
+CommandResult check(const CheckOptions& options, const Terminal& terminal,
+                    const CommandWorker& worker);
 
 }  // namespace accounts

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <optional>
 #include <string>
 #include <variant>
 
@@ -12,6 +13,8 @@ struct CommandReport {
   /// For standard output.
   std::string text;
   ExitStatus exitStatus = ExitStatus::Success;
+  /// What the file gets that the arguments name for it; the text is for when it is written.
+  std::optional<std::string> file = {};
 };
 
 using CommandResult = std::variant<CommandReport, ProgramError>;

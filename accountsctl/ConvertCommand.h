@@ -4,6 +4,7 @@
 #include <string>
 
 #include "accountsctl/CommandResult.h"
+#include "accountsctl/CommandWorker.h"
 
 namespace accounts {
 
@@ -20,9 +21,8 @@ struct ConvertOptions {
   bool reportsJSON = false;
 };
 
-/// Writes a property list in another form, its values unchanged, secrets included. The output file
-/// appears whole or not at all; a new one can be read by its owner alone, one that is replaced
-/// keeps its permissions. Only a regular file is replaced, through symbolic links that lead to it.
-CommandResult convert(const ConvertOptions& options);
+/// A property list in another form, its values unchanged, secrets included: the report's text for
+/// standard output, its file for any other one.
+CommandResult convert(const ConvertOptions& options, const CommandWorker& worker);
 
 }  // namespace accounts

@@ -14,26 +14,40 @@ constexpr const char* kNeededResources[] = {"AccountTypesProperties", "Dataclass
 
 }  // namespace
 
-DevicePlatform::DevicePlatform(std::unique_ptr<LinuxPlatform> platform)
-    : platform_(std::move(platform)), process_(platform_->platform()) {}
+DevicePlatform::DevicePlatform(std::unique_ptr<LinuxPlatform> platform, std::string resources)
+    : platform_(std::move(platform)),
+      resources_(std::move(resources)),
+      process_(platform_->platform()) {}
 
-std::variant<std::unique_ptr<DevicePlatform>, ProgramError> DevicePlatform::make(
+std::variant<std::unique_ptr<DevicePlatform>, ProgramError> DevicePlatform::open(
     LinuxPlatformOptions options) {
   if (options.bundleResourcesDirectory.empty()) {
     options.bundleResourcesDirectory = resourcesOfBundle(bundleOfProgram()).string();
   }
+  options.descriptionDecoding = DescriptionDecoding::Later;
   LinuxPlatformError error;
   std::unique_ptr<LinuxPlatform> platform = LinuxPlatform::create(options, error);
   if (platform == nullptr) {
     return programErrorOf(error);
   }
+  if (const auto unread = platform->readAhead()) {
+    return programErrorOf(*unread, ExitStatus::MissingInput);
+  }
+  return std::unique_ptr<DevicePlatform>(
+      new DevicePlatform(std::move(platform), options.bundleResourcesDirectory));
+}
+
+std::optional<ProgramError> DevicePlatform::decode() {
+  if (LinuxPlatformError error; !platform_->decodeDescription(error)) {
+    return programErrorOf(error);
+  }
   for (const char* name : kNeededResources) {
-    if (!platform->platform().bundleResources.readPropertyList(name)) {
-      return ProgramError{ExitStatus::MissingInput, std::string("No readable resource ") + name +
-                                                        " in " + options.bundleResourcesDirectory};
+    if (!platform_->platform().bundleResources.readPropertyList(name)) {
+      return ProgramError{ExitStatus::MissingInput,
+                          std::string("No readable resource ") + name + " in " + resources_};
     }
   }
-  return std::unique_ptr<DevicePlatform>(new DevicePlatform(std::move(platform)));
+  return std::nullopt;
 }
 
 }  // namespace accounts

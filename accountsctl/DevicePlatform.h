@@ -15,17 +15,21 @@ namespace accounts {
 class DevicePlatform {
  public:
   /// On the device of the options' root. Options without a directory of resources have that of the
-  /// bundle of the program. An error when the root, the device description or the resources are
-  /// missing or unreadable.
-  static std::variant<std::unique_ptr<DevicePlatform>, ProgramError> make(
+  /// bundle of the program. Reads what it will need of the bundle and of this machine. An error
+  /// when the root, the device description or the resources are missing or unreadable.
+  static std::variant<std::unique_ptr<DevicePlatform>, ProgramError> open(
       LinuxPlatformOptions options);
+
+  /// Decodes what was read, before any use. An error when that cannot be done.
+  std::optional<ProgramError> decode();
 
   LinuxPlatform& linuxPlatform() { return *platform_; }
 
  private:
-  explicit DevicePlatform(std::unique_ptr<LinuxPlatform> platform);
+  DevicePlatform(std::unique_ptr<LinuxPlatform> platform, std::string resources);
 
   std::unique_ptr<LinuxPlatform> platform_;
+  std::string resources_;
   Process process_;
 };
 

@@ -3,8 +3,10 @@
 #include <fcntl.h>
 #include <sys/file.h>
 
+#include "accountsctl/PlatformInMemory.h"
 #include "accountsettings/AccountsManager.h"
 #include "migrator/AccountsDataMigrator.h"
+#include "platform/linux/DictionaryFile.h"
 #include "platform/linux/LinuxDevicePlaces.h"
 #include "platform/linux/TemporaryFile.h"
 #include "safetynet/KeptFolders.h"
@@ -17,14 +19,18 @@ namespace {
 constexpr std::string_view kTemporaryPlaces[] = {"tmp", "Library/Preferences",
                                                  "Library/Logs/CrashReporter/AccountMigration"};
 
-void lookAtSettings(LinuxPlatform& platform, DeviceStatus& status) {
-  status.settingsPath = AccountsManager::fullPathToAccountSettingsPlist();
+void lookAtSettings(Transaction& transaction, DeviceStatus& status) {
+  const PlaceState& place = transaction.snapshot().at(DevicePlace::Settings);
+  status.settingsPath = place.path;
+  status.hasSettings = transaction.exists(DevicePlace::Settings);
+  const std::optional<std::string> bytes = transaction.bytesBefore(DevicePlace::Settings);
   Failure error;
-  const std::optional<PropertyDictionary> root =
-      platform.propertyLists().readDictionary(status.settingsPath, error);
-  status.hasSettings = root || !error.isMissing();
+  const auto root = bytes ? dictionaryFromBytes(*bytes, place.path, error) : std::nullopt;
   if (!root) {
-    status.settingsProblem = status.hasSettings ? std::optional(error.text) : std::nullopt;
+    const auto& whyNotRead = place.whyNotRead ? place.whyNotRead : transaction.readFailure();
+    status.settingsProblem = !status.hasSettings ? std::nullopt
+                             : whyNotRead        ? std::optional(whyNotRead->text)
+                                                 : std::optional(error.text);
     return;
   }
   if (const PropertyValue* version = root->find(kPlistVersionKey)) {
@@ -75,7 +81,10 @@ bool isAbandoned(const DeviceRoot& root, const std::string& path) {
   return file && ::flock(file->number(), LOCK_SH | LOCK_NB) == 0;
 }
 
-void lookAtLeftovers(LinuxPlatform& platform, DeviceStatus& status) {
+}  // namespace
+
+DeviceStatus leftoversOn(LinuxPlatform& platform) {
+  DeviceStatus status;
   const std::string home = platform.platform().homeDirectory.path();
   LinuxDevicePlaces places(platform.root(), platform.fileSystem(), home);
   status.keptFolders = KeptFolders(platform.fileSystem(), places).keptFor(KeptFor::Migration);
@@ -87,16 +96,14 @@ void lookAtLeftovers(LinuxPlatform& platform, DeviceStatus& status) {
       }
     }
   }
+  return status;
 }
 
-}  // namespace
-
-DeviceStatus statusOf(DevicePlatform& platform) {
-  DeviceStatus status;
-  lookAtSettings(platform.linuxPlatform(), status);
+void lookAtDevice(LinuxPlatform& platform, const DeviceSnapshot& snapshot, DeviceStatus& status) {
+  Transaction transaction(snapshot, platform.platform().homeDirectory.path());
+  const PlatformInMemory inMemory(platform, transaction, nullptr);
+  lookAtSettings(transaction, status);
   lookAtWork(status);
-  lookAtLeftovers(platform.linuxPlatform(), status);
-  return status;
 }
 
 }  // namespace accounts

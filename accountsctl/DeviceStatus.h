@@ -5,7 +5,8 @@
 #include <string>
 #include <vector>
 
-#include "accountsctl/DevicePlatform.h"
+#include "platform/DeviceSnapshot.h"
+#include "platform/linux/LinuxPlatform.h"
 #include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
@@ -40,7 +41,10 @@ struct DeviceStatus {
   }
 };
 
-/// Looks at the device of a platform and changes nothing on it.
-DeviceStatus statusOf(DevicePlatform& platform);
+/// What earlier runs left on a device. Changes nothing, and decodes nothing.
+DeviceStatus leftoversOn(LinuxPlatform& platform);
+
+/// Completes that with what a snapshot of the device holds.
+void lookAtDevice(LinuxPlatform& platform, const DeviceSnapshot& snapshot, DeviceStatus& status);
 
 }  // namespace accounts

@@ -84,17 +84,15 @@ CommandReport jsonReport(const std::vector<ComparedPart>& parts, const DiffOptio
 
 }  // namespace
 
-CommandResult diff(const DiffOptions& options, const Terminal& terminal) {
-  const std::variant<PropertyValue, ProgramError> before = readPropertyListInput(options.before);
-  if (const auto* error = std::get_if<ProgramError>(&before)) {
+CommandResult diff(const DiffOptions& options, const Terminal& terminal,
+                   const CommandWorker& worker) {
+  const auto inputs = readPropertyListInputs({options.before, options.after}, worker);
+  if (const auto* error = std::get_if<ProgramError>(&inputs)) {
     return *error;
   }
-  const std::variant<PropertyValue, ProgramError> after = readPropertyListInput(options.after);
-  if (const auto* error = std::get_if<ProgramError>(&after)) {
-    return *error;
-  }
-  const auto& left = std::get<PropertyValue>(before);
-  const auto& right = std::get<PropertyValue>(after);
+  const auto& values = std::get<std::vector<PropertyValue>>(inputs);
+  const PropertyValue& left = values[0];
+  const PropertyValue& right = values[1];
   const FileKind kind = kindOf(left);
   if (kindOf(right) != kind) {
     return ProgramError{

@@ -3,6 +3,7 @@
 #include <string>
 
 #include "accountsctl/CommandResult.h"
+#include "accountsctl/CommandWorker.h"
 #include "commandline/Terminal.h"
 #include "propertylist/value/SecretKeys.h"
 
@@ -18,6 +19,7 @@ struct DiffOptions {
 
 /// Compares two files of one kind. The exit status of the report is ExitStatus::Attention when they
 /// differ. Files of different kinds are an error.
-CommandResult diff(const DiffOptions& options, const Terminal& terminal);
+CommandResult diff(const DiffOptions& options, const Terminal& terminal,
+                   const CommandWorker& worker);
 
 }  // namespace accounts

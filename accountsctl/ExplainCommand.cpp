@@ -10,12 +10,13 @@
 
 namespace accounts {
 
-CommandResult explain(const ExplainOptions& options) {
+CommandResult explain(const ExplainOptions& options, const CommandWorker& worker) {
   Failure error;
   const std::optional<std::string> text = readHostFile(options.report, error);
   if (!text) {
     return programErrorOf(error, ExitStatus::MissingInput);
   }
+  worker.giveUpRights({.size = text->size()});
   const JSON report = JSON::parse(*text, nullptr, /*allow_exceptions=*/false);
   if (!report.is_object() || !report.contains("stages")) {
     return ProgramError{ExitStatus::MalformedInput,

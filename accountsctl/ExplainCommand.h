@@ -3,6 +3,7 @@
 #include <string>
 
 #include "accountsctl/CommandResult.h"
+#include "accountsctl/CommandWorker.h"
 
 namespace accounts {
 
@@ -16,6 +17,6 @@ struct ExplainOptions {
 
 /// Tells what a migration did to one account. An error when the report is none, or has no such
 /// account.
-CommandResult explain(const ExplainOptions& options);
+CommandResult explain(const ExplainOptions& options, const CommandWorker& worker);
 
 }  // namespace accounts

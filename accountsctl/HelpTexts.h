@@ -18,6 +18,7 @@ inline constexpr const char* kErrors =
     "  64  the arguments cannot be used\n"
     "  65  a file is not what it has to be\n"
     "  66  a file or the root is missing or unreadable\n"
+    "  70  what read the files did what it may not do, or ended\n"
     "  73  the output file cannot be created\n"
     "  74  a file or standard output cannot be written or read\n"
     "  75  what stands in the way may pass\n";

@@ -1,6 +1,7 @@
 #include "accountsctl/PropertyListInput.h"
 
 #include <optional>
+#include <utility>
 
 #include "commandline/PlatformError.h"
 #include "platform/linux/FileContents.h"
@@ -8,20 +9,33 @@
 
 namespace accounts {
 
-std::variant<PropertyValue, ProgramError> readPropertyListInput(const std::string& file) {
-  Failure error;
-  const std::optional<std::string> bytes = readHostFile(file, error);
-  if (!bytes) {
-    return programErrorOf(error, ExitStatus::MissingInput);
+std::variant<std::vector<PropertyValue>, ProgramError> readPropertyListInputs(
+    const std::vector<std::string>& files, const CommandWorker& worker) {
+  std::vector<std::string> contents;
+  OpenInputs inputs;
+  for (const std::string& file : files) {
+    Failure error;
+    std::optional<std::string> bytes = readHostFile(file, error);
+    if (!bytes) {
+      return programErrorOf(error, ExitStatus::MissingInput);
+    }
+    inputs.size += bytes->size();
+    contents.push_back(*std::move(bytes));
   }
-  PropertyListError malformed;
-  std::optional<PropertyValue> value = readPropertyList(*bytes, malformed);
-  if (!value) {
-    return ProgramError{
-        ExitStatus::MalformedInput,
-        pathFailure("read the property list", nameOfInput(file), malformed.text).text};
+  worker.giveUpRights(inputs);
+  std::vector<PropertyValue> values;
+  for (std::size_t index = 0; index < files.size(); ++index) {
+    PropertyListError malformed;
+    std::optional<PropertyValue> value = readPropertyList(contents[index], malformed);
+    if (!value) {
+      return ProgramError{
+          ExitStatus::MalformedInput,
+          pathFailure("read the property list", nameOfInput(files[index]), malformed.text).text};
+    }
+    values.push_back(*std::move(value));
+    contents[index] = {};
   }
-  return *std::move(value);
+  return values;
 }
 
 }  // namespace accounts

@@ -2,14 +2,18 @@
 
 #include <string>
 #include <variant>
+#include <vector>
 
+#include "accountsctl/CommandWorker.h"
 #include "commandline/ExitStatus.h"
 #include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 
-/// The value of a property-list file of this machine, a pipe or standard input ("-"), in either
-/// format. An error when it is missing, unreadable, too large (kLargestFileSize) or malformed.
-std::variant<PropertyValue, ProgramError> readPropertyListInput(const std::string& file);
+/// The values of property-list files of this machine, pipes or standard input ("-"), in either
+/// format. An error when one is missing, unreadable, too large (kLargestFileSize) or malformed.
+/// The worker gives up its rights once all are read.
+std::variant<std::vector<PropertyValue>, ProgramError> readPropertyListInputs(
+    const std::vector<std::string>& files, const CommandWorker& worker);
 
 }  // namespace accounts

@@ -2,34 +2,16 @@
 
 #include <cerrno>
 #include <memory>
-#include <stdexcept>
 
-#include "commandline/PlatformError.h"
+#include "accountsctl/PlatformInMemory.h"
 #include "migrator/AccountsDataMigrator.h"
-#include "platform/linux/LinuxDevicePlaces.h"
-#include "platform/linux/LinuxPreferenceDomain.h"
 #include "propertylist/binary/BinaryPropertyList.h"
 #include "propertylist/value/Description.h"
 #include "report/LedgerJSON.h"
 #include "safetynet/MigrationInMemory.h"
-#include "safetynet/PlaceErrors.h"
-#include "transaction/TransactionPlatform.h"
 
 namespace accounts {
 namespace {
-
-/// Lets everybody have a file: who looks at an image is not who will migrate it.
-class AnyOwner final : public OwnershipRule {
- public:
-  std::variant<FileOwner, Failure> ownerNamed(std::string_view, std::string_view) override {
-    return FileOwner();
-  }
-};
-
-class SilentConsole final : public ConsoleLog {
- public:
-  void writeLine(std::string_view) override {}
-};
 
 class OwnedBytes final : public ReadableBytes {
  public:
@@ -72,35 +54,15 @@ DeviceSnapshot snapshotOf(DevicePlace place, std::string bytes, std::string_view
   return snapshot;
 }
 
-Rehearsed rehearse(LinuxPlatform& linux, const DeviceSnapshot& snapshot) {
-  MigrationInMemory migration(snapshot, linux.platform().homeDirectory.path());
-  AnyOwner owners;
-  TransactionPlatform inMemory(
-      migration.transaction(), linux.platform(), owners, MigrationLockState::Available,
-      [](std::string_view path) {
-        throw std::logic_error("A path that no migration has: " + std::string(path));
-      });
-  LinuxPreferenceDomain preferences(inMemory.propertyLists(), linux.platform().homeDirectory);
-  SilentConsole console;
-  Platform platform =
-      platformWith(inMemory.platform(preferences),
-                   {.consoleLog = &console, .migrationObserver = &migration.told()});
-  const Process process(platform);
-  const bool succeeded = AccountsDataMigrator().performMigration();
-  migration.verify(succeeded ? PluginResult::GaveTrue : PluginResult::GaveFalse, factsOf(platform));
-  return migration.error() ? Rehearsed(*migration.error()) : Rehearsed(migration.ledger());
-}
-
 }  // namespace
 
-Rehearsed rehearseDevice(DevicePlatform& device) {
-  LinuxPlatform& linux = device.linuxPlatform();
-  LinuxDevicePlaces places(linux.root(), linux.fileSystem(), linux.platform().homeDirectory.path());
-  const auto snapshot = places.takeSnapshot();
-  if (const auto* failure = std::get_if<Failure>(&snapshot)) {
-    return readingError(*failure);
-  }
-  return rehearse(linux, std::get<DeviceSnapshot>(snapshot));
+Rehearsed rehearse(LinuxPlatform& linux, const DeviceSnapshot& snapshot) {
+  MigrationInMemory migration(snapshot, linux.platform().homeDirectory.path());
+  const PlatformInMemory inMemory(linux, migration.transaction(), &migration.told());
+  const bool succeeded = AccountsDataMigrator().performMigration();
+  migration.verify(succeeded ? PluginResult::GaveTrue : PluginResult::GaveFalse,
+                   factsOf(inMemory.platform()));
+  return migration.error() ? Rehearsed(*migration.error()) : Rehearsed(migration.ledger());
 }
 
 Rehearsed rehearseFile(DevicePlatform& device, FileKind kind, const PropertyValue& content,

@@ -6,6 +6,7 @@
 #include "accountsctl/DevicePlatform.h"
 #include "inspection/PropertyListJSON.h"
 #include "inspection/StoreLayout.h"
+#include "platform/DeviceSnapshot.h"
 #include "safetynet/AccountLedger.h"
 
 namespace accounts {
@@ -14,9 +15,8 @@ namespace accounts {
 /// written; or why a run would fail.
 using Rehearsed = std::variant<AccountLedger, ProgramError>;
 
-/// Rehearses the migration of a device. A snapshot that cannot be taken is an error too, with the
-/// status of what cannot be read.
-Rehearsed rehearseDevice(DevicePlatform& device);
+/// Rehearses the migration of a device.
+Rehearsed rehearse(LinuxPlatform& linux, const DeviceSnapshot& snapshot);
 
 /// Rehearses the migration of a device that has one file alone: account settings or a legacy store.
 /// `name` is what the ledger calls the file. A value that no settings file can hold is malformed

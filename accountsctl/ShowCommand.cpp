@@ -28,12 +28,13 @@ CommandResult shownXML(const PropertyValue& content) {
 
 }  // namespace
 
-CommandResult show(const ShowOptions& options, const Terminal& terminal) {
-  const std::variant<PropertyValue, ProgramError> input = readPropertyListInput(options.file);
+CommandResult show(const ShowOptions& options, const Terminal& terminal,
+                   const CommandWorker& worker) {
+  const auto input = readPropertyListInputs({options.file}, worker);
   if (const auto* error = std::get_if<ProgramError>(&input)) {
     return *error;
   }
-  const auto& value = std::get<PropertyValue>(input);
+  const PropertyValue& value = std::get<std::vector<PropertyValue>>(input).front();
   const PropertyValue content = options.secrets == Secrets::Hide ? withSecretsHidden(value) : value;
   switch (options.form) {
     case ShownForm::Tables:

@@ -3,6 +3,7 @@
 #include <string>
 
 #include "accountsctl/CommandResult.h"
+#include "accountsctl/CommandWorker.h"
 #include "accountsctl/TextTable.h"
 #include "commandline/Terminal.h"
 #include "propertylist/value/PropertyValue.h"
@@ -25,7 +26,8 @@ struct ShowOptions {
 };
 
 /// Shows a file, whatever kind of property list it is.
-CommandResult show(const ShowOptions& options, const Terminal& terminal);
+CommandResult show(const ShowOptions& options, const Terminal& terminal,
+                   const CommandWorker& worker);
 
 /// The tables that show a file's content to people.
 std::string shownTables(const PropertyValue& content, const ShowOptions& options,

@@ -12,7 +12,9 @@
 #include "accountsettings/AccountsManager.h"
 #include "commandline/BundleLocation.h"
 #include "commandline/PlatformError.h"
+#include "platform/linux/LinuxDevicePlaces.h"
 #include "propertylist/value/Description.h"
+#include "safetynet/PlaceErrors.h"
 
 namespace accounts {
 namespace {
@@ -115,19 +117,32 @@ std::string objectLine(const StatusOptions& options, const DeviceStatus& status,
 
 }  // namespace
 
-CommandResult status(const StatusOptions& options, const Terminal& terminal) {
-  const auto platform = DevicePlatform::make(platformOptions(options));
-  if (const auto* error = std::get_if<ProgramError>(&platform)) {
+CommandResult status(const StatusOptions& options, const Terminal& terminal,
+                     const CommandWorker& worker) {
+  const auto opened = DevicePlatform::open(platformOptions(options));
+  if (const auto* error = std::get_if<ProgramError>(&opened)) {
     return *error;
   }
-  const auto& device = std::get<std::unique_ptr<DevicePlatform>>(platform);
-  if (const auto missing = whyNoDevice(device->linuxPlatform().root(), options.root)) {
+  DevicePlatform& device = *std::get<std::unique_ptr<DevicePlatform>>(opened);
+  LinuxPlatform& linux = device.linuxPlatform();
+  if (const auto missing = whyNoDevice(linux.root(), options.root)) {
     return *missing;
   }
-  const DeviceStatus found = statusOf(*device);
+  LinuxDevicePlaces places(linux.root(), linux.fileSystem(), linux.platform().homeDirectory.path());
+  const auto taken = places.takeSnapshot();
+  if (const auto* failure = std::get_if<Failure>(&taken)) {
+    return readingError(*failure);
+  }
+  const auto& snapshot = std::get<DeviceSnapshot>(taken);
+  DeviceStatus found = leftoversOn(linux);
+  worker.giveUpRights(openInputsOf(snapshot));
+  if (auto error = device.decode()) {
+    return *std::move(error);
+  }
+  lookAtDevice(linux, snapshot, found);
   const ExitStatus exitStatus =
       options.failsIfPending && found.isPending() ? ExitStatus::Attention : ExitStatus::Success;
-  const Rehearsed rehearsed = rehearseDevice(*device);
+  const Rehearsed rehearsed = rehearse(linux, snapshot);
   // What this machine lacks or its medium does not give says nothing of the device.
   const auto* const error = std::get_if<ProgramError>(&rehearsed);
   if (error != nullptr && (error->exitStatus == ExitStatus::TemporaryFailure ||

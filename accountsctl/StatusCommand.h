@@ -4,6 +4,7 @@
 #include <string>
 
 #include "accountsctl/CommandResult.h"
+#include "accountsctl/CommandWorker.h"
 #include "commandline/Terminal.h"
 
 namespace accounts {
@@ -24,6 +25,7 @@ struct StatusOptions {
 /// Tells what a migration would find on a device and do. Changes nothing, and reads nothing outside
 /// the root but the bundle's resources and a device description that is named. The exit status of
 /// the report is ExitStatus::Attention if that is asked for and something is pending.
-CommandResult status(const StatusOptions& options, const Terminal& terminal);
+CommandResult status(const StatusOptions& options, const Terminal& terminal,
+                     const CommandWorker& worker);
 
 }  // namespace accounts

@@ -1,12 +1,12 @@
 #include "accountsctl/SummarizeCommand.h"
 
+#include <fcntl.h>
 #include <fmt/format.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <cerrno>
 #include <filesystem>
-#include <fstream>
-#include <iostream>
 #include <sstream>
 #include <unordered_set>
 
@@ -16,7 +16,6 @@
 #include "accountsctl/ProgressLine.h"
 #include "accountsctl/TextTable.h"
 #include "commandline/PlatformError.h"
-#include "commandline/ReplacedFile.h"
 #include "platform/linux/FileContents.h"
 #include "propertylist/value/Description.h"
 
@@ -25,18 +24,6 @@ namespace {
 
 /// People look for what is frequent; the JSON object has the others as well.
 constexpr std::size_t kShownErrors = 10;
-
-/// Reads every line of a stream; whether it came to its end.
-bool addLines(std::istream& stream, const std::optional<std::string>& page,
-              const SummarizeOptions& options, FleetSummary& summary, ProgressLine& progress) {
-  for (std::string line; std::getline(stream, line);) {
-    summary.addLine(line, page);
-    if (progress.wantsText()) {
-      progress.show(progressText(summary, options.expected));
-    }
-  }
-  return !stream.bad();
-}
 
 /// The page of the report that a file holds: it has the same name, but for its end.
 std::optional<std::string> pageBeside(const std::string& file) {
@@ -71,32 +58,34 @@ std::vector<std::string> filesOf(const std::string& name) {
   return files;
 }
 
-std::optional<ProgramError> addFile(const std::string& file, const SummarizeOptions& options,
-                                    FleetSummary& summary, ProgressLine& progress) {
-  errno = 0;
-  bool isRead = false;
-  if (file == kStandardStream) {
-    isRead = addLines(std::cin, std::nullopt, options, summary, progress);
-  } else {
-    std::ifstream stream(file, std::ios::binary);
-    isRead = stream.is_open() && addLines(stream, pageBeside(file), options, summary, progress);
+/// Adds every line of the file that the keeper reads aloud.
+void addFile(const CommandWorker& worker, const SummarizedFile& file,
+             const SummarizeOptions& options, FleetSummary& summary, ProgressLine& progress) {
+  std::string text;
+  const auto add = [&](std::string_view line) {
+    summary.addLine(line, file.page);
+    if (progress.wantsText()) {
+      progress.show(progressText(summary, options.expected));
+    }
+  };
+  for (std::string piece = worker.nextPiece(); !piece.empty(); piece = worker.nextPiece()) {
+    std::size_t begin = 0;
+    std::size_t searched = text.size();
+    text += piece;
+    for (std::size_t end = 0; (end = text.find('\n', searched)) != std::string::npos;
+         begin = searched = end + 1) {
+      add(std::string_view(text).substr(begin, end - begin));
+    }
+    text.erase(0, begin);
   }
-  if (isRead) {
-    return std::nullopt;
-  }
-  return programErrorOf(pathFailure("read", file, errno), ExitStatus::MissingInput);
+  add(text);
 }
 
-/// The roots in a file, each once. Lines may end as on another system, and blank ones are none.
-std::variant<std::vector<std::string>, ProgramError> readRoots(const std::string& file) {
-  Failure error;
-  const std::optional<std::string> text = readHostFile(file, error);
-  if (!text) {
-    return programErrorOf(error, ExitStatus::MissingInput);
-  }
+/// The roots in a text, each once. Lines may end as on another system, and blank ones are none.
+std::vector<std::string> rootsIn(const std::string& text) {
   std::vector<std::string> roots;
   std::unordered_set<std::string> known;
-  std::istringstream lines(*text);
+  std::istringstream lines(text);
   for (std::string line; std::getline(lines, line);) {
     if (line.ends_with('\r')) {
       line.pop_back();
@@ -106,6 +95,35 @@ std::variant<std::vector<std::string>, ProgramError> readRoots(const std::string
     }
   }
   return roots;
+}
+
+/// What a file has; one that does not say counts as the largest.
+std::uint64_t sizeOf(const SummarizedFile& file) {
+  std::error_code error;
+  const std::uintmax_t size = std::filesystem::file_size(file.name, error);
+  return error ? kLargestFileSize : size;
+}
+
+std::optional<ProgramError> readAloud(const std::string& file, const TakePiece& take) {
+  constexpr std::size_t kPiece = std::size_t{64} << 10;
+  std::string piece(kPiece, '\0');
+  const FileDescriptor opened(file == kStandardStream
+                                  ? ::fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, 0)
+                                  : ::open(file.c_str(), O_RDONLY | O_CLOEXEC | O_NOCTTY));
+  for (;;) {
+    const ssize_t count =
+        opened.number() < 0 ? -1 : ::read(opened.number(), piece.data(), piece.size());
+    if (count < 0 && errno == EINTR) {
+      continue;
+    }
+    if (count < 0) {
+      return programErrorOf(pathFailure("read", file, errno), ExitStatus::MissingInput);
+    }
+    const bool isHeard = take(std::string_view(piece).substr(0, static_cast<std::size_t>(count)));
+    if (count == 0 || !isHeard) {
+      return std::nullopt;
+    }
+  }
 }
 
 std::size_t missingCount(const SummarizeOptions& options, const FleetSummary& summary) {
@@ -246,50 +264,77 @@ std::string objectLine(const SummarizeOptions& options, const FleetSummary& summ
 
 }  // namespace
 
-CommandResult summarize(const SummarizeOptions& asked, const Terminal& terminal) {
-  SummarizeOptions options = asked;
-  FleetSummary summary;
-  if (options.rootsFile) {
-    const auto roots = readRoots(*options.rootsFile);
-    if (const auto* error = std::get_if<ProgramError>(&roots)) {
-      return *error;
+std::vector<SummarizedFile> filesToSummarize(const SummarizeOptions& options) {
+  std::vector<SummarizedFile> files;
+  for (const std::string& name : options.files) {
+    for (std::string& file : filesOf(name)) {
+      std::optional<std::string> page = pageBeside(file);
+      files.push_back({std::move(file), std::move(page)});
     }
-    summary.expect(std::get<std::vector<std::string>>(roots));
-    options.expected = std::get<std::vector<std::string>>(roots).size();
   }
+  return files;
+}
+
+std::optional<ProgramError> readAloud(const std::vector<SummarizedFile>& files,
+                                      const TakePiece& take) {
+  for (const SummarizedFile& file : files) {
+    if (auto error = readAloud(file.name, take)) {
+      return error;
+    }
+  }
+  return std::nullopt;
+}
+
+CommandResult summarize(const SummarizeOptions& asked, const std::vector<SummarizedFile>& files,
+                        const Terminal& terminal, const CommandWorker& worker) {
+  SummarizeOptions options = asked;
+  OpenInputs inputs;
+  for (const SummarizedFile& file : files) {
+    inputs.size += sizeOf(file);
+  }
+  std::optional<std::string> rootsText;
+  if (options.rootsFile) {
+    Failure error;
+    rootsText = readHostFile(*options.rootsFile, error);
+    if (!rootsText) {
+      return programErrorOf(error, ExitStatus::MissingInput);
+    }
+    inputs.size += rootsText->size();
+  }
+  std::error_code unknown;
+  const std::filesystem::path page =
+      std::filesystem::absolute(options.html.value_or(std::string()), unknown);
+  FleetSummary summary;
   {
     ProgressLine progress;
-    for (const std::string& name : options.files) {
-      for (const std::string& file : filesOf(name)) {
-        if (std::optional<ProgramError> error = addFile(file, options, summary, progress)) {
-          return *std::move(error);
-        }
-      }
+    worker.giveUpRights(inputs);
+    if (rootsText) {
+      const std::vector<std::string> roots = rootsIn(*rootsText);
+      summary.expect(roots);
+      options.expected = roots.size();
+    }
+    for (const SummarizedFile& file : files) {
+      addFile(worker, file, options, summary, progress);
     }
   }
+  std::optional<std::string> written;
   if (options.html) {
-    std::error_code error;
-    const std::filesystem::path page = std::filesystem::absolute(*options.html, error);
-    const std::string directory = page.parent_path().lexically_normal().string();
-    if (std::optional<ProgramError> problem =
-            replaceFile(*options.html, fleetPage(summary, directory))) {
-      return *std::move(problem);
-    }
+    written = fleetPage(summary, page.parent_path().lexically_normal().string());
   }
   if (options.listed) {
-    return CommandReport{listOf(*options.listed, options, summary, terminal), ExitStatus::Success};
+    return CommandReport{listOf(*options.listed, options, summary, terminal)};
   }
   const bool isDone = summary.countOf(Remedy::None) == summary.imageCount() &&
                       missingCount(options, summary) == 0 && summary.unreadableLineCount() == 0;
   const ExitStatus exitStatus = isDone ? ExitStatus::Success : ExitStatus::Attention;
   if (options.reportsJSON) {
-    return CommandReport{objectLine(options, summary, exitStatus), exitStatus};
+    return CommandReport{objectLine(options, summary, exitStatus), exitStatus, std::move(written)};
   }
   return CommandReport{outcomesText(options, summary, terminal) +
                            countsText("Step", summary.steps(), summary.steps().size(), terminal) +
                            countsText("Error", summary.errors(), kShownErrors, terminal) +
                            remarksText(summary),
-                       exitStatus};
+                       exitStatus, std::move(written)};
 }
 
 }  // namespace accounts

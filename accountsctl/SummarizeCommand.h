@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "accountsctl/CommandResult.h"
+#include "accountsctl/CommandWorker.h"
 #include "accountsctl/RunResult.h"
 #include "commandline/Terminal.h"
 
@@ -37,9 +38,24 @@ struct SummarizeOptions {
   bool reportsJSON = false;
 };
 
+/// A file with lines that runs wrote.
+struct SummarizedFile {
+  std::string name;
+  /// The page of the report that it is; none for no such page.
+  std::optional<std::string> page;
+};
+
+/// The files that are asked for, those in directories, too.
+std::vector<SummarizedFile> filesToSummarize(const SummarizeOptions& options);
+
+/// Reads them to the worker that summarizes them. An error when one cannot be read.
+std::optional<ProgramError> readAloud(const std::vector<SummarizedFile>& files,
+                                      const TakePiece& take);
+
 /// Counts what runs of migration-host on many images reported: by outcome, stage and error. While
 /// it reads, a terminal at standard error shows how far the fleet has come. The exit status of the
 /// report is ExitStatus::Attention unless every image is migrated; that of a list is success.
-CommandResult summarize(const SummarizeOptions& asked, const Terminal& terminal);
+CommandResult summarize(const SummarizeOptions& asked, const std::vector<SummarizedFile>& files,
+                        const Terminal& terminal, const CommandWorker& worker);
 
 }  // namespace accounts

@@ -4,34 +4,50 @@
 #include <variant>
 
 #include "accountsctl/CommandLine.h"
+#include "accountsctl/CommandWorker.h"
 #include "accountsctl/JSONText.h"
 #include "commandline/MemoryReserve.h"
+#include "commandline/ReplacedFile.h"
 #include "commandline/StandardStreams.h"
 #include "commandline/Terminal.h"
 
 namespace accounts {
 namespace {
 
+template <class Options>
+using TerminalCommand = CommandResult (*)(const Options&, const Terminal&, const CommandWorker&);
+
+template <class Options>
+CommandResult runForTerminal(TerminalCommand<Options> command, const Options& options) {
+  return runInWorker([&, terminal = standardOutputTerminal(::getenv)](const CommandWorker& worker) {
+    return command(options, terminal, worker);
+  });
+}
+
 CommandResult runCommand(const ShowOptions& options) {
-  return show(options, standardOutputTerminal(::getenv));
+  return runForTerminal(show, options);
 }
 CommandResult runCommand(const DiffOptions& options) {
-  return diff(options, standardOutputTerminal(::getenv));
+  return runForTerminal(diff, options);
 }
 CommandResult runCommand(const CheckOptions& options) {
-  return check(options, standardOutputTerminal(::getenv));
+  return runForTerminal(check, options);
 }
 CommandResult runCommand(const StatusOptions& options) {
-  return status(options, standardOutputTerminal(::getenv));
+  return runForTerminal(status, options);
 }
 CommandResult runCommand(const ConvertOptions& options) {
-  return convert(options);
-}
-CommandResult runCommand(const SummarizeOptions& options) {
-  return summarize(options, standardOutputTerminal(::getenv));
+  return runInWorker([&](const CommandWorker& worker) { return convert(options, worker); });
 }
 CommandResult runCommand(const ExplainOptions& options) {
-  return explain(options);
+  return runInWorker([&](const CommandWorker& worker) { return explain(options, worker); });
+}
+CommandResult runCommand(const SummarizeOptions& options) {
+  const std::vector<SummarizedFile> files = filesToSummarize(options);
+  const Terminal terminal = standardOutputTerminal(::getenv);
+  return runInWorker(
+      [&](const CommandWorker& worker) { return summarize(options, files, terminal, worker); },
+      [&](const TakePiece& take) { return readAloud(files, take); });
 }
 CommandResult runCommand(const RequestedText& requested) {
   return CommandReport{requested.text};
@@ -51,10 +67,27 @@ std::string errorObject(const CommandLine& commandLine, const ProgramError& erro
   return lineOf(std::move(object), error.exitStatus);
 }
 
-/// What a command came to; want of memory is an error like another.
+/// The file that the arguments name for what a command makes; null for none.
+const std::string* outputFileOf(const CommandLine& commandLine) {
+  if (const auto* const convert = std::get_if<ConvertOptions>(&commandLine.asked)) {
+    return &convert->output;
+  }
+  const auto* const summarize = std::get_if<SummarizeOptions>(&commandLine.asked);
+  return summarize != nullptr && summarize->html ? &*summarize->html : nullptr;
+}
+
+/// What a command came to, its file written; want of memory is an error like another.
 CommandResult resultOf(const CommandLine& commandLine) {
   try {
-    return std::visit([](const auto& asked) { return runCommand(asked); }, commandLine.asked);
+    CommandResult result =
+        std::visit([](const auto& asked) { return runCommand(asked); }, commandLine.asked);
+    const auto* const report = std::get_if<CommandReport>(&result);
+    const std::string* const output = outputFileOf(commandLine);
+    if (report == nullptr || !report->file || output == nullptr) {
+      return result;
+    }
+    auto error = replaceFile(*output, *report->file);
+    return error ? CommandResult(*std::move(error)) : result;
   } catch (const std::bad_alloc&) {
     return outOfMemory();
   }

@@ -3,18 +3,17 @@
 #include <unistd.h>
 
 #include <algorithm>
-#include <cerrno>
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
 #include <iostream>
 #include <limits>
 #include <memory>
-#include <new>
 #include <utility>
 #include <variant>
 
 #include "commandline/PlatformError.h"
+#include "commandline/WorkerEnd.h"
 #include "host/Announcements.h"
 #include "host/KernelOwnershipRule.h"
 #include "host/ReportFiles.h"
@@ -190,13 +189,7 @@ void giveUpRights(const PluginWork& work, const WorkerSide& side) {
   if (linux.logsToJournal()) {
     kept.journalEntries = JournalEntries::Sent;
   }
-  if (const auto error = accounts::giveUpRights(kept)) {
-    if (error->number == ENOMEM) {
-      throw std::bad_alloc();
-    }
-    static_cast<void>(sendFrame(side.socket, FrameKind::Fault, error->text));
-    _exit(static_cast<int>(ExitStatus::PluginEnded));
-  }
+  giveUpRightsOrEnd(kept, side.socket);
 }
 
 /// Reports a path that no migration has and ends the process.
@@ -245,8 +238,10 @@ void workInMemory(const PluginWork& work, const WorkerSide& side, const DeviceSn
   work.leaveHost();
   LinuxPlatform& linux = *work.device.platform;
   // Whatever has to be opened is opened here.
-  const Loaded loaded = work.device.bundle.load();
-  linux.readAhead();
+  Loaded loaded = work.device.bundle.load();
+  if (const auto unread = linux.readAhead()) {
+    loaded = programErrorOf(*unread, ExitStatus::MissingInput);
+  }
   KernelOwnershipRule ownership(linux.root());
   ownership.readAhead(std::string(kSettingsFileOwner));
   giveUpRights(work, side);

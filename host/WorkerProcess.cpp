@@ -18,14 +18,15 @@
 #include <cstring>
 #include <utility>
 
-#include "host/OpenInputs.h"
-#include "host/WorkerEnd.h"
-#include "host/WorkerLimits.h"
+#include "commandline/WorkerEnd.h"
+#include "commandline/WorkerLimits.h"
+#include "platform/linux/OpenInputs.h"
 #include "platform/linux/OpenedBytes.h"
 
 namespace accounts {
 namespace {
 
+constexpr std::string_view kPlugin = "The plug-in";
 // A migration takes far less; one that takes longer waits for something.
 constexpr auto kGrace = std::chrono::seconds(5);
 
@@ -127,7 +128,7 @@ ProgramError WorkerProcess::describeEnd() {
   while (waitpid(child_, &status, 0) < 0 && errno == EINTR) {
   }
   child_ = -1;
-  return endedWorkerError(status, limits_);
+  return WorkerEnd(kPlugin, limits_).withStatus(status);
 }
 
 std::variant<HandedOver, ProgramError> WorkerProcess::takeOver(std::string proposal) {
@@ -161,16 +162,13 @@ std::variant<HandedOver, ProgramError> WorkerProcess::work(const DeviceSnapshot&
       case FrameKind::Announcements:
         announcements_ = std::move(frame->bytes);
         break;
-      case FrameKind::Fault:
-        return ProgramError{ExitStatus::PluginEnded, std::move(frame->bytes)};
-      case FrameKind::ForbiddenCall:
-        return forbiddenCallError(frame->bytes);
-      case FrameKind::OutOfMemory:
-        return outOfMemoryError(limits_);
       case FrameKind::Proposal:
         return takeOver(std::move(frame->bytes));
       default:
-        return ProgramError{ExitStatus::PluginEnded, "The plug-in's process sent something else"};
+        return WorkerEnd(kPlugin, limits_)
+            .toldBy(*frame)
+            .value_or(
+                ProgramError{ExitStatus::PluginEnded, "The plug-in's process sent something else"});
     }
   }
 }

@@ -9,8 +9,8 @@
 #include <variant>
 #include <vector>
 
+#include "commandline/WorkerChannel.h"
 #include "host/StopSignals.h"
-#include "host/WorkerChannel.h"
 #include "platform/linux/Confinement.h"
 #include "platform/linux/FileDescriptor.h"
 #include "safetynet/MigrationRun.h"

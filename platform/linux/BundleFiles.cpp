@@ -21,7 +21,7 @@ std::string BundleFiles::pathOf(const std::string& name) const {
   return joinedPath(directory_, name);
 }
 
-void BundleFiles::readAhead() {
+std::optional<Failure> BundleFiles::readAhead() {
   std::map<std::string, Found> found;
   std::error_code error;
   fs::recursive_directory_iterator entry(directory_, error);
@@ -32,9 +32,16 @@ void BundleFiles::readAhead() {
     std::string name = entry->path().lexically_relative(directory_).string();
     Found file;
     file.bytes = readHostFile(entry->path().string(), file.error, Pipes::Refuse);
+    if (!file.bytes && file.error.kind() != FailureKind::Lasting) {
+      return file.error;
+    }
     found.emplace(std::move(name), std::move(file));
   }
+  if (Failure{error.value(), {}}.kind() != FailureKind::Lasting) {
+    return pathFailure("open", directory_, error.value());
+  }
   found_ = std::move(found);
+  return std::nullopt;
 }
 
 bool BundleFiles::exists(const std::string& name) const {

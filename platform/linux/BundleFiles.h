@@ -16,8 +16,9 @@ class BundleFiles {
   explicit BundleFiles(std::string directory) : directory_(std::move(directory)) {}
 
   /// Reads everything there is now, so that nothing needs to be opened later. What comes into the
-  /// directory afterwards is not seen.
-  void readAhead();
+  /// directory afterwards is not seen. An error when this machine's want or its medium keeps
+  /// something from being read.
+  std::optional<Failure> readAhead();
 
   [[nodiscard]] bool exists(const std::string& name) const;
   /// The bytes of a regular file; none, with `error` set, when it is missing or cannot be read.

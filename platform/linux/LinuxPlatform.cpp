@@ -207,9 +207,9 @@ bool LinuxPlatform::decodeDescription(LinuxPlatformError& error) {
   return true;
 }
 
-void LinuxPlatform::readAhead() {
-  parts_->bundleFiles.readAhead();
+std::optional<Failure> LinuxPlatform::readAhead() {
   readLocalTimeZoneAhead();
+  return parts_->bundleFiles.readAhead();
 }
 
 LinuxPlatform::LinuxPlatform(std::unique_ptr<Parts> parts) : parts_(std::move(parts)) {}

@@ -74,8 +74,9 @@ class LinuxPlatform {
   bool decodeDescription(LinuxPlatformError& error);
 
   /// Opens and reads what else the plug-in may ask for outside the root: the bundle's resources and
-  /// the local time zone. Nothing needs to be opened for them from then on.
-  void readAhead();
+  /// the local time zone. Nothing needs to be opened for them from then on. An error when this
+  /// machine's want or its medium keeps something from being read.
+  std::optional<Failure> readAhead();
 
   /// Valid as long as this object.
   [[nodiscard]] Platform& platform();

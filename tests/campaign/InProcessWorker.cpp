@@ -8,7 +8,7 @@
 #include <utility>
 
 #include "accountsettings/Process.h"
-#include "host/WorkerChannel.h"
+#include "commandline/WorkerChannel.h"
 #include "migrator/AccountsDataMigrator.h"
 #include "safetynet/MigrationInMemory.h"
 #include "tests/campaign/AllocationFailures.h"

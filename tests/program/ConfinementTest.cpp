@@ -54,12 +54,36 @@ class Confined : public DeviceRootFixture {
     return runProgram(call);
   }
 
+  /// Runs accountsctl with decoders that want out: tests/program/plugins/EscapingCodecs.cpp.
+  [[nodiscard]] ProgramResult attemptInDecoder(const std::string& name,
+                                               std::vector<std::string> arguments,
+                                               std::optional<uid_t> user = {},
+                                               const std::filesystem::path& victim = {},
+                                               pid_t process = 0) const {
+    return runProgram({.program = accountsctl(),
+                       .arguments = std::move(arguments),
+                       .environment = {{"LD_PRELOAD", ESCAPING_CODECS},
+                                       {"ATTEMPT", name},
+                                       {"VICTIM", victim.string()},
+                                       {"VICTIM_PROCESS", std::to_string(process)}},
+                       .user = user});
+  }
+
   static void expectEnded(const ProgramResult& result, const std::string& message) {
     EXPECT_EQ(result.exitStatus, kPluginEnded);
     EXPECT_TRUE(result.hasErrorLine("migration-host: The plug-in " + message)) << result.errors;
     EXPECT_EQ(onlyObject(result)["error"], "The plug-in " + message);
   }
+
+  static void expectCommandEnded(const ProgramResult& result, const std::string& message) {
+    EXPECT_EQ(result.exitStatus, kPluginEnded);
+    EXPECT_EQ(result.errors, "accountsctl: The command " + message + "\n");
+    EXPECT_EQ(result.output, "");
+  }
 };
+
+constexpr const char* kXMLSettings =
+    "<plist version=\"1.0\"><dict><key>Accounts</key><array/></dict></plist>";
 
 struct Attempt {
   std::string name;
@@ -96,6 +120,28 @@ TEST_P(ForbiddenCall, EndsTheRunAndChangesNothing) {
       EXPECT_EQ(treeOf(root()), inside);
       EXPECT_EQ(outside.contents(), outsideBefore);
     }
+  }
+}
+
+TEST_P(ForbiddenCall, OfADecoderEndsTheCommandAndChangesNothing) {
+  if (kIsExemptFromConfinement) {
+    GTEST_SKIP() << "Workers of this build give up no rights.";
+  }
+  writeText("/settings.xml", kXMLSettings);
+  const DeviceTree before = treeOf(root());
+  for (const std::optional<uid_t> user : users()) {
+    const pid_t process = startProgram({.program = "sleep", .arguments = {"60"}, .user = user},
+                                       STDOUT_FILENO, STDERR_FILENO);
+
+    const ProgramResult result =
+        attemptInDecoder(GetParam().name, {"show", onThisMachine("/settings.xml").string()}, user,
+                         onThisMachine(kSettingsPath), process);
+
+    expectCommandEnded(result, "made a system call that it may not make: " + GetParam().call);
+    EXPECT_EQ(waitpid(process, nullptr, WNOHANG), 0) << "the process ended";
+    kill(process, SIGKILL);
+    waitpid(process, nullptr, 0);
+    EXPECT_EQ(treeOf(root()), before);
   }
 }
 
@@ -165,6 +211,57 @@ TEST_F(Confined, NoDirectoryIsOpen) {
   EXPECT_EQ(result.exitStatus, 0);
   EXPECT_NE(result.errors.find("descriptor of kind "), std::string::npos);
   EXPECT_FALSE(result.hasErrorLine(directory.str())) << result.errors;
+}
+
+TEST_F(Confined, SoAreTheDecodersOfEveryCommandOfAccountsctl) {
+  if (kIsExemptFromConfinement) {
+    GTEST_SKIP() << "Workers of this build give up no rights.";
+  }
+  writeText(kSettingsPath, kXMLSettings);
+  writeText("/report.json", "{}");
+  const std::string settings = onThisMachine(kSettingsPath).string();
+  const std::string report = onThisMachine("/report.json").string();
+  const std::string made = onThisMachine("/made").string();
+  giveTo(kSomeUser);
+  const DeviceTree before = treeOf(root());
+  const std::vector<std::string> commands[] = {{"show", settings},
+                                               {"diff", settings, settings},
+                                               {"check", settings},
+                                               {"status", "--root", root()},
+                                               {"convert", settings, made, "--to", "binary"},
+                                               {"explain", report, "A"},
+                                               {"summarize", report, "--html", made}};
+  for (const std::vector<std::string>& command : commands) {
+    for (const std::optional<uid_t> user : users()) {
+      SCOPED_TRACE(command.front());
+      expectCommandEnded(attemptInDecoder("open", command, user, settings),
+                         "made a system call that it may not make: openat");
+      EXPECT_EQ(treeOf(root()), before);
+    }
+    const ProgramResult shown = attemptInDecoder("show descriptors", command);
+    std::ostringstream directory;
+    directory << "descriptor of kind " << std::oct << S_IFDIR;
+    EXPECT_NE(shown.output.find("descriptor of kind "), std::string::npos);
+    EXPECT_EQ(shown.output.find(directory.str()), std::string::npos) << shown.output;
+    if (getuid() == 0) {
+      EXPECT_NE(attemptInDecoder("show user", command).output.find("user 65534, group 65534"),
+                std::string::npos);
+    }
+    std::filesystem::remove(made);
+  }
+}
+
+TEST_F(Confined, ADecoderHasAnEndOfMemoryAndOfProcessorTime) {
+  if (kIsExemptFromConfinement) {
+    GTEST_SKIP() << "Workers of this build give up no rights.";
+  }
+  writeText("/settings.xml", kXMLSettings);
+  const std::string settings = onThisMachine("/settings.xml").string();
+
+  expectCommandEnded(attemptInDecoder("memory", {"show", settings}),
+                     "needs more than the 256 MiB of memory that files of this size allow it");
+  expectCommandEnded(attemptInDecoder("time", {"show", settings}),
+                     "needs more than the 5 s of processor time that files of this size allow it");
 }
 
 TEST_F(Confined, AMigrationLoadsNoFramework) {

@@ -9,7 +9,7 @@ namespace accounts {
 
 /// The open files of a snapshot.
 struct OpenInputs {
-  std::vector<int> descriptors;
+  std::vector<int> descriptors = {};
   /// Bytes, all files together.
   std::uint64_t size = 0;
 };

@@ -9,11 +9,10 @@
 
 namespace accounts {
 
-/// What a frame between the host and its worker is.
+/// What a frame between a keeper and its worker is.
 enum class FrameKind : std::uint8_t {
   /// From the worker: its list of changes; what is to be announced; why it cannot go on, as text,
-  /// as
-  /// the number of a system call, or because there is no memory.
+  /// as the number of a system call, or because there is no memory.
   Proposal = 1,
   Announcements,
   Fault,
@@ -25,7 +24,10 @@ enum class FrameKind : std::uint8_t {
   /// From the worker: the report and the page; what standard error and standard output get.
   Report,
   Page,
-  Result
+  Result,
+  /// To a worker of accountsctl: a piece of a file. From it: what it may use.
+  Piece,
+  Limits
 };
 
 struct Frame {

@@ -1,4 +1,4 @@
-#include "host/WorkerChannel.h"
+#include "commandline/WorkerChannel.h"
 
 #include <sys/socket.h>
 
@@ -9,8 +9,8 @@
 namespace accounts {
 namespace {
 
-/// A page of many accounts is the largest there is.
-constexpr std::uint64_t kLargestFrame = std::uint64_t{1} << 30;
+/// A document of the largest file is the largest there is.
+constexpr std::uint64_t kLargestFrame = std::uint64_t{1} << 32;
 constexpr std::size_t kHeaderSize = 1 + sizeof(std::uint64_t);
 
 bool sendAll(int socket, std::string_view bytes) {

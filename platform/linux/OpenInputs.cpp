@@ -1,4 +1,4 @@
-#include "host/OpenInputs.h"
+#include "platform/linux/OpenInputs.h"
 
 #include <sys/stat.h>
 
