@@ -29,9 +29,6 @@ std::string accountSettingsAccountsPath();
 
 namespace accounts {
 
-/// What happened to an account between two saves. The numbers are those of change records.
-enum class AccountChangeType : std::int32_t { Added = 0, Modified = 1, Deleted = 2 };
-
 /// The account-settings store: the accounts of the account settings file in memory, to be looked
 /// up, changed and saved. All changes stay in memory until saveAllAccounts(). Nothing reports an
 /// error to the caller; failures show on the log channel and in the file. For one thread at a time;

@@ -135,6 +135,7 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   void setDisplayName(std::optional<Text> newName);
 
   [[nodiscard]] const BasicAccountReference& parentAccount() const { return _parentAccount; }
+  [[nodiscard]] AccountRecordReference parentRecord() const override { return _parentAccount; }
   void setParentAccount(BasicAccountReference parent);
   /// The parent's identifier; none without a parent.
   [[nodiscard]] std::optional<Text> parentAccountIdentifier() const;
@@ -149,9 +150,7 @@ class BasicAccount : public AccountRecord, public std::enable_shared_from_this<B
   [[nodiscard]] PropertyArray supportedDataclasses() const;
   /// What the account is set up for, as far as it is supported and no profile hides it.
   [[nodiscard]] PropertyArray provisionedDataclasses() const;
-  /// What the user has switched on, as far as it is provisioned; none when no list is stored. A
-  /// child whose parent has enabled dataclasses has its parent's.
-  [[nodiscard]] std::optional<PropertyArray> enabledDataclasses() const;
+  [[nodiscard]] std::optional<PropertyArray> enabledDataclasses() const override;
   [[nodiscard]] bool isEnabledForDataclass(std::string_view dataclass) const;
   /// Switches a dataclass on or off; one that the type does not support is silently left.
   void setEnabled_forDataclass(bool enabled, std::string_view dataclass);

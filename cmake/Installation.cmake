@@ -64,34 +64,25 @@ install(FILES ${PROJECT_SOURCE_DIR}/completion/migration-host ${PROJECT_SOURCE_D
   DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/bash-completion/completions COMPONENT ${programs_component})
 
 set(package_directory lib/cmake/AccountsFramework)
-install(TARGETS propertyvalue accountsframework EXPORT AccountsFrameworkTargets
+install(TARGETS vocabulary propertyvalue propertylistcodecs accountsettings linuxplatform
+    accountsframework accountsstore
+  EXPORT AccountsFrameworkTargets
   ARCHIVE DESTINATION ${library_directory} COMPONENT ${development_component})
 install(EXPORT AccountsFrameworkTargets NAMESPACE accounts::
   DESTINATION ${package_directory} COMPONENT ${development_component})
-foreach(header
-    platform/AccountFramework.h
-    propertylist/value/Description.h
-    propertylist/value/PropertyArray.h
-    propertylist/value/PropertyContent.h
-    propertylist/value/PropertyDictionary.h
-    propertylist/value/PropertyKeys.h
-    propertylist/value/PropertyScalars.h
-    propertylist/value/PropertyValue.h
-    propertylist/value/SharedNode.h
-    propertylist/value/SharedRun.h
-    propertylist/value/Text.h)
-  cmake_path(GET header PARENT_PATH folder)
-  install(FILES ${PROJECT_SOURCE_DIR}/${header}
-    DESTINATION include/accounts/${folder} COMPONENT ${development_component})
+foreach(folder vocabulary propertylist platform accountsettings)
+  install(DIRECTORY ${PROJECT_SOURCE_DIR}/${folder}
+    DESTINATION include/accounts COMPONENT ${development_component} FILES_MATCHING PATTERN "*.h")
 endforeach()
 write_basic_package_version_file(${PROJECT_BINARY_DIR}/AccountsFrameworkConfigVersion.cmake
   COMPATIBILITY SameMinorVersion)
 install(FILES
     ${CMAKE_CURRENT_LIST_DIR}/AccountsFrameworkConfig.cmake
     ${CMAKE_CURRENT_LIST_DIR}/AccountsFrameworks.cmake
+    ${CMAKE_CURRENT_LIST_DIR}/AccountsFrameworks.map
     ${PROJECT_BINARY_DIR}/AccountsFrameworkConfigVersion.cmake
   DESTINATION ${package_directory} COMPONENT ${development_component})
-install(DIRECTORY ${PROJECT_SOURCE_DIR}/examples/frameworks
+install(DIRECTORY ${PROJECT_SOURCE_DIR}/examples/frameworks ${PROJECT_SOURCE_DIR}/examples/notify
   DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration-dev/examples
   COMPONENT ${development_component})
 
@@ -120,10 +111,13 @@ migration-host runs the migration, accountsctl shows, compares and checks
 files.")
 set(CPACK_DEBIAN_ACCOUNTS-MIGRATION-DEV_PACKAGE_NAME accounts-migration-dev)
 set(CPACK_DEBIAN_ACCOUNTS-MIGRATION-DEV_PACKAGE_SECTION libdevel)
-set(CPACK_DEBIAN_ACCOUNTS-MIGRATION-DEV_PACKAGE_SUGGESTS "accounts-migration, cmake")
+# The bundle with the account-creation map, what checks a framework, and what the store is built on.
+set(CPACK_DEBIAN_ACCOUNTS-MIGRATION-DEV_PACKAGE_DEPENDS
+  "accounts-migration (= ${PROJECT_VERSION}), libexpat1-dev, libseccomp-dev, uuid-dev, pkgconf")
+set(CPACK_DEBIAN_ACCOUNTS-MIGRATION-DEV_PACKAGE_SUGGESTS "cmake")
 set(CPACK_COMPONENT_ACCOUNTS-MIGRATION-DEV_DESCRIPTION
   "Development files for frameworks of accounts
-The headers, the library of values and the CMake package that a framework of
-full accounts, sync accounts and notifiers is compiled against, and examples
-of such frameworks.")
+The headers, the libraries and the CMake package that a framework of full
+accounts, sync accounts and notifiers is compiled against, or a program that
+opens the store of a device, and examples of both.")
 include(CPack)

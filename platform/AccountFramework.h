@@ -13,9 +13,13 @@ namespace accounts {
 
 /// The version of what frameworks and the bundle share with a program that loads them: all headers
 /// of platform/ and of the values. To be raised when one of them changes its layout.
-inline constexpr std::uint32_t kInterfaceVersion = 1;
+inline constexpr std::uint32_t kInterfaceVersion = 2;
 /// The name under which what is loaded tells the version that it was built with.
 inline constexpr const char* kInterfaceVersionFunction = "AccountsInterfaceVersion";
+
+/// What happened to an account between two saves. The numbers are those of change records, under
+/// kASChangeAccountChangeTypeKey.
+enum class AccountChangeType : std::int32_t { Added = 0, Modified = 1, Deleted = 2 };
 
 /// What a framework sees of an account: its record in the store.
 class AccountRecord {
@@ -31,6 +35,11 @@ class AccountRecord {
   /// The record's own value for a key, else its parent's; none when neither has one.
   [[nodiscard]] virtual std::optional<PropertyValue> accountPropertyForKey(
       std::string_view key) const = 0;
+  /// What the user has switched on, as far as it is provisioned, in canonical order; none when no
+  /// list is stored. A child whose parent has enabled dataclasses has its parent's.
+  [[nodiscard]] virtual std::optional<PropertyArray> enabledDataclasses() const = 0;
+  /// The record that this one is a child of; null for a top-level account.
+  [[nodiscard]] virtual std::shared_ptr<AccountRecord> parentRecord() const = 0;
 };
 using AccountRecordReference = std::shared_ptr<AccountRecord>;
 

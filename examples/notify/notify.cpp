@@ -1,13 +1,13 @@
-#include <CLI/CLI.hpp>
 #include <cstdio>
+#include <string>
 
 #include "accountsettings/AccountsManager.h"
 #include "accountsettings/Process.h"
 #include "platform/linux/LinuxPlatform.h"
 
-// Opens the account settings of a device outside a migration, changes three accounts, saves, and so
-// shows what the notifiers of the device's frameworks are told. The lines on standard output are
-// the notifiers' own.
+// Opens the account settings of a device outside a migration, renames the first Yahoo account,
+// deletes the first Exchange account, adds a mail account, saves, and so shows what the notifiers
+// of the device's frameworks are told. The lines on standard output are the notifiers' own.
 
 namespace {
 
@@ -43,15 +43,13 @@ void deleteFirst(AccountsManager& store, std::string_view type) {
 }  // namespace
 
 int main(int argc, char** argv) {
-  CLI::App program(
-      "Changes accounts outside a migration and shows what notifiers are told: renames the first "
-      "Yahoo account, deletes the first Exchange account, adds a mail account, saves.");
+  if (argc != 3) {
+    std::fputs("Usage: notify ROOT BUNDLE\n", stderr);
+    return 64;
+  }
   LinuxPlatformOptions options;
-  std::string bundle;
-  program.add_option("--root", options.rootDirectory, "The device root")->required();
-  program.add_option("--bundle", bundle, "The plug-in's bundle, for its resources")->required();
-  CLI11_PARSE(program, argc, argv);
-  options.bundleResourcesDirectory = bundle + "/Resources";
+  options.rootDirectory = argv[1];
+  options.bundleResourcesDirectory = std::string(argv[2]) + "/Resources";
 
   LinuxPlatformError error;
   const std::unique_ptr<LinuxPlatform> platform = LinuxPlatform::create(options, error);

@@ -5,6 +5,7 @@
 
 #include <cerrno>
 #include <exception>
+#include <filesystem>
 #include <new>
 
 #include "platform/linux/LoadedInterface.h"
@@ -32,6 +33,24 @@ Result registerClassesOf(void* entryPoint, ClassRegistry& registry) {
 
 }  // namespace
 
+Result registerFramework(const std::string& file, ClassRegistry& registry) {
+  void* library = dlopen(file.c_str(), RTLD_NOW | RTLD_LOCAL);
+  if (library == nullptr) {
+    return Result::failure(dlerror());
+  }
+  void* entryPoint = dlsym(library, kEntryPoint);
+  if (entryPoint == nullptr) {
+    const Result missing = Result::failure(dlerror());
+    dlclose(library);
+    return missing;
+  }
+  if (const auto otherVersion = whyOtherInterface(library)) {
+    dlclose(library);
+    return Result::failure(*otherVersion);
+  }
+  return registerClassesOf(entryPoint, registry);
+}
+
 Result LinuxFrameworkLoader::loadFramework(std::string_view path) {
   Failure error;
   std::optional<FileDescriptor> file = root_.openRegularFile(path, error);
@@ -46,30 +65,20 @@ Result LinuxFrameworkLoader::loadFramework(std::string_view path) {
   if (loaded_.contains(identity)) {
     return Result::success();
   }
-  // Loaded through its descriptor: a path would be looked up again, and could then lead out of the
-  // root.
-  const std::string descriptorPath = "/proc/self/fd/" + std::to_string(file->number());
-  void* library = dlopen(descriptorPath.c_str(), RTLD_NOW | RTLD_LOCAL);
-  if (library == nullptr) {
-    return Result::failure(dlerror());
+  // By the name that the opened file has on this machine, so that $ORIGIN means its directory. Who
+  // could put another file there meanwhile could as well write into this one.
+  std::error_code unnamed;
+  const auto name =
+      std::filesystem::read_symlink("/proc/self/fd/" + std::to_string(file->number()), unnamed);
+  if (unnamed) {
+    return pathFailure("name", path, unnamed.value());
   }
-  // Never closed from here on: the dynamic loader knows the framework by the name of its
-  // descriptor, which must not come to mean another file as long as the process lives.
-  static_cast<void>(file->release());
-  void* entryPoint = dlsym(library, kEntryPoint);
-  if (entryPoint == nullptr) {
-    const Result missing = Result::failure(dlerror());
-    dlclose(library);
-    return missing;
-  }
-  if (const auto otherVersion = whyOtherInterface(library)) {
-    dlclose(library);
-    return Result::failure(*otherVersion);
-  }
-  loaded_.insert(identity);
   registering_ = path;
-  const Result registered = registerClassesOf(entryPoint, *this);
+  const Result registered = registerFramework(name, *this);
   registering_.clear();
+  if (registered) {
+    loaded_.insert(identity);
+  }
   return registered;
 }
 

@@ -106,16 +106,16 @@ TEST_F(InstalledPackages, PassTheEndToEndTestsOfTheBuild) {
 TEST_F(InstalledPackages, LeaveNothingWhenTheyAreRemoved) {
   install();
   ASSERT_FALSE(tree(machine()).empty());
-  remove("accounts-migration");
   remove("accounts-migration-dev");
+  remove("accounts-migration");
   EXPECT_EQ(tree(machine()), std::set<std::string>{});
 }
 
 TEST_F(InstalledPackages, LeaveWhatIsNotTheirsWhenTheyAreRemoved) {
   install();
   fs::create_directories(prefix() / "lib/accounts/other");
-  remove("accounts-migration");
   remove("accounts-migration-dev");
+  remove("accounts-migration");
   EXPECT_EQ(tree(machine()), (std::set<std::string>{"usr", "usr/lib", "usr/lib/accounts",
                                                     "usr/lib/accounts/other"}));
 }

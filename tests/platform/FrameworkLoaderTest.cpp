@@ -104,9 +104,9 @@ TEST_F(FrameworkLoaderTest, AFrameworkOfOtherHeadersIsAFailureThatSaysSo) {
   installBroken("OfNoVersion", "/Library/Old.so");
 
   EXPECT_EQ(loader_.loadFramework("/Library/Other.so").error(),
-            "It was built against other headers: its interface has version 999, which is 1 here");
+            "It was built against other headers: its interface has version 999, which is 2 here");
   EXPECT_EQ(loader_.loadFramework("/Library/Old.so").error(),
-            "It was built against other headers: it names no version of its interface, which is 1 "
+            "It was built against other headers: it names no version of its interface, which is 2 "
             "here");
 }
 

@@ -33,8 +33,7 @@ class HostileFramework : public HostileRootFixture,
 
   /// Whether the notifier of the framework was told of the account.
   [[nodiscard]] bool isNotified() const {
-    ProgramCall call = {.program = NOTIFY_PROGRAM,
-                        .arguments = {"--root", root(), "--bundle", pluginBundle()}};
+    ProgramCall call = {.program = NOTIFY_PROGRAM, .arguments = {root(), pluginBundle()}};
     if (GetParam().toOtherUsersOnly) {
       call.user = kSomebody;
     }
@@ -88,7 +87,7 @@ class ThrowingFramework : public HostileRootFixture {
 
   [[nodiscard]] ProgramResult notifyWhereItThrows(const std::string& when) const {
     return runProgram({.program = NOTIFY_PROGRAM,
-                       .arguments = {"--root", root(), "--bundle", pluginBundle()},
+                       .arguments = {root(), pluginBundle()},
                        .environment = {{"THROWS_WHILE", when}}});
   }
 

@@ -17,8 +17,7 @@ class NotificationsTest : public DeviceRootFixture {
                           std::filesystem::copy_options::recursive);
   }
   [[nodiscard]] ProgramResult runNotify() const {
-    return runProgram(
-        {.program = NOTIFY_PROGRAM, .arguments = {"--root", root(), "--bundle", pluginBundle()}});
+    return runProgram({.program = NOTIFY_PROGRAM, .arguments = {root(), pluginBundle()}});
   }
   void writeAccounts(PropertyArray accounts) const {
     write(kSettingsPath, accountSettings(12, std::move(accounts)));
