@@ -33,24 +33,6 @@ Result registerClassesOf(void* entryPoint, ClassRegistry& registry) {
 
 }  // namespace
 
-Result registerFramework(const std::string& file, ClassRegistry& registry) {
-  void* library = dlopen(file.c_str(), RTLD_NOW | RTLD_LOCAL);
-  if (library == nullptr) {
-    return Result::failure(dlerror());
-  }
-  void* entryPoint = dlsym(library, kEntryPoint);
-  if (entryPoint == nullptr) {
-    const Result missing = Result::failure(dlerror());
-    dlclose(library);
-    return missing;
-  }
-  if (const auto otherVersion = whyOtherInterface(library)) {
-    dlclose(library);
-    return Result::failure(*otherVersion);
-  }
-  return registerClassesOf(entryPoint, registry);
-}
-
 Result LinuxFrameworkLoader::loadFramework(std::string_view path) {
   Failure error;
   std::optional<FileDescriptor> file = root_.openRegularFile(path, error);
@@ -73,12 +55,24 @@ Result LinuxFrameworkLoader::loadFramework(std::string_view path) {
   if (unnamed) {
     return pathFailure("name", path, unnamed.value());
   }
-  registering_ = path;
-  const Result registered = registerFramework(name, *this);
-  registering_.clear();
-  if (registered) {
-    loaded_.insert(identity);
+  void* library = dlopen(name.c_str(), RTLD_NOW | RTLD_LOCAL);
+  if (library == nullptr) {
+    return Result::failure(dlerror());
   }
+  void* entryPoint = dlsym(library, kEntryPoint);
+  if (entryPoint == nullptr) {
+    const Result missing = Result::failure(dlerror());
+    dlclose(library);
+    return missing;
+  }
+  if (const auto otherVersion = whyOtherInterface(library)) {
+    dlclose(library);
+    return Result::failure(*otherVersion);
+  }
+  loaded_.insert(identity);
+  registering_ = path;
+  const Result registered = registerClassesOf(entryPoint, *this);
+  registering_.clear();
   return registered;
 }
 

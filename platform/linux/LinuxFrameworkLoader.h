@@ -14,10 +14,6 @@
 
 namespace accounts {
 
-/// Loads the framework in a file of this machine, all its symbols resolved, which runs its code,
-/// and lets it register its classes. It stays loaded as long as the process lives.
-Result registerFramework(const std::string& file, ClassRegistry& registry);
-
 /// Frameworks as shared objects beneath the device root. Loaded ones stay loaded as long as the
 /// process lives, since their classes do.
 class LinuxFrameworkLoader : public FrameworkLoader, private ClassRegistry {
