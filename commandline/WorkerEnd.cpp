@@ -14,12 +14,11 @@
 #include <string>
 
 #include "commandline/MemoryReserve.h"
+#include "commandline/WorkerLimits.h"
 #include "platform/linux/SystemCallFilter.h"
 
 namespace accounts {
 namespace {
-
-constexpr std::uint64_t kMebibyte = std::uint64_t{1} << 20;
 
 /// Handlers are given nothing of their own: where this worker tells of its end.
 const FileDescriptor* endSocket = nullptr;

@@ -9,12 +9,12 @@
 #include <new>
 #include <vector>
 
+#include "commandline/WorkerLimits.h"
 #include "tests/fakes/Sanitizers.h"
 
 namespace accounts {
 namespace {
 
-constexpr std::size_t kMebibyte = std::size_t{1} << 20;
 constexpr std::size_t kBlock = 100'000;
 using Blocks = std::vector<std::unique_ptr<char[]>>;
 

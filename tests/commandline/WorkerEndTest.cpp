@@ -23,8 +23,6 @@ std::optional<ProgramError> forbidden(std::string bytes) {
   return kEnd.toldBy({FrameKind::ForbiddenCall, std::move(bytes)});
 }
 
-constexpr std::uint64_t kMebibyte = std::uint64_t{1} << 20;
-
 TEST(WorkerEnd, AForbiddenCallIsNamed) {
   const int number = SYS_ptrace;
   const auto error = forbidden({reinterpret_cast<const char*>(&number), sizeof number});
