@@ -5,6 +5,7 @@
 #include <utility>
 
 #include "platform/linux/DictionaryFile.h"
+#include "platform/linux/FileContents.h"
 
 namespace accounts {
 namespace {

@@ -1,6 +1,6 @@
 #include "platform/linux/DictionaryFile.h"
 
-#include "platform/linux/FileContents.h"
+#include "platform/linux/PathFailure.h"
 #include "propertylist/PropertyListFile.h"
 
 namespace accounts {
@@ -24,18 +24,6 @@ std::optional<PropertyDictionary> dictionaryFromBytes(std::string_view bytes, st
     return std::nullopt;
   }
   return *dictionary;
-}
-
-std::optional<PropertyDictionary> readDictionaryFile(const DeviceRoot& root, std::string_view path,
-                                                     Failure& error) {
-  const std::optional<std::string> bytes = root.readFile(path, error);
-  return bytes ? dictionaryFromBytes(*bytes, path, error) : std::nullopt;
-}
-
-std::optional<PropertyDictionary> readHostDictionaryFile(const std::string& path, Failure& error,
-                                                         Pipes pipes) {
-  const std::optional<std::string> bytes = readHostFile(path, error, pipes);
-  return bytes ? dictionaryFromBytes(*bytes, nameOfInput(path), error) : std::nullopt;
 }
 
 }  // namespace accounts

@@ -1,12 +1,9 @@
 #pragma once
 
 #include <optional>
-#include <string>
 #include <string_view>
 
-#include "platform/linux/DeviceRoot.h"
-#include "platform/linux/FileContents.h"
-#include "platform/linux/PathFailure.h"
+#include "platform/Failure.h"
 #include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
@@ -15,14 +12,5 @@ namespace accounts {
 /// path, when they are malformed or stand for something else.
 std::optional<PropertyDictionary> dictionaryFromBytes(std::string_view bytes, std::string_view path,
                                                       Failure& error);
-
-/// The dictionary that a property-list file of the device holds. None, with `error` set, when the
-/// file is missing (`error.isMissing()`), cannot be read, is malformed or holds something else.
-std::optional<PropertyDictionary> readDictionaryFile(const DeviceRoot& root, std::string_view path,
-                                                     Failure& error);
-
-/// The same for a file of the host, outside any device root.
-std::optional<PropertyDictionary> readHostDictionaryFile(const std::string& path, Failure& error,
-                                                         Pipes pipes = Pipes::Read);
 
 }  // namespace accounts

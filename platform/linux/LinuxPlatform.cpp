@@ -244,8 +244,4 @@ LinuxFileSystem& LinuxPlatform::fileSystem() {
   return parts_->fileSystem;
 }
 
-LinuxPropertyLists& LinuxPlatform::propertyLists() {
-  return parts_->propertyLists;
-}
-
 }  // namespace accounts

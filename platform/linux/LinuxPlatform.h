@@ -90,7 +90,6 @@ class LinuxPlatform {
   [[nodiscard]] std::optional<int> channelDescriptor() const;
   [[nodiscard]] bool logsToJournal() const;
   [[nodiscard]] LinuxFileSystem& fileSystem();
-  [[nodiscard]] LinuxPropertyLists& propertyLists();
 
  private:
   struct Parts;

@@ -8,12 +8,8 @@ namespace accounts {
 
 std::optional<PropertyDictionary> LinuxPropertyLists::readDictionary(std::string_view path) {
   Failure error;
-  return readDictionary(path, error);
-}
-
-std::optional<PropertyDictionary> LinuxPropertyLists::readDictionary(std::string_view path,
-                                                                     Failure& error) {
-  return readDictionaryFile(root_, path, error);
+  const std::optional<std::string> bytes = root_.readFile(path, error);
+  return bytes ? dictionaryFromBytes(*bytes, path, error) : std::nullopt;
 }
 
 Result LinuxPropertyLists::serializeBinary(const PropertyValue& value,

@@ -5,7 +5,6 @@
 
 #include "platform/PropertyLists.h"
 #include "platform/linux/DeviceRoot.h"
-#include "platform/linux/PathFailure.h"
 #include "propertylist/binary/BinaryPropertyListSerializer.h"
 
 namespace accounts {
@@ -17,10 +16,6 @@ class LinuxPropertyLists final : public PropertyLists {
 
   std::optional<PropertyDictionary> readDictionary(std::string_view path) override;
   Result serializeBinary(const PropertyValue& value, SerializedPropertyList& serialized) override;
-
-  /// Like `readDictionary`, and says in `error` why there is none: `error.isMissing()` tells a
-  /// missing file from an unreadable one.
-  std::optional<PropertyDictionary> readDictionary(std::string_view path, Failure& error);
 
  private:
   const DeviceRoot& root_;
