@@ -108,7 +108,7 @@ void CommandWorker::giveUpRights(const OpenInputs& inputs) const {
   kept.descriptors.push_back(socket_.number());
   static_cast<void>(sendFrame(socket_, FrameKind::Limits,
                               {reinterpret_cast<const char*>(&kept.limits), sizeof kept.limits}));
-  giveUpRightsOrEnd(kept, socket_);
+  endUnlessGivenUp(accounts::giveUpRights(kept), socket_);
 }
 
 std::string CommandWorker::nextPiece() const {

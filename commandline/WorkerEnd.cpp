@@ -62,15 +62,14 @@ void tellHowThisWorkerEnds(const FileDescriptor& socket) {
   sigaction(SIGSYS, &action, nullptr);
 }
 
-void giveUpRightsOrEnd(const Confinement& kept, const FileDescriptor& socket) {
-  const auto error = giveUpRights(kept);
-  if (!error) {
+void endUnlessGivenUp(const std::optional<Failure>& whyNot, const FileDescriptor& socket) {
+  if (!whyNot) {
     return;
   }
-  if (error->number == ENOMEM) {
+  if (whyNot->number == ENOMEM) {
     throw std::bad_alloc();
   }
-  static_cast<void>(sendFrame(socket, FrameKind::Fault, error->text));
+  static_cast<void>(sendFrame(socket, FrameKind::Fault, whyNot->text));
   _exit(static_cast<int>(ExitStatus::PluginEnded));
 }
 

@@ -15,8 +15,8 @@ namespace accounts {
 /// make or that it had no memory. `socket` must live as long as the process.
 void tellHowThisWorkerEnds(const FileDescriptor& socket);
 
-/// Gives up rights, and ends this process where that cannot be done; its keeper is told.
-void giveUpRightsOrEnd(const Confinement& kept, const FileDescriptor& socket);
+/// Ends this process where rights could not be given up, for the reason given; its keeper is told.
+void endUnlessGivenUp(const std::optional<Failure>& whyNot, const FileDescriptor& socket);
 
 /// What a keeper says of a worker's end. `who` worked there: "The plug-in".
 class WorkerEnd {

@@ -1,5 +1,6 @@
 #include "host/PluginWork.h"
 
+#include <fcntl.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -189,7 +190,7 @@ void giveUpRights(const PluginWork& work, const WorkerSide& side) {
   if (linux.logsToJournal()) {
     kept.journalEntries = JournalEntries::Sent;
   }
-  giveUpRightsOrEnd(kept, side.socket);
+  endUnlessGivenUp(accounts::giveUpRights(kept), side.socket);
 }
 
 /// Reports a path that no migration has and ends the process.
@@ -302,6 +303,9 @@ void tellOfEndedWorker(const PluginWork& work, const WorkerSide& side) {
 
 void workOnDevice(const PluginWork& work, const WorkerSide& side) {
   work.leaveHost();
+  Failure error;
+  const auto root = work.device.platform->root().open("/", O_PATH | O_DIRECTORY, error);
+  endUnlessGivenUp(root ? giveUpForeignRights(root->number()) : std::optional(error), side.socket);
   ToldFates told;
   PluginOutcome outcome =
       runRecordedPlugin(work, work.device.bundle.load(), work.device.platform->platform(), told);

@@ -136,4 +136,18 @@ std::optional<Failure> giveUpRights(const Confinement& kept) {
   return number != 0 ? std::optional(cannotGiveUp("system calls", number)) : std::nullopt;
 }
 
+std::optional<Failure> giveUpForeignRights(int directory) {
+  if (kIsExemptFromConfinement) {
+    return std::nullopt;
+  }
+  if (::prctl(PR_SET_NO_NEW_PRIVS, 1, 0, 0, 0) != 0) {
+    return cannotGiveUp("new rights", errno);
+  }
+  if (const int number = enterLandlockDomainOf(directory); number != 0) {
+    return cannotGiveUp("files outside the root", number);
+  }
+  const int number = filterForeignCalls();
+  return number != 0 ? std::optional(cannotGiveUp("system calls", number)) : std::nullopt;
+}
+
 }  // namespace accounts

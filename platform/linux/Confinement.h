@@ -42,4 +42,10 @@ struct Confinement {
 /// already stays. An error when that cannot be done: the process must not go on then.
 std::optional<Failure> giveUpRights(const Confinement& kept);
 
+/// Gives up, for good, what a process does not need that changes a device by itself: files outside
+/// `directory`, the device's root, which may be open for its path (Landlock, where the kernel has
+/// it), and the calls of `filterForeignCalls`. Its user and its capabilities stay. An error when
+/// that cannot be done: the process must not go on then.
+std::optional<Failure> giveUpForeignRights(int directory);
+
 }  // namespace accounts

@@ -43,9 +43,14 @@ constexpr Version kVersions[] = {
     {6, {.files = bits(16), .network = bits(2), .scoped = bits(2)}, sizeof(HandledAccess)},
 };
 
-}  // namespace
+/// What changes a file or a directory, of all that the newest version knows.
+constexpr std::uint64_t kReading =
+    LANDLOCK_ACCESS_FS_EXECUTE | LANDLOCK_ACCESS_FS_READ_FILE | LANDLOCK_ACCESS_FS_READ_DIR;
+constexpr std::uint64_t kChanging = bits(15) & ~kReading;
+constexpr long kFirstThatMovesBetweenDirectories = 2;
 
-int enterLandlockDomain() {
+/// The newest version of the kernel's that is known here; null for none.
+const Version* newestVersion() {
   const long known =
       ::syscall(SYS_landlock_create_ruleset, nullptr, 0, LANDLOCK_CREATE_RULESET_VERSION);
   const Version* newest = nullptr;
@@ -54,15 +59,42 @@ int enterLandlockDomain() {
       newest = &version;
     }
   }
-  if (newest == nullptr) {
+  return newest;
+}
+
+/// Without a rule nothing that is handled is allowed.
+FileDescriptor makeRuleset(const HandledAccess& handled, const Version& version) {
+  return FileDescriptor(
+      static_cast<int>(::syscall(SYS_landlock_create_ruleset, &handled, version.size, 0)));
+}
+
+int enter(const FileDescriptor& ruleset) {
+  return ::syscall(SYS_landlock_restrict_self, ruleset.number(), 0) == 0 ? 0 : errno;
+}
+
+}  // namespace
+
+int enterLandlockDomain() {
+  const Version* const version = newestVersion();
+  if (version == nullptr) {
     return 0;
   }
-  // Without a single rule nothing that is handled is allowed.
-  const FileDescriptor ruleset(
-      static_cast<int>(::syscall(SYS_landlock_create_ruleset, &newest->handled, newest->size, 0)));
-  const bool isRestricted =
-      ruleset.number() >= 0 && ::syscall(SYS_landlock_restrict_self, ruleset.number(), 0) == 0;
-  return isRestricted ? 0 : errno;
+  const FileDescriptor ruleset = makeRuleset(version->handled, *version);
+  return ruleset.number() >= 0 ? enter(ruleset) : errno;
+}
+
+int enterLandlockDomainOf(int directory) {
+  const Version* const version = newestVersion();
+  if (version == nullptr || version->number < kFirstThatMovesBetweenDirectories) {
+    return 0;
+  }
+  const std::uint64_t changes = kChanging & version->handled.files;
+  const FileDescriptor ruleset =
+      makeRuleset({.files = changes, .scoped = version->handled.scoped}, *version);
+  const landlock_path_beneath_attr rule = {.allowed_access = changes, .parent_fd = directory};
+  const bool isMade = ruleset.number() >= 0 && ::syscall(SYS_landlock_add_rule, ruleset.number(),
+                                                         LANDLOCK_RULE_PATH_BENEATH, &rule, 0) == 0;
+  return isMade ? enter(ruleset) : errno;
 }
 
 }  // namespace accounts

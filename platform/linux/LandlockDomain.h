@@ -9,4 +9,10 @@ namespace accounts {
 /// number.
 int enterLandlockDomain();
 
+/// The same for a domain in which files can be opened and read as before, but made, changed and
+/// removed by their names beneath one directory alone, which may be open for its path. Who a file
+/// belongs to and what is permitted are nothing that Landlock knows of. Does nothing, either, where
+/// the kernel is so old that no file could be moved between directories any more.
+int enterLandlockDomainOf(int directory);
+
 }  // namespace accounts

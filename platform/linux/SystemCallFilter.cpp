@@ -55,6 +55,32 @@ constexpr int kCalls[] = {
     SCMP_SYS(exit_group),
 };
 
+/// What reaches beyond the process itself and the files of the device.
+constexpr int kForeignCalls[] = {
+    SCMP_SYS(execve),
+    SCMP_SYS(execveat),
+    SCMP_SYS(ptrace),
+    SCMP_SYS(pidfd_getfd),
+    SCMP_SYS(pidfd_send_signal),
+    SCMP_SYS(process_vm_readv),
+    SCMP_SYS(perf_event_open),
+    SCMP_SYS(process_vm_writev),
+    SCMP_SYS(bpf),
+    SCMP_SYS(io_uring_setup),
+    SCMP_SYS(mount),
+    SCMP_SYS(umount2),
+    SCMP_SYS(move_mount),
+    SCMP_SYS(pivot_root),
+    SCMP_SYS(chroot),
+    SCMP_SYS(unshare),
+    SCMP_SYS(setns),
+    SCMP_SYS(init_module),
+    SCMP_SYS(finit_module),
+    SCMP_SYS(delete_module),
+    SCMP_SYS(kexec_load),
+    SCMP_SYS(reboot),
+};
+
 /// Conditions on an int leave the upper half of its register out, as the kernel does.
 constexpr scmp_datum_t kInt = 0xffffffff;
 
@@ -69,7 +95,13 @@ struct FilterReleaser {
 /// A filter under construction; the first failure is remembered.
 class Filter {
  public:
-  Filter() : filter_(::seccomp_init(SCMP_ACT_TRAP)) { number_ = filter_ == nullptr ? ENOMEM : 0; }
+  /// `others` is what is done with calls that nothing is said of.
+  explicit Filter(std::uint32_t others) : filter_(::seccomp_init(others)) {
+    number_ = filter_ == nullptr ? ENOMEM : 0;
+    // Calls by the numbers of another processor mode, and threads that were started before.
+    set(SCMP_FLTATR_ACT_BADARCH, SCMP_ACT_KILL_PROCESS);
+    set(SCMP_FLTATR_CTL_TSYNC, 1);
+  }
 
   void set(scmp_filter_attr attribute, std::uint32_t value) {
     note([&] { return ::seccomp_attr_set(filter_.get(), attribute, value); });
@@ -77,6 +109,9 @@ class Filter {
   void allow(int call) { add(SCMP_ACT_ALLOW, call, {}); }
   void allow(int call, std::initializer_list<Condition> conditions) {
     add(SCMP_ACT_ALLOW, call, conditions);
+  }
+  void trap(int call, std::initializer_list<Condition> conditions = {}) {
+    add(SCMP_ACT_TRAP, call, conditions);
   }
   void refuse(int call, int error) { add(SCMP_ACT_ERRNO(static_cast<unsigned>(error)), call, {}); }
   void load() {
@@ -125,10 +160,7 @@ void allowJournalEntries(Filter& filter) {
 }  // namespace
 
 int filterSystemCalls(JournalEntries journalEntries) {
-  Filter filter;
-  // Calls by the numbers of another processor mode, and threads that were started before.
-  filter.set(SCMP_FLTATR_ACT_BADARCH, SCMP_ACT_KILL_PROCESS);
-  filter.set(SCMP_FLTATR_CTL_TSYNC, 1);
+  Filter filter(SCMP_ACT_TRAP);
   for (const int call : kCalls) {
     filter.allow(call);
   }
@@ -139,6 +171,19 @@ int filterSystemCalls(JournalEntries journalEntries) {
   // Its arguments stand in memory, where a filter cannot look; the C library then takes the older
   // call, which is not allowed.
   filter.refuse(SCMP_SYS(clone3), ENOSYS);
+  filter.load();
+  return filter.number();
+}
+
+int filterForeignCalls() {
+  Filter filter(SCMP_ACT_ALLOW);
+  for (const int call : kForeignCalls) {
+    filter.trap(call);
+  }
+  const auto self = static_cast<scmp_datum_t>(::getpid());
+  filter.trap(SCMP_SYS(kill), {{.arg = 0, .op = SCMP_CMP_NE, .datum_a = self, .datum_b = 0}});
+  filter.trap(SCMP_SYS(tgkill), {{.arg = 0, .op = SCMP_CMP_NE, .datum_a = self, .datum_b = 0}});
+  filter.refuse(SCMP_SYS(socket), EACCES);
   filter.load();
   return filter.number();
 }

@@ -11,6 +11,12 @@ namespace accounts {
 /// handler finds the number in `siginfo_t`. Returns 0 or the error number.
 int filterSystemCalls(JournalEntries journalEntries);
 
+/// Keeps the process, for good, from starting other programs, looking into or signalling other
+/// processes, and changing what the system is: such a call is answered in the same way. No new
+/// socket is made either, but that is answered as want of a permission, since the C library asks
+/// for one where it can do without. Everything else stays allowed. Returns 0 or the error number.
+int filterForeignCalls();
+
 /// The name of a system call, or its number where it has none.
 std::string systemCallName(int number);
 

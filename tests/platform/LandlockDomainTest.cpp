@@ -10,6 +10,7 @@
 
 #include <cerrno>
 #include <cstdlib>
+#include <filesystem>
 
 #include "tests/platform/DeviceFixture.h"
 
@@ -68,6 +69,36 @@ TEST_F(LandlockDomainTest, WhatIsOpenStaysOpen) {
       },
       testing::ExitedWithCode(EXIT_SUCCESS), "");
   ::close(opened);
+}
+
+TEST_F(LandlockDomainTest, OfADirectoryFilesAreChangedBeneathItAloneAndReadAnywhere) {
+  constexpr long kFirstVersionThatIsUsed = 2;
+  if (::syscall(SYS_landlock_create_ruleset, nullptr, 0, LANDLOCK_CREATE_RULESET_VERSION) <
+      kFirstVersionThatIsUsed) {
+    GTEST_SKIP() << "This kernel's Landlock is too old.";
+  }
+  const std::string inside = onHost("/inside").string();
+  ASSERT_EQ(::mkdir(inside.c_str(), 0700), 0);
+  const int directory = ::open(inside.c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC);
+  EXPECT_EXIT(
+      {
+        ::prctl(PR_SET_NO_NEW_PRIVS, 1, 0, 0, 0);
+        const bool isEntered = enterLandlockDomainOf(directory) == 0;
+        const bool isMadeInside =
+            ::open((inside + "/file").c_str(), O_CREAT | O_RDWR, 0600) >= 0 &&
+            ::mkdir((inside + "/folder").c_str(), 0700) == 0 &&
+            ::rename((inside + "/file").c_str(), (inside + "/folder/file").c_str()) == 0;
+        const bool isReadOutside = ::open(file.c_str(), O_RDONLY) >= 0;
+        const bool isKeptOutside = ::unlink(file.c_str()) != 0 && errno == EACCES &&
+                                   ::open(file.c_str(), O_RDWR) < 0 && errno == EACCES &&
+                                   ::mkdir((file + ".new").c_str(), 0700) != 0 && errno == EACCES;
+        std::_Exit(isEntered && isMadeInside && isReadOutside && isKeptOutside ? EXIT_SUCCESS
+                                                                               : EXIT_FAILURE);
+      },
+      testing::ExitedWithCode(EXIT_SUCCESS), "");
+  ::close(directory);
+  EXPECT_TRUE(std::filesystem::exists(inside + "/folder/file"));
+  EXPECT_EQ(contentsOf("/file"), "contents");
 }
 
 }  // namespace

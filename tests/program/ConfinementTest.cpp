@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
+#include <linux/landlock.h>
 #include <sys/stat.h>
+#include <sys/syscall.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -44,9 +46,11 @@ class Confined : public DeviceRootFixture {
   }
 
   [[nodiscard]] ProgramResult attempt(const std::string& name, std::optional<uid_t> user = {},
-                                      const std::filesystem::path& victim = {},
-                                      pid_t process = 0) const {
-    ProgramCall call = migrationCall({"--plugin", ESCAPING_BUNDLE, "--json"});
+                                      const std::filesystem::path& victim = {}, pid_t process = 0,
+                                      const std::vector<std::string>& further = {}) const {
+    std::vector<std::string> arguments = {"--plugin", ESCAPING_BUNDLE, "--json"};
+    arguments.insert(arguments.end(), further.begin(), further.end());
+    ProgramCall call = migrationCall(arguments);
     call.environment = {{"ATTEMPT", name},
                         {"VICTIM", victim.string()},
                         {"VICTIM_PROCESS", std::to_string(process)}};
@@ -161,6 +165,49 @@ INSTANTIATE_TEST_SUITE_P(All, ForbiddenCall,
                            std::erase(name, ' ');
                            return name;
                          });
+
+TEST_F(Confined, OnTheDeviceItselfItReachesNoOtherProcess) {
+  if (kIsExemptFromConfinement) {
+    GTEST_SKIP() << "Workers of this build give up no rights.";
+  }
+  for (const Attempt& each :
+       {Attempt{"exec", "execve"}, Attempt{"ptrace", "ptrace"}, Attempt{"signal", "kill"}}) {
+    const pid_t process =
+        startProgram({.program = "sleep", .arguments = {"60"}}, STDOUT_FILENO, STDERR_FILENO);
+
+    const ProgramResult result =
+        attempt(each.name, {}, onThisMachine(kSettingsPath), process, {"--bare"});
+
+    expectEnded(result, "made a system call that it may not make: " + each.call);
+    EXPECT_EQ(waitpid(process, nullptr, WNOHANG), 0) << "the process ended";
+    kill(process, SIGKILL);
+    waitpid(process, nullptr, 0);
+    EXPECT_TRUE(exists(kSettingsPath));
+  }
+  EXPECT_EQ(attempt("socket", {}, {}, 0, {"--bare"}).exitStatus, kMigrationFailed);
+  EXPECT_EQ(attempt("nothing", {}, {}, 0, {"--bare"}).exitStatus, 0);
+}
+
+TEST_F(Confined, OnTheDeviceItselfItChangesNoFileOutsideTheRoot) {
+  if (kIsExemptFromConfinement) {
+    GTEST_SKIP() << "Workers of this build give up no rights.";
+  }
+  constexpr long kFirstVersionThatIsUsed = 2;
+  if (syscall(SYS_landlock_create_ruleset, nullptr, 0, LANDLOCK_CREATE_RULESET_VERSION) <
+      kFirstVersionThatIsUsed) {
+    GTEST_SKIP() << "This kernel has no Landlock, or too old a one.";
+  }
+  const OutsideTree outside;
+  const auto before = outside.contents();
+  for (const char* const name : {"create", "truncate", "remove", "rename"}) {
+    EXPECT_EQ(attempt(name, {}, outside.path(kSettingsPath), 0, {"--bare"}).exitStatus,
+              kMigrationFailed)
+        << name;
+    EXPECT_EQ(outside.contents(), before) << name;
+    write(kSettingsPath, accountSettings(12));
+    EXPECT_EQ(attempt(name, {}, onThisMachine(kSettingsPath), 0, {"--bare"}).exitStatus, 0) << name;
+  }
+}
 
 TEST_F(Confined, TheNewCallForThreadsAndProcessesDoesNotExist) {
   if (kIsExemptFromConfinement) {
