@@ -38,6 +38,10 @@ std::optional<ListedImages> listNamed(std::string_view name) {
   return std::nullopt;
 }
 
+std::string requireLoadableFile(const std::string& value) {
+  return value == kStandardStream ? "must be a file, since standard input cannot be loaded" : "";
+}
+
 std::string requireNamedPage(const std::string& value) {
   return value == kStandardStream ? "must be a file, since standard output carries the summary"
                                   : "";
@@ -68,6 +72,7 @@ struct Arguments {
   ShowOptions show;
   DiffOptions diff;
   CheckOptions check;
+  std::optional<std::string> framework;
   StatusOptions status;
   ConvertOptions convert;
   SummarizeOptions summarize;
@@ -102,9 +107,9 @@ void addShowSecrets(CLI::App& command, Arguments& arguments) {
                    "Show passwords, tokens and the like as well");
 }
 
-void addBundle(CLI::App& command, std::optional<std::string>& bundle) {
-  addPath(command, "--plugin", bundle, "BUNDLE",
-          "The plug-in bundle (default: that of the program)");
+CLI::Option* addBundle(CLI::App& command, std::optional<std::string>& bundle) {
+  return addPath(command, "--plugin", bundle, "BUNDLE",
+                 "The plug-in bundle (default: that of the program)");
 }
 
 void addShow(CLI::App& command, Arguments& arguments) {
@@ -145,15 +150,31 @@ Asked diffAsked(Arguments& arguments) {
 }
 
 void addCheck(CLI::App& command, Arguments& arguments) {
-  addFile(command, "FILE", arguments.check.file, "The file, - for standard input");
-  addPath(command, "--device", arguments.check.device, "FILE",
-          "The device description, - for standard input (default: this machine's "
-          "/etc/device.plist, if there is one)");
-  addBundle(command, arguments.check.bundle);
+  CLI::Option* file =
+      command.add_option("FILE", arguments.check.file, "The file, - for standard input")
+          ->option_text(" ")
+          ->check(requireText);
+  CLI::Option* device =
+      addPath(command, "--device", arguments.check.device, "FILE",
+              "The device description, - for standard input (default: this machine's "
+              "/etc/device.plist, if there is one)");
+  CLI::Option* bundle = addBundle(command, arguments.check.bundle);
+  addPath(command, "--framework", arguments.framework, "FRAMEWORK",
+          "Check a framework instead, a shared object, whose code then runs")
+      ->check(requireLoadableFile)
+      ->excludes(file)
+      ->excludes(device)
+      ->excludes(bundle);
   addJSON(command, arguments);
 }
 
 Asked checkAsked(Arguments& arguments) {
+  if (arguments.framework) {
+    return FrameworkCheckOptions{*arguments.framework, arguments.wantsJSON};
+  }
+  if (arguments.check.file.empty()) {
+    return unusableArguments("FILE is required, or --framework");
+  }
   if (const auto problem = severalStandardInputs(
           {arguments.check.file, arguments.check.device.value_or(std::string())})) {
     return unusableArguments(*problem);

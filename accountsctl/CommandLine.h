@@ -8,6 +8,7 @@
 #include "accountsctl/ConvertCommand.h"
 #include "accountsctl/DiffCommand.h"
 #include "accountsctl/ExplainCommand.h"
+#include "accountsctl/FrameworkCheck.h"
 #include "accountsctl/ShowCommand.h"
 #include "accountsctl/StatusCommand.h"
 #include "accountsctl/SummarizeCommand.h"
@@ -20,7 +21,8 @@ inline constexpr const char* kProgramName = "accountsctl";
 /// What the arguments ask for.
 struct CommandLine {
   std::variant<ShowOptions, DiffOptions, CheckOptions, StatusOptions, ConvertOptions,
-               SummarizeOptions, ExplainOptions, RequestedText, UnusableArguments>
+               SummarizeOptions, ExplainOptions, FrameworkCheckOptions, RequestedText,
+               UnusableArguments>
       asked;
   /// The subcommand's name; none when the arguments name none.
   std::optional<std::string> subcommand;

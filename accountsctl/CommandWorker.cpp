@@ -19,8 +19,6 @@
 namespace accounts {
 namespace {
 
-constexpr std::string_view kCommand = "The command";
-
 ProgramError temporaryFailure() {
   return {ExitStatus::TemporaryFailure,
           "No process for the command: " + std::string(std::strerror(errno))};
@@ -75,7 +73,8 @@ int waitFor(pid_t child) {
 
 /// What a worker says; none when it ended without a word. `limits` are those that it gave itself.
 std::optional<CommandResult> receiveResult(const FileDescriptor& socket,
-                                           std::optional<ProcessLimits>& limits) {
+                                           std::optional<ProcessLimits>& limits,
+                                           std::string_view who) {
   std::optional<std::string> file;
   for (;;) {
     std::optional<Frame> frame = receiveFrame(socket);
@@ -94,7 +93,7 @@ std::optional<CommandResult> receiveResult(const FileDescriptor& socket,
       case FrameKind::Result:
         return resultFrom(frame->bytes, std::move(file));
       default:
-        return WorkerEnd(kCommand, limits)
+        return WorkerEnd(who, limits)
             .toldBy(*frame)
             .value_or(ProgramError{ExitStatus::PluginEnded, "The command sent something else"});
     }
@@ -116,7 +115,8 @@ std::string CommandWorker::nextPiece() const {
   return frame ? std::move(frame->bytes) : std::string();
 }
 
-CommandResult runInWorker(const Command& command, const ReadAloud& readAloud) {
+CommandResult runInWorker(const Command& command, const ReadAloud& readAloud,
+                          std::string_view who) {
   std::array<int, 2> ends{};
   if (socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, ends.data()) != 0) {
     return temporaryFailure();
@@ -141,7 +141,7 @@ CommandResult runInWorker(const Command& command, const ReadAloud& readAloud) {
   std::optional<ProcessLimits> limits;
   std::optional<CommandResult> result;
   if (!error) {
-    result = receiveResult(*own, limits);
+    result = receiveResult(*own, limits, who);
   }
   // Without a keeper to hear it a worker comes to its end.
   own.reset();
@@ -149,7 +149,7 @@ CommandResult runInWorker(const Command& command, const ReadAloud& readAloud) {
   if (error) {
     return *std::move(error);
   }
-  return result ? *std::move(result) : WorkerEnd(kCommand, limits).withStatus(status);
+  return result ? *std::move(result) : WorkerEnd(who, limits).withStatus(status);
 }
 
 }  // namespace accounts

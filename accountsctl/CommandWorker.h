@@ -35,7 +35,12 @@ using TakePiece = std::function<bool(std::string_view)>;
 /// What the keeper reads aloud meanwhile. An error is the command's.
 using ReadAloud = std::function<std::optional<ProgramError>(const TakePiece& take)>;
 
-/// Lets a command run in a process of its own and gives what it came to, or how it ended instead.
-CommandResult runInWorker(const Command& command, const ReadAloud& readAloud = {});
+/// Who works in a command's process, as a message begins.
+inline constexpr std::string_view kCommand = "The command";
+
+/// Lets a command run in a process of its own and gives what it came to, or how it ended instead,
+/// said of `who`.
+CommandResult runInWorker(const Command& command, const ReadAloud& readAloud = {},
+                          std::string_view who = kCommand);
 
 }  // namespace accounts

@@ -51,13 +51,16 @@ inline constexpr const char* kDiffExamples =
 
 inline constexpr const char* kCheck =
     "Say what a migration would drop, repair, ignore or refuse of a settings file or a legacy\n"
-    "store, and why. The store's own code decides, with the account types of the bundle.";
+    "store, and why. The store's own code decides, with the account types of the bundle.\n"
+    "With --framework: load a framework as a device does, list its classes with what they answer,\n"
+    "and say what is wrong with it. Its code runs with the rights of whoever asks.";
 inline constexpr const char* kCheckStatuses =
     "  0   nothing was found\n"
     "  1   something was found\n";
 inline constexpr const char* kCheckExamples =
     "  accountsctl check com.quarx.accountsettings.plist\n"
-    "  accountsctl check --device image/etc/device.plist --json Accounts.plist\n";
+    "  accountsctl check --device image/etc/device.plist --json Accounts.plist\n"
+    "  accountsctl check --framework build/frameworks/Mail.framework/Mail.so\n";
 
 inline constexpr const char* kStatus =
     "Tell what a migration would find on a device and do, and what an earlier one left behind.\n"

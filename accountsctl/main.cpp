@@ -18,10 +18,13 @@ template <class Options>
 using TerminalCommand = CommandResult (*)(const Options&, const Terminal&, const CommandWorker&);
 
 template <class Options>
-CommandResult runForTerminal(TerminalCommand<Options> command, const Options& options) {
-  return runInWorker([&, terminal = standardOutputTerminal(::getenv)](const CommandWorker& worker) {
-    return command(options, terminal, worker);
-  });
+CommandResult runForTerminal(TerminalCommand<Options> command, const Options& options,
+                             std::string_view who = kCommand) {
+  return runInWorker(
+      [&, terminal = standardOutputTerminal(::getenv)](const CommandWorker& worker) {
+        return command(options, terminal, worker);
+      },
+      {}, who);
 }
 
 CommandResult runCommand(const ShowOptions& options) {
@@ -32,6 +35,9 @@ CommandResult runCommand(const DiffOptions& options) {
 }
 CommandResult runCommand(const CheckOptions& options) {
   return runForTerminal(check, options);
+}
+CommandResult runCommand(const FrameworkCheckOptions& options) {
+  return runForTerminal(checkFramework, options, "The framework");
 }
 CommandResult runCommand(const StatusOptions& options) {
   return runForTerminal(status, options);

@@ -15,8 +15,6 @@ namespace accounts {
 
 namespace {
 
-constexpr const char* kEntryPoint = "RegisterClasses";
-
 /// Calls a framework's entry point.
 Result registerClassesOf(void* entryPoint, ClassRegistry& registry) {
   try {
@@ -59,7 +57,7 @@ Result LinuxFrameworkLoader::loadFramework(std::string_view path) {
   if (library == nullptr) {
     return Result::failure(dlerror());
   }
-  void* entryPoint = dlsym(library, kEntryPoint);
+  void* entryPoint = dlsym(library, kFrameworkEntryPoint);
   if (entryPoint == nullptr) {
     const Result missing = Result::failure(dlerror());
     dlclose(library);
@@ -86,6 +84,14 @@ void LinuxFrameworkLoader::registerClass(std::string name, AccountClass accountC
   log_.writeLine(escapedText("The class " + name + " of the framework " + registering_ +
                              " is not taken: " + (first.empty() ? "the system" : first) +
                              " has one of that name"));
+}
+
+std::vector<std::string> LinuxFrameworkLoader::classNames() const {
+  std::vector<std::string> names;
+  for (const auto& [name, registered] : classes_) {
+    names.push_back(name);
+  }
+  return names;
 }
 
 const AccountClass* LinuxFrameworkLoader::classNamed(std::string_view name) const {

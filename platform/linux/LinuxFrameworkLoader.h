@@ -7,12 +7,16 @@
 #include <string>
 #include <string_view>
 #include <utility>
+#include <vector>
 
 #include "platform/ConsoleLog.h"
 #include "platform/FrameworkLoader.h"
 #include "platform/linux/DeviceRoot.h"
 
 namespace accounts {
+
+/// The name of the function that a framework registers its classes with.
+inline constexpr const char* kFrameworkEntryPoint = "RegisterClasses";
 
 /// Frameworks as shared objects beneath the device root. Loaded ones stay loaded as long as the
 /// process lives, since their classes do.
@@ -23,6 +27,8 @@ class LinuxFrameworkLoader : public FrameworkLoader, private ClassRegistry {
 
   Result loadFramework(std::string_view path) override;
   ClassRegistry& classes() override { return *this; }
+  /// The names of all classes that were registered, sorted.
+  [[nodiscard]] std::vector<std::string> classNames() const;
 
  private:
   void registerClass(std::string name, AccountClass accountClass) override;

@@ -18,7 +18,7 @@ class FrameworkLoaderTest : public DeviceFixture {
     install(EXAMPLE_FRAMEWORKS_DIRECTORY "/" + name + ".framework/" + name + ".so", devicePath);
   }
   void installBroken(const std::string& name, std::string_view devicePath) const {
-    install(BROKEN_FRAMEWORKS_DIRECTORY "/" + name + ".so", devicePath);
+    install(FAULTY_FRAMEWORKS_DIRECTORY "/" + name + ".so", devicePath);
   }
 
   DeviceRoot root_ = openImage();

@@ -14,7 +14,6 @@
 
 namespace accounts {
 
-// Exit statuses of the program.
 /// An empty directory in which the real accountsctl is run.
 class AccountsctlFixture : public testing::Test {
  public:

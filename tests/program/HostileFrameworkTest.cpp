@@ -75,7 +75,7 @@ class ThrowingFramework : public HostileRootFixture {
     std::filesystem::create_directories(onThisMachine(kFrameworks).parent_path());
     std::filesystem::copy(EXAMPLE_FRAMEWORKS_DIRECTORY, onThisMachine(kFrameworks),
                           std::filesystem::copy_options::recursive);
-    std::filesystem::copy_file(THROWING_FRAMEWORK, onThisMachine(kLibrary),
+    std::filesystem::copy_file(FAULTY_FRAMEWORKS_DIRECTORY "/Throwing.so", onThisMachine(kLibrary),
                                std::filesystem::copy_options::overwrite_existing);
     write(kSettingsPath,
           accountSettings(12, {PropertyDictionary{{"Type", "Yahoo"},

@@ -6,7 +6,6 @@
 #include <functional>
 #include <iostream>
 
-#include "commandline/WorkerLimits.h"
 #include "platform/linux/FileDescriptor.h"
 #include "tests/fakes/Sanitizers.h"
 #include "tests/program/DeviceRootFixture.h"
@@ -22,6 +21,7 @@ namespace {
 
 using testing::BinaryFile;
 
+constexpr std::uint64_t kMebibyte = std::uint64_t{1} << 20;
 /// What one may take more than an ordinary file of its size.
 constexpr std::uint64_t kMostMemoryBeyond = 64 * kMebibyte;
 constexpr std::uint64_t kMostBytesBeyond = 64 * kMebibyte;
