@@ -163,7 +163,7 @@ TEST(BasicAccountCreationDeathTest, TheClassIsAskedForBeforeTheType) {
 
 TEST(BasicAccountCreationDeathTest, ThePlainInitialiserIsForbidden) {
   FakeProcess device;
-  EXPECT_DEATH(BasicAccount::init(), "Don't use this method");
+  EXPECT_DEATH(BasicAccount::init(), R"(-\[BasicAccount init\].*Don't use this method)");
 }
 
 TEST(AccountIdentifiers, EachIsAFreshUUID) {

@@ -174,6 +174,24 @@ TEST_F(MigrationRunTest, AProposalWithAnotherStatusChangesNothingAndIsForTheWork
   EXPECT_TRUE(device.exists(DevicePlace::LegacyMail));
 }
 
+TEST_F(MigrationRunTest, AFailureIsBlamedOnTheMigrationLockWhereThereIsNoneAlone) {
+  useWorker([](const WorkerTask&) {
+    Proposal proposal;
+    proposal.status = ExitStatus::MigrationFailed;
+    return HandedOver{bytesOf(proposal), 0};
+  });
+  EXPECT_EQ(run().exitStatus, ExitStatus::MigrationFailed);
+  EXPECT_FALSE(run().error);
+
+  locks.migration = LockEnd::Impossible;
+  const RunConclusion conclusion = run();
+  ASSERT_TRUE(conclusion.error);
+  EXPECT_EQ(conclusion.error->exitStatus, ExitStatus::MigrationFailed);
+  EXPECT_EQ(conclusion.error->message,
+            "The plug-in reported that it failed: no migration lock can be made: why there is no "
+            "lock");
+}
+
 /// Another program that writes the settings file just before a commit would, so many times.
 class DisturbedRunTest : public RunTest {
  protected:

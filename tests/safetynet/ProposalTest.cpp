@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <functional>
 #include <limits>
+#include <vector>
 
 #include "safetynet/FlatBytes.h"
 
@@ -208,6 +209,19 @@ TEST(ProposalTest, AFlagThatIsNeitherIsRefused) {
   constexpr std::size_t kKeepsFiles = 5;
   bytes[kKeepsFiles] = 2;
   EXPECT_FALSE(proposalFrom(bytes, kMemoryFileSize));
+}
+
+TEST(ProposalTest, AStatusThatNoMigrationEndsWithIsRefused) {
+  std::string bytes = bytesOf(Proposal());
+  constexpr std::size_t kStatus = 4;
+  std::vector<int> accepted;
+  for (int status = 0; status < 256; ++status) {
+    bytes[kStatus] = static_cast<char>(status);
+    if (proposalFrom(bytes, kMemoryFileSize)) {
+      accepted.push_back(status);
+    }
+  }
+  EXPECT_EQ(accepted, (std::vector<int>{0, 1, 2, 3, 66, 70, 73, 74, 75}));
 }
 
 TEST(ProposalTest, TheChangeOfAPlaceIsFound) {

@@ -60,6 +60,12 @@ TEST(Description, JSONMeansTheSameWithoutThem) {
   EXPECT_EQ(escapedJSON("[\"\\n\"]"), "[\"\\n\"]");
 }
 
+TEST(Description, JSONKeepsMalformedBytesOfWhatItIsMadeOf) {
+  for (const std::string& json : {"[\"\xC2\"]", "[\"\xE2\x80\"]", "\xC2", "\xE2\x80"}) {
+    EXPECT_EQ(escapedJSON(json), json);
+  }
+}
+
 TEST(Description, AnUnpairedSurrogateIsEscaped) {
   EXPECT_EQ(describe("a\xED\xA0\xBD"
                      "b"),
