@@ -61,7 +61,7 @@ void AccountsManager::waitForMigrationToFinish() {
 
 void AccountsManager::shouldMigrateOldMailAccounts_oldDAAccounts_newAccountSettings(
     bool* migrateOldMailAccounts, bool* migrateOldDAAccounts, bool* migrateNewAccounts) {
-  static constexpr std::string_view operation =
+  static constexpr std::string_view kOperation =
       "+[AccountsManager(MigrationSupport) "
       "shouldMigrateOldMailAccounts:oldDAAccounts:newAccountSettings:]";
   const std::array<std::pair<const bool*, std::string_view>, 3> required = {
@@ -70,7 +70,7 @@ void AccountsManager::shouldMigrateOldMailAccounts_oldDAAccounts_newAccountSetti
        {migrateNewAccounts, "migrateNewAccounts cannot be nil"}}};
   for (const auto& [reference, message] : required) {
     if (reference == nullptr) {
-      failAssertion(operation, kManagerSourceFile, message);
+      failAssertion(kOperation, kManagerSourceFile, message);
     }
   }
   *migrateOldMailAccounts = _oldMailAccountsInformationFound();
@@ -80,7 +80,7 @@ void AccountsManager::shouldMigrateOldMailAccounts_oldDAAccounts_newAccountSetti
   const bool hasLegacyAccounts = *migrateOldMailAccounts || *migrateOldDAAccounts;
   *migrateNewAccounts = !hasLegacyAccounts && accountSettingsNeedsToBeMigrated();
   if (hasLegacyAccounts || *migrateNewAccounts) {
-    logToChannel(operation,
+    logToChannel(kOperation,
                  "Accounts settings needs migration! oldMailAccountsPresent=%d, "
                  "oldDAAccountsPresent=%d, migrateNewAccountsInfo=%d",
                  [&] {
@@ -91,7 +91,7 @@ void AccountsManager::shouldMigrateOldMailAccounts_oldDAAccounts_newAccountSetti
 }
 
 bool AccountsManager::accountSettingsNeedsToBeMigrated() {
-  static constexpr std::string_view operation =
+  static constexpr std::string_view kOperation =
       "+[AccountsManager(MigrationSupport) accountSettingsNeedsToBeMigrated]";
   const std::optional<PropertyDictionary> root =
       Process::current().platform.propertyLists.readDictionary(fullPathToAccountSettingsPlist());
@@ -102,7 +102,7 @@ bool AccountsManager::accountSettingsNeedsToBeMigrated() {
   const std::optional<std::int64_t> savedVersion =
       version != nullptr ? version->integerValue() : std::nullopt;
   if (!savedVersion) {
-    logToChannel(operation,
+    logToChannel(kOperation,
                  "Account Settings plist is missing a version number, returning NO for migration");
     return false;
   }
@@ -110,7 +110,7 @@ bool AccountsManager::accountSettingsNeedsToBeMigrated() {
   // to this system can have stored, counts as newer than every version and is left alone.
   const bool isOutOfDate = static_cast<std::uint64_t>(*savedVersion) < currentVersion();
   if (isOutOfDate) {
-    logToChannel(operation,
+    logToChannel(kOperation,
                  "Account Settings Version out of date: savedVersion=%ld, currentVersion=%ld",
                  [&] { return logArguments(*savedVersion, currentVersion()); });
   }

@@ -79,13 +79,13 @@ bool writeSettingsFile(const PropertyDictionary& root) {
 PropertyDictionary AccountsManager::mergeInMemoryProperties_originalProperties_onDiskProperties(
     const PropertyDictionary& inMemory, const std::optional<PropertyDictionary>& original,
     const std::optional<PropertyDictionary>& onDisk) {
-  static constexpr std::string_view operation =
+  static constexpr std::string_view kOperation =
       "-[AccountsManager mergeInMemoryProperties:originalProperties:onDiskProperties:]";
-  logToChannel(operation, "Merging inmem %@ orig %@ onDisk %@",
+  logToChannel(kOperation, "Merging inmem %@ orig %@ onDisk %@",
                [&] { return logArguments(inMemory, original, onDisk); });
   PropertyDictionary merged = mergeThreeWays(inMemory, original.value_or(PropertyDictionary()),
                                              onDisk.value_or(PropertyDictionary()));
-  logToChannel(operation, "Merged to %@", [&] { return logArguments(merged); });
+  logToChannel(kOperation, "Merged to %@", [&] { return logArguments(merged); });
   return merged;
 }
 

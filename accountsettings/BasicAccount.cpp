@@ -26,15 +26,15 @@ bool BasicAccount::accepts(const PropertyDictionary& properties) {
 }
 
 bool BasicAccount::acceptProperties(const PropertyDictionary& properties) {
-  static constexpr std::string_view operation = "-[BasicAccount initWithProperties:]";
+  static constexpr std::string_view kOperation = "-[BasicAccount initWithProperties:]";
   const std::optional<Text> type = properties.textForKey(kAccountType);
   const std::optional<Text> accountClass = properties.textForKey(kAccountClass);
   const bool isValidType = _isValidAccountType(type);
   if (!isValidType) {
-    logToChannel(operation, "Invalid account type: %@", [&] { return logArguments(type); });
+    logToChannel(kOperation, "Invalid account type: %@", [&] { return logArguments(type); });
   }
   if (!accountClass || accountClass->empty()) {
-    logToChannel(operation, "Missing account class.");
+    logToChannel(kOperation, "Missing account class.");
     return false;
   }
   if (!isValidType) {
@@ -70,12 +70,12 @@ std::string_view BasicAccount::whyRefused(const PropertyValue& element) {
 
 BasicAccountReference BasicAccount::_initWithType_class(
     std::optional<std::string_view> type, std::optional<std::string_view> accountClass) {
-  static constexpr std::string_view operation = "-[BasicAccount _initWithType:class:]";
+  static constexpr std::string_view kOperation = "-[BasicAccount _initWithType:class:]";
   if (!accountClass || accountClass->empty()) {
-    failAssertion(operation, kAccountSourceFile, "The account class is required.");
+    failAssertion(kOperation, kAccountSourceFile, "The account class is required.");
   }
   if (!_isValidAccountType(type)) {
-    failAssertion(operation, kAccountSourceFile, "The account type (%@) is not supported",
+    failAssertion(kOperation, kAccountSourceFile, "The account type (%@) is not supported",
                   {textOrNone(type)});
   }
   PropertyDictionary properties = {{kAccountType, *type}, {kAccountClass, *accountClass}};

@@ -28,16 +28,16 @@ PropertyArray normalisedDataclasses(const PropertyArray& configured, bool isMult
 }
 
 PropertyDictionary loadAccountTypesTable() {
-  static constexpr std::string_view operation = "+[BasicAccount initialize]";
+  static constexpr std::string_view kOperation = "+[BasicAccount initialize]";
   BundleResources& resources = Process::current().platform.bundleResources;
   if (!resources.hasPropertyList(kAccountTypesResource)) {
-    failAssertion(operation, kAccountSourceFile, "Could not find AccountTypesProperties.plist");
+    failAssertion(kOperation, kAccountSourceFile, "Could not find AccountTypesProperties.plist");
   }
   const std::optional<PropertyDictionary> file = resources.readPropertyList(kAccountTypesResource);
   if (!file) {
     // Kept on purpose: the message names the dataclasses although the account types failed; log
     // searches know it so.
-    failAssertion(operation, kAccountSourceFile,
+    failAssertion(kOperation, kAccountSourceFile,
                   "Could not load the dataclasses configuration file");
   }
   const bool isMultitaskingEnabled = BasicAccount::isMultitaskingEnabled();

@@ -24,15 +24,15 @@ struct Directory {
   fs::perms permissions;
 };
 
-constexpr fs::perms usual = fs::perms::owner_all | fs::perms::group_read | fs::perms::group_exec |
-                            fs::perms::others_read | fs::perms::others_exec;
+constexpr fs::perms kUsual = fs::perms::owner_all | fs::perms::group_read | fs::perms::group_exec |
+                             fs::perms::others_read | fs::perms::others_exec;
 
 constexpr std::array<Directory, 6> directories = {{
-    {"etc", usual},
+    {"etc", kUsual},
     {"tmp", fs::perms::all | fs::perms::sticky_bit},
-    {"var/mobile/Library/Logs/CrashReporter", usual},
-    {"var/mobile/Library/Mail", usual},
-    {"var/mobile/Library/Preferences", usual},
+    {"var/mobile/Library/Logs/CrashReporter", kUsual},
+    {"var/mobile/Library/Mail", kUsual},
+    {"var/mobile/Library/Preferences", kUsual},
     {"var/mobile/tmp", fs::perms::owner_all},
 }};
 

@@ -23,12 +23,12 @@ std::string NumberSequence::bytes(std::size_t count) {
 }
 
 std::string NumberSequence::identifier() {
-  constexpr std::string_view digits = "0123456789ABCDEF";
-  constexpr std::string_view pattern = "xxxxxxxx-xxxx-4xxx-8xxx-xxxxxxxxxxxx";
-  std::string text(pattern);
+  constexpr std::string_view kDigits = "0123456789ABCDEF";
+  constexpr std::string_view kPattern = "xxxxxxxx-xxxx-4xxx-8xxx-xxxxxxxxxxxx";
+  std::string text(kPattern);
   for (char& character : text) {
     if (character == 'x') {
-      character = digits[next() >> 60];
+      character = kDigits[next() >> 60];
     }
   }
   return text;

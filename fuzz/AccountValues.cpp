@@ -10,9 +10,9 @@ namespace accounts {
 
 namespace {
 
-constexpr std::size_t mostAccounts = 8;
-constexpr std::size_t mostChildren = 3;
-constexpr std::size_t mostProperties = 8;
+constexpr std::size_t kMostAccounts = 8;
+constexpr std::size_t kMostChildren = 3;
+constexpr std::size_t kMostProperties = 8;
 
 constexpr std::array<std::string_view, 12> classes = {
     "IMAPAccount",   "GmailAccount",   "YahooAccount",        "AOLAccount",
@@ -133,7 +133,7 @@ const std::array<Property, 7> legacyExchangeProperties = {{
 /// Adds a few properties, of which some are known and have plausible values.
 void addProperties(FuzzInput& input, std::span<const Property> known,
                    PropertyDictionary& dictionary) {
-  for (std::size_t count = input.below(mostProperties + 1); count > 0; --count) {
+  for (std::size_t count = input.below(kMostProperties + 1); count > 0; --count) {
     const std::size_t choice = input.below(known.size() + 1);
     if (choice == known.size()) {
       Text key = anyText(input);
@@ -165,7 +165,7 @@ PropertyValue elementFrom(FuzzInput& input, Make&& make) {
 
 PropertyValue children(FuzzInput& input) {
   PropertyArray list;
-  for (std::size_t count = input.below(mostChildren + 1); count > 0; --count) {
+  for (std::size_t count = input.below(kMostChildren + 1); count > 0; --count) {
     list.append(elementFrom(input, [](FuzzInput& rest) {
       // A child's own children are not looked at, so those of any kind do.
       PropertyDictionary child = accountWithProperties(rest, {});
@@ -199,7 +199,7 @@ void setList(FuzzInput& input, PropertyDictionary& root, std::string_view key, M
   if (input.seldom()) {
     root.set(key, anyValue(input));
   } else if (!input.seldom()) {
-    root.set(key, listFrom(input, mostAccounts, make));
+    root.set(key, listFrom(input, kMostAccounts, make));
   }
 }
 
@@ -238,11 +238,11 @@ PropertyDictionary accountFrom(FuzzInput& input) {
 
 PropertyDictionary settingsFrom(FuzzInput& input) {
   PropertyDictionary root;
-  constexpr std::size_t versions = 14;
-  const std::size_t version = input.below(versions + 2);
-  if (version < versions) {
+  constexpr std::size_t kVersions = 14;
+  const std::size_t version = input.below(kVersions + 2);
+  if (version < kVersions) {
     root.set(kPlistVersionKey, version);
-  } else if (version == versions) {
+  } else if (version == kVersions) {
     root.set(kPlistVersionKey, anyValue(input));
   }
   setList(input, root, kPlistAccountsKey, accountFrom);

@@ -8,8 +8,8 @@ namespace accounts {
 
 namespace {
 
-constexpr std::size_t deepestNesting = 3;
-constexpr std::size_t mostElements = 4;
+constexpr std::size_t kDeepestNesting = 3;
+constexpr std::size_t kMostElements = 4;
 
 const std::array<std::string_view, 40> texts = {
     "", "A", "B", "C", "user", "user@gmail.com", "user@marrow.example", "DeviceLocalAccount", "0",
@@ -29,7 +29,7 @@ PropertyValue valueUpTo(FuzzInput& input, std::size_t depth);
 
 PropertyArray anyArray(FuzzInput& input, std::size_t depth) {
   PropertyArray array;
-  for (std::size_t count = input.below(mostElements + 1); count > 0; --count) {
+  for (std::size_t count = input.below(kMostElements + 1); count > 0; --count) {
     array.append(valueUpTo(input, depth));
   }
   return array;
@@ -37,7 +37,7 @@ PropertyArray anyArray(FuzzInput& input, std::size_t depth) {
 
 PropertyDictionary anyDictionary(FuzzInput& input, std::size_t depth) {
   PropertyDictionary dictionary;
-  for (std::size_t count = input.below(mostElements + 1); count > 0; --count) {
+  for (std::size_t count = input.below(kMostElements + 1); count > 0; --count) {
     Text key = anyText(input);
     dictionary.set(std::move(key), valueUpTo(input, depth));
   }
@@ -51,9 +51,9 @@ PropertyValue anyNumber(FuzzInput& input) {
 
 PropertyValue valueUpTo(FuzzInput& input, std::size_t depth) {
   enum Choice : std::uint8_t { AText, ANumber, ASigned, ABoolean, AReal, ADate, SomeData };
-  constexpr std::size_t scalarChoices = 7;
-  constexpr std::size_t containerChoices = 2;
-  const std::size_t choice = input.below(scalarChoices + (depth > 0 ? containerChoices : 0));
+  constexpr std::size_t kScalarChoices = 7;
+  constexpr std::size_t kContainerChoices = 2;
+  const std::size_t choice = input.below(kScalarChoices + (depth > 0 ? kContainerChoices : 0));
   switch (choice) {
     case AText:
       return anyText(input);
@@ -69,7 +69,7 @@ PropertyValue valueUpTo(FuzzInput& input, std::size_t depth) {
       return PropertyDate{std::bit_cast<double>(input.number())};
     case SomeData:
       return PropertyData(input.bytes(input.below(8)));
-    case scalarChoices:
+    case kScalarChoices:
       return anyArray(input, depth - 1);
     default:
       return anyDictionary(input, depth - 1);
@@ -88,7 +88,7 @@ Text anyText(FuzzInput& input) {
 }
 
 PropertyValue anyValue(FuzzInput& input) {
-  return valueUpTo(input, deepestNesting);
+  return valueUpTo(input, kDeepestNesting);
 }
 
 }  // namespace accounts

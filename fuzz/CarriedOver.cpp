@@ -10,7 +10,7 @@ namespace accounts {
 
 namespace {
 
-constexpr std::string_view markKey = "A mark that nobody knows";
+constexpr std::string_view kMarkKey = "A mark that nobody knows";
 
 /// The settings with a different mark in each account.
 PropertyDictionary withMarks(PropertyDictionary settings, const PropertyArray& accounts) {
@@ -18,7 +18,7 @@ PropertyDictionary withMarks(PropertyDictionary settings, const PropertyArray& a
   for (std::size_t index = 0; index < accounts.size(); ++index) {
     if (const PropertyDictionary* account = accounts.at(index).asDictionary()) {
       PropertyDictionary changed = *account;
-      changed.set(markKey, index);
+      changed.set(kMarkKey, index);
       marked.replace(index, changed);
     }
   }
@@ -76,7 +76,7 @@ bool canBeTakenAway(const PropertyDictionary& account) {
 void collectMarks(const PropertyArray& accounts, std::vector<PropertyValue>& marks) {
   for (const PropertyValue& element : accounts) {
     if (const PropertyDictionary* account = element.asDictionary()) {
-      if (const PropertyValue* mark = account->find(markKey)) {
+      if (const PropertyValue* mark = account->find(kMarkKey)) {
         marks.push_back(*mark);
       }
       collectMarks(account->arrayForKey(kAccountChildAccounts).value_or(PropertyArray()), marks);
@@ -100,7 +100,7 @@ CarriedOver::CarriedOver(FuzzedDevice& device) {
   isUpToDate_ = areUpToDate(*settings);
   for (const PropertyValue& account : accounts_) {
     if (!canBeTakenAway(*account.asDictionary())) {
-      marks_.push_back(*account.asDictionary()->find(markKey));
+      marks_.push_back(*account.asDictionary()->find(kMarkKey));
     }
   }
   device.addPropertyList(kSettingsPath, marked);

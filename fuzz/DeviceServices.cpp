@@ -35,12 +35,12 @@ void addSyncSources(FuzzInput& input, FakeExternalSyncSources& service) {
 }
 
 void addRestrictions(FuzzInput& input, FakeProfileRestrictions& service) {
-  constexpr std::size_t answers = 3;
+  constexpr std::size_t kAnswers = 3;
   for (const RestrictedFeature feature :
        {RestrictedFeature::CloudDocumentSync, RestrictedFeature::PhotoStream,
         RestrictedFeature::SharedPhotoStreams, RestrictedFeature::CloudBackup,
         RestrictedFeature::CardsAndPassesWhileLocked}) {
-    service.answers[feature] = static_cast<RestrictionAnswer>(input.below(answers));
+    service.answers[feature] = static_cast<RestrictionAnswer>(input.below(kAnswers));
   }
 }
 

@@ -12,8 +12,8 @@ namespace accounts {
 
 namespace {
 
-constexpr std::size_t keyCount = 12;
-constexpr std::size_t valueCount = 5;
+constexpr std::size_t kKeyCount = 12;
+constexpr std::size_t kValueCount = 5;
 
 /// Three sides over few keys and few values, so that all agreements between them are frequent.
 struct Sides {
@@ -30,11 +30,11 @@ void choose(FuzzInput& input, const std::string& key, const std::vector<Property
 
 Sides sidesFrom(FuzzInput& input) {
   std::vector<PropertyValue> values;
-  while (values.size() < valueCount) {
+  while (values.size() < kValueCount) {
     values.push_back(anyValue(input));
   }
   Sides sides;
-  for (std::size_t index = 0; index < keyCount; ++index) {
+  for (std::size_t index = 0; index < kKeyCount; ++index) {
     // Keys that begin alike and keys that do not, the empty one included.
     const std::string key(index / 2, index % 2 == 0 ? 'k' : 'm');
     for (PlainProperties* side : {&sides.original, &sides.inMemory, &sides.onDisk}) {

@@ -35,11 +35,11 @@ std::optional<bool> migrate(FuzzedDevice& device) {
 /// when there is such a fault; half of the devices have none. Which one is drawn from the
 /// whole input, because a mutation of a long one seldom meets a certain byte.
 bool addFault(std::string_view bytes, FakeFileSystem& files) {
-  constexpr std::size_t choices = 8;
-  constexpr std::size_t operations = 64;
+  constexpr std::size_t kChoices = 8;
+  constexpr std::size_t kOperations = 64;
   const std::size_t draw = std::hash<std::string_view>()(bytes);
-  const std::size_t operation = draw / choices % operations;
-  switch (draw % choices) {
+  const std::size_t operation = draw / kChoices % kOperations;
+  switch (draw % kChoices) {
     case 4:
       files.failAt(operation);
       return true;
@@ -82,8 +82,8 @@ void checkResult(const FuzzedDevice& device, bool result) {
 /// drops.
 void checkRest(FuzzedDevice& device) {
   device.fileSystem.removeFaults();
-  constexpr int runsToRest = 2;
-  for (int run = 0; run < runsToRest; ++run) {
+  constexpr int kRunsToRest = 2;
+  for (int run = 0; run < kRunsToRest; ++run) {
     require(migrate(device) == device.sharedResources.canMakeLock, "a further run ends as ruled");
   }
   const std::optional<std::string> bytes = device.fileSystem.contentsOf(kSettingsPath);

@@ -48,8 +48,8 @@ void requireEqual(const PropertyValue& actual, const PropertyValue& expected,
 /// and the engine watches comparisons. Where that is refused, runs with the same seed try different
 /// inputs.
 extern "C" int LLVMFuzzerInitialize(int*, char*** arguments) {
-  constexpr unsigned long unchanged = 0xffffffff;
-  const int current = ::personality(unchanged);
+  constexpr unsigned long kUnchanged = 0xffffffff;
+  const int current = ::personality(kUnchanged);
   if (current != -1 && (current & ADDR_NO_RANDOMIZE) == 0 &&
       ::personality(static_cast<unsigned long>(current | ADDR_NO_RANDOMIZE)) != -1) {
     ::execv("/proc/self/exe", *arguments);

@@ -59,14 +59,14 @@ FuzzedDevice::FuzzedDevice() {
 
 void FuzzedDevice::addAnything(FuzzInput& input, std::string_view path,
                                PropertyDictionary (*make)(FuzzInput& input)) {
-  constexpr std::size_t aDirectoryChoice = 7;
-  const std::size_t choice = input.below(aDirectoryChoice + 1);
+  constexpr std::size_t kDirectoryChoice = 7;
+  const std::size_t choice = input.below(kDirectoryChoice + 1);
   if (choice == 0) {
     return;
   }
   if (choice == 1) {
     fileSystem.addFile(path, input.countedBytes());
-  } else if (choice == aDirectoryChoice) {
+  } else if (choice == kDirectoryChoice) {
     fileSystem.addDirectory(path);
   } else {
     addPropertyList(path, make(input));

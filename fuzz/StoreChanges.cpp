@@ -9,7 +9,7 @@ namespace accounts {
 
 namespace {
 
-constexpr std::size_t mostChanges = 16;
+constexpr std::size_t kMostChanges = 16;
 
 /// What a change works on.
 struct Changing {
@@ -112,13 +112,13 @@ void save(Changing& changing) {
 }  // namespace
 
 void changeStore(FuzzInput& input, FuzzedDevice& device, AccountsManager& store) {
-  constexpr std::array changes = {
+  constexpr std::array kChanges = {
       insert,   remove,      removeByIdentifier, update,      replace,        replaceTypes,
       addChild, removeChild, switchDataclass,    setProperty, takeProperties, writeAsAnotherProgram,
       save};
   Changing changing = {input, device, store};
-  for (std::size_t count = 0; count < mostChanges && !input.isUsedUp(); ++count) {
-    changes[input.below(changes.size())](changing);
+  for (std::size_t count = 0; count < kMostChanges && !input.isUsedUp(); ++count) {
+    kChanges[input.below(kChanges.size())](changing);
   }
 }
 

@@ -56,9 +56,9 @@ JSON jsonOf(const PropertyValue& value) {
 }
 
 std::string lineOf(const JSON& value) {
-  constexpr int onOneLine = -1;
-  constexpr bool keepUnicode = false;
-  return escapedJSON(value.dump(onOneLine, ' ', keepUnicode, JSON::error_handler_t::replace));
+  constexpr int kOnOneLine = -1;
+  constexpr bool kKeepUnicode = false;
+  return escapedJSON(value.dump(kOnOneLine, ' ', kKeepUnicode, JSON::error_handler_t::replace));
 }
 
 JSON textOrNull(const std::optional<Text>& text) {

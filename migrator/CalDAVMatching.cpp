@@ -43,11 +43,12 @@ std::optional<Text> textInDictionary(const BasicAccount& account, std::string_vi
 }  // namespace
 
 CalDAVEndpoint calDAVEndpointOf(const BasicAccount& calDAVAccount) {
-  constexpr std::string_view principalKey = "CalDAVPrincipalConfiguration";
-  constexpr std::string_view accountKey = "CalDAVAccountConfiguration";
-  return {.server = textInDictionary(calDAVAccount, principalKey, "CalDAV_Server_Key"),
-          .login = textInDictionary(calDAVAccount, principalKey, "Login_Key"),
-          .principalPath = textInDictionary(calDAVAccount, accountKey, "CalDAV_PrincipalPath_Key")};
+  constexpr std::string_view kPrincipalKey = "CalDAVPrincipalConfiguration";
+  constexpr std::string_view kAccountKey = "CalDAVAccountConfiguration";
+  return {
+      .server = textInDictionary(calDAVAccount, kPrincipalKey, "CalDAV_Server_Key"),
+      .login = textInDictionary(calDAVAccount, kPrincipalKey, "Login_Key"),
+      .principalPath = textInDictionary(calDAVAccount, kAccountKey, "CalDAV_PrincipalPath_Key")};
 }
 
 ExpectedCalDAV expectedCalDAVOf(const BasicAccount& umbrellaAccount) {

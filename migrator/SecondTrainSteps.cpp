@@ -80,8 +80,8 @@ void wrapHostedServiceAccount(AccountsManager& store, const BasicAccountReferenc
   }
   // Kept on purpose: an account that does not say whether it is active counts as inactive here,
   // while the steps of 7A242 and 8C136 count it as active.
-  constexpr bool activeIfAbsent = false;
-  if (hosted->booleanPropertyForKey(kIsActiveKey).value_or(activeIfAbsent)) {
+  constexpr bool kActiveIfAbsent = false;
+  if (hosted->booleanPropertyForKey(kIsActiveKey).value_or(kActiveIfAbsent)) {
     parent->setEnabled_forDataclass(true, kAccountDataclassMail);
   }
   for (const std::string_view key : kMovedKeys) {
@@ -157,9 +157,9 @@ bool AccountsDataMigrator::_migrateAccountsFrom8C136(AccountsManager& store) {
     if (hasClass(*account, kCloudAccountClass)) {
       removeHostedServiceDisplayNames(*account);
     }
-    constexpr bool activeIfAbsent = true;
+    constexpr bool kActiveIfAbsent = true;
     if (hasClassAmong(*account, kMailOnlyClasses) &&
-        account->booleanPropertyForKey(kIsActiveKey).value_or(activeIfAbsent)) {
+        account->booleanPropertyForKey(kIsActiveKey).value_or(kActiveIfAbsent)) {
       account->setEnabled_forDataclass(true, kAccountDataclassMail);
     }
   }

@@ -89,9 +89,9 @@ class CalDAVAccounts {
 };
 
 void enableMailAndNotes(BasicAccount& account) {
-  constexpr bool activeIfAbsent = true;
+  constexpr bool kActiveIfAbsent = true;
   if (hasClassAmong(account, kWebMailClasses) &&
-      account.booleanPropertyForKey(kIsActiveKey).value_or(activeIfAbsent)) {
+      account.booleanPropertyForKey(kIsActiveKey).value_or(kActiveIfAbsent)) {
     account.setEnabled_forDataclass(true, kAccountDataclassMail);
     account.setEnabled_forDataclass(true, kAccountDataclassNotes);
   }

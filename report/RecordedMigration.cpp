@@ -74,8 +74,8 @@ class Assembly {
 RecordedMigration RecordedMigration::fromLines(const std::vector<std::string>& lines) {
   Assembly assembly;
   for (const std::string& line : lines) {
-    constexpr bool allowExceptions = false;
-    JSON object = JSON::parse(line, nullptr, allowExceptions);
+    constexpr bool kAllowExceptions = false;
+    JSON object = JSON::parse(line, nullptr, kAllowExceptions);
     if (object.is_object()) {
       for (auto&& [event, content] : object.items()) {
         if (content.is_object()) {

@@ -148,9 +148,9 @@ bool ChangedKeys::mayDiffer(std::string_view key, AccountOrigin::Kind origin,
 
 bool ChangedKeys::mayDifferInChild(std::string_view key, const PropertyDictionary& parent,
                                    const PropertyDictionary& before) const {
-  constexpr std::array hosted = {kVelmoraAccountClass, kMarrowAccountClass};
+  constexpr std::array kHosted = {kVelmoraAccountClass, kMarrowAccountClass};
   if (!told_.hasRun(kStep8C136) || !holds(kCloudClass, kAccountClass, parent, parent) ||
-      !holds(hosted, kAccountClass, before, before)) {
+      !holds(kHosted, kAccountClass, before, before)) {
     return false;
   }
   return key == kAccountDisplayName ||

@@ -69,12 +69,12 @@ ProposedChange takeChange(FlatReader& reader, std::uint64_t memoryFileSize) {
 
 /// A status that a migration may end with.
 ExitStatus takeStatus(FlatReader& reader) {
-  constexpr std::array statuses = {
+  constexpr std::array kStatuses = {
       ExitStatus::Success,           ExitStatus::MigrationFailed,  ExitStatus::NotVerified,
       ExitStatus::NotAllCarriedOver, ExitStatus::MissingInput,     ExitStatus::PluginEnded,
       ExitStatus::InputOutputError,  ExitStatus::TemporaryFailure, ExitStatus::CannotCreate};
   const auto status = static_cast<ExitStatus>(reader.take<std::uint8_t>());
-  if (std::ranges::find(statuses, status) == statuses.end()) {
+  if (std::ranges::find(kStatuses, status) == kStatuses.end()) {
     reader.refuse();
   }
   return status;

@@ -119,14 +119,14 @@ void appendPadded(std::string& line, std::int64_t number, std::size_t width) {
 
 void appendDate(std::string& line, double secondsSinceReferenceDate) {
   using namespace std::chrono;
-  constexpr sys_seconds reference = sys_days(year(2001) / January / 1);
-  constexpr double earliest =
-      static_cast<double>((sys_seconds(sys_days(year(0) / January / 1)) - reference).count());
-  constexpr double pastLatest =
-      static_cast<double>((sys_seconds(sys_days(year(10000) / January / 1)) - reference).count());
+  constexpr sys_seconds kReference = sys_days(year(2001) / January / 1);
+  constexpr double kEarliest =
+      static_cast<double>((sys_seconds(sys_days(year(0) / January / 1)) - kReference).count());
+  constexpr double kPastLatest =
+      static_cast<double>((sys_seconds(sys_days(year(10000) / January / 1)) - kReference).count());
   line.push_back('"');
   // Written so that NaN takes this way too.
-  if (!(secondsSinceReferenceDate >= earliest && secondsSinceReferenceDate < pastLatest)) {
+  if (!(secondsSinceReferenceDate >= kEarliest && secondsSinceReferenceDate < kPastLatest)) {
     if (std::isnan(secondsSinceReferenceDate)) {
       line.append("date NaN");
     } else if (std::isinf(secondsSinceReferenceDate)) {
@@ -148,7 +148,7 @@ void appendDate(std::string& line, double secondsSinceReferenceDate) {
     ++wholeSeconds;
     fraction = 0;
   }
-  const sys_seconds time = reference + seconds(wholeSeconds);
+  const sys_seconds time = kReference + seconds(wholeSeconds);
   const sys_days day = floor<days>(time);
   const year_month_day date(day);
   const hh_mm_ss timeOfDay(time - day);

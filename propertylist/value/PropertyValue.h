@@ -56,11 +56,11 @@ class PropertyValue {
   PropertyValue(Real real) : content_(static_cast<double>(real)) {}
 
   [[nodiscard]] PropertyKind kind() const {
-    constexpr PropertyKind kinds[] = {
+    constexpr PropertyKind kKinds[] = {
         PropertyKind::Dictionary, PropertyKind::Array,   PropertyKind::String,
         PropertyKind::Data,       PropertyKind::Integer, PropertyKind::Integer,
         PropertyKind::Real,       PropertyKind::Boolean, PropertyKind::Date};
-    return kinds[static_cast<std::size_t>(content_.form())];
+    return kKinds[static_cast<std::size_t>(content_.form())];
   }
 
   /// The content as one kind; null or none when the value is of another.

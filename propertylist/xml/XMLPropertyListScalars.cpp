@@ -65,12 +65,12 @@ bool isDigit(char character) {
 /// The value of each base64 digit; kNoDigit for every other character.
 constexpr unsigned char kNoDigit = 0xFF;
 constexpr std::array<unsigned char, 256> kBase64Values = [] {
-  constexpr std::string_view digits =
+  constexpr std::string_view kDigits =
       "ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789+/";
   std::array<unsigned char, 256> values{};
   values.fill(kNoDigit);
-  for (std::size_t value = 0; value < digits.size(); ++value) {
-    values[static_cast<unsigned char>(digits[value])] = static_cast<unsigned char>(value);
+  for (std::size_t value = 0; value < kDigits.size(); ++value) {
+    values[static_cast<unsigned char>(kDigits[value])] = static_cast<unsigned char>(value);
   }
   return values;
 }();
@@ -131,9 +131,9 @@ std::optional<PropertyValue> parseDate(std::string_view text) {
   if (!date.ok() || hour > 23 || minute > 59 || second > 59) {
     return std::nullopt;
   }
-  constexpr sys_days reference = year(2001) / January / 1;
+  constexpr sys_days kReference = year(2001) / January / 1;
   const auto sinceReference =
-      (sys_days(date) - reference) + hours(hour) + minutes(minute) + seconds(second);
+      (sys_days(date) - kReference) + hours(hour) + minutes(minute) + seconds(second);
   return PropertyDate{static_cast<double>(sinceReference.count())};
 }
 

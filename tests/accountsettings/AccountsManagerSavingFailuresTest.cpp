@@ -40,7 +40,7 @@ class AccountsManagerSavingFailures : public StoreFixture {
 
   const std::string failed =
       R"(-[AccountsManager saveAllAccounts] (N) "Failed to save accounts to filesystem.")";
-  static constexpr std::size_t operationsOfASave = 5;
+  static constexpr std::size_t kOperationsOfASave = 5;
   Store store;
   /// The file before a save, and after one that succeeds.
   std::optional<std::string> before;
@@ -139,7 +139,7 @@ TEST_F(AccountsManagerSavingFailures, AFileThatCannotBeReadIsReplacedByMemory) {
 }
 
 TEST_F(AccountsManagerSavingFailures, WhereverAnOperationFailsTheFileIsTheOldOneOrTheWholeNewOne) {
-  for (std::size_t operation = 0; operation < operationsOfASave; ++operation) {
+  for (std::size_t operation = 0; operation < kOperationsOfASave; ++operation) {
     startAgain();
     device.fileSystem.failAt(device.fileSystem.operationCount() + operation);
     store->saveAllAccounts();
@@ -151,11 +151,11 @@ TEST_F(AccountsManagerSavingFailures, WhereverAnOperationFailsTheFileIsTheOldOne
 }
 
 TEST_F(AccountsManagerSavingFailures, WhereverTheWorldStopsTheFileIsTheOldOneOrTheWholeNewOne) {
-  for (std::size_t operation = 0; operation < operationsOfASave; ++operation) {
+  for (std::size_t operation = 0; operation < kOperationsOfASave; ++operation) {
     startAgain();
     device.fileSystem.stopAfter(device.fileSystem.operationCount() + operation);
     EXPECT_THROW(store->saveAllAccounts(), WorldStopped);
-    const bool isMoved = operation + 1 == operationsOfASave;
+    const bool isMoved = operation + 1 == kOperationsOfASave;
     EXPECT_EQ(device.fileSystem.contentsOf(kSettingsPath), isMoved ? after : before) << operation;
   }
 }
@@ -163,7 +163,7 @@ TEST_F(AccountsManagerSavingFailures, WhereverTheWorldStopsTheFileIsTheOldOneOrT
 TEST_F(AccountsManagerSavingFailures, ASaveWithoutFaultsHasSoManyOperations) {
   const std::size_t first = device.fileSystem.operationCount();
   store->saveAllAccounts();
-  EXPECT_EQ(device.fileSystem.operationCount() - first, operationsOfASave);
+  EXPECT_EQ(device.fileSystem.operationCount() - first, kOperationsOfASave);
   EXPECT_EQ(device.fileSystem.contentsOf(kSettingsPath), after);
 }
 

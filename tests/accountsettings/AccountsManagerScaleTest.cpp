@@ -21,13 +21,13 @@ class AccountsManagerScale : public StoreFixture {
   /// store included, are in proportion to the number.
   template <class Action>
   static void expectInProportion(const Action& action) {
-    constexpr std::size_t few = 1'000;
-    constexpr std::size_t many = 4 * few;
-    const std::uint64_t forFew = comparisonsIn([&] { action(few); });
-    const std::uint64_t forMany = comparisonsIn([&] { action(many); });
-    EXPECT_GT(forFew, few);
+    constexpr std::size_t kFew = 1'000;
+    constexpr std::size_t kMany = 4 * kFew;
+    const std::uint64_t forFew = comparisonsIn([&] { action(kFew); });
+    const std::uint64_t forMany = comparisonsIn([&] { action(kMany); });
+    EXPECT_GT(forFew, kFew);
     // A little more: tables grow by leaps, and what is sorted takes the logarithm besides.
-    EXPECT_LT(forMany, forFew * 5) << forFew << " comparisons for " << few << " accounts";
+    EXPECT_LT(forMany, forFew * 5) << forFew << " comparisons for " << kFew << " accounts";
   }
 
   static std::string name(std::string_view prefix, std::size_t number) {

@@ -7,7 +7,7 @@ namespace {
 
 using Lines = std::vector<std::string>;
 
-constexpr const char* firstUUID = "00000000-0000-0000-0000-000000000001";
+constexpr const char* kFirstUUID = "00000000-0000-0000-0000-000000000001";
 
 const PropertyDictionary complete = {
     {kAccountType, "Mail"}, {kAccountClass, "IMAPAccount"}, {kAccountIdentifier, "mail-1"}};
@@ -35,22 +35,22 @@ TEST(BasicAccountCreation, ADictionaryWithAnIdentifierGetsNoSyncIdentifier) {
 TEST(BasicAccountCreation, ADictionaryWithoutIdentifierGetsAFreshOneForSyncingToo) {
   FakeProcess device;
   const auto account = BasicAccount::initWithProperties(completeWithout(kAccountIdentifier));
-  EXPECT_EQ(account->identifier(), firstUUID);
-  EXPECT_EQ(account->syncStoreIdentifier(), firstUUID);
+  EXPECT_EQ(account->identifier(), kFirstUUID);
+  EXPECT_EQ(account->syncStoreIdentifier(), kFirstUUID);
 }
 
 TEST(BasicAccountCreation, AnExistingSyncIdentifierIsKeptBesideAFreshIdentifier) {
   FakeProcess device;
   const auto account = BasicAccount::initWithProperties(
       with(completeWithout(kAccountIdentifier), {{kAccountSyncIdentifier, "sync-1"}}));
-  EXPECT_EQ(account->identifier(), firstUUID);
+  EXPECT_EQ(account->identifier(), kFirstUUID);
   EXPECT_EQ(account->syncStoreIdentifier(), "sync-1");
 }
 
 TEST(BasicAccountCreation, AnIdentifierThatIsNoTextIsReplaced) {
   FakeProcess device;
   const auto account = BasicAccount::initWithProperties(with(complete, {{kAccountIdentifier, 17}}));
-  EXPECT_EQ(account->identifier(), firstUUID);
+  EXPECT_EQ(account->identifier(), kFirstUUID);
 }
 
 TEST(BasicAccountCreation, AnEmptyIdentifierIsKept) {
@@ -170,7 +170,7 @@ TEST(AccountIdentifiers, EachIsAFreshUUID) {
   FakeProcess device;
   const std::optional<Text> first = BasicAccount::createNewAccountUID();
   const std::optional<Text> second = BasicAccount::createNewAccountUID();
-  EXPECT_EQ(first, firstUUID);
+  EXPECT_EQ(first, kFirstUUID);
   EXPECT_NE(first, second);
 }
 

@@ -12,28 +12,28 @@
 namespace accounts {
 namespace {
 
-constexpr std::array toggleActions = {
+constexpr std::array kToggleActions = {
     &kDataclassToggleActionNone,           &kDataclassToggleActionKeepLocalData,
     &kDataclassToggleActionMergeLocalData, &kDataclassToggleActionDeleteLocalData,
     &kDataclassToggleActionMergeSyncData,  &kDataclassToggleActionDeleteSyncData};
-constexpr std::array deleteActions = {&kAccountDeleteActionMergeData,
-                                      &kAccountDeleteActionDeleteData};
+constexpr std::array kDeleteActions = {&kAccountDeleteActionMergeData,
+                                       &kAccountDeleteActionDeleteData};
 
-constexpr std::array allTypes = {&kSubscribedCalendarAccountType,
-                                 &kCalDAVAccountType,
-                                 &kCardDAVAccountType,
-                                 &kBookmarkDAVAccountType,
-                                 &kSMTPAccountType,
-                                 &kExchangeAccountType,
-                                 &kLDAPAccountType,
-                                 &kMailAccountType,
-                                 &kVelmoraAccountType,
-                                 &kGmailAccountType,
-                                 &kYahooAccountType,
-                                 &kOnMyDeviceAccountType,
-                                 &kIMAPNotesAccountType,
-                                 &kQuarxAccountType,
-                                 &kTolvaneIMAPAccountType};
+constexpr std::array kAllTypes = {&kSubscribedCalendarAccountType,
+                                  &kCalDAVAccountType,
+                                  &kCardDAVAccountType,
+                                  &kBookmarkDAVAccountType,
+                                  &kSMTPAccountType,
+                                  &kExchangeAccountType,
+                                  &kLDAPAccountType,
+                                  &kMailAccountType,
+                                  &kVelmoraAccountType,
+                                  &kGmailAccountType,
+                                  &kYahooAccountType,
+                                  &kOnMyDeviceAccountType,
+                                  &kIMAPNotesAccountType,
+                                  &kQuarxAccountType,
+                                  &kTolvaneIMAPAccountType};
 
 template <std::size_t count>
 void expectOnly(const PropertyDictionary& properties, std::string_view key,
@@ -59,10 +59,10 @@ bool supports(std::string_view type, std::string_view dataclass) {
 TEST(BundledAccountTypes, ThereAreExactlyTheFifteen) {
   FakeProcess device;
   const PropertyDictionary types = resource(device, "AccountTypesProperties");
-  for (const std::string_view* type : allTypes) {
+  for (const std::string_view* type : kAllTypes) {
     EXPECT_TRUE(types.contains(*type)) << *type;
   }
-  EXPECT_EQ(types.size(), allTypes.size());
+  EXPECT_EQ(types.size(), kAllTypes.size());
 }
 
 TEST(BundledAccountTypes, EveryListedDataclassIsAKnownOneAndListedOnce) {
@@ -84,16 +84,16 @@ TEST(BundledAccountTypes, EveryActionIsAKnownOne) {
   for (const auto& [type, value] : resource(device, "AccountTypesProperties")) {
     SCOPED_TRACE(type.view());
     const PropertyDictionary& properties = *value.asDictionary();
-    expectOnly(properties, kPropertiesEnableDataclassActions, toggleActions);
-    expectOnly(properties, kPropertiesDisableDataclassActions, toggleActions);
-    expectOnly(properties, kPropertiesDeleteAccountActions, deleteActions);
+    expectOnly(properties, kPropertiesEnableDataclassActions, kToggleActions);
+    expectOnly(properties, kPropertiesDisableDataclassActions, kToggleActions);
+    expectOnly(properties, kPropertiesDeleteAccountActions, kDeleteActions);
     EXPECT_NE(properties.find(kPropertiesShowRemindersSeparately)->asBoolean(), nullptr);
   }
 }
 
 TEST(BundledAccountTypes, EveryDataclassThatCanBeSwitchedOffersAnAction) {
   FakeProcess device;
-  for (const std::string_view* type : allTypes) {
+  for (const std::string_view* type : kAllTypes) {
     const PropertyArray supported = BasicAccount::supportedDataclassesForAccountType(*type).value();
     for (const PropertyValue& dataclass : supported) {
       const std::string_view name = *dataclass.asText();
@@ -107,7 +107,7 @@ TEST(BundledAccountTypes, EveryDataclassThatCanBeSwitchedOffersAnAction) {
 
 TEST(BundledAccountTypes, RemindersAreShownSeparatelyOnlyWhereTheyAreSupported) {
   FakeProcess device;
-  for (const std::string_view* type : allTypes) {
+  for (const std::string_view* type : kAllTypes) {
     if (BasicAccount::showRemindersSeparatelyForAccountType(*type)) {
       EXPECT_TRUE(supports(*type, kAccountDataclassReminders)) << *type;
     }

@@ -11,19 +11,19 @@
 namespace accounts {
 namespace {
 
-constexpr const char* languages[] = {"en", "de"};
+constexpr const char* kLanguages[] = {"en", "de"};
 
-constexpr const char* deviceLocalKeys[] = {"FROM_MY_COMPUTER_TYPE_DORSA",
-                                           "FROM_MY_COMPUTER_TYPE_DORSA_MID_SENTENCE",
-                                           "FROM_MY_COMPUTER_TYPE_PC",
-                                           "FROM_MY_COMPUTER_TYPE_PC_MID_SENTENCE",
-                                           "ON_MY_DEVICE_TYPE_HANDRA",
-                                           "ON_MY_DEVICE_TYPE_MID_SENTENCE_HANDRA",
-                                           "ON_YOUR_DEVICE_TYPE_MID_SENTENCE_HANDRA",
-                                           "SYNCED_WITH_YOUR_COMPUTER_TYPE_DORSA_MID_SENTENCE",
-                                           "SYNCED_WITH_YOUR_COMPUTER_TYPE_PC_MID_SENTENCE"};
-constexpr const char* managerKeys[] = {"SUBSCRIBED_CALENDAR_GROUP_TITLE",
-                                       "SUBSCRIBED_CALENDAR_GROUP_MID_SENTENCE_TITLE"};
+constexpr const char* kDeviceLocalKeys[] = {"FROM_MY_COMPUTER_TYPE_DORSA",
+                                            "FROM_MY_COMPUTER_TYPE_DORSA_MID_SENTENCE",
+                                            "FROM_MY_COMPUTER_TYPE_PC",
+                                            "FROM_MY_COMPUTER_TYPE_PC_MID_SENTENCE",
+                                            "ON_MY_DEVICE_TYPE_HANDRA",
+                                            "ON_MY_DEVICE_TYPE_MID_SENTENCE_HANDRA",
+                                            "ON_YOUR_DEVICE_TYPE_MID_SENTENCE_HANDRA",
+                                            "SYNCED_WITH_YOUR_COMPUTER_TYPE_DORSA_MID_SENTENCE",
+                                            "SYNCED_WITH_YOUR_COMPUTER_TYPE_PC_MID_SENTENCE"};
+constexpr const char* kManagerKeys[] = {"SUBSCRIBED_CALENDAR_GROUP_TITLE",
+                                        "SUBSCRIBED_CALENDAR_GROUP_MID_SENTENCE_TITLE"};
 
 /// The string table of a language; an empty one when the file is missing or no dictionary.
 PropertyDictionary stringTable(const std::string& language, const std::string& table) {
@@ -45,21 +45,21 @@ void expectTexts(const PropertyDictionary& table, const char* const (&keys)[coun
 }
 
 TEST(BundledStringTables, EveryLanguageHasEveryTextOfTheDeviceLocalAccount) {
-  for (const char* language : languages) {
+  for (const char* language : kLanguages) {
     SCOPED_TRACE(language);
-    expectTexts(stringTable(language, "DeviceLocalAccount"), deviceLocalKeys);
+    expectTexts(stringTable(language, "DeviceLocalAccount"), kDeviceLocalKeys);
   }
 }
 
 TEST(BundledStringTables, EveryLanguageHasEveryTextOfTheStore) {
-  for (const char* language : languages) {
+  for (const char* language : kLanguages) {
     SCOPED_TRACE(language);
-    expectTexts(stringTable(language, "AccountsManager"), managerKeys);
+    expectTexts(stringTable(language, "AccountsManager"), kManagerKeys);
   }
 }
 
 TEST(BundledStringTables, TextsWithinASentenceDifferFromThoseThatBeginOne) {
-  for (const char* language : languages) {
+  for (const char* language : kLanguages) {
     const PropertyDictionary texts = stringTable(language, "DeviceLocalAccount");
     EXPECT_NE(texts.textForKey("ON_MY_DEVICE_TYPE_HANDRA"),
               texts.textForKey("ON_MY_DEVICE_TYPE_MID_SENTENCE_HANDRA"))

@@ -9,10 +9,10 @@
 namespace accounts {
 namespace {
 
-constexpr const char* configurationResource = "DataclassesProperties";
+constexpr const char* kConfigurationResource = "DataclassesProperties";
 
 void configureContacts(FakePlatform& device, const PropertyDictionary& properties) {
-  device.bundleResources.replaced[configurationResource] =
+  device.bundleResources.replaced[kConfigurationResource] =
       PropertyDictionary{{kAccountDataclassContacts, properties}};
 }
 
@@ -58,7 +58,7 @@ TEST(DataclassConfiguration, MissingEntriesAnswerFalse) {
 
 TEST(DataclassConfiguration, AMissingResourceAnswersFalseWithoutAMessage) {
   FakeProcess device;
-  device.bundleResources.replaced[configurationResource] = std::nullopt;
+  device.bundleResources.replaced[kConfigurationResource] = std::nullopt;
 
   EXPECT_FALSE(BasicAccount::displayToggleForDataclass(kAccountDataclassContacts));
 
@@ -68,7 +68,7 @@ TEST(DataclassConfiguration, AMissingResourceAnswersFalseWithoutAMessage) {
 
 TEST(DataclassConfiguration, ItIsReadOnceEvenWhenItIsMissing) {
   FakeProcess device;
-  device.bundleResources.replaced[configurationResource] = std::nullopt;
+  device.bundleResources.replaced[kConfigurationResource] = std::nullopt;
   BasicAccount::displayToggleForDataclass(kAccountDataclassContacts);
   device.bundleResources.replaced.clear();
 
@@ -77,7 +77,7 @@ TEST(DataclassConfiguration, ItIsReadOnceEvenWhenItIsMissing) {
 
 TEST(DataclassConfiguration, ThePlainReadIsNotKept) {
   FakeProcess device;
-  device.bundleResources.replaced[configurationResource] = std::nullopt;
+  device.bundleResources.replaced[kConfigurationResource] = std::nullopt;
   EXPECT_EQ(BasicAccount::_dataclassesProperties(), std::nullopt);
 
   device.bundleResources.replaced.clear();
@@ -103,7 +103,7 @@ TEST(ToggleActions, ASingleStoreLosesTheLastKeepingOfLocalDataOnly) {
 
 TEST(ToggleActions, ADataclassThatIsNotConfiguredHasASingleStore) {
   FakeProcess device;
-  device.bundleResources.replaced[configurationResource] = PropertyDictionary();
+  device.bundleResources.replaced[kConfigurationResource] = PropertyDictionary();
   configureActions(device, kPropertiesEnableDataclassActions,
                    {"Keep Local Data", "Merge Local Data"});
   EXPECT_EQ(actionsToEnableContacts(), R"(["Merge Local Data"])");

@@ -9,7 +9,7 @@
 namespace accounts {
 namespace {
 
-constexpr const char* servicesResource = "MailServices";
+constexpr const char* kServicesResource = "MailServices";
 
 TEST(MailServices, TheBundleNamesEveryService) {
   FakeProcess device;
@@ -33,26 +33,26 @@ TEST(MailServices, TheyAreReadOnceAProcess) {
 
   EXPECT_EQ(&first, &second);
   const std::vector<std::string>& reads = device.bundleResources.reads;
-  EXPECT_EQ(std::count(reads.begin(), reads.end(), servicesResource), 1);
+  EXPECT_EQ(std::count(reads.begin(), reads.end(), kServicesResource), 1);
 }
 
 TEST(MailServicesDeathTest, AMissingResourceEndsTheProcess) {
   FakeProcess device;
-  device.bundleResources.replaced[servicesResource] = std::nullopt;
+  device.bundleResources.replaced[kServicesResource] = std::nullopt;
   EXPECT_DEATH(MailServices::current(), "MailServices: Could not find MailServices.plist");
 }
 
 TEST(MailServicesDeathTest, AnUnreadableResourceEndsTheProcess) {
   FakeProcess device;
-  device.bundleResources.unreadable.insert(servicesResource);
+  device.bundleResources.unreadable.insert(kServicesResource);
   EXPECT_DEATH(MailServices::current(), "MailServices: Could not load MailServices.plist");
 }
 
 TEST(MailServicesDeathTest, AMissingNameEndsTheProcessAndIsNamed) {
   FakeProcess device;
-  PropertyDictionary incomplete = *device.bundleResources.readPropertyList(servicesResource);
+  PropertyDictionary incomplete = *device.bundleResources.readPropertyList(kServicesResource);
   incomplete.remove("Yahoo IMAP Host");
-  device.bundleResources.replaced[servicesResource] = incomplete;
+  device.bundleResources.replaced[kServicesResource] = incomplete;
   EXPECT_DEATH(
       MailServices::current(),
       "MailServices: Malformed MailServices information. Could not find the Yahoo IMAP Host");
@@ -60,9 +60,9 @@ TEST(MailServicesDeathTest, AMissingNameEndsTheProcessAndIsNamed) {
 
 TEST(MailServicesDeathTest, AnEmptyNameCountsAsMissing) {
   FakeProcess device;
-  PropertyDictionary services = *device.bundleResources.readPropertyList(servicesResource);
+  PropertyDictionary services = *device.bundleResources.readPropertyList(kServicesResource);
   services.set("Gmail IMAP Host", "");
-  device.bundleResources.replaced[servicesResource] = services;
+  device.bundleResources.replaced[kServicesResource] = services;
   EXPECT_DEATH(MailServices::current(), "Could not find the Gmail IMAP Host");
 }
 

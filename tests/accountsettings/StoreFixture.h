@@ -94,7 +94,7 @@ inline std::string identifiersOf(const PropertyArray& elements) {
 }
 
 /// A fake device on which stores are made.
-class StoreFixture : public ::testing::Test {
+class StoreFixture : public testing::Test {
  protected:
   using Store = std::unique_ptr<AccountsManager>;
   using Lines = std::vector<std::string>;

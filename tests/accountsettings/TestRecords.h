@@ -13,7 +13,7 @@ namespace accounts {
 /// A list of dataclasses as a test reads it: the names without their common beginning, separated by
 /// blanks; whatever else a list holds as in a log line; "none" for no list at all.
 inline std::string shortNames(const std::optional<PropertyArray>& list) {
-  constexpr std::string_view commonBeginning = "com.quarx.Dataclass.";
+  constexpr std::string_view kCommonBeginning = "com.quarx.Dataclass.";
   if (!list) {
     return "none";
   }
@@ -22,7 +22,7 @@ inline std::string shortNames(const std::optional<PropertyArray>& list) {
     std::string name;
     appendDescription(name, member);
     names += names.empty() ? "" : " ";
-    names += name.starts_with(commonBeginning) ? name.substr(commonBeginning.size()) : name;
+    names += name.starts_with(kCommonBeginning) ? name.substr(kCommonBeginning.size()) : name;
   }
   return names;
 }

@@ -8,11 +8,11 @@
 namespace accounts {
 namespace {
 
-constexpr const char* domain = "com.quarx.mobile.tethered_sync";
+constexpr const char* kDomain = "com.quarx.mobile.tethered_sync";
 
 /// Makes a key of the pairing service name a source; the key "" is the domain as a whole.
 void syncWith(FakePlatform& device, const std::string& key, const PropertyValue& source) {
-  device.pairingValueStore.values.insert_or_assign({domain, key},
+  device.pairingValueStore.values.insert_or_assign({kDomain, key},
                                                    PropertyDictionary{{"SyncingOS", source}});
 }
 
@@ -28,7 +28,7 @@ TEST_P(TetheredSyncKeys, EachDataclassIsAskedForUnderItsKey) {
   DeviceLocalAccount::tetheredSourceForDataClass(GetParam().first);
   ASSERT_EQ(device.pairingValueStore.requests.size(), 1U);
   EXPECT_EQ(device.pairingValueStore.requests[0],
-            std::pair(std::string(domain), GetParam().second));
+            std::pair(std::string(kDomain), GetParam().second));
 }
 
 INSTANTIATE_TEST_SUITE_P(EachDataclass, TetheredSyncKeys,
@@ -67,9 +67,9 @@ TEST(TetheredSource, WithoutAValueTheDataIsOnTheDevice) {
 
 TEST(TetheredSource, AValueWithoutASystemsNameCountsAsNone) {
   FakeProcess device;
-  device.pairingValueStore.values.insert_or_assign({domain, "Contacts"}, "Windows");
+  device.pairingValueStore.values.insert_or_assign({kDomain, "Contacts"}, "Windows");
   EXPECT_EQ(sourceOfContacts(), "Handra");
-  device.pairingValueStore.values.insert_or_assign({domain, "Contacts"}, PropertyDictionary());
+  device.pairingValueStore.values.insert_or_assign({kDomain, "Contacts"}, PropertyDictionary());
   EXPECT_EQ(sourceOfContacts(), "Handra");
   syncWith(device, "Contacts", 7);
   EXPECT_EQ(sourceOfContacts(), "Handra");

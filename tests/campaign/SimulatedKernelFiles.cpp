@@ -136,11 +136,11 @@ int SimulatedKernel::setOwner(int descriptor, unsigned owner, unsigned group) {
   const int error = beginToChange("fchown", descriptor);
   if (error == 0) {
     const SimulatedInode& inode = disk_.inode(file(descriptor).inode);
-    constexpr unsigned asItIs = static_cast<unsigned>(-1);
+    constexpr unsigned kAsItIs = static_cast<unsigned>(-1);
     change({.kind = Kind::SetOwner,
             .inode = file(descriptor).inode,
-            .number = owner != asItIs ? owner : inode.owner,
-            .group = group != asItIs ? group : inode.group});
+            .number = owner != kAsItIs ? owner : inode.owner,
+            .group = group != kAsItIs ? group : inode.group});
   }
   return error;
 }

@@ -22,19 +22,19 @@ DeviceFiles OrdinaryDevice::make() {
     files.settings = settings(static_cast<int>(below(13)), std::move(accounts));
   }
   if (hasMailStore) {
-    constexpr std::array incoming = {
+    constexpr std::array kIncoming = {
         kIMAPAccountClass,  kPOPAccountClass,     kAOLAccountClass,    kGmailAccountClass,
         kYahooAccountClass, kVelmoraAccountClass, kMarrowAccountClass, kTolvaneIMAPAccountClass};
-    constexpr std::array outgoing = {kSMTPAccountClass, kDeliveryAccountClass};
+    constexpr std::array kOutgoing = {kSMTPAccountClass, kDeliveryAccountClass};
     std::vector<PropertyValue> in;
     std::vector<PropertyValue> out;
     for (unsigned count = below(3); count > 0; --count) {
       in.emplace_back(description(kLegacyMailIdentifier, kLegacyMailClass,
-                                  incoming[below(incoming.size())], kLegacyMailDisplayName));
+                                  kIncoming[below(kIncoming.size())], kLegacyMailDisplayName));
     }
     for (unsigned count = below(3); count > 0; --count) {
       out.emplace_back(description(kLegacyMailIdentifier, chance(80) ? kLegacyMailClass : "",
-                                   outgoing[below(outgoing.size())], kLegacyMailDisplayName));
+                                   kOutgoing[below(kOutgoing.size())], kLegacyMailDisplayName));
     }
     files.mail = mailStore(std::move(in), std::move(out));
   }

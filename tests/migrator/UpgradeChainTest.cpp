@@ -34,8 +34,8 @@ class UpgradeChainTest : public StepTest {
  protected:
   bool run() { return recorder._migrateNewAccountsInfo(*store); }
 
-  static constexpr auto chain = recordingChain(std::make_index_sequence<kUpgradeChain.size()>());
-  RecordingMigrator recorder{chain};
+  static constexpr auto kChain = recordingChain(std::make_index_sequence<kUpgradeChain.size()>());
+  RecordingMigrator recorder{kChain};
   using Versions = std::vector<std::uint64_t>;
   const Versions allVersions = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11};
 };
@@ -128,7 +128,7 @@ TEST_F(UpgradeChainTest, AStepThatFailsEndsTheChain) {
 }
 
 TEST_F(UpgradeChainTest, AChainWithoutAStepForTheVersionFails) {
-  RecordingMigrator lackingTheLast(std::span(chain).first(11));
+  RecordingMigrator lackingTheLast(std::span(kChain).first(11));
   addSettingsFile(11, {});
 
   EXPECT_FALSE(lackingTheLast._migrateNewAccountsInfo(*store));

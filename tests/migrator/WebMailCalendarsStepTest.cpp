@@ -10,11 +10,11 @@ class WebMailCalendarsStepTest : public StepTest {
   void runStep() { EXPECT_TRUE(migrator._migrateAccountsFrom7A242(*store)); }
   /// The identifiers in the channel's lines about deletions, one for each line.
   [[nodiscard]] TextList deletions() const {
-    constexpr std::string_view before = R"("Identifier":")";
+    constexpr std::string_view kBefore = R"("Identifier":")";
     TextList result;
     for (const std::string& line : device.logSystem.channel.lines) {
       if (line.starts_with("-[AccountsManager deleteAccount:]")) {
-        const std::size_t start = line.find(before) + before.size();
+        const std::size_t start = line.find(kBefore) + kBefore.size();
         result.push_back(line.substr(start, line.find('"', start) - start));
       }
     }
@@ -216,10 +216,10 @@ TEST_F(WebMailCalendarsStepTest, DeletionsForOneWebMailAccountAreInStoreOrder) {
 }
 
 TEST_F(WebMailCalendarsStepTest, EveryPairOfManyWebMailAndCalDAVAccountsWritesItsLine) {
-  constexpr std::size_t count = 50;
+  constexpr std::size_t kCount = 50;
   std::vector<PropertyValue> accounts;
   TextList calendars;
-  for (std::size_t number = 0; number < count; ++number) {
+  for (std::size_t number = 0; number < kCount; ++number) {
     accounts.emplace_back(gmail("G" + std::to_string(number), "jdoe"));
     calendars.push_back("C" + std::to_string(number));
     accounts.emplace_back(googleCalendar(calendars.back(), "jdoe"));
@@ -228,9 +228,9 @@ TEST_F(WebMailCalendarsStepTest, EveryPairOfManyWebMailAndCalDAVAccountsWritesIt
 
   runStep();
 
-  EXPECT_EQ(store->count(), count);
+  EXPECT_EQ(store->count(), kCount);
   TextList expected;
-  for (std::size_t number = 0; number < count; ++number) {
+  for (std::size_t number = 0; number < kCount; ++number) {
     expected.insert(expected.end(), calendars.begin(), calendars.end());
   }
   EXPECT_EQ(deletions(), expected);
@@ -238,9 +238,9 @@ TEST_F(WebMailCalendarsStepTest, EveryPairOfManyWebMailAndCalDAVAccountsWritesIt
 
 // Nothing is timed: with a walk through the store for each deletion this would take a minute.
 TEST_F(WebMailCalendarsStepTest, ADeletionThatNobodyReadsAboutCostsNoWalkThroughTheStore) {
-  constexpr std::size_t count = 2'000;
+  constexpr std::size_t kCount = 2'000;
   std::vector<PropertyValue> accounts;
-  for (std::size_t number = 0; number < count; ++number) {
+  for (std::size_t number = 0; number < kCount; ++number) {
     accounts.emplace_back(gmail("G" + std::to_string(number), "jdoe"));
     accounts.emplace_back(googleCalendar("C" + std::to_string(number), "jdoe"));
   }
@@ -249,7 +249,7 @@ TEST_F(WebMailCalendarsStepTest, ADeletionThatNobodyReadsAboutCostsNoWalkThrough
 
   runStep();
 
-  EXPECT_EQ(store->count(), count);
+  EXPECT_EQ(store->count(), kCount);
 }
 
 }  // namespace

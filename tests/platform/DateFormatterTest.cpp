@@ -13,7 +13,7 @@ using namespace std::chrono;
 // The pattern in the names of migration-information files.
 constexpr std::string_view kPattern = "Y-M-d-H-M-S";
 
-class DateFormatterTest : public ::testing::Test {
+class DateFormatterTest : public testing::Test {
  protected:
   DateFormatterTest() { useTimeZone("UTC0"); }
   ~DateFormatterTest() override { useTimeZone("UTC0"); }

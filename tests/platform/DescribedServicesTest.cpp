@@ -87,7 +87,7 @@ TEST(DescribedPairingValueStoreTest, WithoutPairingValuesConnectingFails) {
   EXPECT_FALSE(Device({{"PairingValues", "wrong kind"}}).pairing.connect());
 }
 
-class DescribedPairingValuesTest : public ::testing::Test {
+class DescribedPairingValuesTest : public testing::Test {
  protected:
   const PropertyDictionary calendars = {{"SyncingOS", "Windows"}};
   Device device{

@@ -15,7 +15,7 @@ namespace accounts {
 
 /// A small device image in a temporary directory of the host, and a directory beside it that
 /// nothing may reach from the device. Device paths given to its helpers start with "/".
-class DeviceFixture : public ::testing::Test {
+class DeviceFixture : public testing::Test {
  protected:
   DeviceFixture();
   ~DeviceFixture() override;

@@ -16,7 +16,7 @@
 namespace accounts {
 namespace {
 
-using ::testing::ExitedWithCode;
+using testing::ExitedWithCode;
 namespace fs = std::filesystem;
 
 class DeviceRootTest : public DeviceFixture {

@@ -100,7 +100,7 @@ TEST_F(FileSystemRenameTest, AFileWhoseContentsDoNotReachTheMediumIsNotMoved) {
         std::fprintf(stderr, "%s\n", result ? "renamed" : result.error().c_str());
         std::_Exit(0);
       },
-      ::testing::ExitedWithCode(0), "Cannot flush /new: Input/output error");
+      testing::ExitedWithCode(0), "Cannot flush /new: Input/output error");
   EXPECT_EQ(contentsOf("/new"), "new");
   EXPECT_EQ(contentsOf("/file"), "old");
 }

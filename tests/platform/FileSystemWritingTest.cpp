@@ -148,7 +148,7 @@ TEST_F(FileSystemWritingTest, WritingAtomicallyFailsWhenTheContentsDoNotReachThe
         std::fprintf(stderr, "%s\n", result ? "written" : result.error().c_str());
         std::_Exit(0);
       },
-      ::testing::ExitedWithCode(0), "Cannot write /directory/file: Input/output error");
+      testing::ExitedWithCode(0), "Cannot write /directory/file: Input/output error");
   EXPECT_EQ(contentsOf("/directory/file"), "old");
   EXPECT_EQ(namesIn("/directory"), std::vector<std::string>{"file"});
 }

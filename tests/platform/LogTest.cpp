@@ -51,9 +51,9 @@ TEST(ConsoleLogTest, ALineIsWrittenVerbatimInOneWrite) {
 }
 
 TEST(ConsoleLogTest, LinesGoToStandardErrorUnlessToldOtherwise) {
-  ::testing::internal::CaptureStderr();
+  testing::internal::CaptureStderr();
   LinuxConsoleLog().writeLine("Migrating accounts");
-  EXPECT_EQ(::testing::internal::GetCapturedStderr(), "Migrating accounts\n");
+  EXPECT_EQ(testing::internal::GetCapturedStderr(), "Migrating accounts\n");
 }
 
 TEST(ConsoleLogTest, AClosedOutputIsNoFailure) {
@@ -63,7 +63,7 @@ TEST(ConsoleLogTest, AClosedOutputIsNoFailure) {
         LinuxConsoleLog(-1).writeLine("unheard");
         std::_Exit(EXIT_SUCCESS);
       },
-      ::testing::ExitedWithCode(EXIT_SUCCESS), "");
+      testing::ExitedWithCode(EXIT_SUCCESS), "");
 }
 
 class LogSystemTest : public DeviceFixture {
@@ -110,9 +110,9 @@ TEST_F(LogSystemTest, ANewFileIsForItsOwnerAlone) {
 }
 
 TEST_F(LogSystemTest, AHyphenStandsForStandardError) {
-  ::testing::internal::CaptureStderr();
+  testing::internal::CaptureStderr();
   LinuxLogSystem(open("-")).makeChannel("one", "two").write({.text = "line"});
-  EXPECT_EQ(::testing::internal::GetCapturedStderr(), "[one:two] line\n");
+  EXPECT_EQ(testing::internal::GetCapturedStderr(), "[one:two] line\n");
 }
 
 TEST_F(LogSystemTest, AFileThatCannotBeMadeIsAnErrorWithItsPath) {

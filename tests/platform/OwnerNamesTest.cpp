@@ -118,7 +118,7 @@ TEST_F(OwnerNamesTest, TheRunningSystemIsAskedAheadForTheNameAlone) {
         std::_Exit((known.userIdentifier("root", error) == 0u ? 0 : 1) +
                    (unknown.userIdentifier("root", error) ? 2 : 0));
       },
-      ::testing::ExitedWithCode(0), "");
+      testing::ExitedWithCode(0), "");
 }
 
 TEST_F(OwnerNamesTest, TheRunningSystemAsksItsNameService) {
@@ -145,7 +145,7 @@ TEST_F(OwnerNamesTest, TheRunningSystemAsksItsNameServiceAndNotItsFiles) {
         const auto group = systemNames.groupIdentifier("root", error);
         std::_Exit((user ? 1 : 0) + (group ? 2 : 0));
       },
-      ::testing::ExitedWithCode(0), "");
+      testing::ExitedWithCode(0), "");
 }
 
 class SetOwnerTest : public DeviceFixture {

@@ -78,8 +78,8 @@ TEST_F(DriverResult, WithTheLockOfAFinishedMigrationItIsTrue) {
 }
 
 TEST_F(DriverResult, WhileAnotherProcessHoldsTheLockItIsWaitedFor) {
-  constexpr mode_t ownerOnly = 0600;
-  const int lock = open(onThisMachine(kLockPath).c_str(), O_CREAT | O_RDWR | O_CLOEXEC, ownerOnly);
+  constexpr mode_t kOwnerOnly = 0600;
+  const int lock = open(onThisMachine(kLockPath).c_str(), O_CREAT | O_RDWR | O_CLOEXEC, kOwnerOnly);
   ASSERT_EQ(flock(lock, LOCK_EX), 0);
   const std::filesystem::path lockFile = onThisMachine(kLockPath);
   if (!isLockListed(lockFile)) {

@@ -19,10 +19,10 @@ template <class Take>
 void forEachIdentifier(std::string_view bytes, const Take& take) {
   for (std::size_t hyphen = bytes.find('-'); hyphen != std::string_view::npos;
        hyphen = bytes.find('-', hyphen + 1)) {
-    constexpr std::size_t firstHyphen = kForm.find('-');
-    if (hyphen >= firstHyphen && isIdentifierAt(bytes, hyphen - firstHyphen)) {
-      take(bytes.substr(hyphen - firstHyphen, kForm.size()), hyphen - firstHyphen);
-      hyphen += kForm.size() - firstHyphen - 1;
+    constexpr std::size_t kFirstHyphen = kForm.find('-');
+    if (hyphen >= kFirstHyphen && isIdentifierAt(bytes, hyphen - kFirstHyphen)) {
+      take(bytes.substr(hyphen - kFirstHyphen, kForm.size()), hyphen - kFirstHyphen);
+      hyphen += kForm.size() - kFirstHyphen - 1;
     }
   }
 }

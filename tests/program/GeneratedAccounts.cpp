@@ -298,10 +298,10 @@ PropertyValue anyValue(Choices& choices) {
 }
 
 PropertyDictionary generatedSettings(Choices& choices) {
-  constexpr std::size_t versions = 14;
+  constexpr std::size_t kVersions = 14;
   PropertyDictionary root;
   if (!choices.oneIn(8)) {
-    root.set("Version", choices.below(versions));
+    root.set("Version", choices.below(kVersions));
   } else if (!choices.oneIn(3)) {
     root.set("Version", anyValue(choices));
   }

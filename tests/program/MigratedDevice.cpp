@@ -35,14 +35,14 @@ std::vector<std::string> splitLines(const std::string& text) {
 
 /// Bytes as a line that a person can read.
 std::string escapedBytes(std::string_view bytes) {
-  constexpr std::string_view digits = "0123456789abcdef";
+  constexpr std::string_view kDigits = "0123456789abcdef";
   std::string line;
   for (const char each : bytes) {
     const auto code = static_cast<unsigned char>(each);
     if (code >= 0x20 && code < 0x7f) {
       line += each;
     } else {
-      line.append("\\").append(1, digits[code >> 4]).append(1, digits[code & 15]);
+      line.append("\\").append(1, kDigits[code >> 4]).append(1, kDigits[code & 15]);
     }
   }
   return line;
@@ -71,9 +71,9 @@ std::string differencesOf(const Ending& first, const Ending& second) {
   const std::vector<std::string> other = linesOf(second);
   const auto [line, otherLine] = std::mismatch(one.begin(), one.end(), other.begin(), other.end());
   // Some lines before, which say what it is in.
-  constexpr std::ptrdiff_t shown = 12;
+  constexpr std::ptrdiff_t kShown = 12;
   std::string text;
-  for (auto each = line - std::min(shown, line - one.begin()); each != line; ++each) {
+  for (auto each = line - std::min(kShown, line - one.begin()); each != line; ++each) {
     text += "  " + each->substr(0, kLongestShown) + "\n";
   }
   const std::string here = line != one.end() ? *line : "";

@@ -19,8 +19,6 @@
 namespace accounts {
 namespace {
 
-using testing::BinaryFile;
-
 constexpr std::uint64_t kMebibyte = std::uint64_t{1} << 20;
 /// What one may take more than an ordinary file of its size.
 constexpr std::uint64_t kMostMemoryBeyond = 64 * kMebibyte;
@@ -46,7 +44,7 @@ std::string store(BinaryFile& file, std::size_t unknown, std::size_t padding) {
     return file.addContainer('\xD5', {type, identifier, otherIdentifier, otherType, key,
                                       add("CalDAV"), name, name, add("IMAPAccount"), unknown});
   }();
-  const std::size_t accounts = file.addContainer(testing::kArrayOfOne, {account});
+  const std::size_t accounts = file.addContainer(kArrayOfOne, {account});
   const std::size_t version = file.add("\x10\x03");
   file.addContainer('\xD4', {add("Accounts"), add("MailAccounts"), add("Version"), add("Unknown"),
                              accounts, accounts, version, add(std::string(padding, 'p'))});
@@ -59,7 +57,7 @@ std::string withDoublingArrays(std::size_t levels, std::size_t padding) {
   file.setOffsetSize(2);
   std::size_t array = file.add("\x09");
   for (std::size_t level = 0; level < levels; ++level) {
-    array = file.addContainer(testing::kArrayOfTwo, {array, array});
+    array = file.addContainer(kArrayOfTwo, {array, array});
   }
   return store(file, array, padding);
 }
@@ -93,7 +91,7 @@ std::string withOneAccountOften(std::size_t count, std::size_t padding) {
   const std::size_t type = add("Type");
   const std::size_t calDAV = add("CalDAV");
   const std::size_t children = add("ChildAccounts");
-  const std::size_t child = file.addContainer(testing::kDictionaryOfOne, {type, calDAV});
+  const std::size_t child = file.addContainer(kDictionaryOfOne, {type, calDAV});
   const std::string often = std::string{'\xAF', '\x10', static_cast<char>(count)};
   const std::size_t list = file.add(often + std::string(count, static_cast<char>(child)));
   const std::size_t account = file.addContainer('\xD2', {type, children, calDAV, list});
@@ -135,7 +133,7 @@ std::string largestReadable(const SmallFile& kind, std::size_t padding) {
 }
 
 class SmallFiles : public DeviceRootFixture,
-                   public ::testing::WithParamInterface<std::tuple<SmallFile, std::size_t>> {
+                   public testing::WithParamInterface<std::tuple<SmallFile, std::size_t>> {
  protected:
   SmallFiles() : DeviceRootFixture(Medium::Memory) {}
 
@@ -256,12 +254,11 @@ TEST_F(SmallResult, ThatCouldNotBeReadAgainIsNotWritten) {
 
 INSTANTIATE_TEST_SUITE_P(
     Kinds, SmallFiles,
-    ::testing::Combine(::testing::Values(SmallFile{"DoublingArrays", withDoublingArrays},
-                                         SmallFile{"DoublingDictionaries",
-                                                   withDoublingDictionaries},
-                                         SmallFile{"LongText", withLongText},
-                                         SmallFile{"OneAccountOften", withOneAccountOften}),
-                       ::testing::Values(0, 8000)),
+    testing::Combine(testing::Values(SmallFile{"DoublingArrays", withDoublingArrays},
+                                     SmallFile{"DoublingDictionaries", withDoublingDictionaries},
+                                     SmallFile{"LongText", withLongText},
+                                     SmallFile{"OneAccountOften", withOneAccountOften}),
+                     testing::Values(0, 8000)),
     [](const auto& information) {
       return std::get<SmallFile>(information.param).name + "And" +
              std::to_string(std::get<std::size_t>(information.param)) + "Bytes";

@@ -11,13 +11,13 @@ namespace accounts {
 namespace {
 
 bool isGeneratedIdentifier(std::string_view text) {
-  constexpr std::string_view form = "XXXXXXXX-XXXX-XXXX-XXXX-XXXXXXXXXXXX";
+  constexpr std::string_view kForm = "XXXXXXXX-XXXX-XXXX-XXXX-XXXXXXXXXXXX";
   const auto fits = [](char formCharacter, char character) {
     const bool isUpperCaseHexadecimal = std::isdigit(static_cast<unsigned char>(character)) != 0 ||
                                         (character >= 'A' && character <= 'F');
     return formCharacter == '-' ? character == '-' : isUpperCaseHexadecimal;
   };
-  return std::equal(form.begin(), form.end(), text.begin(), text.end(), fits);
+  return std::equal(kForm.begin(), kForm.end(), text.begin(), text.end(), fits);
 }
 
 /// Gives names to made-up identifiers in the order in which it meets them.

@@ -23,8 +23,8 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr int currentVersion = 12;
-constexpr const char* mailAutoFetchPath = "/var/mobile/Library/Mail/AutoFetchEnabled";
+constexpr int kCurrentVersion = 12;
+constexpr const char* kMailAutoFetchPath = "/var/mobile/Library/Mail/AutoFetchEnabled";
 
 fs::path versionsDirectory() {
   return fs::path(SOURCE_DIRECTORY) / "tests" / "fixtures" / "versions";
@@ -61,9 +61,9 @@ std::string joined(const std::vector<std::string>& lines) {
 /// Whether a line is as a fixture gives it. A fixture's line that ends with "…" leaves the rest,
 /// which the operating system words, open.
 bool isLine(const std::string& expected, const std::string& found) {
-  constexpr std::string_view openEnd = "…";
-  return expected.ends_with(openEnd)
-             ? found.starts_with(expected.substr(0, expected.size() - openEnd.size()))
+  constexpr std::string_view kOpenEnd = "…";
+  return expected.ends_with(kOpenEnd)
+             ? found.starts_with(expected.substr(0, expected.size() - kOpenEnd.size()))
              : found == expected;
 }
 
@@ -72,7 +72,7 @@ class StoredVersions : public DeviceRootFixture, public testing::WithParamInterf
  protected:
   StoredVersions() {
     copyOverRoot(directory() / "before");
-    writeText(mailAutoFetchPath, "");
+    writeText(kMailAutoFetchPath, "");
     for (const fs::directory_entry& entry :
          fs::recursive_directory_iterator(directory() / "before")) {
       if (entry.is_regular_file()) {
@@ -192,7 +192,7 @@ TEST_P(StoredVersions, EndWithABinaryFileOfTheCurrentVersion) {
   EXPECT_TRUE(isBinaryPropertyList(readText(kSettingsPath)));
   const PropertyDictionary settings = readDictionary(kSettingsPath);
   ASSERT_TRUE(settings.contains("Version"));
-  EXPECT_EQ(*settings.find("Version"), PropertyValue(currentVersion));
+  EXPECT_EQ(*settings.find("Version"), PropertyValue(kCurrentVersion));
   EXPECT_EQ(settings.size(), 2U) << "\"Version\" and \"Accounts\", nothing else";
 }
 
@@ -253,8 +253,8 @@ INSTANTIATE_TEST_SUITE_P(Device, StoredVersions,
 // Anna's device is there once for every version. Since each of its ends is what the migration gives
 // (EndWithTheAccountsThatAPersonDerived), equal ends say that all versions converge.
 TEST(StoredVersionsOfOneDevice, AllHaveTheSameEnd) {
-  const PropertyDictionary endOfCurrent = expectedSettings(std::to_string(currentVersion));
-  for (int version = 0; version < currentVersion; ++version) {
+  const PropertyDictionary endOfCurrent = expectedSettings(std::to_string(kCurrentVersion));
+  for (int version = 0; version < kCurrentVersion; ++version) {
     const std::vector<std::string> found =
         differences(endOfCurrent, expectedSettings(std::to_string(version)));
     EXPECT_TRUE(found.empty()) << "version " << version << ":\n" << joined(found);
@@ -262,7 +262,7 @@ TEST(StoredVersionsOfOneDevice, AllHaveTheSameEnd) {
 }
 
 TEST(StoredVersionsOfOneDevice, AreStoredUnderTheirVersion) {
-  for (int version = 0; version <= currentVersion; ++version) {
+  for (int version = 0; version <= kCurrentVersion; ++version) {
     const fs::path file = versionsDirectory() / std::to_string(version) / "before" /
                           fs::path(kSettingsPath).relative_path();
     const PropertyDictionary settings = dictionaryOfFile(file);

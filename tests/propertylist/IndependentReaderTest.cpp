@@ -53,7 +53,7 @@ std::string hexadecimal(std::string_view bytes) {
 
 std::string hexadecimal(double number) {
   std::string bytes;
-  testing::BinaryFile::appendNumber(bytes, std::bit_cast<std::uint64_t>(number), 8);
+  BinaryFile::appendNumber(bytes, std::bit_cast<std::uint64_t>(number), 8);
   return hexadecimal(bytes);
 }
 
@@ -90,7 +90,7 @@ std::string render(const PropertyValue& value) {
 
 /// What the independent reader makes of a file.
 std::string renderIndependently(const std::string& bytes) {
-  const std::string stem = ::testing::TempDir() + "independent-reader-" + std::to_string(getpid());
+  const std::string stem = testing::TempDir() + "independent-reader-" + std::to_string(getpid());
   const std::string file = stem + ".plist";
   const std::string script = stem + ".py";
   std::ofstream(file, std::ios::binary) << bytes;
@@ -114,7 +114,7 @@ std::string renderIndependently(const std::string& bytes) {
   return output;
 }
 
-class IndependentReader : public ::testing::Test {
+class IndependentReader : public testing::Test {
  protected:
   void SetUp() override {
     if (access(kPython, X_OK) != 0) {
@@ -124,22 +124,22 @@ class IndependentReader : public ::testing::Test {
 };
 
 TEST_F(IndependentReader, ReadsEveryKindAsItWasWritten) {
-  const PropertyValue value = testing::valueOfEveryKind();
+  const PropertyValue value = valueOfEveryKind();
 
-  EXPECT_EQ(renderIndependently(testing::writeBinary(value)), render(value));
+  EXPECT_EQ(renderIndependently(writeBinary(value)), render(value));
 }
 
 TEST_F(IndependentReader, ReadsEveryKindAsItWasWrittenInXML) {
-  const PropertyValue value = testing::valueOfEveryKindInXML();
+  const PropertyValue value = valueOfEveryKindInXML();
 
-  EXPECT_EQ(renderIndependently(testing::writeXML(value)), render(value));
+  EXPECT_EQ(renderIndependently(writeXML(value)), render(value));
 }
 
 TEST_F(IndependentReader, ReadsAwkwardTextsAsTheyWereWrittenInXML) {
   const PropertyValue value =
       PropertyArray{" ", "\r\n", "a\tb", "]]>", "&amp;", "<string>", "\xC2\x85", "\xE2\x80\xA8"};
 
-  EXPECT_EQ(renderIndependently(testing::writeXML(value)), render(value));
+  EXPECT_EQ(renderIndependently(writeXML(value)), render(value));
 }
 
 TEST_F(IndependentReader, ReadsAFileWithSharedContainersAndManyObjects) {
@@ -152,16 +152,16 @@ TEST_F(IndependentReader, ReadsAFileWithSharedContainersAndManyObjects) {
   }
   const PropertyValue value = PropertyDictionary{{"Version", 12}, {"Accounts", accounts}};
 
-  EXPECT_EQ(renderIndependently(testing::writeBinary(value)), render(value));
+  EXPECT_EQ(renderIndependently(writeBinary(value)), render(value));
 }
 
 TEST_F(IndependentReader, ReadsAnXMLFileAsWeDo) {
-  const std::string file = testing::inPropertyList(
+  const std::string file = inPropertyList(
       "<dict><key>a</key><integer>0x1F</integer><key>b</key><real>1.25</real>"
       "<key>c</key><date>2011-05-02T16:34:56Z</date><key>d</key><data>QUI= </data>"
       "<key>e</key><array><true/><string>B\xC3\xBCro &amp; co</string></array></dict>");
 
-  EXPECT_EQ(renderIndependently(file), render(testing::readXML(file)));
+  EXPECT_EQ(renderIndependently(file), render(readXML(file)));
 }
 
 }  // namespace

@@ -7,8 +7,6 @@
 namespace accounts {
 namespace {
 
-using testing::contains;
-
 std::string errorOfReading(std::string_view bytes) {
   PropertyListError error;
   EXPECT_FALSE(readPropertyList(bytes, error));
@@ -18,14 +16,14 @@ std::string errorOfReading(std::string_view bytes) {
 TEST(PropertyListFile, ABinaryFileIsRead) {
   PropertyListError error;
 
-  EXPECT_EQ(readPropertyList(testing::writeBinary(PropertyArray{1}), error),
+  EXPECT_EQ(readPropertyList(writeBinary(PropertyArray{1}), error),
             PropertyValue(PropertyArray{1}));
 }
 
 TEST(PropertyListFile, AnXMLFileIsRead) {
   PropertyListError error;
 
-  EXPECT_EQ(readPropertyList(testing::inPropertyList("<array><integer>1</integer></array>"), error),
+  EXPECT_EQ(readPropertyList(inPropertyList("<array><integer>1</integer></array>"), error),
             PropertyValue(PropertyArray{1}));
 }
 

@@ -4,7 +4,7 @@
 #include <cctype>
 #include <limits>
 
-namespace accounts::testing {
+namespace accounts {
 
 PropertyValue valueOfEveryKind() {
   using namespace std::string_literals;
@@ -54,17 +54,17 @@ PropertyValue nestedArrays(std::size_t depth) {
   return array;
 }
 
-::testing::AssertionResult contains(std::string_view text, std::string_view part) {
+testing::AssertionResult contains(std::string_view text, std::string_view part) {
   const auto isOfAWord = [](char each) {
     return std::isalnum(static_cast<unsigned char>(each)) != 0;
   };
   for (std::size_t at = text.find(part); at != text.npos; at = text.find(part, at + 1)) {
     const std::size_t end = at + part.size();
     if (end == text.size() || !isOfAWord(part.back()) || !isOfAWord(text[end])) {
-      return ::testing::AssertionSuccess();
+      return testing::AssertionSuccess();
     }
   }
-  return ::testing::AssertionFailure() << "\"" << text << "\" does not contain \"" << part << "\"";
+  return testing::AssertionFailure() << "\"" << text << "\" does not contain \"" << part << "\"";
 }
 
-}  // namespace accounts::testing
+}  // namespace accounts

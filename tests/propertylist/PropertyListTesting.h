@@ -12,7 +12,7 @@
 #include "propertylist/value/SerializedPropertyList.h"
 #include "propertylist/xml/XMLPropertyList.h"
 
-namespace accounts::testing {
+namespace accounts {
 
 inline constexpr double kInfinity = std::numeric_limits<double>::infinity();
 inline constexpr double kNaN = std::numeric_limits<double>::quiet_NaN();
@@ -166,6 +166,6 @@ PropertyValue valueOfEveryKindInXML();
 PropertyValue nestedArrays(std::size_t depth);
 
 /// Passes when the text contains the part, and its last word as a whole; prints both otherwise.
-::testing::AssertionResult contains(std::string_view text, std::string_view part);
+testing::AssertionResult contains(std::string_view text, std::string_view part);
 
-}  // namespace accounts::testing
+}  // namespace accounts

@@ -157,7 +157,7 @@ Visit visitPage(const std::string& html, const std::string& driver, const View& 
   const std::size_t end = result.output.find(kNotesEnd, start);
   if (start == std::string::npos || end == std::string::npos) {
     ADD_FAILURE() << "the driver did not come to its end; exit status " << result.exitStatus << "\n"
-                  << ::testing::PrintToString(visit.consoleLines);
+                  << testing::PrintToString(visit.consoleLines);
     return visit;
   }
   const std::size_t first = start + kNotesStart.size();
@@ -167,7 +167,7 @@ Visit visitPage(const std::string& html, const std::string& driver, const View& 
 
 nlohmann::json notedOn(const std::string& html, const std::string& driver, const View& view) {
   const Visit visit = visitPage(html, driver, view);
-  EXPECT_THAT(visit.consoleLines, ::testing::IsEmpty());
+  EXPECT_THAT(visit.consoleLines, testing::IsEmpty());
   return visit.noted;
 }
 

@@ -8,10 +8,10 @@
 namespace accounts {
 namespace {
 
-using ::testing::Contains;
-using ::testing::ElementsAre;
-using ::testing::HasSubstr;
-using ::testing::IsEmpty;
+using testing::Contains;
+using testing::ElementsAre;
+using testing::HasSubstr;
+using testing::IsEmpty;
 
 TEST(BrowserTest, WhatGoesWrongOnAPageIsSeen) {
   const Visit visit = visitPage(R"(<!DOCTYPE html>

@@ -9,8 +9,8 @@
 namespace accounts {
 namespace {
 
-using ::testing::HasSubstr;
-using ::testing::Not;
+using testing::HasSubstr;
+using testing::Not;
 
 constexpr std::string_view kReportStart = R"(<script type="application/json" id="report">)";
 

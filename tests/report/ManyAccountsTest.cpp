@@ -75,7 +75,7 @@ TEST(ManyAccountsTest, AreInGroupsThatAreBuiltWhenTheyAreOpenedAndFoundByTheFilt
   EXPECT_EQ(noted["found"], json({"IMAP 'Account 9876'", "IMAP 'Account 9876'"}));
   // 98, 980 to 989 and 9800 to 9899, and those whose identifier or user has the 98.
   EXPECT_THAT(noted["foundInGroups"].get<std::vector<std::string>>(),
-              ::testing::Contains("101 to 200"));
+              testing::Contains("101 to 200"));
 }
 
 TEST(ManyAccountsTest, AStepLeadsToAnAccountInAGroupThatWasNeverOpened) {

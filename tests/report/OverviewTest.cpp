@@ -58,18 +58,18 @@ TEST(OverviewTest, OneSentenceSaysWhatCameOfARunOrAPlan) {
       json::object(),
   }));
 
-  EXPECT_THAT(sentences,
-              ::testing::ElementsAre(
-                  "The accounts were migrated from version 3 to 12.",
-                  "The accounts were migrated to version 12.",
-                  "The migration succeeded and changed no account.",
-                  "The accounts were migrated; their version stays 12.",
-                  "The accounts were migrated; their version stays 12.",
-                  "The result could not be verified, so nothing was changed.",
-                  "The migration failed.", "The migration failed.",
-                  "A migration would bring the accounts up to date from version 3 to 12.",
-                  "A migration would change no account.", "A migration would fail.",
-                  "The migration failed."));
+  EXPECT_THAT(
+      sentences,
+      testing::ElementsAre("The accounts were migrated from version 3 to 12.",
+                           "The accounts were migrated to version 12.",
+                           "The migration succeeded and changed no account.",
+                           "The accounts were migrated; their version stays 12.",
+                           "The accounts were migrated; their version stays 12.",
+                           "The result could not be verified, so nothing was changed.",
+                           "The migration failed.", "The migration failed.",
+                           "A migration would bring the accounts up to date from version 3 to 12.",
+                           "A migration would change no account.", "A migration would fail.",
+                           "The migration failed."));
 }
 
 TEST(OverviewTest, ShowsTheFactsWarningsKeptInputsAndAnnouncements) {
@@ -87,8 +87,8 @@ TEST(OverviewTest, ShowsTheFactsWarningsKeptInputsAndAnnouncements) {
   EXPECT_EQ(noted["facts"], json({"Root/mnt/image", "Time2026-11-21 22:10:00 UTC", "Version3 → 12",
                                   "Took33 ms", "Exit status3"}));
   ASSERT_EQ(noted["notices"].size(), 3U);
-  EXPECT_THAT(noted["notices"][0].get<std::string>(), ::testing::StartsWith("Not carried over\n"));
-  EXPECT_THAT(noted["notices"][1].get<std::string>(), ::testing::StartsWith("Warning\n"));
+  EXPECT_THAT(noted["notices"][0].get<std::string>(), testing::StartsWith("Not carried over\n"));
+  EXPECT_THAT(noted["notices"][1].get<std::string>(), testing::StartsWith("Warning\n"));
   EXPECT_EQ(noted["notices"][2],
             "Kept inputs\n/var/mobile/Library/AccountMigration/Kept-20261121T221000Z");
   EXPECT_EQ(noted["announcements"], json({"com.quarx.mobilemail was told that MailAccounts changed",
@@ -137,8 +137,8 @@ TEST(OverviewTest, WithoutScriptsThePageSaysWhatToDo) {
                                 {.scripts = View::Scripts::forbidden});
 
   const std::string text = visit.noted.value("text", "");
-  EXPECT_THAT(text, ::testing::HasSubstr("needs JavaScript"));
-  EXPECT_THAT(text, ::testing::HasSubstr("--report FILE"));
+  EXPECT_THAT(text, testing::HasSubstr("needs JavaScript"));
+  EXPECT_THAT(text, testing::HasSubstr("--report FILE"));
 }
 
 TEST(OverviewTest, WithScriptsItDoesNot) {
@@ -146,7 +146,7 @@ TEST(OverviewTest, WithScriptsItDoesNot) {
     note("text", page.body.innerText);
   )js");
 
-  EXPECT_THAT(noted["text"].get<std::string>(), ::testing::Not(::testing::HasSubstr("JavaScript")));
+  EXPECT_THAT(noted["text"].get<std::string>(), testing::Not(testing::HasSubstr("JavaScript")));
 }
 
 }  // namespace

@@ -193,10 +193,10 @@ PropertyDictionary withChild(PropertyDictionary parent, std::size_t which,
 /// Every stored version, one of the future, none, and what is no number.
 constexpr std::size_t kVersions = 16;
 std::optional<PropertyValue> versionAt(std::size_t which) {
-  constexpr std::size_t versions = 14;
-  return which < versions    ? std::optional<PropertyValue>(which)
-         : which == versions ? std::nullopt
-                             : std::optional<PropertyValue>("5");
+  constexpr std::size_t kWithVersion = 14;
+  return which < kWithVersion    ? std::optional<PropertyValue>(which)
+         : which == kWithVersion ? std::nullopt
+                                 : std::optional<PropertyValue>("5");
 }
 PropertyDictionary settings(std::size_t version, PropertyArray accounts) {
   PropertyDictionary root = {{kPlistAccountsKey, std::move(accounts)}};
@@ -339,7 +339,7 @@ PropertyDictionary exchangeDescription(std::size_t deviation) {
 }
 
 void putSettingsBesideStores(SmallDevice& device, std::size_t which) {
-  constexpr std::size_t withoutAccounts = 3;
+  constexpr std::size_t kWithoutAccounts = 3;
   if (which == 0) {
     return;
   }
@@ -348,8 +348,8 @@ void putSettingsBesideStores(SmallDevice& device, std::size_t which) {
     return;
   }
   PropertyArray accounts;
-  if (which >= withoutAccounts) {
-    accounts.append(account("one", kKinds[which - withoutAccounts]));
+  if (which >= kWithoutAccounts) {
+    accounts.append(account("one", kKinds[which - kWithoutAccounts]));
   }
   put(device, DevicePlace::Settings, settings(0, std::move(accounts)));
 }

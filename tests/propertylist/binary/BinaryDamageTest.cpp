@@ -12,7 +12,7 @@ namespace {
 /// damaged at every byte.
 std::string smallFile() {
   using namespace std::string_literals;
-  return testing::writeBinary(PropertyDictionary{
+  return writeBinary(PropertyDictionary{
       {"array", PropertyArray{1, 300, 70'000, -1, ~std::uint64_t{0}, PropertyArray{}}},
       {"boolean", true},
       {"data", PropertyData("\x00\xFF"s)},
@@ -68,7 +68,7 @@ TEST(DamagedBinaryFile, WhatADamagedFileStillGivesCanBeWrittenAndReadAgain) {
     damaged[position] = static_cast<char>(damaged[position] ^ 1);
     PropertyListError error;
     if (const std::optional<PropertyValue> value = readBinaryPropertyList(damaged, error)) {
-      EXPECT_EQ(testing::readBinary(testing::writeBinary(*value)), *value);
+      EXPECT_EQ(readBinary(writeBinary(*value)), *value);
     }
   }
 }

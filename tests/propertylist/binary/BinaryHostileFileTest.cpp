@@ -12,13 +12,6 @@ namespace accounts {
 namespace {
 
 using namespace std::string_literals;
-using testing::BinaryFile;
-using testing::contains;
-using testing::errorOfReadingBinary;
-using testing::kArrayOfOne;
-using testing::kArrayOfTwo;
-using testing::kDictionaryOfOne;
-using testing::readBinary;
 
 /// Arrays in each other, four-byte references. The innermost is empty and the last object.
 std::string nestedArraysFile(std::size_t depth) {
@@ -56,8 +49,7 @@ TEST(HostileBinaryFile, AFileLargerThanTheLimitIsRefused) {
 }
 
 TEST(HostileBinaryFile, ContainersMayNestAsDeepAsTheLimit) {
-  EXPECT_EQ(readBinary(nestedArraysFile(kMaximumNestingDepth)),
-            testing::nestedArrays(kMaximumNestingDepth));
+  EXPECT_EQ(readBinary(nestedArraysFile(kMaximumNestingDepth)), nestedArrays(kMaximumNestingDepth));
 }
 
 TEST(HostileBinaryFile, ContainersNestedDeeperThanTheLimitAreRefused) {

@@ -13,14 +13,6 @@
 namespace accounts {
 namespace {
 
-using testing::BinaryFile;
-using testing::contains;
-using testing::errorOfReadingBinary;
-using testing::kArrayOfOne;
-using testing::kArrayOfTwo;
-using testing::kDictionaryOfOne;
-using testing::readBinary;
-
 /// Adds arrays of two, each twice in the next, and returns the number of the last. It stands for
 /// 2^depth - 1 values.
 std::size_t addDoublingArrays(BinaryFile& file, std::size_t depth) {

@@ -9,10 +9,6 @@
 namespace accounts {
 namespace {
 
-using testing::piecesOf;
-using testing::readBinary;
-using testing::writeBinary;
-
 /// A value whose file has several pieces: each kind of content that can be long goes over the end
 /// of one.
 PropertyValue largeValue() {

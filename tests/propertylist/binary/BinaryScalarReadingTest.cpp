@@ -11,11 +11,6 @@ namespace accounts {
 namespace {
 
 using namespace std::string_literals;
-using testing::BinaryFile;
-using testing::contains;
-using testing::errorOfReadingBinary;
-using testing::fileWithObject;
-using testing::readBinary;
 
 PropertyValue read(std::string_view object) {
   return readBinary(fileWithObject(object));
@@ -131,7 +126,7 @@ TEST(BinaryScalars, AnUnpairedUTF16UnitIsKeptAndWrittenBackAsItWas) {
   };
   for (const std::string& file : unpaired) {
     const PropertyValue value = readBinary(file);
-    const std::string written = testing::writeBinary(value);
+    const std::string written = writeBinary(value);
 
     const std::size_t objectSize = 1 + 2 * (static_cast<std::size_t>(file[8]) & 0xF);
     EXPECT_EQ(written.substr(8, objectSize), file.substr(8, objectSize));

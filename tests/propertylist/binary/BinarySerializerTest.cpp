@@ -11,12 +11,7 @@
 namespace accounts {
 namespace {
 
-using testing::contains;
-using testing::nestedArrays;
-using testing::readBinary;
-using testing::writeBinary;
-
-class BinarySerializer : public ::testing::Test {
+class BinarySerializer : public testing::Test {
  protected:
   bool serialize(const PropertyValue& value) {
     return static_cast<bool>(serializer_.serialize(value, error));
@@ -51,7 +46,7 @@ PropertyDictionary largeAccount() {
 }
 
 TEST_F(BinarySerializer, TheBytesAreThoseOfTheWriter) {
-  const PropertyValue value = testing::valueOfEveryKind();
+  const PropertyValue value = valueOfEveryKind();
   EXPECT_EQ(bytesFor(value), writeBinary(value));
 }
 

@@ -10,14 +10,6 @@ namespace accounts {
 namespace {
 
 using namespace std::string_literals;
-using testing::BinaryFile;
-using testing::contains;
-using testing::errorOfReadingBinary;
-using testing::fileWithObject;
-using testing::kArrayOfOne;
-using testing::kArrayOfTwo;
-using testing::kDictionaryOfOne;
-using testing::readBinary;
 
 constexpr std::uint64_t kHuge = std::numeric_limits<std::uint64_t>::max();
 constexpr char kDictionaryOfTwo = '\xD2';
@@ -261,7 +253,7 @@ TEST(BinaryStructure, AKeyThatIsNotASCIIIsRead) {
   BinaryFile file;
   const std::size_t key = file.add(std::string_view("\x62\x00\xFC\x20\xAC", 5));
   const std::size_t value = file.add("\x09");
-  file.addContainer(testing::kDictionaryOfOne, {key, value});
+  file.addContainer(kDictionaryOfOne, {key, value});
 
   EXPECT_EQ(readBinary(file.build()),
             PropertyValue(PropertyDictionary{{"\xC3\xBC\xE2\x82\xAC", true}}));
@@ -271,7 +263,7 @@ TEST(BinaryStructure, AKeyThatIsNotASCIIIsWrittenAndReadAgain) {
   const PropertyValue value = PropertyDictionary{
       {"B\xC3\xBCro", 1}, {"a", 2}, {"\xF0\x9F\x98\x80", PropertyDictionary{{"\xC3\xBC", 3}}}};
 
-  EXPECT_EQ(readBinary(testing::writeBinary(value)), value);
+  EXPECT_EQ(readBinary(writeBinary(value)), value);
 }
 
 }  // namespace

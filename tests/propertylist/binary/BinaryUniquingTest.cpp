@@ -12,10 +12,6 @@
 namespace accounts {
 namespace {
 
-using testing::objectCount;
-using testing::readBinary;
-using testing::writeBinary;
-
 PropertyArray arrayOf(PropertyValue value) {
   return PropertyArray({std::move(value)});
 }

@@ -11,11 +11,6 @@ namespace accounts {
 namespace {
 
 using namespace std::string_literals;
-using testing::contains;
-using testing::objectCount;
-using testing::readBinary;
-using testing::trailerNumber;
-using testing::writeBinary;
 
 std::string errorOfWriting(const PropertyValue& value) {
   PropertyListError error;
@@ -38,7 +33,7 @@ TEST(BinaryWriting, AFileIsLaidOutAsTheFormatSays) {
 }
 
 TEST(BinaryWriting, EveryKindIsReadBackAsItWas) {
-  const PropertyValue value = testing::valueOfEveryKind();
+  const PropertyValue value = valueOfEveryKind();
 
   const PropertyValue once = readBinary(writeBinary(value));
   const PropertyValue twice = readBinary(writeBinary(once));
@@ -48,7 +43,7 @@ TEST(BinaryWriting, EveryKindIsReadBackAsItWas) {
 }
 
 TEST(BinaryWriting, ReadingAndWritingAgainGivesTheSameBytes) {
-  const std::string file = writeBinary(testing::valueOfEveryKind());
+  const std::string file = writeBinary(valueOfEveryKind());
 
   EXPECT_TRUE(writeBinary(readBinary(file)) == file);
 }
@@ -157,18 +152,18 @@ TEST(BinaryWriting, ATextThatIsNoUTF8IsRefused) {
 }
 
 TEST(BinaryWriting, AValueAsDeepAsTheLimitIsWritten) {
-  const PropertyValue value = testing::nestedArrays(kMaximumNestingDepth);
+  const PropertyValue value = nestedArrays(kMaximumNestingDepth);
 
   EXPECT_EQ(readBinary(writeBinary(value)), value);
 }
 
 TEST(BinaryWriting, AValueDeeperThanTheLimitIsRefused) {
-  EXPECT_TRUE(contains(errorOfWriting(testing::nestedArrays(kMaximumNestingDepth + 1)),
+  EXPECT_TRUE(contains(errorOfWriting(nestedArrays(kMaximumNestingDepth + 1)),
                        "nested deeper than the limit"));
 }
 
 TEST(BinaryWriting, ASharedChildCountsWithItsWholeHeightWhereverItStands) {
-  const PropertyValue lower = testing::nestedArrays(kMaximumNestingDepth - 1);
+  const PropertyValue lower = nestedArrays(kMaximumNestingDepth - 1);
 
   EXPECT_EQ(readBinary(writeBinary(PropertyArray{lower, lower})),
             PropertyValue(PropertyArray{lower, lower}));

@@ -9,9 +9,6 @@
 namespace accounts {
 namespace {
 
-using testing::kInfinity;
-using testing::kNaN;
-
 TEST(Description, AppendsToWhatTheLineHolds) {
   std::string line = "value: ";
 

@@ -50,7 +50,7 @@ TEST(GeneralisedUTF8, IllFormedSequencesHaveNoLength) {
       // Longer than need be, and beyond the last code point.
       "\xE0\x9F\xBF", "\xF0\x8F\xBF\xBF", "\xF4\x90\x80\x80"};
   for (const std::string_view sequence : sequences) {
-    EXPECT_EQ(decodeCodePoint(sequence).length, 0U) << ::testing::PrintToString(sequence);
+    EXPECT_EQ(decodeCodePoint(sequence).length, 0U) << testing::PrintToString(sequence);
   }
 }
 

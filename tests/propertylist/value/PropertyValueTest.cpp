@@ -9,8 +9,6 @@
 namespace accounts {
 namespace {
 
-using testing::kNaN;
-
 TEST(PropertyValueKind, EveryContentHasItsKind) {
   EXPECT_EQ(PropertyValue(PropertyDictionary()).kind(), PropertyKind::Dictionary);
   EXPECT_EQ(PropertyValue(PropertyArray()).kind(), PropertyKind::Array);

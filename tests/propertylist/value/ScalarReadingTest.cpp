@@ -10,9 +10,6 @@
 namespace accounts {
 namespace {
 
-using testing::kInfinity;
-using testing::kNaN;
-
 constexpr std::int64_t kLargest = std::numeric_limits<std::int64_t>::max();
 constexpr std::int64_t kSmallest = std::numeric_limits<std::int64_t>::min();
 

@@ -10,8 +10,6 @@
 namespace accounts {
 namespace {
 
-using testing::piecesOf;
-
 /// Gives each text of an array as a piece.
 bool giveTexts(const PropertyValue& value, const SerializedPropertyList::Taker& take) {
   for (const PropertyValue& element : *value.asArray()) {

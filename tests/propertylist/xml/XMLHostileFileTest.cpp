@@ -7,10 +7,6 @@
 namespace accounts {
 namespace {
 
-using testing::contains;
-using testing::errorOfReadingXML;
-using testing::inPropertyList;
-
 std::string withDocumentType(std::string_view documentType, std::string_view content) {
   return "<?xml version=\"1.0\"?>\n<!DOCTYPE plist " + std::string(documentType) +
          ">\n<plist version=\"1.0\">" + std::string(content) + "</plist>\n";
@@ -22,7 +18,7 @@ TEST(HostileXMLFile, ADocumentTypeIsSkipped) {
   for (const char* documentType :
        {"", "SYSTEM \"PropertyList.dtd\"", "PUBLIC \"-//Q//DTD//EN\" \"http://q.example/p.dtd\"",
         "[<!ELEMENT plist ANY>]"}) {
-    EXPECT_EQ(testing::readXML(withDocumentType(documentType, "<true/>")), PropertyValue(true));
+    EXPECT_EQ(readXML(withDocumentType(documentType, "<true/>")), PropertyValue(true));
   }
 }
 
@@ -110,7 +106,7 @@ std::string sampleDocument() {
 
 TEST(HostileXMLFile, ADocumentCutOffAnywhereIsRefused) {
   const std::string document = sampleDocument();
-  ASSERT_EQ(testing::readXML(document).kind(), PropertyKind::Dictionary);
+  ASSERT_EQ(readXML(document).kind(), PropertyKind::Dictionary);
 
   // Only the line feed behind the last tag may be missing.
   for (std::size_t length = 0; length + 1 < document.size(); ++length) {

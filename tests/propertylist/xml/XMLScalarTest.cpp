@@ -8,18 +8,12 @@
 namespace accounts {
 namespace {
 
-using testing::contains;
-using testing::errorOfReadingXML;
-using testing::inPropertyList;
-using testing::kInfinity;
-using testing::kNaN;
-
 std::string element(std::string_view name, std::string_view content) {
   return "<" + std::string(name) + ">" + std::string(content) + "</" + std::string(name) + ">";
 }
 
 PropertyValue read(std::string_view name, std::string_view content) {
-  return testing::readXML(inPropertyList(element(name, content)));
+  return readXML(inPropertyList(element(name, content)));
 }
 
 void expectRefused(std::string_view name, std::string_view content) {
@@ -152,8 +146,8 @@ TEST(XMLScalars, ALongTextIsKeptWhole) {
 }
 
 TEST(XMLScalars, BooleansHoldNothing) {
-  EXPECT_EQ(testing::readXML(inPropertyList("<true/>")), PropertyValue(true));
-  EXPECT_EQ(testing::readXML(inPropertyList("<false></false>")), PropertyValue(false));
+  EXPECT_EQ(readXML(inPropertyList("<true/>")), PropertyValue(true));
+  EXPECT_EQ(readXML(inPropertyList("<false></false>")), PropertyValue(false));
   expectRefused("true", "yes");
 }
 

@@ -9,10 +9,6 @@ namespace accounts {
 namespace {
 
 using namespace std::string_literals;
-using testing::contains;
-using testing::errorOfReadingXML;
-using testing::inPropertyList;
-using testing::readXML;
 
 TEST(XMLStructure, AWholeDocument) {
   const PropertyValue value = readXML(R"(<?xml version="1.0" encoding="UTF-8"?>
@@ -96,7 +92,7 @@ TEST(XMLStructure, ContainersMayNestAsDeepAsTheLimit) {
     arrays = "<array>" + arrays + "</array>";
   }
 
-  EXPECT_EQ(readXML(inPropertyList(arrays)), testing::nestedArrays(kMaximumNestingDepth));
+  EXPECT_EQ(readXML(inPropertyList(arrays)), nestedArrays(kMaximumNestingDepth));
   EXPECT_TRUE(contains(errorOfReadingXML(inPropertyList("<array>" + arrays + "</array>")),
                        "nested deeper than the limit"));
 }

@@ -12,10 +12,6 @@
 namespace accounts {
 namespace {
 
-using testing::contains;
-using testing::readXML;
-using testing::writeXML;
-
 std::string errorOfWritingXML(const PropertyValue& value) {
   PropertyListError error;
   EXPECT_FALSE(writeXMLPropertyList(value, error));
@@ -28,7 +24,7 @@ void expectKept(const PropertyValue& value) {
 }
 
 TEST(XMLWriting, EveryKindIsReadAsItWasWritten) {
-  expectKept(testing::valueOfEveryKindInXML());
+  expectKept(valueOfEveryKindInXML());
 }
 
 TEST(XMLWriting, AFileIsIndentedWithItsKeysInOrder) {
@@ -141,11 +137,11 @@ TEST(XMLWriting, AnErrorNamesThePlaceByKeysAndIndexes) {
 }
 
 TEST(XMLWriting, ContainersAsDeepAsTheLimitAreKept) {
-  expectKept(testing::nestedArrays(kMaximumNestingDepth));
+  expectKept(nestedArrays(kMaximumNestingDepth));
 }
 
 TEST(XMLWriting, ContainersDeeperThanTheLimitAreRefused) {
-  EXPECT_TRUE(contains(errorOfWritingXML(testing::nestedArrays(kMaximumNestingDepth + 1)),
+  EXPECT_TRUE(contains(errorOfWritingXML(nestedArrays(kMaximumNestingDepth + 1)),
                        "nested deeper than the limit"));
 }
 
