@@ -5,6 +5,7 @@
 #include <link.h>
 
 #include <algorithm>
+#include <bit>
 #include <cstdint>
 
 namespace accounts {
@@ -21,7 +22,7 @@ struct SymbolTables {
 SymbolTables tablesOf(const ElfW(Dyn) * entry) {
   SymbolTables tables;
   for (; entry->d_tag != DT_NULL; ++entry) {
-    const auto address = reinterpret_cast<const void*>(entry->d_un.d_ptr);
+    const auto* const address = std::bit_cast<const void*>(entry->d_un.d_ptr);
     switch (entry->d_tag) {
       case DT_SYMTAB:
         tables.symbols = static_cast<const ElfW(Sym)*>(address);
@@ -64,7 +65,7 @@ std::uint32_t countIn(const std::uint32_t* table) {
 
 std::vector<std::string> exportedSymbols(void* handle) {
   link_map* library = nullptr;
-  if (dlinfo(handle, RTLD_DI_LINKMAP, &library) != 0) {
+  if (dlinfo(handle, RTLD_DI_LINKMAP, static_cast<void*>(&library)) != 0) {
     return {};
   }
   const SymbolTables tables = tablesOf(library->l_ld);
