@@ -1,9 +1,12 @@
 #include <fcntl.h>
+#include <sys/file.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <cstring>
 #include <filesystem>
 
+#include "platform/linux/FileDescriptor.h"
 #include "tests/program/DeviceTree.h"
 #include "tests/program/ExitStatuses.h"
 #include "tests/program/Programs.h"
@@ -187,6 +190,31 @@ TEST_F(Restore, BringsBackBytesOwnersModesAndTimesOfAllThatARunReplacesOrRemoves
     EXPECT_EQ(statusOf(each).st_mtim.tv_sec, 1000000000 + ++mode) << each;
     EXPECT_EQ(statusOf(each).st_mtim.tv_nsec, 123456789) << each;
   }
+}
+
+TEST_F(Restore, PutsBackWhatWasInAnotherHome) {
+  std::filesystem::remove_all(onThisMachine(kAccountMigration));
+  write(kSettingsPath, accountSettings(12));
+  const std::string home = "/home/ada";
+  const std::string mail = home + std::string(kLegacyMailPath).substr(strlen("/var/mobile"));
+  std::filesystem::create_directories(onThisMachine(home + "/Library/Preferences"));
+  write(mail, legacyMail());
+  ASSERT_EQ(migrate({"--home", home, "--keep"}).exitStatus, 0);
+  ASSERT_FALSE(exists(mail));
+
+  EXPECT_EQ(restore({"--home", home}).exitStatus, 0);
+
+  EXPECT_TRUE(exists(mail));
+  EXPECT_FALSE(exists(kLegacyMailPath));
+}
+
+TEST_F(Restore, ChangesNothingWhileAMigrationHoldsItsLock) {
+  const FileDescriptor lock(open(onThisMachine(kLockPath).c_str(), O_RDWR | O_CLOEXEC));
+  ASSERT_EQ(flock(lock.number(), LOCK_EX), 0);
+
+  expectRefused(restore({"--lock-timeout", "0"}), kMayPass,
+                "Another process has had the migration lock for 0 seconds");
+  EXPECT_EQ(restore({"--list"}).exitStatus, 0);
 }
 
 TEST_F(Restore, EndsWhatWouldTakeTheStoresForConvertedOnes) {
