@@ -36,6 +36,17 @@ constexpr std::uint64_t maximumExpandedValueCount(std::size_t fileSize) {
   return std::min<std::uint64_t>(kMaximumExpandedValueCount, kOfAnyFile + fileSize);
 }
 
+/// How often a binary file of a size may reach a container again that it has reached before,
+/// counted in the same way. An account's dictionary is its own, and takes as much of everybody's
+/// time as a hundred values: an array of one of them would stand for as many accounts as it has
+/// bytes. What accounts do share, lists of dataclasses above all, comes to one container in 20
+/// bytes at most.
+constexpr std::uint64_t maximumRepeatedContainerCount(std::size_t fileSize) {
+  constexpr std::uint64_t kOfAnyFile = std::uint64_t{1} << 12;
+  constexpr std::uint64_t kBytesForEach = 8;
+  return kOfAnyFile + fileSize / kBytesForEach;
+}
+
 /// See `kMaximumExpandedValueCount`: together they hold the texts of one value to a gibibyte.
 inline constexpr std::uint64_t kBytesPerExpandedValue = 64;
 

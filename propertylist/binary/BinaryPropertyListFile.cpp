@@ -212,7 +212,8 @@ bool giveFile(const PropertyValue& value, const SerializedPropertyList::Taker& t
   putTableAndTrailer(output, offsets, referenceSize);
   output.passOn();
   return !output.isRefused() &&
-         objects.expandedCount() <= maximumExpandedValueCount(output.count());
+         objects.expandedCount() <= maximumExpandedValueCount(output.count()) &&
+         objects.repeatedContainerCount() <= maximumRepeatedContainerCount(output.count());
 }
 
 }  // namespace accounts::binaryplist

@@ -94,6 +94,8 @@ void Objects::leaveContainer(bool isDictionary, std::size_t firstPending) {
                            .firstReference = static_cast<std::uint32_t>(references_.size()),
                            .referenceCount = static_cast<std::uint32_t>(own.size())});
     references_.insert(references_.end(), own.begin(), own.end());
+  } else {
+    ++repeatedContainerCount_;
   }
   pending_.resize(firstPending);
   pending_.push_back(found | kContainerBit);

@@ -50,6 +50,8 @@ class Objects {
 
   /// How many values the value stands for, as `maximumExpandedValueCount` has it.
   [[nodiscard]] std::uint64_t expandedCount() const { return expandedCount_; }
+  /// How often a container is reached again, as `maximumRepeatedContainerCount` has it.
+  [[nodiscard]] std::uint64_t repeatedContainerCount() const { return repeatedContainerCount_; }
   [[nodiscard]] std::size_t count() const { return scalars_.size() + containers_.size(); }
   [[nodiscard]] const std::vector<Scalar>& scalars() const { return scalars_; }
   [[nodiscard]] const std::vector<Container>& containers() const { return containers_; }
@@ -71,6 +73,7 @@ class Objects {
   /// References of the containers that are being walked, the innermost one's last.
   std::vector<Reference> pending_;
   std::uint64_t expandedCount_ = 0;
+  std::uint64_t repeatedContainerCount_ = 0;
 };
 
 }  // namespace accounts::binaryplist

@@ -26,8 +26,9 @@ struct Layout {
   std::size_t referenceSize = 0;
   std::size_t objectCount = 0;
   std::uint32_t topObject = 0;
-  /// How many values the file may stand for.
+  /// How many values the file may stand for, and how often it may reach a container again.
   std::uint64_t mostValues = 0;
+  std::uint64_t mostRepeatedContainers = 0;
 };
 
 bool readTrailer(std::string_view bytes, Layout& layout, PropertyListError& error) {
@@ -67,6 +68,7 @@ bool readTrailer(std::string_view bytes, Layout& layout, PropertyListError& erro
   layout.objectCount = static_cast<std::size_t>(objectCount);
   layout.topObject = static_cast<std::uint32_t>(topObject);
   layout.mostValues = maximumExpandedValueCount(bytes.size());
+  layout.mostRepeatedContainers = maximumRepeatedContainerCount(bytes.size());
   return true;
 }
 
@@ -104,15 +106,23 @@ class Reader {
   static_assert(kMaximumObjectCount <= std::size_t{1} << 32);
 
   enum class State : std::uint8_t { Unread, Open, Text, OtherValue };
+  static constexpr int kBitsOfACount = 25;
+  static constexpr std::uint64_t kCountMask = (std::uint64_t{1} << kBitsOfACount) - 1;
+  static_assert(kMaximumExpandedValueCount + 1 <= kCountMask);
+  static constexpr std::uint64_t kHeightMask = (1U << 10) - 1;
+  static_assert(kMaximumNestingDepth <= kHeightMask);
 
   struct Object {
     /// Where the object was made: a `Text` or, of other values, a `PropertyValue`.
     const void* place = nullptr;
-    std::uint32_t expandedCount = 0;
+    /// How many values, and containers among them, the object stands for.
+    std::uint64_t expandedCount : kBitsOfACount = 0;
+    std::uint64_t containerCount : kBitsOfACount = 0;
     /// 0 of a scalar, of a container one more than its highest child's.
-    std::uint16_t height = 0;
-    State state = State::Unread;
+    std::uint64_t height : 10 = 0;
+    State state : 2 = State::Unread;
   };
+  static_assert(sizeof(Object) == 16, "there are millions of them");
 
   /// The keys of all dictionaries that refer to the same objects for them.
   struct DictionaryKeys {
@@ -138,6 +148,7 @@ class Reader {
     const char* nextChild = nullptr;
     const char* endOfChildren = nullptr;
     std::uint64_t expandedCount = 1;
+    std::uint64_t containerCount = 1;
   };
 
   bool fail(std::string_view what, std::size_t offset) { return failAt(error_, what, offset); }
@@ -205,7 +216,8 @@ class Reader {
   /// Adds the next child to a container and returns it in its place.
   static const PropertyValue& add(Container& container, const Object& object, PropertyValue value) {
     container.expandedCount += object.expandedCount;
-    container.height = std::max(container.height, std::uint32_t{object.height} + 1);
+    container.containerCount += object.containerCount;
+    container.height = std::max(container.height, static_cast<std::uint32_t>(object.height) + 1);
     return container.hasValues ? container.values.append(std::move(value))
                                : container.elements.append(std::move(value));
   }
@@ -283,8 +295,8 @@ class Reader {
       return std::nullopt;
     }
     // Long enough encodings alone stand for more values than one.
-    object.expandedCount = static_cast<std::uint32_t>(
-        std::min(kMaximumExpandedValueCount + 1, 1 + expandedCountOf(*value)));
+    object.expandedCount =
+        std::min(kMaximumExpandedValueCount + 1, 1 + expandedCountOf(*value)) & kCountMask;
     return value;
   }
 
@@ -328,6 +340,7 @@ class Reader {
         return false;
       }
     }
+    ++distinctContainers_;
     objects_[reference].state = State::Open;
     Container& container = openContainers_.emplace_back();
     container.hasValues = isDictionary && keys->list.isOrdered();
@@ -353,13 +366,18 @@ class Reader {
       return fail("a container that stands for more values than a file of this size may",
                   closed.offset);
     }
+    if (closed.containerCount > layout_.mostRepeatedContainers + distinctContainers_) {
+      return fail("a container that repeats more containers than a file of this size may",
+                  closed.offset);
+    }
     // A child that was read before, at a lower level, may be too high for this one.
     if (closed.height > kMaximumNestingDepth) {
       return fail("containers nested deeper than the limit", closed.offset);
     }
     Object& object = objects_[closed.object];
-    object.expandedCount = static_cast<std::uint32_t>(closed.expandedCount);
-    object.height = static_cast<std::uint16_t>(closed.height);
+    object.expandedCount = closed.expandedCount & kCountMask;
+    object.containerCount = closed.containerCount & kCountMask;
+    object.height = closed.height & kHeightMask;
     notePlace(object, add(openContainers_.back(), object, valueOf(closed)));
     return true;
   }
@@ -380,6 +398,7 @@ class Reader {
   PropertyListError& error_;
   ScalarReader scalars_;
   std::size_t bytesRead_ = 0;
+  std::uint64_t distinctContainers_ = 0;
   std::vector<Object> objects_;
   std::vector<Container> openContainers_;
   std::deque<DictionaryKeys> keys_;

@@ -54,7 +54,7 @@ std::string store(BinaryFile& file, std::size_t unknown, std::size_t padding) {
 /// Each level holds the one below twice.
 std::string withDoublingArrays(std::size_t levels, std::size_t padding) {
   BinaryFile file;
-  file.setOffsetSize(2);
+  file.setOffsetSize(3);
   std::size_t array = file.add("\x09");
   for (std::size_t level = 0; level < levels; ++level) {
     array = file.addContainer(kArrayOfTwo, {array, array});
@@ -64,7 +64,7 @@ std::string withDoublingArrays(std::size_t levels, std::size_t padding) {
 
 std::string withDoublingDictionaries(std::size_t levels, std::size_t padding) {
   BinaryFile file;
-  file.setOffsetSize(2);
+  file.setOffsetSize(3);
   const std::size_t first = file.add(text("Password"));
   const std::size_t second = file.add(text("Identifier"));
   std::size_t dictionary = file.add("\x09");
@@ -77,7 +77,7 @@ std::string withDoublingDictionaries(std::size_t levels, std::size_t padding) {
 /// An array that holds a long text as often as its length is.
 std::string withLongText(std::size_t length, std::size_t padding) {
   BinaryFile file;
-  file.setOffsetSize(2);
+  file.setOffsetSize(3);
   const std::size_t content = file.add(text(std::string(length, 'T')));
   std::string array = {'\xAF', '\x11', static_cast<char>(length >> 8), static_cast<char>(length)};
   return store(file, file.add(array.append(length, static_cast<char>(content))), padding);
@@ -86,7 +86,7 @@ std::string withLongText(std::size_t length, std::size_t padding) {
 /// An account that its store holds many times, with children of the same kind.
 std::string withOneAccountOften(std::size_t count, std::size_t padding) {
   BinaryFile file;
-  file.setOffsetSize(2);
+  file.setOffsetSize(3);
   const auto add = [&file](std::string_view content) { return file.add(text(content)); };
   const std::size_t type = add("Type");
   const std::size_t calDAV = add("CalDAV");
@@ -102,17 +102,54 @@ std::string withOneAccountOften(std::size_t count, std::size_t padding) {
   return file.build();
 }
 
-/// One account, with a text for the rest.
+/// What is no account, again and again.
+std::string withNoAccountOften(std::size_t count, std::size_t padding) {
+  BinaryFile file;
+  file.setOffsetSize(3);
+  const auto add = [&file](std::string_view content) { return file.add(text(content)); };
+  std::string list = "\xAF\x12";
+  BinaryFile::appendNumber(list, count, 4);
+  const std::size_t nothing = file.addContainer('\xD0', {});
+  const std::size_t accounts = file.add(list.append(count, static_cast<char>(nothing)));
+  const std::size_t version = file.add("\x10\x03");
+  file.addContainer('\xD4', {add("Accounts"), add("MailAccounts"), add("Version"), add("Unknown"),
+                             accounts, accounts, version, add(std::string(padding, 'p'))});
+  return file.build();
+}
+
+/// As many accounts as a file of a size can have if each has bytes of its own.
 std::string ordinaryFile(std::size_t size) {
   BinaryFile file;
-  file.setOffsetSize(2);
-  return store(file, file.add("\x09"), size);
+  file.setOffsetSize(3);
+  file.setReferenceSize(2);
+  const auto container = [&file](std::string marker, const std::vector<std::size_t>& references) {
+    for (const std::size_t reference : references) {
+      BinaryFile::appendNumber(marker, reference, 2);
+    }
+    return file.add(marker);
+  };
+  const std::size_t type = file.add(text("Type"));
+  const std::size_t calDAV = file.add(text("CalDAV"));
+  constexpr std::size_t kSizeOfAnAccount = 10;
+  std::vector<std::size_t> accounts;
+  for (std::size_t count = 0; count < size / kSizeOfAnAccount; ++count) {
+    accounts.push_back(container("\xD1", {type, calDAV}));
+  }
+  std::string list = "\xAF\x12";
+  BinaryFile::appendNumber(list, accounts.size(), 4);
+  const std::size_t all = container(list, accounts);
+  const std::size_t key = file.add(text("Accounts"));
+  const std::size_t version = file.add(text("Version"));
+  container("\xD2", {key, version, all, file.add("\x10\x03")});
+  return file.build();
 }
 
 struct SmallFile {
   std::string name;
   /// One that stands for the more the larger the number is, and that has so many bytes besides.
   std::function<std::string(std::size_t number, std::size_t padding)> make;
+  /// The largest number that it can be made for.
+  std::size_t most = 0;
 };
 
 void PrintTo(const SmallFile& file, std::ostream* stream) {
@@ -121,15 +158,17 @@ void PrintTo(const SmallFile& file, std::ostream* stream) {
 
 /// The largest of them that is read.
 std::string largestReadable(const SmallFile& kind, std::size_t padding) {
-  std::string largest;
-  PropertyListError error;
-  for (std::size_t number = 1;; ++number) {
-    std::string file = kind.make(number, padding);
-    if (number > 4000 || !readBinaryPropertyList(file, error)) {
-      return largest;
-    }
-    largest = std::move(file);
+  const auto isRead = [&](std::size_t number) {
+    PropertyListError error;
+    return readBinaryPropertyList(kind.make(number, padding), error).has_value();
+  };
+  std::size_t read = 1;
+  std::size_t refused = kind.most + 1;
+  while (refused - read > 1) {
+    const std::size_t between = read + (refused - read) / 2;
+    (isRead(between) ? read : refused) = between;
   }
+  return kind.make(read, padding);
 }
 
 class SmallFiles : public DeviceRootFixture,
@@ -252,17 +291,28 @@ TEST_F(SmallResult, ThatCouldNotBeReadAgainIsNotWritten) {
   EXPECT_EQ(readText(kSettingsPath), settings);
 }
 
+std::string nameOf(const testing::TestParamInfo<std::tuple<SmallFile, std::size_t>>& information) {
+  const auto& [file, padding] = information.param;
+  return file.name + "And" + std::to_string(padding) + "Bytes";
+}
+
+const SmallFile kNoAccountOften = {"NoAccountOften", withNoAccountOften, 1'000'000};
+
 INSTANTIATE_TEST_SUITE_P(
     Kinds, SmallFiles,
-    testing::Combine(testing::Values(SmallFile{"DoublingArrays", withDoublingArrays},
-                                     SmallFile{"DoublingDictionaries", withDoublingDictionaries},
-                                     SmallFile{"LongText", withLongText},
-                                     SmallFile{"OneAccountOften", withOneAccountOften}),
-                     testing::Values(0, 8000)),
-    [](const auto& information) {
-      return std::get<SmallFile>(information.param).name + "And" +
-             std::to_string(std::get<std::size_t>(information.param)) + "Bytes";
-    });
+    testing::Combine(
+        testing::Values(SmallFile{"DoublingArrays", withDoublingArrays, 200},
+                        SmallFile{"DoublingDictionaries", withDoublingDictionaries, 200},
+                        SmallFile{"LongText", withLongText, 65'535},
+                        SmallFile{"OneAccountOften", withOneAccountOften, 255}, kNoAccountOften),
+        testing::Values(0, 8'000)),
+    nameOf);
+
+// What takes most of a command's work for its size, in a file that is not so small.
+INSTANTIATE_TEST_SUITE_P(Larger, SmallFiles,
+                         testing::Combine(testing::Values(kNoAccountOften),
+                                          testing::Values(kWithSanitizers ? 16'000 : 50'000)),
+                         nameOf);
 
 }  // namespace
 }  // namespace accounts

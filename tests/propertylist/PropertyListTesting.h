@@ -20,6 +20,7 @@ inline constexpr double kNaN = std::numeric_limits<double>::quiet_NaN();
 // Markers of containers in binary files.
 inline constexpr char kArrayOfOne = '\xA1';
 inline constexpr char kArrayOfTwo = '\xA2';
+inline constexpr char kArrayOfFourteen = '\xAE';
 inline constexpr char kDictionaryOfOne = '\xD1';
 
 /// Makes binary property lists object by object, right ones and wrong ones.

@@ -30,10 +30,13 @@ std::string nestedArraysFile(std::size_t depth) {
 /// Each array but the innermost holds the next one twice.
 std::string doublingArraysFile(std::size_t depth) {
   BinaryFile file;
-  for (std::size_t level = 1; level < depth; ++level) {
-    file.addContainer(kArrayOfTwo, {level, level});
+  constexpr std::size_t kDepthOfFifteenValues = 4;
+  std::size_t below = 1;
+  for (std::size_t level = kDepthOfFifteenValues; level < depth; ++level, ++below) {
+    file.addContainer(kArrayOfTwo, {below, below});
   }
-  file.add("\xA0");
+  file.addContainer(kArrayOfFourteen, std::vector<std::size_t>(14, below));
+  file.add("\x08");
   file.setTopObject(0);
   return file.build();
 }

@@ -14,10 +14,12 @@ namespace accounts {
 namespace {
 
 /// Adds arrays of two, each twice in the next, and returns the number of the last. It stands for
-/// 2^depth - 1 values.
+/// 2^depth - 1 values, few of them containers.
 std::size_t addDoublingArrays(BinaryFile& file, std::size_t depth) {
-  std::size_t array = file.add("\xA0");
-  for (std::size_t level = 1; level < depth; ++level) {
+  constexpr std::size_t kDepthOfFifteenValues = 4;
+  std::size_t array =
+      file.addContainer(kArrayOfFourteen, std::vector<std::size_t>(14, file.add("\x08")));
+  for (std::size_t level = kDepthOfFifteenValues; level < depth; ++level) {
     array = file.addContainer(kArrayOfTwo, {array, array});
   }
   return array;
@@ -138,6 +140,61 @@ std::string fileWithSharedLowerHalf(std::size_t height) {
   addArray({});
   file.setTopObject(0);
   return file.build();
+}
+
+constexpr std::uint64_t kMostRepetitions = maximumRepeatedContainerCount(kFileSize);
+constexpr const char* kTooManyRepetitions =
+    "a container that repeats more containers than a file of this size may";
+
+/// Adds an array that holds one object so many times.
+std::size_t addArrayOf(BinaryFile& file, std::size_t object, std::uint64_t count) {
+  std::string array = "\xAF\x11";
+  BinaryFile::appendNumber(array, count, 2);
+  return file.add(array.append(count, static_cast<char>(object)));
+}
+
+TEST(BinaryLimits, AContainerMayBeReachedAgainAsOftenAsTheLimit) {
+  const auto fileOf = [](std::uint64_t repetitions) {
+    return fileWith([&](BinaryFile& file) {
+      addArrayOf(file, file.addContainer('\xD0', {}), 1 + repetitions);
+    });
+  };
+  EXPECT_EQ(readBinary(fileOf(kMostRepetitions)).asArray()->size(), 1 + kMostRepetitions);
+  EXPECT_TRUE(contains(errorOfReadingBinary(fileOf(kMostRepetitions + 1)), kTooManyRepetitions));
+}
+
+TEST(BinaryLimits, WhatARepeatedContainerHoldsIsRepeated) {
+  // Ten arrays of `each` containers: the first array and its first container repeat nothing.
+  const auto fileOf = [](std::uint64_t each, std::uint64_t further) {
+    return fileWith([&](BinaryFile& file) {
+      const std::size_t container = file.add("\xA0");
+      const std::size_t array = addArrayOf(file, container, each);
+      std::vector<std::size_t> children(10, array);
+      children.resize(10 + further, container);
+      file.addContainer(static_cast<char>(0xA0 + children.size()), children);
+    });
+  };
+  constexpr std::uint64_t kEach = (kMostRepetitions + 1 - 9) / 10;
+  constexpr std::uint64_t kFurther = kMostRepetitions - (10 * kEach - 1 + 9);
+  static_assert(10 + kFurther < 14);
+  EXPECT_EQ(readBinary(fileOf(kEach, kFurther)).kind(), PropertyKind::Array);
+  EXPECT_TRUE(contains(errorOfReadingBinary(fileOf(kEach, kFurther + 1)), kTooManyRepetitions));
+}
+
+TEST(BinaryLimits, ContainersOfTheirOwnRepeatNothing) {
+  constexpr std::size_t kContainers = 20'000;
+  BinaryFile file;
+  file.setOffsetSize(3);
+  file.setReferenceSize(2);
+  std::string array = "\xAF\x11";
+  BinaryFile::appendNumber(array, kContainers, 2);
+  for (std::size_t count = 0; count < kContainers; ++count) {
+    BinaryFile::appendNumber(array, file.add("\xA0"), 2);
+  }
+  file.add(array);
+
+  EXPECT_LT(maximumRepeatedContainerCount(file.build().size()), kContainers);
+  EXPECT_EQ(readBinary(file.build()).asArray()->size(), kContainers);
 }
 
 TEST(BinaryLimits, ASharedChildMayReachAsDeepAsTheLimit) {

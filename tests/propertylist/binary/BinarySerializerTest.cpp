@@ -146,6 +146,17 @@ TEST_F(BinarySerializer, AFileTooSmallForWhatItStandsForIsNotMade) {
   EXPECT_FALSE(tooSmall.giveTo([](std::string_view) { return true; }));
 }
 
+TEST_F(BinarySerializer, AFileTooSmallForWhatItRepeatsIsNotMade) {
+  const auto list = [](std::size_t count) {
+    return PropertyValue(PropertyArray(std::vector<PropertyValue>(count, PropertyArray())));
+  };
+  // Each takes a byte besides the first.
+  constexpr std::size_t kMost = 4689;
+  EXPECT_EQ(readBinary(writeBinary(list(kMost))), list(kMost));
+
+  EXPECT_FALSE(writeBinaryPropertyList(list(kMost + 1), error));
+}
+
 TEST_F(BinarySerializer, AValueWhoseFileTheReaderWouldFindTooLargeIsRefused) {
   EXPECT_FALSE(serialize(PropertyData(std::string(kMaximumFileSize - 8, '\0'))));
   EXPECT_TRUE(contains(error.text, "more objects or bytes than the limit"));
