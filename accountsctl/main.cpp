@@ -8,6 +8,7 @@
 #include "accountsctl/JSONText.h"
 #include "commandline/MemoryReserve.h"
 #include "commandline/ReplacedFile.h"
+#include "commandline/StackLimit.h"
 #include "commandline/StandardStreams.h"
 #include "commandline/Terminal.h"
 
@@ -85,6 +86,9 @@ const std::string* outputFileOf(const CommandLine& commandLine) {
 /// What a command came to, its file written; want of memory is an error like another.
 CommandResult resultOf(const CommandLine& commandLine) {
   try {
+    if (auto error = askForStack()) {
+      return *std::move(error);
+    }
     CommandResult result =
         std::visit([](const auto& asked) { return runCommand(asked); }, commandLine.asked);
     const auto* const report = std::get_if<CommandReport>(&result);

@@ -4,6 +4,7 @@
 #include <variant>
 
 #include "commandline/MemoryReserve.h"
+#include "commandline/StackLimit.h"
 #include "commandline/StandardStreams.h"
 #include "commandline/Terminal.h"
 #include "host/CommandLine.h"
@@ -56,6 +57,9 @@ ExitStatus run(int argumentCount, char** arguments) {
   try {
     const MemoryReserve reserve;
     commandLine = parseCommandLine(argumentCount, arguments);
+    if (const auto error = askForStack()) {
+      return finish(*error, commandLine);
+    }
     return std::visit([&](const auto& asked) { return finish(asked, commandLine); },
                       commandLine.asked);
   } catch (const std::bad_alloc&) {

@@ -11,9 +11,6 @@
 
 namespace accounts {
 
-/// A user of this machine without privileges.
-inline constexpr uid_t kSomebody = 54321;
-
 /// A device that a migration changes in every way (both legacy stores, old settings, an information
 /// file asked for), a hostile thing in one of its places, and a tree outside that must stay as it
 /// is.

@@ -11,7 +11,7 @@
 #include "tests/program/Programs.h"
 
 // Every program and subcommand with ever more memory, and with ever more descriptors, from too
-// little to start to enough.
+// little to start to enough, and with little stack.
 
 namespace accounts {
 namespace {
@@ -27,7 +27,7 @@ enum class Format : std::uint8_t { XML, Binary };
 struct Use {
   std::string name;
   bool isHost = false;
-  /// ROOT and FILE stand for the device's root and its settings file.
+  /// ROOT, FILE and REPORT stand for the device's root, its settings file and a plan of it.
   std::vector<std::string> arguments;
 };
 
@@ -50,6 +50,11 @@ class LittleMemory : public DeviceRootFixture,
     makeSettings();
     if (isOf("restore")) {
       EXPECT_EQ(migrate({"--keep"}).exitStatus, 0);
+    } else if (isOf("summarize") || isOf("explain")) {
+      const ProgramResult plan = runProgram(
+          {.program = migrationHost(), .arguments = {"plan", "--root", root(), "--json"}});
+      EXPECT_EQ(plan.exitStatus, 0);
+      writeText("/report.json", plan.output);
     }
   }
 
@@ -81,6 +86,8 @@ class LittleMemory : public DeviceRootFixture,
         argument = root();
       } else if (argument == "FILE") {
         argument = onThisMachine(kSettingsPath).string();
+      } else if (argument == "REPORT") {
+        argument = onThisMachine("/report.json").string();
       }
     }
     return call;
@@ -92,6 +99,17 @@ class LittleMemory : public DeviceRootFixture,
 
   [[nodiscard]] static bool changesTheDevice() {
     return isOf("run") || (isOf("restore") && std::get<Use>(GetParam()).name != "RestoreList");
+  }
+
+  [[nodiscard]] static bool isBare() { return std::get<Use>(GetParam()).name == "BareRun"; }
+
+  /// A bare run saves each step by itself, and begins where it ended.
+  void expectNothingChanged(const std::string& before) const {
+    if (isBare()) {
+      prepare();
+    } else {
+      EXPECT_EQ(readText(kSettingsPath), before);
+    }
   }
 
   /// Whether the use puts kept files back.
@@ -121,12 +139,16 @@ class LittleMemory : public DeviceRootFixture,
     return memory;
   }
 
-  /// A call with a number of descriptors, those that the tests' own program leaves open included.
-  static ProgramCall withDescriptors(int count, ProgramCall call) {
-    call.arguments.insert(call.arguments.begin(), {"-c", "ulimit -n \"$0\"; exec \"$@\"",
-                                                   std::to_string(count), call.program});
+  /// A call with what the shell's ulimit sets.
+  static ProgramCall withLimit(const std::string& limit, ProgramCall call) {
+    call.arguments.insert(call.arguments.begin(),
+                          {"-c", "ulimit " + limit + "; exec \"$0\" \"$@\"", call.program});
     call.program = "sh";
     return call;
+  }
+  /// A call with a number of descriptors, those that the tests' own program leaves open included.
+  static ProgramCall withDescriptors(int count, ProgramCall call) {
+    return withLimit("-n " + std::to_string(count), std::move(call));
   }
   /// The fewest descriptors with which the program starts: the loader speaks before.
   [[nodiscard]] int fewestDescriptors() const {
@@ -167,7 +189,7 @@ TEST_P(LittleMemory, EndsWithOneClearLineOrAsWithEnough) {
     ++failures;
     SCOPED_TRACE(std::to_string(memory / kKibibyte) + " KiB");
     expectOneClearLine(result, "memory");
-    EXPECT_EQ(readText(kSettingsPath), before);
+    expectNothingChanged(before);
     if (HasFailure()) {
       return;
     }
@@ -178,6 +200,9 @@ TEST_P(LittleMemory, EndsWithOneClearLineOrAsWithEnough) {
 TEST_P(LittleMemory, SoItIsWithFewDescriptors) {
   if (kWithSanitizers) {
     GTEST_SKIP() << "Sanitizers take descriptors of their own.";
+  }
+  if (isBare()) {
+    GTEST_SKIP() << "What a bare run cannot open is missing for the plug-in.";
   }
   constexpr int kMostDescriptors = 64;
   const ProgramResult enough = runProgram(call(std::nullopt));
@@ -198,7 +223,7 @@ TEST_P(LittleMemory, SoItIsWithFewDescriptors) {
       return;
     }
     expectOneClearLine(result, "Too many open files");
-    EXPECT_EQ(readText(kSettingsPath), before);
+    expectNothingChanged(before);
     if (HasFailure()) {
       return;
     }
@@ -206,10 +231,31 @@ TEST_P(LittleMemory, SoItIsWithFewDescriptors) {
   ADD_FAILURE() << "no limit was enough";
 }
 
+TEST_P(LittleMemory, TheStackIsAskedForThatIsNeeded) {
+  if (kWithSanitizers) {
+    GTEST_SKIP() << "Sanitizers take stack of their own.";
+  }
+  const std::string before = readText(kSettingsPath);
+  const ProgramResult enough = runProgram(call(std::nullopt));
+  if (changesTheDevice()) {
+    prepare();
+  }
+
+  const ProgramResult result = runProgram(withLimit("-S -s 64", call(std::nullopt)));
+
+  EXPECT_EQ(result.exitStatus, enough.exitStatus) << result.errors;
+  EXPECT_EQ(readText(kSettingsPath) != before, isOf("run") || isPutBack());
+  // More than is allowed is given to the superuser at most.
+  ProgramCall refused = withLimit("-s 64", call(std::nullopt));
+  refused.user = kSomebody;
+  expectOneClearLine(runProgram(refused), "stack");
+}
+
 INSTANTIATE_TEST_SUITE_P(
     Uses, LittleMemory,
     testing::Combine(
         testing::Values(Use{"Run", true, {"run", "--root", "ROOT"}},
+                        Use{"BareRun", true, {"run", "--root", "ROOT", "--bare"}},
                         Use{"Plan", true, {"plan", "--root", "ROOT"}},
                         Use{"PlanAsJSON", true, {"plan", "--root", "ROOT", "--json"}},
                         Use{"Restore", true, {"restore", "--root", "ROOT"}},
@@ -220,7 +266,9 @@ INSTANTIATE_TEST_SUITE_P(
                         Use{"Check", false, {"check", "FILE"}},
                         Use{"Convert", false, {"convert", "FILE", "-", "--to", "xml"}},
                         Use{"Diff", false, {"diff", "FILE", "FILE"}},
-                        Use{"Status", false, {"status", "--root", "ROOT"}}),
+                        Use{"Status", false, {"status", "--root", "ROOT"}},
+                        Use{"Summarize", false, {"summarize", "REPORT"}},
+                        Use{"Explain", false, {"explain", "REPORT", "ID7"}}),
         testing::Values(Format::XML, Format::Binary)),
     [](const auto& information) {
       return std::get<Use>(information.param).name +

@@ -10,6 +10,9 @@
 
 namespace accounts {
 
+/// A user of this machine without privileges.
+inline constexpr uid_t kSomebody = 54321;
+
 /// How a program is to be run.
 struct ProgramCall {
   std::string program;
