@@ -8,7 +8,7 @@
 namespace accounts {
 namespace {
 
-/// Twice what 512 nested containers take in the slowest build.
+/// More than 512 nested containers take in the slowest build.
 constexpr rlim_t kNeeded = rlim_t{1} << 20;
 constexpr rlim_t kKibibyte = 1024;
 
