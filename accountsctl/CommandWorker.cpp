@@ -34,7 +34,7 @@ void send(const FileDescriptor& socket, const CommandResult& result) {
   bytes += error != nullptr ? error->message : report->text;
   // Without a reader there is nobody to tell.
   if (report == nullptr || !report->file || sendFrame(socket, FrameKind::Page, *report->file)) {
-    static_cast<void>(sendFrame(socket, FrameKind::Result, bytes));
+    static_cast<void>(sendFrame(socket, FrameKind::ToldResult, bytes));
   }
 }
 
@@ -90,7 +90,7 @@ std::optional<CommandResult> receiveResult(const FileDescriptor& socket,
       case FrameKind::Page:
         file = std::move(frame->bytes);
         break;
-      case FrameKind::Result:
+      case FrameKind::ToldResult:
         return resultFrom(frame->bytes, std::move(file));
       default:
         return WorkerEnd(who, limits)

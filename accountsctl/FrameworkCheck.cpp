@@ -139,7 +139,7 @@ CommandResult checkFramework(const FrameworkCheckOptions& options, const Termina
   LinuxFrameworkLoader loader(*root, log);
   const std::string path = std::filesystem::absolute(options.file).string();
   if (const Result loaded = loader.loadFramework(path); !loaded) {
-    const Failure& failure = loaded.failure();
+    const Failure& failure = loaded.error();
     return failure.number != 0
                ? ProgramError{exitStatusOf(failure, ExitStatus::MissingInput), failure.text}
                : ProgramError{ExitStatus::MalformedInput,

@@ -31,7 +31,7 @@ void loadCreatorFramework(std::string_view relativePath, std::string_view operat
   if (!loaded) {
     failAssertion(operation, sourceFile,
                   "Could not load the account creator framework %@. Error %s",
-                  {path, loaded.error()});
+                  {path, loaded.error().text});
   }
 }
 

@@ -127,7 +127,7 @@ void AccountsManager::removeNewAccountSettingsToMigrateOldAccountInformation() {
     logToChannel(
         "+[AccountsManager(MigrationSupport) "
         "removeNewAccountSettingsToMigrateOldAccountInformation]",
-        "Could not remove %@. Error %@", [&] { return logArguments(path, removal.error()); });
+        "Could not remove %@. Error %@", [&] { return logArguments(path, removal.error().text); });
   }
 }
 

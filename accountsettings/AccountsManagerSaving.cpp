@@ -32,7 +32,7 @@ SerializedPropertyList serialize(const PropertyDictionary& root) {
       Process::current().platform.propertyLists.serializeBinary(root, serialized);
   if (!serialized) {
     logToChannel(kSaveOperation, "Failed to serialize account settings data: %@", [&] {
-      return logArguments(serialization ? std::optional<Text>() : Text(serialization.error()));
+      return logArguments(serialization ? std::optional<Text>() : Text(serialization.error().text));
     });
   }
   return serialized;
@@ -50,7 +50,7 @@ bool writeThroughTemporaryFile(const SerializedPropertyList& contents,
   if (!attributes) {
     logToChannel(kSaveOperation,
                  "Could not set attributes on the temporary account settings plist. %@",
-                 [&] { return logArguments(attributes.error()); });
+                 [&] { return logArguments(attributes.error().text); });
     return false;
   }
   return static_cast<bool>(fileSystem.renameFile(temporaryPath, path));

@@ -23,7 +23,7 @@ install(DIRECTORY ${PROJECT_SOURCE_DIR}/docs
   FILES_MATCHING PATTERN "*.md" PATTERN "*.png" PATTERN "schema/*.json")
 
 # Parts of these libraries are in the programs; their licences ask for these notices then.
-foreach(library libcli11-dev libfmt-dev nlohmann-json3-dev)
+foreach(library libcli11-dev libexpected-dev libfmt-dev nlohmann-json3-dev)
   install(FILES /usr/share/doc/${library}/copyright RENAME ${library}
     DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/accounts-migration/licences
     COMPONENT ${programs_component})
@@ -113,7 +113,7 @@ set(CPACK_DEBIAN_ACCOUNTS-MIGRATION-DEV_PACKAGE_NAME accounts-migration-dev)
 set(CPACK_DEBIAN_ACCOUNTS-MIGRATION-DEV_PACKAGE_SECTION libdevel)
 # The bundle with the account-creation map, what checks a framework, and what the store is built on.
 set(CPACK_DEBIAN_ACCOUNTS-MIGRATION-DEV_PACKAGE_DEPENDS
-  "accounts-migration (= ${PROJECT_VERSION}), libexpat1-dev, libseccomp-dev, uuid-dev, pkgconf")
+  "accounts-migration (= ${PROJECT_VERSION}), libexpat1-dev, libexpected-dev, libseccomp-dev, uuid-dev, pkgconf")
 set(CPACK_DEBIAN_ACCOUNTS-MIGRATION-DEV_PACKAGE_SUGGESTS "cmake")
 set(CPACK_COMPONENT_ACCOUNTS-MIGRATION-DEV_DESCRIPTION
   "Development files for frameworks of accounts

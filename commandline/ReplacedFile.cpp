@@ -141,7 +141,7 @@ std::optional<ProgramError> replaceFile(const std::string& path, std::string_vie
   }
   // Gone already when only the directory could not be flushed; then there is nothing to remove.
   (void)temporary.entry.remove();
-  return programErrorOf(moved.failure(), ExitStatus::InputOutputError);
+  return programErrorOf(moved.error(), ExitStatus::InputOutputError);
 }
 
 std::optional<ProgramError> whyNotReplaceable(const std::string& path) {

@@ -24,7 +24,7 @@ enum class FrameKind : std::uint8_t {
   /// From the worker: the report and the page; what standard error and standard output get.
   Report,
   Page,
-  Result,
+  ToldResult,
   /// To a worker of accountsctl: a piece of a file. From it: what it may use.
   Piece,
   Limits

@@ -45,7 +45,7 @@ std::optional<std::string> broadcastOnDBus(const Announcements& announcements) {
   }
   const Result delivered = bus.deliver();
   return delivered ? std::nullopt
-                   : std::optional("Nobody was told of the changes: " + delivered.error());
+                   : std::optional("Nobody was told of the changes: " + delivered.error().text);
 }
 
 }  // namespace accounts

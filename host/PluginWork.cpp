@@ -171,7 +171,7 @@ void handOverAndTell(const PluginWork& work, const WorkerSide& side, const Propo
   // What the plug-in printed, too, before the host ends.
   std::cout.flush();
   static_cast<void>(std::fflush(nullptr));
-  static_cast<void>(sendFrame(side.socket, FrameKind::Result,
+  static_cast<void>(sendFrame(side.socket, FrameKind::ToldResult,
                               bytesOf(toldResult(work.options, report, outcome.recorded))));
   // Here rather than by returning: what a large migration holds takes long to be taken apart.
   std::exit(EXIT_SUCCESS);

@@ -101,8 +101,8 @@ RestoreResult discardFolder(KeptFolders& folders, const RestoreOptions& options)
   RestoreResult result;
   std::string& folder = std::get<std::string>(chosen);
   if (const Result discarded = folders.discard(folder); !discarded) {
-    return failed({programErrorOf(discarded.failure(), ExitStatus::InputOutputError).exitStatus,
-                   "The folder cannot be removed and is still whole: " + discarded.error()});
+    return failed({programErrorOf(discarded.error(), ExitStatus::InputOutputError).exitStatus,
+                   "The folder cannot be removed and is still whole: " + discarded.error().text});
   }
   result.discarded = std::move(folder);
   return result;

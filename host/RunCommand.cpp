@@ -68,8 +68,8 @@ ExitStatus tell(const RunOptions& options, const RunConclusion& conclusion, Work
     // A report that is missing is an error of a program that otherwise succeeded.
     exitStatus = reportError->exitStatus;
   }
-  const auto answer =
-      worker->ask(FrameKind::ReportErrors, bytesOfReportError(reportError), {FrameKind::Result});
+  const auto answer = worker->ask(FrameKind::ReportErrors, bytesOfReportError(reportError),
+                                  {FrameKind::ToldResult});
   const auto told = answer ? toldResultFrom(answer->front()) : std::nullopt;
   return told ? print(*told, exitStatus) : tellAlone(options, conclusion);
 }

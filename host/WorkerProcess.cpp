@@ -190,7 +190,7 @@ std::optional<std::vector<std::string>> WorkerProcess::ask(FrameKind kind, std::
     if (!frame || frame->kind != expected) {
       return std::nullopt;
     }
-    isDone_ = expected == FrameKind::Result;
+    isDone_ = expected == FrameKind::ToldResult;
     received.push_back(std::move(frame->bytes));
   }
   return received;

@@ -27,7 +27,8 @@ std::string informationDirectory() {
 }
 
 void logRemovalFailure(const std::string& path, const Result& removal) {
-  logToConsole("%s. Could not delete %@. Error = %@", {kRemovalOperation, path, removal.error()});
+  logToConsole("%s. Could not delete %@. Error = %@",
+               {kRemovalOperation, path, removal.error().text});
 }
 
 /// Sees to it that the directory of migration-information files exists. False, with a console line,
@@ -40,7 +41,7 @@ bool makeInformationDirectory(FileSystem& files, const std::string& directory) {
       logToConsole(
           "AccountMigration warning: Could not create the directory to store migration information "
           "at %@ [Error = %@]",
-          {directory, creation.error()});
+          {directory, creation.error().text});
     }
     return static_cast<bool>(creation);
   }
@@ -67,7 +68,7 @@ void AccountsDataMigrator::_copyAsideAccountsPlist() {
   }
   const Result copy = platform.fileSystem.copyFile(source, destination);
   if (!copy) {
-    logToConsole("Error trying to save an accountsettings plist copy: %@", {copy.error()});
+    logToConsole("Error trying to save an accountsettings plist copy: %@", {copy.error().text});
   }
 }
 

@@ -1,29 +1,25 @@
 #pragma once
 
-#include <optional>
-#include <string>
+#include <tl/expected.hpp>
 #include <utility>
 
 #include "platform/Failure.h"
 
 namespace accounts {
 
-/// What an operation of the platform that can fail gives back: success, or the failure.
-class [[nodiscard]] Result {
+/// A value, or the error for which there is none. An error is returned as it is; what gives no
+/// value, only success or an error, has the value void and returns {} for success.
+template <class Value, class Error>
+class [[nodiscard]] OrError : public tl::expected<Value, Error> {
  public:
-  static Result success() { return Result(); }
-  /// A failure whose reason is not the system's.
-  static Result failure(std::string text) { return Failure{0, std::move(text)}; }
-  Result(Failure failure) : failure_(std::move(failure)) {}
-
-  explicit operator bool() const { return !failure_.has_value(); }
-  /// Only of a failure.
-  [[nodiscard]] const Failure& failure() const { return *failure_; }
-  [[nodiscard]] const std::string& error() const { return failure_->text; }
-
- private:
-  Result() = default;
-  std::optional<Failure> failure_;
+  using tl::expected<Value, Error>::expected;
+  OrError() = default;
+  OrError(Error error) : tl::expected<Value, Error>(tl::unexpect, std::move(error)) {}
 };
+
+/// What an operation of the platform that can fail gives back.
+template <class Value>
+using OrFailure = OrError<Value, Failure>;
+using Result = OrFailure<void>;
 
 }  // namespace accounts

@@ -65,7 +65,7 @@ class RecordedFileSystem final : public ForwardingFileSystem {
     const bool isTemporary = temporaryFiles_.contains(path);
     if (!result || !isTemporary) {
       recorder_.recordFile(action, isTemporary ? kTemporaryFile : path,
-                           result ? std::nullopt : std::optional(result.error()));
+                           result ? std::nullopt : std::optional(result.error().text));
     }
     return result;
   }

@@ -175,7 +175,7 @@ std::optional<CommitOutcome> Commit::writeRecord() {
   }
   constexpr std::string_view kOperation = "The commit record cannot be written";
   if (const Result made = folders_.makeDirectory(); !made) {
-    return failed(writingError(kOperation, made.failure()));
+    return failed(writingError(kOperation, made.error()));
   }
   if (isWritten) {
     const auto contents = contentsOf_(*change);

@@ -63,7 +63,7 @@ std::string_view prefixOf(KeptFor purpose) {
 }
 
 PlaceOutcome outcomeOf(const Result& result) {
-  return result ? PlaceOutcome::done() : PlaceOutcome::failed(result.failure());
+  return result ? PlaceOutcome::done() : PlaceOutcome::failed(result.error());
 }
 
 /// The time, made unique by a number where folders of that time exist; none when that cannot be
@@ -163,7 +163,7 @@ PlaceOutcome KeptFolders::keep(const std::vector<PlaceToKeep>& places, KeptFor p
   const std::optional<std::string> suffix = freeSuffix(files_, time);
   if (!suffix) {
     return outcomeOf(
-        Result::failure("No name is free in " + std::string(kAccountMigrationDirectory)));
+        Failure{.text = "No name is free in " + std::string(kAccountMigrationDirectory)});
   }
   const std::string unfinished = prefixed(kUnfinishedPrefix, *suffix);
   const std::string finished = prefixed(prefixOf(purpose), *suffix);
@@ -185,7 +185,7 @@ PlaceOutcome KeptFolders::keep(const std::vector<PlaceToKeep>& places, KeptFor p
 }
 
 Result KeptFolders::makeDirectory() {
-  Result result = Result::success();
+  Result result;
   if (files_.kindOfEntry(kAccountMigrationDirectory) != EntryKind::Directory) {
     result =
         files_.createDirectoryWithIntermediates(kAccountMigrationDirectory, kDirectoryPermissions);
@@ -230,7 +230,7 @@ Result KeptFolders::discard(std::string_view folder) {
   if (renamed || files_.kindOfEntry(folder) == EntryKind::Nothing) {
     removeWithContents(unfinished);
     removeDirectoryIfMade();
-    return Result::success();
+    return {};
   }
   return renamed;
 }

@@ -214,7 +214,7 @@ Restoration restoreKeptFiles(DevicePlaces& places, KeptFolders& folders, std::st
   if (const Result discarded = folders.discard(*restoration.folder); !discarded) {
     restoration.error = ProgramError{
         ExitStatus::InputOutputError,
-        "Everything is put back, but the folder cannot be removed: " + discarded.error()};
+        "Everything is put back, but the folder cannot be removed: " + discarded.error().text};
   }
   return restoration;
 }

@@ -13,12 +13,12 @@ constexpr std::string_view kTemporaryFiles = "/transaction/";
 
 Result failure(std::string_view operation, std::string_view path, int number) {
   std::string text = "Cannot ";
-  return Result::failure(text.append(operation).append(" ").append(path).append(": ").append(
-      std::generic_category().message(number)));
+  return Failure{.text = text.append(operation).append(" ").append(path).append(": ").append(
+                     std::generic_category().message(number))};
 }
 
 Result resultOf(const std::optional<Failure>& whyNot) {
-  return whyNot ? Result(*whyNot) : Result::success();
+  return whyNot ? Result(*whyNot) : Result();
 }
 
 }  // namespace
@@ -85,7 +85,7 @@ Result TransactionFileSystem::copyFile(std::string_view source, std::string_view
 Result TransactionFileSystem::removeFile(std::string_view path) {
   if (const auto temporary = temporaryFiles_.find(path); temporary != temporaryFiles_.end()) {
     temporaryFiles_.erase(temporary);
-    return Result::success();
+    return {};
   }
   const DevicePlace place = placeOf(path);
   const Transaction::Standing& standing = transaction_.at(place);
@@ -98,7 +98,7 @@ Result TransactionFileSystem::removeFile(std::string_view path) {
     }
   }
   transaction_.put(place, Transaction::Removed{});
-  return Result::success();
+  return {};
 }
 
 Result TransactionFileSystem::createFile(std::string_view path, std::string_view contents) {
@@ -140,7 +140,7 @@ Result TransactionFileSystem::writeFile(std::string_view path,
     return writeFileAtomically(path, contents);
   }
   temporary->second.list = contents;
-  return Result::success();
+  return {};
 }
 
 Result TransactionFileSystem::writeFileAtomically(std::string_view path,
@@ -177,7 +177,7 @@ Result TransactionFileSystem::setOwnerAndGroup(std::string_view path, std::strin
     return ofSave(*whyNot);
   }
   temporary->second.owner = std::get<FileOwner>(owner);
-  return Result::success();
+  return {};
 }
 
 Result TransactionFileSystem::renameFile(std::string_view source, std::string_view destination) {
@@ -195,12 +195,12 @@ Result TransactionFileSystem::renameFile(std::string_view source, std::string_vi
   if (place == DevicePlace::Settings) {
     transaction_.noteSave(LastSave::Written);
   }
-  return Result::success();
+  return {};
 }
 
 Result TransactionFileSystem::ofSave(Result result) {
   if (!result) {
-    transaction_.noteSaveFailure(result.error());
+    transaction_.noteSaveFailure(result.error().text);
   }
   return result;
 }

@@ -15,7 +15,7 @@ class TransactionFrameworkLoader final : public FrameworkLoader {
   explicit TransactionFrameworkLoader(FrameworkLoader& beneath) : beneath_(beneath) {}
 
   Result loadFramework(std::string_view path) override {
-    return Result::failure("A migration loads no framework: " + std::string(path));
+    return Failure{.text = "A migration loads no framework: " + std::string(path)};
   }
   ClassRegistry& classes() override { return beneath_.classes(); }
 

@@ -121,21 +121,21 @@ void DBusBroadcast::announce(CloudTabs state) {
 Result DBusBroadcast::deliver() {
   const std::vector<Signal> signals = std::exchange(signals_, {});
   if (signals.empty()) {
-    return Result::success();
+    return {};
   }
   std::string missing;
   const std::optional<SystemdLibrary> library = SystemdLibrary::load(options_.library, missing);
   if (!library) {
-    return Result::failure("Cannot load " + options_.library + ": " + missing);
+    return Failure{.text = "Cannot load " + options_.library + ": " + missing};
   }
   Connection connection(*library, options_);
   for (const Signal& signal : signals) {
     connection.emit(signal);
   }
   const int error = connection.flush();
-  return error == 0 ? Result::success()
-                    : Result::failure("Cannot announce on the bus at " + options_.address + ": " +
-                                      std::strerror(error));
+  return error == 0 ? Result()
+                    : Failure{.text = "Cannot announce on the bus at " + options_.address + ": " +
+                                      std::strerror(error)};
 }
 
 }  // namespace accounts

@@ -321,7 +321,7 @@ std::optional<Failure> LinuxDevicePlaces::makeInformationDirectory() {
   }
   constexpr unsigned kEverybody = 0777;
   const Result made = files_.createDirectoryWithIntermediates(directory, kEverybody);
-  return made ? std::nullopt : std::optional(Failure{0, made.error()});
+  return made ? std::nullopt : std::optional(Failure{0, made.error().text});
 }
 
 std::optional<Failure> LinuxDevicePlaces::writeInformationFile(std::string_view name,

@@ -63,7 +63,7 @@ Result LinuxFileSystem::copyFile(std::string_view source, std::string_view desti
     (void)entry->remove();
     return asResult("set the permissions of", destination, number);
   }
-  return Result::success();
+  return {};
 }
 
 Result LinuxFileSystem::removeFile(std::string_view path) {
@@ -101,8 +101,7 @@ Result LinuxFileSystem::createDirectoryWithIntermediates(std::string_view path,
     }
   }
   const auto entry = root_.locate(whole, error);
-  return entry && entry->createDirectory(permissions & kPermissionBits, error) ? Result::success()
-                                                                               : error;
+  return entry && entry->createDirectory(permissions & kPermissionBits, error) ? Result() : error;
 }
 
 Result LinuxFileSystem::writeFile(std::string_view path, const SerializedPropertyList& contents) {
@@ -168,7 +167,7 @@ Result LinuxFileSystem::setOwnerAndGroup(std::string_view path, std::string_view
   if (::fchown(file->number(), *user, *group) != 0) {
     return asResult("set the owner of", path, errno);
   }
-  return Result::success();
+  return {};
 }
 
 Result LinuxFileSystem::renameFile(std::string_view source, std::string_view destination) {

@@ -19,13 +19,13 @@ namespace {
 Result registerClassesOf(void* entryPoint, ClassRegistry& registry) {
   try {
     reinterpret_cast<decltype(&RegisterClasses)>(entryPoint)(registry);
-    return Result::success();
+    return {};
   } catch (const std::bad_alloc&) {
     throw;
   } catch (const std::exception& exception) {
-    return Result::failure(std::string("It threw an exception: ") + exception.what());
+    return Failure{.text = std::string("It threw an exception: ") + exception.what()};
   } catch (...) {
-    return Result::failure("It threw an exception without words");
+    return Failure{.text = "It threw an exception without words"};
   }
 }
 
@@ -43,7 +43,7 @@ Result LinuxFrameworkLoader::loadFramework(std::string_view path) {
   }
   const std::pair identity(status.st_dev, status.st_ino);
   if (loaded_.contains(identity)) {
-    return Result::success();
+    return {};
   }
   // By the name that the opened file has on this machine, so that $ORIGIN means its directory. Who
   // could put another file there meanwhile could as well write into this one.
@@ -55,17 +55,17 @@ Result LinuxFrameworkLoader::loadFramework(std::string_view path) {
   }
   void* library = dlopen(name.c_str(), RTLD_NOW | RTLD_LOCAL);
   if (library == nullptr) {
-    return Result::failure(dlerror());
+    return Failure{.text = dlerror()};
   }
   void* entryPoint = dlsym(library, kFrameworkEntryPoint);
   if (entryPoint == nullptr) {
-    const Result missing = Result::failure(dlerror());
+    const Result missing = Failure{.text = dlerror()};
     dlclose(library);
     return missing;
   }
   if (const auto otherVersion = whyOtherInterface(library)) {
     dlclose(library);
-    return Result::failure(*otherVersion);
+    return Failure{.text = *otherVersion};
   }
   loaded_.insert(identity);
   registering_ = path;

@@ -16,7 +16,7 @@ Result LinuxPropertyLists::serializeBinary(const PropertyValue& value,
                                            SerializedPropertyList& serialized) {
   PropertyListError error;
   serialized = serializer_.serialize(value, error);
-  return serialized ? Result::success() : Result::failure(std::move(error.text));
+  return serialized ? Result() : Failure{.text = std::move(error.text)};
 }
 
 }  // namespace accounts

@@ -19,7 +19,7 @@ Failure notRegularFailure(std::string_view operation, std::string_view path, mod
 
 /// Success for the system error number 0, otherwise the failure as above.
 inline Result asResult(std::string_view operation, std::string_view path, int number) {
-  return number == 0 ? Result::success() : pathFailure(operation, path, number);
+  return number == 0 ? Result() : pathFailure(operation, path, number);
 }
 
 }  // namespace accounts

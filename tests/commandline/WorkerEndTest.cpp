@@ -61,7 +61,7 @@ TEST(WorkerEnd, WithoutALimitOfItsOwnTheEndOfMemoryMayPass) {
 }
 
 TEST(WorkerEnd, NoOtherFrameTellsOfOne) {
-  EXPECT_FALSE(kEnd.toldBy({FrameKind::Result, {}}));
+  EXPECT_FALSE(kEnd.toldBy({FrameKind::ToldResult, {}}));
 }
 
 TEST(WorkerLimits, GrowWithTheFiles) {

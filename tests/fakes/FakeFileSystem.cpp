@@ -14,7 +14,7 @@ std::string parentOf(std::string_view path) {
 }
 
 Result noSuchFile(std::string_view path) {
-  return Result::failure(std::string(path) + ": No such file or directory");
+  return Failure{.text = std::string(path) + ": No such file or directory"};
 }
 
 std::string words(std::string_view verb, std::string_view path) {
@@ -75,7 +75,7 @@ Result FakeFileSystem::perform(const std::string& line, const std::function<Resu
       number == failAt_ || (failFrom_ && number >= *failFrom_) ||
       std::any_of(failingBeginnings_.begin(), failingBeginnings_.end(),
                   [&](const std::string& beginning) { return line.starts_with(beginning); });
-  Result result = isFailing ? Result::failure(line + ": Input/output error") : operation();
+  Result result = isFailing ? Failure{.text = line + ": Input/output error"} : operation();
   if (number == stopAfter_) {
     stopWorld();
   }
@@ -91,58 +91,57 @@ Result FakeFileSystem::put(std::string_view path, std::string_view contents) {
     return noSuchFile(path);
   }
   if (directories.contains(path)) {
-    return Result::failure(std::string(path) + ": Is a directory");
+    return Failure{.text = std::string(path) + ": Is a directory"};
   }
   files[std::string(path)].contents = contents;
-  return Result::success();
+  return {};
 }
 
 std::optional<std::string> FakeFileSystem::read(std::string_view path) {
   std::optional<std::string> contents;
-  const Result result = perform(words("read", path), [&] {
+  const Result result = perform(words("read", path), [&]() -> Result {
     contents = contentsOf(path);
-    return contents ? Result::success() : noSuchFile(path);
+    return contents ? Result() : noSuchFile(path);
   });
   return result ? contents : std::nullopt;
 }
 
 bool FakeFileSystem::fileExists(std::string_view path) {
-  return static_cast<bool>(perform(words("exists", path), [&] {
-    return files.contains(path) || directories.contains(path) ? Result::success()
-                                                              : noSuchFile(path);
+  return static_cast<bool>(perform(words("exists", path), [&]() -> Result {
+    return files.contains(path) || directories.contains(path) ? Result() : noSuchFile(path);
   }));
 }
 
 bool FakeFileSystem::isDirectory(std::string_view path) {
-  return static_cast<bool>(perform(words("isDirectory", path), [&] {
-    return directories.contains(path) ? Result::success() : noSuchFile(path);
+  return static_cast<bool>(perform(words("isDirectory", path), [&]() -> Result {
+    return directories.contains(path) ? Result() : noSuchFile(path);
   }));
 }
 
 Result FakeFileSystem::copyFile(std::string_view source, std::string_view destination) {
-  return perform(words("copy", source, destination), [&] {
+  return perform(words("copy", source, destination), [&]() -> Result {
     const auto file = files.find(source);
     if (file == files.end()) {
       return noSuchFile(source);
     }
     if (files.contains(destination) || directories.contains(destination)) {
-      return Result::failure(std::string(destination) + ": File exists");
+      return Failure{.text = std::string(destination) + ": File exists"};
     }
     return put(destination, std::string(file->second.contents));
   });
 }
 
 Result FakeFileSystem::removeFile(std::string_view path) {
-  return perform(words("remove", path), [&] {
+  return perform(words("remove", path), [&]() -> Result {
     if (directories.contains(path)) {
-      return Result::failure(std::string(path) + ": Is a directory");
+      return Failure{.text = std::string(path) + ": Is a directory"};
     }
     const auto file = files.find(path);
     if (file == files.end()) {
       return noSuchFile(path);
     }
     files.erase(file);
-    return Result::success();
+    return {};
   });
 }
 
@@ -152,20 +151,20 @@ Result FakeFileSystem::createFile(std::string_view path, std::string_view conten
 
 Result FakeFileSystem::createDirectoryWithIntermediates(std::string_view path,
                                                         unsigned permissions) {
-  return perform(words("createDirectory", path), [&] {
+  return perform(words("createDirectory", path), [&]() -> Result {
     if (files.contains(path) || directories.contains(path)) {
-      return Result::failure(std::string(path) + ": File exists");
+      return Failure{.text = std::string(path) + ": File exists"};
     }
     addDirectory(path);
     directories[std::string(path)] = permissions;
-    return Result::success();
+    return {};
   });
 }
 
 std::optional<std::string> FakeFileSystem::makeTemporaryFile() {
   std::string path = temporaryDirectory + "/" + std::string(kTemporaryNameBeginning) +
                      std::to_string(temporaryFileCount_++);
-  const Result result = perform("makeTemporary", [&] {
+  const Result result = perform("makeTemporary", [&]() -> Result {
     Result made = put(path, "");
     if (made) {
       files[path].permissions = 0600;
@@ -186,33 +185,33 @@ Result FakeFileSystem::writeFileAtomically(std::string_view path,
 
 Result FakeFileSystem::setOwnerAndGroup(std::string_view path, std::string_view ownerName,
                                         std::string_view groupName) {
-  return perform(words("setOwner", path), [&] {
+  return perform(words("setOwner", path), [&]() -> Result {
     const auto file = files.find(path);
     if (file == files.end()) {
       return noSuchFile(path);
     }
     if (!accountNames.contains(ownerName) || !accountNames.contains(groupName)) {
-      return Result::failure(std::string(path) + ": no such user or group");
+      return Failure{.text = std::string(path) + ": no such user or group"};
     }
     file->second.owner = ownerName;
     file->second.group = groupName;
-    return Result::success();
+    return {};
   });
 }
 
 Result FakeFileSystem::renameFile(std::string_view source, std::string_view destination) {
-  return perform(words("rename", source, destination), [&] {
+  return perform(words("rename", source, destination), [&]() -> Result {
     const auto file = files.find(source);
     if (file == files.end() || !parentExists(destination)) {
       return noSuchFile(source);
     }
     if (directories.contains(destination)) {
-      return Result::failure(std::string(destination) + ": Is a directory");
+      return Failure{.text = std::string(destination) + ": Is a directory"};
     }
     FakeFile moved = std::move(file->second);
     files.erase(file);
     files.insert_or_assign(std::string(destination), std::move(moved));
-    return Result::success();
+    return {};
   });
 }
 

@@ -6,7 +6,7 @@ Result FakeFrameworkLoader::loadFramework(std::string_view path) {
   loads.emplace_back(path);
   const auto error = errors.find(path);
   if (error != errors.end()) {
-    return Result::failure(error->second);
+    return Failure{.text = error->second};
   }
   const auto framework = frameworks.find(path);
   if (framework != frameworks.end()) {
@@ -14,7 +14,7 @@ Result FakeFrameworkLoader::loadFramework(std::string_view path) {
       registerClass(name, accountClass);
     }
   }
-  return Result::success();
+  return {};
 }
 
 void FakeFrameworkLoader::registerClass(std::string name, AccountClass accountClass) {

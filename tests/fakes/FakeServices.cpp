@@ -95,14 +95,14 @@ Result FakePropertyLists::serializeBinary(const PropertyValue& value,
                                           SerializedPropertyList& serialized) {
   serialized = {};
   if (serializationError) {
-    return Result::failure(*serializationError);
+    return Failure{.text = *serializationError};
   }
   if (givesNone) {
-    return Result::success();
+    return {};
   }
   PropertyListError error;
   serialized = serializer_.serialize(value, error);
-  return serialized ? Result::success() : Result::failure(error.text);
+  return serialized ? Result() : Failure{.text = error.text};
 }
 
 std::unique_ptr<NamedLock> FakeSharedResources::makeLock(std::string_view name) {

@@ -91,7 +91,7 @@ void RegisterClasses(accounts::ClassRegistry& registry) {
   LinuxConsoleLog log;
   LinuxFrameworkLoader loader(*device, log);
   const Result loaded = loader.loadFramework("/Mine.framework/Mine.so");
-  ASSERT_TRUE(loaded) << loaded.error();
+  ASSERT_TRUE(loaded) << loaded.error().text;
   EXPECT_NE(loader.classes().classNamed("MyNotifier"), nullptr);
 }
 

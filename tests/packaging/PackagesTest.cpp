@@ -35,7 +35,8 @@ TEST_F(InstalledPackages, HoldWhatAnInstallationHolds) {
 
 TEST_F(InstalledPackages, HoldTheNoticesOfTheLibrariesThatAreCompiledIn) {
   install();
-  for (const char* library : {"libcli11-dev", "libfmt-dev", "nlohmann-json3-dev"}) {
+  for (const char* library :
+       {"libcli11-dev", "libexpected-dev", "libfmt-dev", "nlohmann-json3-dev"}) {
     std::ifstream notice(prefix() / "share/doc/accounts-migration/licences" / library);
     const std::string text(std::istreambuf_iterator<char>(notice), {});
     EXPECT_NE(text.find("Copyright: "), std::string::npos) << library;

@@ -27,7 +27,7 @@ TEST(DBusBroadcastTest, AnnouncementsAreSignalsInTheirOrder) {
   broadcast.announceChange("", "ключ");
   const Result delivered = broadcast.deliver();
 
-  ASSERT_TRUE(delivered) << delivered.error();
+  ASSERT_TRUE(delivered) << delivered.error().text;
   EXPECT_EQ(listener.next(),
             kObject + std::string("PreferencesChanged com.quarx.mobilemail MailAccounts"));
   EXPECT_EQ(listener.next(), kObject + std::string("CloudTabsSwitched 1"));
@@ -57,7 +57,7 @@ TEST(DBusBroadcastTest, AMissingBusIsAFailureWithItsAddress) {
   broadcast.announceChange("application", "key");
   const Result delivered = broadcast.deliver();
   ASSERT_FALSE(delivered);
-  EXPECT_EQ(delivered.error(),
+  EXPECT_EQ(delivered.error().text,
             "Cannot announce on the bus at unix:path=/nowhere/bus: No such file or directory");
 }
 
@@ -99,7 +99,7 @@ TEST_F(SilentBus, IsWaitedForNoLongerThanTheTimeLimit) {
   const Result delivered = broadcast.deliver();
 
   ASSERT_FALSE(delivered);
-  EXPECT_TRUE(delivered.error().ends_with("Connection timed out")) << delivered.error();
+  EXPECT_TRUE(delivered.error().text.ends_with("Connection timed out")) << delivered.error().text;
 }
 
 TEST(DBusBroadcastTest, AMissingLibraryIsAFailureWithTheLoadersWords) {
@@ -107,8 +107,8 @@ TEST(DBusBroadcastTest, AMissingLibraryIsAFailureWithTheLoadersWords) {
   broadcast.announceChange("application", "key");
   const Result delivered = broadcast.deliver();
   ASSERT_FALSE(delivered);
-  EXPECT_TRUE(delivered.error().starts_with("Cannot load missing-library.so: "))
-      << delivered.error();
+  EXPECT_TRUE(delivered.error().text.starts_with("Cannot load missing-library.so: "))
+      << delivered.error().text;
 }
 
 }  // namespace

@@ -51,7 +51,7 @@ TEST_F(FileSystemCopyTest, AnExistingFileIsNotCopiedOver) {
   makeFile("/copy", "old");
   const Result result = files.copyFile("/source", "/copy");
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot create /copy: File exists");
+  EXPECT_EQ(result.error().text, "Cannot create /copy: File exists");
   EXPECT_EQ(contentsOf("/copy"), "old");
 }
 
@@ -77,7 +77,7 @@ TEST_F(FileSystemCopyTest, ALinkAtTheSourceIsCopiedAsTheFileItLeadsTo) {
 TEST_F(FileSystemCopyTest, AMissingSourceFailsAndLeavesNothing) {
   const Result result = files.copyFile("/none", "/copy");
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot open /none: No such file or directory");
+  EXPECT_EQ(result.error().text, "Cannot open /none: No such file or directory");
   EXPECT_TRUE(namesIn("/").empty());
 }
 
@@ -104,7 +104,7 @@ TEST_F(FileSystemCopyTest, ACopyThatTheDiskHasNoRoomForIsRemoved) {
   const WithLargestWrittenFile full(4);
   const Result result = files.copyFile("/source", "/copy");
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot write /copy: File too large");
+  EXPECT_EQ(result.error().text, "Cannot write /copy: File too large");
   EXPECT_FALSE(fs::exists(onHost("/copy")));
 }
 

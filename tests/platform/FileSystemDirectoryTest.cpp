@@ -60,7 +60,7 @@ TEST_F(FileSystemDirectoryTest, AnExistingDirectoryIsAFailureAndKeepsItsPermissi
   fs::permissions(onHost("/directory"), fs::perms(0700));
   const Result result = files.createDirectoryWithIntermediates("/directory", kEveryoneMayWrite);
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot create the directory /directory: File exists");
+  EXPECT_EQ(result.error().text, "Cannot create the directory /directory: File exists");
   EXPECT_EQ(permissionsOf("/directory"), 0700u);
 }
 
@@ -68,7 +68,7 @@ TEST_F(FileSystemDirectoryTest, AFileInPlaceOfAParentIsAFailure) {
   makeFile("/Library", "contents");
   const Result result = files.createDirectoryWithIntermediates("/Library/Logs", kEveryoneMayWrite);
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot create the directory /Library: File exists");
+  EXPECT_EQ(result.error().text, "Cannot create the directory /Library: File exists");
   EXPECT_EQ(contentsOf("/Library"), "contents");
 }
 

@@ -68,7 +68,7 @@ TEST_F(FileSystemEntriesTest, ADirectoryWithSomethingInItIsNotRemoved) {
   makeFile("/directory/file", "contents");
   const Result result = files.removeDirectory("/directory");
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot remove the directory /directory: Directory not empty");
+  EXPECT_EQ(result.error().text, "Cannot remove the directory /directory: Directory not empty");
   EXPECT_EQ(contentsOf("/directory/file"), "contents");
 }
 

@@ -45,7 +45,7 @@ TEST_F(FileSystemRemovalTest, ADirectoryIsNotRemoved) {
   makeDirectory("/directory");
   const Result result = files.removeFile("/directory");
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot remove /directory: Is a directory");
+  EXPECT_EQ(result.error().text, "Cannot remove /directory: Is a directory");
   EXPECT_TRUE(fs::is_directory(onHost("/directory")));
 }
 
@@ -53,7 +53,7 @@ TEST_F(FileSystemRemovalTest, AMissingFileIsAFailureThatNamesIt) {
   makeDirectory("/directory");
   const Result result = files.removeFile("/directory/none");
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot remove /directory/none: No such file or directory");
+  EXPECT_EQ(result.error().text, "Cannot remove /directory/none: No such file or directory");
 }
 
 TEST_F(FileSystemRemovalTest, AFileInAReadOnlyDirectoryStays) {

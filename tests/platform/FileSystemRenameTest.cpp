@@ -53,7 +53,7 @@ TEST_F(FileSystemRenameTest, ALinkInPlaceOfTheSourceIsNotMoved) {
   makeFile("/file", "old");
   const Result result = files.renameFile("/new", "/file");
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot open /new: It is a symbolic link, not a regular file");
+  EXPECT_EQ(result.error().text, "Cannot open /new: It is a symbolic link, not a regular file");
   EXPECT_EQ(contentsOf("/file"), "old");
 }
 
@@ -62,7 +62,7 @@ TEST_F(FileSystemRenameTest, ADirectoryAtTheDestinationIsAFailureThatKeepsTheSou
   makeDirectory("/file");
   const Result result = files.renameFile("/new", "/file");
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot rename /new to /file: Is a directory");
+  EXPECT_EQ(result.error().text, "Cannot rename /new to /file: Is a directory");
   EXPECT_EQ(contentsOf("/new"), "new");
 }
 
@@ -97,7 +97,7 @@ TEST_F(FileSystemRenameTest, AFileWhoseContentsDoNotReachTheMediumIsNotMoved) {
       {
         makeSystemCallFail(SYS_fsync, EIO);
         const Result result = files.renameFile("/new", "/file");
-        std::fprintf(stderr, "%s\n", result ? "renamed" : result.error().c_str());
+        std::fprintf(stderr, "%s\n", result ? "renamed" : result.error().text.c_str());
         std::_Exit(0);
       },
       testing::ExitedWithCode(0), "Cannot flush /new: Input/output error");

@@ -44,7 +44,7 @@ TEST_F(FileSystemWritingTest, CreatingReplacesALinkAndLeavesItsTarget) {
 TEST_F(FileSystemWritingTest, CreatingInAMissingDirectoryFails) {
   const Result result = files.createFile("/none/file", "contents");
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot open /none: No such file or directory");
+  EXPECT_EQ(result.error().text, "Cannot open /none: No such file or directory");
 }
 
 TEST_F(FileSystemWritingTest, WritingInPlaceKeepsTheFileAndReplacesItsContents) {
@@ -100,7 +100,7 @@ TEST_F(FileSystemWritingTest, WritingInPlaceDoesNotFollowALink) {
   makeLink("/file", "/target");
   const Result result = files.writeFile("/file", plainContents("new"));
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot open /file: It is a symbolic link, not a regular file");
+  EXPECT_EQ(result.error().text, "Cannot open /file: It is a symbolic link, not a regular file");
   EXPECT_EQ(contentsOf("/target"), "target");
 }
 
@@ -119,7 +119,7 @@ TEST_F(FileSystemWritingTest, WritingInPlaceFailsOnAFullDisk) {
   const WithLargestWrittenFile full(4);
   const Result result = files.writeFile("/file", plainContents("longer than that"));
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot write /file: File too large");
+  EXPECT_EQ(result.error().text, "Cannot write /file: File too large");
 }
 
 TEST_F(FileSystemWritingTest, WritingAtomicallyReplacesTheFileWithANewOne) {
@@ -145,7 +145,7 @@ TEST_F(FileSystemWritingTest, WritingAtomicallyFailsWhenTheContentsDoNotReachThe
       {
         makeSystemCallFail(SYS_fsync, EIO);
         const Result result = files.writeFileAtomically("/directory/file", plainContents("new"));
-        std::fprintf(stderr, "%s\n", result ? "written" : result.error().c_str());
+        std::fprintf(stderr, "%s\n", result ? "written" : result.error().text.c_str());
         std::_Exit(0);
       },
       testing::ExitedWithCode(0), "Cannot write /directory/file: Input/output error");
@@ -157,7 +157,7 @@ TEST_F(FileSystemWritingTest, WritingAtomicallyOverADirectoryFailsAndLeavesNothi
   makeDirectory("/directory/file");
   const Result result = files.writeFileAtomically("/directory/file", plainContents("new"));
   ASSERT_FALSE(result);
-  EXPECT_NE(result.error().find("Is a directory"), std::string::npos);
+  EXPECT_NE(result.error().text.find("Is a directory"), std::string::npos);
   EXPECT_EQ(namesIn("/directory"), std::vector<std::string>{"file"});
 }
 

@@ -37,7 +37,7 @@ TEST_F(FrameworkLoaderTest, AFrameworkMakesItsClassesKnown) {
 
   const Result loaded = loader_.loadFramework("/Library/Mail.so");
 
-  EXPECT_TRUE(loaded) << loaded.error();
+  EXPECT_TRUE(loaded) << loaded.error().text;
   const AccountClass* notifier = loader_.classes().classNamed("MailAccountNotifier");
   ASSERT_NE(notifier, nullptr);
   EXPECT_TRUE(notifier->noteAccountChanges);
@@ -103,10 +103,10 @@ TEST_F(FrameworkLoaderTest, AFrameworkOfOtherHeadersIsAFailureThatSaysSo) {
   installBroken("OfOtherHeaders", "/Library/Other.so");
   installBroken("OfNoVersion", "/Library/Old.so");
 
-  EXPECT_EQ(loader_.loadFramework("/Library/Other.so").error(),
-            "It was built against other headers: its interface has version 999, which is 2 here");
-  EXPECT_EQ(loader_.loadFramework("/Library/Old.so").error(),
-            "It was built against other headers: it names no version of its interface, which is 2 "
+  EXPECT_EQ(loader_.loadFramework("/Library/Other.so").error().text,
+            "It was built against other headers: its interface has version 999, which is 3 here");
+  EXPECT_EQ(loader_.loadFramework("/Library/Old.so").error().text,
+            "It was built against other headers: it names no version of its interface, which is 3 "
             "here");
 }
 
@@ -118,7 +118,7 @@ TEST_F(FrameworkLoaderTest, AMissingFrameworkIsAFailureThatNamesIt) {
   const Result loaded = loader_.loadFramework("/Library/Mail.so");
 
   ASSERT_FALSE(loaded);
-  EXPECT_THAT(loaded.error(), HasSubstr("/Library/Mail.so: No such file or directory"));
+  EXPECT_THAT(loaded.error().text, HasSubstr("/Library/Mail.so: No such file or directory"));
 }
 
 TEST_F(FrameworkLoaderTest, AFileThatIsNoSharedObjectIsAFailureInTheLoadersWords) {
@@ -128,7 +128,7 @@ TEST_F(FrameworkLoaderTest, AFileThatIsNoSharedObjectIsAFailureInTheLoadersWords
   const Result loaded = loader_.loadFramework("/Library/Mail.so");
 
   ASSERT_FALSE(loaded);
-  EXPECT_THAT(loaded.error(), HasSubstr("invalid ELF header"));
+  EXPECT_THAT(loaded.error().text, HasSubstr("invalid ELF header"));
 }
 
 TEST_F(FrameworkLoaderTest, ASharedObjectWithoutTheEntryPointIsAFailureThatNamesIt) {
@@ -137,7 +137,7 @@ TEST_F(FrameworkLoaderTest, ASharedObjectWithoutTheEntryPointIsAFailureThatNames
   const Result loaded = loader_.loadFramework("/Library/Mail.so");
 
   ASSERT_FALSE(loaded);
-  EXPECT_THAT(loaded.error(), HasSubstr("undefined symbol: RegisterClasses"));
+  EXPECT_THAT(loaded.error().text, HasSubstr("undefined symbol: RegisterClasses"));
 }
 
 TEST_F(FrameworkLoaderTest, AnUnresolvedSymbolIsAFailureAtLoadTimeThatNamesIt) {
@@ -146,7 +146,7 @@ TEST_F(FrameworkLoaderTest, AnUnresolvedSymbolIsAFailureAtLoadTimeThatNamesIt) {
   const Result loaded = loader_.loadFramework("/Library/Mail.so");
 
   ASSERT_FALSE(loaded);
-  EXPECT_THAT(loaded.error(), HasSubstr("undefined symbol: functionThatNobodyDefines"));
+  EXPECT_THAT(loaded.error().text, HasSubstr("undefined symbol: functionThatNobodyDefines"));
 }
 
 TEST_F(FrameworkLoaderTest, ALinkThatLeadsOutOfTheDeviceLoadsNothingFromOutside) {

@@ -173,10 +173,12 @@ TEST_F(SetOwnerTest, AnUnknownUserOrGroupFailsWithItsName) {
   const auto before = statusOf("/file").st_uid;
   const Result unknownUser = files.setOwnerAndGroup("/file", "nobody", "mobile");
   ASSERT_FALSE(unknownUser);
-  EXPECT_EQ(unknownUser.error(), "Cannot find \"nobody\" in /etc/passwd: There is no usable entry");
+  EXPECT_EQ(unknownUser.error().text,
+            "Cannot find \"nobody\" in /etc/passwd: There is no usable entry");
   const Result unknownGroup = files.setOwnerAndGroup("/file", "mobile", "staff");
   ASSERT_FALSE(unknownGroup);
-  EXPECT_EQ(unknownGroup.error(), "Cannot find \"staff\" in /etc/group: There is no usable entry");
+  EXPECT_EQ(unknownGroup.error().text,
+            "Cannot find \"staff\" in /etc/group: There is no usable entry");
   EXPECT_EQ(statusOf("/file").st_uid, before);
 }
 
@@ -194,7 +196,7 @@ TEST_F(SetOwnerTest, WithoutTheRightToGiveFilesAwayItFails) {
   const WithoutPrivileges restricted;
   const Result result = files.setOwnerAndGroup("/file", "mobile", "mobile");
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot set the owner of /file: Operation not permitted");
+  EXPECT_EQ(result.error().text, "Cannot set the owner of /file: Operation not permitted");
 }
 
 }  // namespace

@@ -115,7 +115,7 @@ TEST_F(PropertyListsTest, AValueNestedTooDeeplyIsNotSerialised) {
   SerializedPropertyList serialized = serialize("left over");
   const Result result = propertyLists.serializeBinary(value, serialized);
   ASSERT_FALSE(result);
-  EXPECT_FALSE(result.error().empty());
+  EXPECT_FALSE(result.error().text.empty());
   EXPECT_FALSE(serialized);
 }
 

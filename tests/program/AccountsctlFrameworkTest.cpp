@@ -35,7 +35,7 @@ TEST_F(AccountsctlFramework, ItsClassesAreListedWithWhatTheyAnswer) {
             "CloudAccountNotifier\tnoteAccountChanges\n"
             "CloudFullAccount\taccountWithBasicAccount\n"
             "CloudSyncAccount\taccountToRefreshForBasicAccount\n"
-            "Built for version 2 of the interface\n"
+            "Built for version 3 of the interface\n"
             "Nothing found\n");
 }
 
@@ -91,7 +91,7 @@ TEST_F(AccountsctlFramework, WhatNoDeviceLoadsIsRefusedWithTheReason) {
   const std::pair<const char*, const char*> refused[] = {
       {"WithoutEntryPoint", "RegisterClasses"},
       {"WithUnresolvedSymbol", "functionThatNobodyDefines"},
-      {"OfOtherHeaders", "its interface has version 999, which is 2 here"},
+      {"OfOtherHeaders", "its interface has version 999, which is 3 here"},
       {"OfNoVersion", "it names no version of its interface"},
   };
   for (const auto& [name, reason] : refused) {

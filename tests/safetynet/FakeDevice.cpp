@@ -31,7 +31,7 @@ bool isIn(std::string_view path, std::string_view directory) {
 }
 
 Result resultOf(const std::optional<Failure>& failure) {
-  return failure ? Result(*failure) : Result::success();
+  return failure ? Result(*failure) : Result();
 }
 
 }  // namespace

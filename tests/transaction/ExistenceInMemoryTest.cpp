@@ -28,8 +28,8 @@ TEST_P(ExistenceTest, WhatIsThereIsThereInMemory) {
     const std::optional<WithoutPrivileges> everyone =
         isPrivileged ? std::nullopt : std::make_optional<WithoutPrivileges>();
     const auto look = [&, at = path(place)](FileSystem& system) {
-      return Result::failure(std::string(system.fileExists(at) ? "there" : "not there") +
-                             (system.isDirectory(at) ? ", a directory" : ""));
+      return Failure{.text = std::string(system.fileExists(at) ? "there" : "not there") +
+                             (system.isDirectory(at) ? ", a directory" : "")};
     };
     const std::string memory = inMemory(look);
     if (!memory.starts_with("no snapshot: Cannot open " + path(place))) {

@@ -30,7 +30,7 @@ class SameAsTheDeviceTest : public DeviceFixture {
   /// What an operation says: nothing, or why it failed.
   static std::string outcomeOf(FileSystem& files, const Operation& operation) {
     const Result result = operation(files);
-    return result ? "success" : result.error();
+    return result ? "success" : result.error().text;
   }
   [[nodiscard]] std::string inMemory(const Operation& operation) {
     auto taken = LinuxDevicePlaces(root, files, std::string(kHome)).takeSnapshot();

@@ -48,7 +48,7 @@ TEST_F(SavesInMemoryTest, ASettingsFileThatCannotBeReplacedSaysWhyTheSaveFailed)
   const Result result = save(kNew);
 
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot create it: why");
+  EXPECT_EQ(result.error().text, "Cannot create it: why");
   EXPECT_EQ(transaction.lastSave(), LastSave::Failed);
   EXPECT_EQ(transaction.saveFailure(), "Cannot create it: why");
   EXPECT_EQ(transaction.dictionaryAt(DevicePlace::Settings), kOld);
@@ -57,7 +57,7 @@ TEST_F(SavesInMemoryTest, ASettingsFileThatCannotBeReplacedSaysWhyTheSaveFailed)
 TEST_F(SavesInMemoryTest, OnlyWhatIsAboutToBePutInPlaceIsGivenAway) {
   snapshot.addFile(DevicePlace::Settings, "");
   EXPECT_EQ(
-      files.setOwnerAndGroup(path(DevicePlace::Settings), "mobile", "mobile").error(),
+      files.setOwnerAndGroup(path(DevicePlace::Settings), "mobile", "mobile").error().text,
       "Cannot set the owner of " + path(DevicePlace::Settings) + ": No such file or directory");
 }
 

@@ -43,7 +43,7 @@ TEST_F(TransactionFileSystemTest, AFileThatIsRemovedIsGone) {
   EXPECT_FALSE(files.fileExists(path(DevicePlace::LegacyMail)));
   const Result again = files.removeFile(path(DevicePlace::LegacyMail));
   ASSERT_FALSE(again);
-  EXPECT_EQ(again.error(),
+  EXPECT_EQ(again.error().text,
             "Cannot remove /var/mobile/Library/Mail/Accounts.plist: "
             "No such file or directory");
 }
@@ -55,7 +55,7 @@ TEST_F(TransactionFileSystemTest, WhatTheDeviceWouldNotRemoveStays) {
   const Result result = files.removeFile(path(DevicePlace::LegacyMail));
 
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot remove it: why");
+  EXPECT_EQ(result.error().text, "Cannot remove it: why");
   EXPECT_TRUE(files.fileExists(path(DevicePlace::LegacyMail)));
 }
 
@@ -65,7 +65,7 @@ TEST_F(TransactionFileSystemTest, WhatTheDeviceWouldNotReplaceIsNotMade) {
   const Result result = files.createFile(path(DevicePlace::RemovalSentinel), "removing");
 
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "why");
+  EXPECT_EQ(result.error().text, "why");
   EXPECT_FALSE(files.fileExists(path(DevicePlace::RemovalSentinel)));
 }
 
@@ -81,7 +81,7 @@ TEST_F(TransactionFileSystemTest, ACopyHoldsWhatTheSettingsFileHeldThen) {
 TEST_F(TransactionFileSystemTest, NothingIsCopiedFromNothing) {
   const Result result = files.copyFile(path(DevicePlace::Settings), path(DevicePlace::CopyAside));
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), snapshot.at(DevicePlace::Settings).whyNotRead->text);
+  EXPECT_EQ(result.error().text, snapshot.at(DevicePlace::Settings).whyNotRead->text);
   EXPECT_FALSE(files.fileExists(path(DevicePlace::CopyAside)));
 }
 
@@ -98,7 +98,7 @@ TEST_F(TransactionFileSystemTest, NothingIsCopiedOverWhatIsThere) {
   const Result result = files.copyFile(path(DevicePlace::Settings), path(DevicePlace::CopyAside));
 
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(),
+  EXPECT_EQ(result.error().text,
             "Cannot create /var/mobile/Library/Logs/CrashReporter/com.quarx.accountsettings.plist: "
             "File exists");
 }
@@ -120,8 +120,9 @@ TEST_F(TransactionFileSystemTest, ACopyTakesThePlaceOfWhatWasRemoved) {
 
 TEST_F(TransactionFileSystemTest, OnlyTheSettingsFileIsCopied) {
   snapshot.addFile(DevicePlace::LegacyMail, "store");
-  EXPECT_EQ(files.copyFile(path(DevicePlace::LegacyMail), path(DevicePlace::CopyAside)).error(),
-            "Cannot copy " + path(DevicePlace::LegacyMail) + ": Operation not supported");
+  EXPECT_EQ(
+      files.copyFile(path(DevicePlace::LegacyMail), path(DevicePlace::CopyAside)).error().text,
+      "Cannot copy " + path(DevicePlace::LegacyMail) + ": Operation not supported");
   EXPECT_EQ(changes(), std::vector<std::string>{});
 }
 
@@ -136,7 +137,7 @@ TEST_F(TransactionFileSystemTest, TheInformationDirectoryIsMadeOnce) {
   EXPECT_TRUE(files.isDirectory(directory));
   const Result again = files.createDirectoryWithIntermediates(directory, 0777);
   ASSERT_FALSE(again);
-  EXPECT_EQ(again.error(), "Cannot create the directory " + directory + ": File exists");
+  EXPECT_EQ(again.error().text, "Cannot create the directory " + directory + ": File exists");
 }
 
 TEST_F(TransactionFileSystemTest, AnInformationDirectoryThatCannotBeMadeSaysWhy) {
@@ -144,7 +145,7 @@ TEST_F(TransactionFileSystemTest, AnInformationDirectoryThatCannotBeMadeSaysWhy)
   const Result result =
       files.createDirectoryWithIntermediates(path(DevicePlace::InformationDirectory), 0777);
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "why");
+  EXPECT_EQ(result.error().text, "why");
   EXPECT_FALSE(files.isDirectory(path(DevicePlace::InformationDirectory)));
 }
 
@@ -152,7 +153,7 @@ TEST_F(TransactionFileSystemTest, NoInformationFileIsMadeWithoutItsDirectory) {
   const std::string directory = path(DevicePlace::InformationDirectory);
   const Result result = files.writeFileAtomically(directory + "/name.txt", serialized(kOldVersion));
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "Cannot open " + directory + ": No such file or directory");
+  EXPECT_EQ(result.error().text, "Cannot open " + directory + ": No such file or directory");
   EXPECT_EQ(changes(), std::vector<std::string>{});
 }
 
@@ -162,7 +163,7 @@ TEST_F(TransactionFileSystemTest, NoInformationFileIsMadeInADirectoryThatMayNotB
   const Result result = files.writeFileAtomically(
       path(DevicePlace::InformationDirectory) + "/name.txt", serialized(kOldVersion));
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "why");
+  EXPECT_EQ(result.error().text, "why");
 }
 
 TEST_F(TransactionFileSystemTest, ADirectoryInAFilesPlaceIsOne) {
@@ -188,7 +189,7 @@ TEST_F(TransactionFileSystemTest, ATemporaryFileTakesItsPlaceOnce) {
   ASSERT_TRUE(files.renameFile(temporary, path(DevicePlace::Settings)));
   const Result again = files.renameFile(temporary, path(DevicePlace::Settings));
   ASSERT_FALSE(again);
-  EXPECT_EQ(again.error(), "Cannot open " + temporary + ": No such file or directory");
+  EXPECT_EQ(again.error().text, "Cannot open " + temporary + ": No such file or directory");
 }
 
 }  // namespace

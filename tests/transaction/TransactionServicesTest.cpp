@@ -38,7 +38,7 @@ TEST_F(TransactionPropertyListsTest, WhatCannotBeWrittenIsRefusedWhenItIsSeriali
   SerializedPropertyList list;
   const Result result = lists.serializeBinary(kNewList, list);
   ASSERT_FALSE(result);
-  EXPECT_EQ(result.error(), "too deep");
+  EXPECT_EQ(result.error().text, "too deep");
 }
 
 struct TransactionSharedResourcesTest : testing::Test {

@@ -13,7 +13,7 @@ namespace {
 
 bool isRefusedAFramework(Platform& platform) {
   const Result loaded = platform.frameworkLoader.loadFramework("/framework.so");
-  std::puts(loaded.error().c_str());
+  std::puts(loaded.error().text.c_str());
   return !loaded;
 }
 
