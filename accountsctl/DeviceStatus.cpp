@@ -24,13 +24,12 @@ void lookAtSettings(Transaction& transaction, DeviceStatus& status) {
   status.settingsPath = place.path;
   status.hasSettings = transaction.exists(DevicePlace::Settings);
   const std::optional<std::string> bytes = transaction.bytesBefore(DevicePlace::Settings);
-  Failure error;
-  const auto root = bytes ? dictionaryFromBytes(*bytes, place.path, error) : std::nullopt;
+  const auto root = bytes ? dictionaryFromBytes(*bytes, place.path) : Failure();
   if (!root) {
     const auto& whyNotRead = place.whyNotRead ? place.whyNotRead : transaction.readFailure();
     status.settingsProblem = !status.hasSettings ? std::nullopt
                              : whyNotRead        ? std::optional(whyNotRead->text)
-                                                 : std::optional(error.text);
+                                                 : std::optional(root.error().text);
     return;
   }
   if (const PropertyValue* version = root->find(kPlistVersionKey)) {
@@ -74,10 +73,8 @@ std::vector<std::string> pathsWithPrefix(LinuxPlatform& platform, std::string_vi
 
 /// Whether no process has a temporary file in its hands. The lock that tells is given back at once.
 bool isAbandoned(const DeviceRoot& root, const std::string& path) {
-  Failure error;
-  const std::optional<DirectoryEntry> entry = root.locate(path, error);
-  const std::optional<FileDescriptor> file =
-      entry ? entry->openRegularFile(O_RDONLY, error) : std::nullopt;
+  const auto entry = root.locate(path);
+  const auto file = entry ? entry->openRegularFile(O_RDONLY) : entry.error();
   return file && ::flock(file->number(), LOCK_SH | LOCK_NB) == 0;
 }
 

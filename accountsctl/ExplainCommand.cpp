@@ -11,10 +11,9 @@
 namespace accounts {
 
 CommandResult explain(const ExplainOptions& options, const CommandWorker& worker) {
-  Failure error;
-  const std::optional<std::string> text = readHostFile(options.report, error);
+  const auto text = readHostFile(options.report);
   if (!text) {
-    return programErrorOf(error, ExitStatus::MissingInput);
+    return programErrorOf(text.error(), ExitStatus::MissingInput);
   }
   worker.giveUpRights({.size = text->size()});
   const JSON report = JSON::parse(*text, nullptr, /*allow_exceptions=*/false);

@@ -11,6 +11,7 @@
 #include "accountsctl/ExportedSymbols.h"
 #include "accountsctl/JSONText.h"
 #include "accountsctl/TextTable.h"
+#include "commandline/PlatformError.h"
 #include "platform/linux/LinuxFrameworkLoader.h"
 #include "propertylist/value/Description.h"
 
@@ -129,10 +130,9 @@ CommandResult checkFramework(const FrameworkCheckOptions& options, const Termina
                              const CommandWorker& /*worker*/) {
   // What the framework itself writes is not the report.
   ::dup2(STDERR_FILENO, STDOUT_FILENO);
-  Failure error;
-  const auto root = DeviceRoot::openRoot("/", error);
+  const auto root = DeviceRoot::openRoot("/");
   if (!root) {
-    return ProgramError{exitStatusOf(error, ExitStatus::MissingInput), error.text};
+    return programErrorOf(root.error(), ExitStatus::MissingInput);
   }
   CheckedFramework framework;
   FindingsLog log(framework.findings);

@@ -14,10 +14,9 @@ std::variant<std::vector<PropertyValue>, ProgramError> readPropertyListInputs(
   std::vector<std::string> contents;
   OpenInputs inputs;
   for (const std::string& file : files) {
-    Failure error;
-    std::optional<std::string> bytes = readHostFile(file, error);
+    auto bytes = readHostFile(file);
     if (!bytes) {
-      return programErrorOf(error, ExitStatus::MissingInput);
+      return programErrorOf(bytes.error(), ExitStatus::MissingInput);
     }
     inputs.size += bytes->size();
     contents.push_back(*std::move(bytes));

@@ -294,11 +294,11 @@ CommandResult summarize(const SummarizeOptions& asked, const std::vector<Summari
   }
   std::optional<std::string> rootsText;
   if (options.rootsFile) {
-    Failure error;
-    rootsText = readHostFile(*options.rootsFile, error);
-    if (!rootsText) {
-      return programErrorOf(error, ExitStatus::MissingInput);
+    auto read = readHostFile(*options.rootsFile);
+    if (!read) {
+      return programErrorOf(read.error(), ExitStatus::MissingInput);
     }
+    rootsText = *std::move(read);
     inputs.size += rootsText->size();
   }
   std::error_code unknown;

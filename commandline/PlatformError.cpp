@@ -38,9 +38,9 @@ ProgramError programErrorOf(const Failure& failure, ExitStatus lasting) {
 std::optional<ProgramError> whyNoDevice(const DeviceRoot& root, std::string_view name) {
   std::string missing;
   for (const std::string_view each : kDeviceDirectories) {
-    Failure error;
     // What cannot be looked at is there, as far as this is concerned.
-    if (root.open(each, O_PATH | O_DIRECTORY, error) || error.number != ENOENT) {
+    const auto opened = root.open(each, O_PATH | O_DIRECTORY);
+    if (opened || opened.error().number != ENOENT) {
       return std::nullopt;
     }
     missing.append(missing.empty() ? "" : ", ").append(each);

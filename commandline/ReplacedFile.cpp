@@ -102,16 +102,15 @@ std::variant<Replacement, ProgramError> makeReplacement(const std::string& path,
   if (unresolved) {
     return cannotCreate(pathFailure("write", path, unresolved.value()));
   }
-  Failure error;
-  std::optional<DeviceRoot> machine = DeviceRoot::openRoot("/", error);
+  auto machine = DeviceRoot::openRoot("/");
   if (!machine) {
-    return cannotWrite(error);
+    return cannotWrite(machine.error());
   }
   // In the target's own directory, so that both are on one file system.
   std::string directory(splitPath(target).directory);
-  std::optional<TemporaryFile> temporary = makeTemporaryFileIn(*machine, directory, error);
+  auto temporary = makeTemporaryFileIn(*machine, directory);
   if (!temporary) {
-    return cannotCreate(error);
+    return cannotCreate(temporary.error());
   }
   return Replacement{*std::move(machine), *std::move(temporary), std::move(directory),
                      std::move(target), replaced};

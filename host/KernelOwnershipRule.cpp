@@ -14,11 +14,10 @@ KernelOwnershipRule::KernelOwnershipRule(const DeviceRoot& root)
 
 std::variant<FileOwner, Failure> KernelOwnershipRule::ownerNamed(std::string_view ownerName,
                                                                  std::string_view groupName) {
-  Failure error;
-  const auto user = names_.userIdentifier(std::string(ownerName), error);
-  const auto group = user ? names_.groupIdentifier(std::string(groupName), error) : std::nullopt;
+  const auto user = names_.userIdentifier(std::string(ownerName));
+  const auto group = user ? names_.groupIdentifier(std::string(groupName)) : user.error();
   if (!group) {
-    return error;
+    return group.error();
   }
   const FileOwner owner = {*user, *group};
   if (self_.user != 0 && owner != self_) {

@@ -303,9 +303,8 @@ void tellOfEndedWorker(const PluginWork& work, const WorkerSide& side) {
 
 void workOnDevice(const PluginWork& work, const WorkerSide& side) {
   work.leaveHost();
-  Failure error;
-  const auto root = work.device.platform->root().open("/", O_PATH | O_DIRECTORY, error);
-  endUnlessGivenUp(root ? giveUpForeignRights(root->number()) : std::optional(error), side.socket);
+  const auto root = work.device.platform->root().open("/", O_PATH | O_DIRECTORY);
+  endUnlessGivenUp(root ? giveUpForeignRights(root->number()) : root.error(), side.socket);
   ToldFates told;
   PluginOutcome outcome =
       runRecordedPlugin(work, work.device.bundle.load(), work.device.platform->platform(), told);

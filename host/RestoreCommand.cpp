@@ -65,12 +65,11 @@ RestoreResult failed(ProgramError error) {
 
 /// Why it cannot be told at the moment what is kept: that is not the same as nothing.
 std::optional<ProgramError> whyUnknown(const DeviceRoot& root) {
-  Failure error;
-  if (root.open(kAccountMigrationDirectory, O_RDONLY | O_DIRECTORY, error) ||
-      error.kind() == FailureKind::Lasting) {
+  const auto opened = root.open(kAccountMigrationDirectory, O_RDONLY | O_DIRECTORY);
+  if (opened || opened.error().kind() == FailureKind::Lasting) {
     return std::nullopt;
   }
-  return programErrorOf(error, ExitStatus::MissingInput);
+  return programErrorOf(opened.error(), ExitStatus::MissingInput);
 }
 
 RestoreResult listFolders(const KeptFolders& folders, const RestoreOptions& options) {
@@ -111,10 +110,9 @@ RestoreResult discardFolder(KeptFolders& folders, const RestoreOptions& options)
 }  // namespace
 
 RestoreResult runRestoration(const RestoreOptions& options) {
-  Failure error;
-  const auto root = DeviceRoot::openRoot(options.root, error);
+  const auto root = DeviceRoot::openRoot(options.root);
   if (!root) {
-    return failed(programErrorOf(error, ExitStatus::MissingInput));
+    return failed(programErrorOf(root.error(), ExitStatus::MissingInput));
   }
   // No temporary file is made; the directory is only named.
   const std::string home = homeOf(options);

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <optional>
 #include <tl/expected.hpp>
 #include <utility>
 
@@ -21,5 +22,11 @@ class [[nodiscard]] OrError : public tl::expected<Value, Error> {
 template <class Value>
 using OrFailure = OrError<Value, Failure>;
 using Result = OrFailure<void>;
+
+/// What there is, for whom the error makes no difference.
+template <class Value>
+std::optional<Value> valueOrNone(OrFailure<Value> result) {
+  return result ? std::optional(*std::move(result)) : std::nullopt;
+}
 
 }  // namespace accounts

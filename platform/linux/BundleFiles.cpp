@@ -22,7 +22,7 @@ std::string BundleFiles::pathOf(const std::string& name) const {
 }
 
 std::optional<Failure> BundleFiles::readAhead() {
-  std::map<std::string, Found> found;
+  std::map<std::string, OrFailure<std::string>> found;
   std::error_code error;
   fs::recursive_directory_iterator entry(directory_, error);
   for (; !error && entry != fs::recursive_directory_iterator(); entry.increment(error)) {
@@ -30,10 +30,9 @@ std::optional<Failure> BundleFiles::readAhead() {
       continue;
     }
     std::string name = entry->path().lexically_relative(directory_).string();
-    Found file;
-    file.bytes = readHostFile(entry->path().string(), file.error, Pipes::Refuse);
-    if (!file.bytes && file.error.kind() != FailureKind::Lasting) {
-      return file.error;
+    auto file = readHostFile(entry->path().string(), Pipes::Refuse);
+    if (!file && file.error().kind() != FailureKind::Lasting) {
+      return file.error();
     }
     found.emplace(std::move(name), std::move(file));
   }
@@ -48,19 +47,12 @@ bool BundleFiles::exists(const std::string& name) const {
   return found_ ? found_->contains(name) : ::access(pathOf(name).c_str(), F_OK) == 0;
 }
 
-std::optional<std::string> BundleFiles::read(const std::string& name, Failure& error) const {
+OrFailure<std::string> BundleFiles::read(const std::string& name) const {
   if (!found_) {
-    return readHostFile(pathOf(name), error, Pipes::Refuse);
+    return readHostFile(pathOf(name), Pipes::Refuse);
   }
   const auto file = found_->find(name);
-  if (file == found_->end()) {
-    error = pathFailure("open", pathOf(name), ENOENT);
-    return std::nullopt;
-  }
-  if (!file->second.bytes) {
-    error = file->second.error;
-  }
-  return file->second.bytes;
+  return file != found_->end() ? file->second : pathFailure("open", pathOf(name), ENOENT);
 }
 
 }  // namespace accounts

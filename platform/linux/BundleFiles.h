@@ -21,20 +21,15 @@ class BundleFiles {
   std::optional<Failure> readAhead();
 
   [[nodiscard]] bool exists(const std::string& name) const;
-  /// The bytes of a regular file; none, with `error` set, when it is missing or cannot be read.
-  [[nodiscard]] std::optional<std::string> read(const std::string& name, Failure& error) const;
+  /// The bytes of a regular file.
+  [[nodiscard]] OrFailure<std::string> read(const std::string& name) const;
 
  private:
   [[nodiscard]] std::string pathOf(const std::string& name) const;
 
-  struct Found {
-    std::optional<std::string> bytes;
-    /// Why there are no bytes.
-    Failure error;
-  };
   std::string directory_;
   /// By name; none as long as files are opened when they are asked for.
-  std::optional<std::map<std::string, Found>> found_;
+  std::optional<std::map<std::string, OrFailure<std::string>>> found_;
 };
 
 }  // namespace accounts

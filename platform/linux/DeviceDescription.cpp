@@ -99,29 +99,35 @@ DeviceDescription deviceDescriptionFromDictionary(const PropertyDictionary& dict
   return description;
 }
 
-std::optional<DescriptionBytes> readDeviceDescription(const DeviceRoot& root, Failure& error) {
-  Failure failure;
-  std::optional<std::string> bytes = root.readFile(kDeviceDescriptionPath, failure);
-  if (!bytes && !failure.isMissing()) {
-    error = failure;
-    return std::nullopt;
+OrFailure<DescriptionBytes> readDeviceDescription(const DeviceRoot& root) {
+  auto bytes = root.readFile(kDeviceDescriptionPath);
+  if (!bytes && !bytes.error().isMissing()) {
+    return bytes.error();
   }
-  return DescriptionBytes{std::move(bytes), std::string(kDeviceDescriptionPath)};
+  DescriptionBytes read = {.bytes = {}, .path = std::string(kDeviceDescriptionPath)};
+  if (bytes) {
+    read.bytes = *std::move(bytes);
+  }
+  return read;
 }
 
-std::optional<DescriptionBytes> readHostDeviceDescription(const std::string& path, Failure& error) {
-  std::optional<std::string> bytes = readHostFile(path, error);
-  return bytes ? std::optional(DescriptionBytes{std::move(bytes), nameOfInput(path)})
-               : std::nullopt;
+OrFailure<DescriptionBytes> readHostDeviceDescription(const std::string& path) {
+  auto bytes = readHostFile(path);
+  if (!bytes) {
+    return bytes.error();
+  }
+  return DescriptionBytes{*std::move(bytes), nameOfInput(path)};
 }
 
-std::optional<DeviceDescription> decodeDeviceDescription(const DescriptionBytes& read,
-                                                         Failure& error) {
+OrFailure<DeviceDescription> decodeDeviceDescription(const DescriptionBytes& read) {
   if (!read.bytes) {
     return DeviceDescription();
   }
-  const auto dictionary = dictionaryFromBytes(*read.bytes, read.path, error);
-  return dictionary ? std::optional(deviceDescriptionFromDictionary(*dictionary)) : std::nullopt;
+  const auto dictionary = dictionaryFromBytes(*read.bytes, read.path);
+  if (!dictionary) {
+    return dictionary.error();
+  }
+  return deviceDescriptionFromDictionary(*dictionary);
 }
 
 }  // namespace accounts

@@ -59,16 +59,13 @@ struct DescriptionBytes {
 };
 
 /// The description that the device holds itself, at kDeviceDescriptionPath; it may be missing.
-/// None, with `error` set, when it cannot be read.
-std::optional<DescriptionBytes> readDeviceDescription(const DeviceRoot& root, Failure& error);
+OrFailure<DescriptionBytes> readDeviceDescription(const DeviceRoot& root);
 
-/// The description in a file of the host. None, with `error` set, when the file is missing
-/// (`error.isMissing()`) or cannot be read.
-std::optional<DescriptionBytes> readHostDeviceDescription(const std::string& path, Failure& error);
+/// The description in a file of the host. A failure also when the file is missing.
+OrFailure<DescriptionBytes> readHostDeviceDescription(const std::string& path);
 
-/// What a description says; one that is missing has no answers. None, with `error` set, when the
-/// bytes hold no dictionary.
-std::optional<DeviceDescription> decodeDeviceDescription(const DescriptionBytes& read,
-                                                         Failure& error);
+/// What a description says; one that is missing has no answers. A failure when the bytes hold no
+/// dictionary.
+OrFailure<DeviceDescription> decodeDeviceDescription(const DescriptionBytes& read);
 
 }  // namespace accounts

@@ -42,79 +42,66 @@ bool isRootOfTheSystem(const FileDescriptor& directory) {
 
 }  // namespace
 
-std::optional<DeviceRoot> DeviceRoot::openRoot(const std::string& hostDirectory, Failure& error) {
+OrFailure<DeviceRoot> DeviceRoot::openRoot(const std::string& hostDirectory) {
   const int number = ::open(hostDirectory.c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC);
   if (number < 0) {
-    error = pathFailure("open the device root", hostDirectory, errno);
-    return std::nullopt;
+    return pathFailure("open the device root", hostDirectory, errno);
   }
   FileDescriptor directory(number);
   const int probe = openBeneath(directory.number(), "/", O_PATH | O_DIRECTORY);
   if (probe < 0) {
-    error = pathFailure("resolve paths beneath the device root", hostDirectory, errno);
+    Failure error = pathFailure("resolve paths beneath the device root", hostDirectory, errno);
     error.text += " (openat2, of Linux 5.6 or later, is needed)";
-    return std::nullopt;
+    return error;
   }
   ::close(probe);
   const bool isSystemRoot = isRootOfTheSystem(directory);
   return DeviceRoot(std::move(directory), isSystemRoot);
 }
 
-std::optional<FileDescriptor> DeviceRoot::open(std::string_view path, int flags,
-                                               Failure& error) const {
+OrFailure<FileDescriptor> DeviceRoot::open(std::string_view path, int flags) const {
   if (path.find('\0') != std::string_view::npos) {
-    error = pathFailure("open", path, EINVAL);
-    return std::nullopt;
+    return pathFailure("open", path, EINVAL);
   }
   const int number = openBeneath(directory_.number(), std::string(path), flags);
   if (number < 0) {
-    error = pathFailure("open", path, errno);
-    return std::nullopt;
+    return pathFailure("open", path, errno);
   }
   return FileDescriptor(number);
 }
 
-std::optional<FileDescriptor> DeviceRoot::openIfRegular(std::string_view path, int flags,
-                                                        Failure& error) const {
-  auto file = open(path, flags, error);
-  if (!file) {
-    return std::nullopt;
-  }
-  const auto status = fileStatus(*file, path, error);
+OrFailure<FileDescriptor> DeviceRoot::openIfRegular(std::string_view path, int flags) const {
+  auto file = open(path, flags);
+  const auto status = file ? fileStatus(*file, path) : file.error();
   if (!status) {
-    return std::nullopt;
+    return status.error();
   }
   if (!S_ISREG(status->st_mode)) {
-    error = notRegularFailure("open", path, status->st_mode);
-    return std::nullopt;
+    return notRegularFailure("open", path, status->st_mode);
   }
   return file;
 }
 
-std::optional<FileDescriptor> DeviceRoot::openRegularFile(std::string_view path,
-                                                          Failure& error) const {
+OrFailure<FileDescriptor> DeviceRoot::openRegularFile(std::string_view path) const {
   // First for its path alone: opening a device can already have an effect.
-  if (!openIfRegular(path, O_PATH, error)) {
-    return std::nullopt;
-  }
-  return openIfRegular(path, O_RDONLY | O_NONBLOCK | O_NOCTTY, error);
+  auto file = openIfRegular(path, O_PATH);
+  return file ? openIfRegular(path, O_RDONLY | O_NONBLOCK | O_NOCTTY) : std::move(file);
 }
 
-std::optional<std::string> DeviceRoot::readFile(std::string_view path, Failure& error) const {
-  const auto file = openRegularFile(path, error);
-  return file ? readContents(*file, path, error) : std::nullopt;
+OrFailure<std::string> DeviceRoot::readFile(std::string_view path) const {
+  const auto file = openRegularFile(path);
+  return file ? readContents(*file, path) : file.error();
 }
 
-std::optional<DirectoryEntry> DeviceRoot::locate(std::string_view path, Failure& error) const {
+OrFailure<DirectoryEntry> DeviceRoot::locate(std::string_view path) const {
   const SplitPath split = splitPath(path);
   if (split.name.empty() || split.name == "." || split.name == ".." ||
       split.name.find('\0') != std::string_view::npos) {
-    error = pathFailure("find a name in", path, EINVAL);
-    return std::nullopt;
+    return pathFailure("find a name in", path, EINVAL);
   }
-  auto directory = open(split.directory, O_PATH | O_DIRECTORY, error);
+  auto directory = open(split.directory, O_PATH | O_DIRECTORY);
   if (!directory) {
-    return std::nullopt;
+    return directory.error();
   }
   return DirectoryEntry(std::move(*directory), std::string(split.name), std::string(path));
 }

@@ -10,18 +10,15 @@ constexpr std::string_view kReadOperation = "read the property list";
 
 }  // namespace
 
-std::optional<PropertyDictionary> dictionaryFromBytes(std::string_view bytes, std::string_view path,
-                                                      Failure& error) {
+OrFailure<PropertyDictionary> dictionaryFromBytes(std::string_view bytes, std::string_view path) {
   PropertyListError malformed;
   const auto value = readPropertyList(bytes, malformed);
   if (!value) {
-    error = pathFailure(kReadOperation, path, malformed.text);
-    return std::nullopt;
+    return pathFailure(kReadOperation, path, malformed.text);
   }
   const PropertyDictionary* dictionary = value->asDictionary();
   if (dictionary == nullptr) {
-    error = pathFailure(kReadOperation, path, "Its root is not a dictionary");
-    return std::nullopt;
+    return pathFailure(kReadOperation, path, "Its root is not a dictionary");
   }
   return *dictionary;
 }

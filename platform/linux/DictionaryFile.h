@@ -1,16 +1,14 @@
 #pragma once
 
-#include <optional>
 #include <string_view>
 
-#include "platform/Failure.h"
+#include "platform/Result.h"
 #include "propertylist/value/PropertyValue.h"
 
 namespace accounts {
 
-/// The dictionary that the bytes of a property-list file stand for. None, with `error` naming the
+/// The dictionary that the bytes of a property-list file stand for. A failure, which names the
 /// path, when they are malformed or stand for something else.
-std::optional<PropertyDictionary> dictionaryFromBytes(std::string_view bytes, std::string_view path,
-                                                      Failure& error);
+OrFailure<PropertyDictionary> dictionaryFromBytes(std::string_view bytes, std::string_view path);
 
 }  // namespace accounts

@@ -14,11 +14,9 @@ namespace {
 
 constexpr mode_t kOwnerOnly = 0700;
 
-std::optional<FileDescriptor> asOpened(int number, std::string_view operation,
-                                       std::string_view path, Failure& error) {
+OrFailure<FileDescriptor> asOpened(int number, std::string_view operation, std::string_view path) {
   if (number < 0) {
-    error = pathFailure(operation, path, errno);
-    return std::nullopt;
+    return pathFailure(operation, path, errno);
   }
   return FileDescriptor(number);
 }
@@ -29,68 +27,58 @@ DirectoryEntry::DirectoryEntry(std::shared_ptr<const FileDescriptor> directory, 
                                std::string path)
     : directory_(std::move(directory)), name_(std::move(name)), path_(std::move(path)) {}
 
-std::optional<FileDescriptor> DirectoryEntry::openRegularFile(int flags, Failure& error) const {
+OrFailure<FileDescriptor> DirectoryEntry::openRegularFile(int flags) const {
   struct stat status = {};
   if (::fstatat(directory(), name(), &status, AT_SYMLINK_NOFOLLOW) != 0) {
-    error = pathFailure("open", path_, errno);
-    return std::nullopt;
+    return pathFailure("open", path_, errno);
   }
   // Looked at before it is opened as well: opening a device can already have an effect.
   if (!S_ISREG(status.st_mode)) {
-    error = notRegularFailure("open", path_, status.st_mode);
-    return std::nullopt;
+    return notRegularFailure("open", path_, status.st_mode);
   }
   const int safeFlags = flags | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC | O_NOCTTY;
-  auto file = asOpened(::openat(directory(), name(), safeFlags), "open", path_, error);
-  if (!file) {
-    return std::nullopt;
-  }
-  const auto opened = fileStatus(*file, path_, error);
+  auto file = asOpened(::openat(directory(), name(), safeFlags), "open", path_);
+  const auto opened = file ? fileStatus(*file, path_) : file.error();
   if (!opened) {
-    return std::nullopt;
+    return opened.error();
   }
   if (!S_ISREG(opened->st_mode)) {
-    error = notRegularFailure("open", path_, opened->st_mode);
-    return std::nullopt;
+    return notRegularFailure("open", path_, opened->st_mode);
   }
   return file;
 }
 
-std::optional<FileDescriptor> DirectoryEntry::openForItsPath(Failure& error) const {
-  return asOpened(::openat(directory(), name(), O_PATH | O_NOFOLLOW | O_CLOEXEC), "open", path_,
-                  error);
+OrFailure<FileDescriptor> DirectoryEntry::openForItsPath() const {
+  return asOpened(::openat(directory(), name(), O_PATH | O_NOFOLLOW | O_CLOEXEC), "open", path_);
 }
 
-std::optional<FileDescriptor> DirectoryEntry::createFile(mode_t permissions, Failure& error) const {
+OrFailure<FileDescriptor> DirectoryEntry::createFile(mode_t permissions) const {
   const int flags = O_RDWR | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC | O_NOCTTY;
-  return asOpened(::openat(directory(), name(), flags, permissions), "create", path_, error);
+  return asOpened(::openat(directory(), name(), flags, permissions), "create", path_);
 }
 
-bool DirectoryEntry::createDirectory(mode_t permissions, Failure& error) const {
+Result DirectoryEntry::createDirectory(mode_t permissions) const {
   if (::mkdirat(directory(), name(), kOwnerOnly) != 0) {
-    error = pathFailure("create the directory", path_, errno);
-    return false;
+    return pathFailure("create the directory", path_, errno);
   }
   // The process's mask applies to mkdir but not to fchmod.
   const int flags = O_RDONLY | O_DIRECTORY | O_NOFOLLOW | O_CLOEXEC;
-  const auto made = asOpened(::openat(directory(), name(), flags), "open", path_, error);
+  const auto made = asOpened(::openat(directory(), name(), flags), "open", path_);
   if (made && ::fchmod(made->number(), permissions) == 0) {
-    return true;
+    return {};
   }
-  if (made) {
-    error = pathFailure("set the permissions of", path_, errno);
-  }
+  Failure error = made ? pathFailure("set the permissions of", path_, errno) : made.error();
   ::unlinkat(directory(), name(), AT_REMOVEDIR);
-  return false;
+  return error;
 }
 
 int DirectoryEntry::remove() const {
   return ::unlinkat(directory(), name(), 0) == 0 ? 0 : errno;
 }
 
-std::optional<FileDescriptor> DirectoryEntry::openDirectory(Failure& error) const {
+OrFailure<FileDescriptor> DirectoryEntry::openDirectory() const {
   const int flags = O_RDONLY | O_DIRECTORY | O_CLOEXEC;
-  return asOpened(::openat(directory(), ".", flags), "open the directory of", path_, error);
+  return asOpened(::openat(directory(), ".", flags), "open the directory of", path_);
 }
 
 }  // namespace accounts

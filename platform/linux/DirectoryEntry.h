@@ -3,7 +3,6 @@
 #include <sys/types.h>
 
 #include <memory>
-#include <optional>
 #include <string>
 #include <utility>
 
@@ -37,29 +36,28 @@ class DirectoryEntry {
     return DirectoryEntry(directory_, std::move(name), path_);
   }
 
-  /// Opens the regular file of this name with open's `flags`, without waiting. None, with `error`
-  /// set, when it is missing, may not be opened or is anything but a regular file.
-  [[nodiscard]] std::optional<FileDescriptor> openRegularFile(int flags, Failure& error) const;
+  /// Opens the regular file of this name with open's `flags`, without waiting. A failure when it is
+  /// missing, may not be opened or is anything but a regular file.
+  [[nodiscard]] OrFailure<FileDescriptor> openRegularFile(int flags) const;
 
-  /// Opens what has this name for its path alone, whatever it is; none, with `error` set, when
-  /// nothing has it.
-  [[nodiscard]] std::optional<FileDescriptor> openForItsPath(Failure& error) const;
+  /// Opens what has this name for its path alone, whatever it is.
+  [[nodiscard]] OrFailure<FileDescriptor> openForItsPath() const;
 
   /// Creates a file of this name with the given permission bits (less the process's mask), open for
-  /// reading and writing. None, with `error` set, when anything exists there or creating fails.
-  [[nodiscard]] std::optional<FileDescriptor> createFile(mode_t permissions, Failure& error) const;
+  /// reading and writing. A failure when anything exists there or creating fails.
+  [[nodiscard]] OrFailure<FileDescriptor> createFile(mode_t permissions) const;
 
-  /// Creates a directory of this name with exactly the given permission bits. Returns whether it
-  /// did; after a failure, which `error` explains, there is no new directory.
-  [[nodiscard]] bool createDirectory(mode_t permissions, Failure& error) const;
+  /// Creates a directory of this name with exactly the given permission bits. After a failure
+  /// there is no new directory.
+  [[nodiscard]] Result createDirectory(mode_t permissions) const;
 
   /// Removes the file or symbolic link of this name, never a directory. Returns 0 or the error
   /// number.
   [[nodiscard]] int remove() const;
 
-  /// Opens the directory that holds the name so that it can be flushed; none, with `error` set,
-  /// when it may not be read.
-  [[nodiscard]] std::optional<FileDescriptor> openDirectory(Failure& error) const;
+  /// Opens the directory that holds the name so that it can be flushed; a failure when it may not
+  /// be read.
+  [[nodiscard]] OrFailure<FileDescriptor> openDirectory() const;
 
  private:
   std::shared_ptr<const FileDescriptor> directory_;

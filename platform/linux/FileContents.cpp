@@ -14,17 +14,16 @@ namespace {
 constexpr std::size_t kBlockSize = std::size_t{64} << 10;
 
 // Passes the bytes of an open file to `take` block by block, with the size that the file says it
-// has; `take` returns whether to go on.
+// has; a failure of `take` ends it.
 template <class Take>
-bool readBlocks(const FileDescriptor& file, std::string_view path, Failure& error, Take take) {
-  const auto status = fileStatus(file, path, error);
+Result readBlocks(const FileDescriptor& file, std::string_view path, Take take) {
+  const auto status = fileStatus(file, path);
   if (!status) {
-    return false;
+    return status.error();
   }
   // Seen before anything is read; the count below is for files that grow or hide their size.
   if (status->st_size > static_cast<off_t>(kLargestFileSize)) {
-    error = pathFailure("read", path, EFBIG);
-    return false;
+    return pathFailure("read", path, EFBIG);
   }
   std::array<char, kBlockSize> block;
   std::size_t total = 0;
@@ -34,54 +33,53 @@ bool readBlocks(const FileDescriptor& file, std::string_view path, Failure& erro
       continue;
     }
     if (count < 0) {
-      error = pathFailure("read", path, errno);
-      return false;
+      return pathFailure("read", path, errno);
     }
     if (count == 0) {
-      return true;
+      return {};
     }
     total += static_cast<std::size_t>(count);
     if (total > kLargestFileSize) {
-      error = pathFailure("read", path, EFBIG);
-      return false;
+      return pathFailure("read", path, EFBIG);
     }
-    if (!take(std::string_view(block.data(), static_cast<std::size_t>(count)),
-              static_cast<std::size_t>(status->st_size))) {
-      return false;
+    const Result taken = take(std::string_view(block.data(), static_cast<std::size_t>(count)),
+                              static_cast<std::size_t>(status->st_size));
+    if (!taken) {
+      return taken;
     }
   }
 }
 
 }  // namespace
 
-std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_view path,
-                                      Failure& error) {
+OrFailure<struct stat> fileStatus(const FileDescriptor& file, std::string_view path) {
   struct stat status = {};
   if (::fstat(file.number(), &status) != 0) {
-    error = pathFailure("examine", path, errno);
-    return std::nullopt;
+    return pathFailure("examine", path, errno);
   }
   return status;
 }
 
-std::optional<std::string> readContents(const FileDescriptor& file, std::string_view path,
-                                        Failure& error) {
+OrFailure<std::string> readContents(const FileDescriptor& file, std::string_view path) {
   std::string bytes;
-  const bool isRead = readBlocks(file, path, error, [&](std::string_view block, std::size_t size) {
+  const Result read = readBlocks(file, path, [&](std::string_view block, std::size_t size) {
     if (bytes.empty()) {
       bytes.reserve(size);
     }
     bytes.append(block);
-    return true;
+    return Result();
   });
-  return isRead ? std::optional(std::move(bytes)) : std::nullopt;
+  if (!read) {
+    return read.error();
+  }
+  return bytes;
 }
 
-std::optional<std::string> readHostFile(const std::string& path, Failure& error, Pipes pipes) {
+OrFailure<std::string> readHostFile(const std::string& path, Pipes pipes) {
   if (path == kStandardStream) {
     // A duplicate, since closing the standard stream itself would free its number.
     const FileDescriptor input(::fcntl(STDIN_FILENO, F_DUPFD_CLOEXEC, 0));
-    return readContents(input, nameOfInput(path), error);
+    return readContents(input, nameOfInput(path));
   }
   // A pipe is waited for until somebody writes; opening anything else never waits.
   struct stat named = {};
@@ -90,19 +88,17 @@ std::optional<std::string> readHostFile(const std::string& path, Failure& error,
   const int flags = O_RDONLY | O_CLOEXEC | O_NOCTTY | (isPipe ? 0 : O_NONBLOCK);
   const int number = ::open(path.c_str(), flags);
   if (number < 0) {
-    error = pathFailure("open", path, errno);
-    return std::nullopt;
+    return pathFailure("open", path, errno);
   }
   const FileDescriptor file(number);
-  const auto status = fileStatus(file, path, error);
+  const auto status = fileStatus(file, path);
   if (!status) {
-    return std::nullopt;
+    return status.error();
   }
   if (!S_ISREG(status->st_mode) && !(isPipe && S_ISFIFO(status->st_mode))) {
-    error = notRegularFailure("read", path, status->st_mode);
-    return std::nullopt;
+    return notRegularFailure("read", path, status->st_mode);
   }
-  return readContents(file, path, error);
+  return readContents(file, path);
 }
 
 std::string nameOfInput(const std::string& path) {
@@ -135,15 +131,10 @@ int writeAll(int descriptor, const SerializedPropertyList& contents) {
   return isWhole || number != 0 ? number : EIO;
 }
 
-bool copyContents(const FileDescriptor& source, std::string_view sourcePath,
-                  const FileDescriptor& destination, std::string_view destinationPath,
-                  Failure& error) {
-  return readBlocks(source, sourcePath, error, [&](std::string_view block, std::size_t) {
-    const int number = writeAll(destination.number(), block);
-    if (number != 0) {
-      error = pathFailure("write", destinationPath, number);
-    }
-    return number == 0;
+Result copyContents(const FileDescriptor& source, std::string_view sourcePath,
+                    const FileDescriptor& destination, std::string_view destinationPath) {
+  return readBlocks(source, sourcePath, [&](std::string_view block, std::size_t) {
+    return asResult("write", destinationPath, writeAll(destination.number(), block));
   });
 }
 

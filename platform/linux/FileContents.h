@@ -2,7 +2,6 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <optional>
 #include <string>
 #include <string_view>
 
@@ -16,14 +15,12 @@ namespace accounts {
 /// No file larger than this is read or copied.
 inline constexpr std::size_t kLargestFileSize = kMaximumFileSize;
 
-/// What stat says of an open file; none, with `error` set, when it says nothing.
-std::optional<struct stat> fileStatus(const FileDescriptor& file, std::string_view path,
-                                      Failure& error);
+/// What stat says of an open file. `path` is for the error's text, here and below.
+OrFailure<struct stat> fileStatus(const FileDescriptor& file, std::string_view path);
 
-/// The bytes of an open regular file from its position to its end. None, with `error` set, when
-/// reading fails or there are more than kLargestFileSize. `path` is for the error's text.
-std::optional<std::string> readContents(const FileDescriptor& file, std::string_view path,
-                                        Failure& error);
+/// The bytes of an open regular file from its position to its end. A failure when reading fails or
+/// there are more than kLargestFileSize.
+OrFailure<std::string> readContents(const FileDescriptor& file, std::string_view path);
 
 /// The name that stands for standard input, or output, where a file of the host is named.
 inline constexpr const char* kStandardStream = "-";
@@ -32,10 +29,9 @@ inline constexpr const char* kStandardStream = "-";
 enum class Pipes : std::uint8_t { Read, Refuse };
 
 /// The bytes of a file of the host, outside any device root: of a regular file, of standard input
-/// (kStandardStream) or of a pipe, which is read to its end. None, with `error` set, when it is
-/// missing, unreadable, too large or something else. Only for a pipe opening waits.
-std::optional<std::string> readHostFile(const std::string& path, Failure& error,
-                                        Pipes pipes = Pipes::Read);
+/// (kStandardStream) or of a pipe, which is read to its end. A failure when it is missing,
+/// unreadable, too large or something else. Only for a pipe opening waits.
+OrFailure<std::string> readHostFile(const std::string& path, Pipes pipes = Pipes::Read);
 
 /// How a message names what readHostFile() reads.
 std::string nameOfInput(const std::string& path);
@@ -46,11 +42,9 @@ int writeAll(int descriptor, std::string_view bytes);
 /// The same for the bytes of a property list, which are made as they are written.
 int writeAll(int descriptor, const SerializedPropertyList& contents);
 
-/// Copies the bytes of one open regular file to another; at most kLargestFileSize. Returns whether
-/// it did; `error` says why not.
-bool copyContents(const FileDescriptor& source, std::string_view sourcePath,
-                  const FileDescriptor& destination, std::string_view destinationPath,
-                  Failure& error);
+/// Copies the bytes of one open regular file to another; at most kLargestFileSize.
+Result copyContents(const FileDescriptor& source, std::string_view sourcePath,
+                    const FileDescriptor& destination, std::string_view destinationPath);
 
 /// Waits until the contents of an open file or directory are on the medium, and returns 0 or the
 /// error number.

@@ -43,13 +43,12 @@ class JournalLogSystem::Channel final : public LogChannel {
   std::string commonFields_;
 };
 
-std::unique_ptr<JournalLogSystem> JournalLogSystem::connect(const std::string& socketPath,
-                                                            Failure& error) {
+OrFailure<std::unique_ptr<JournalLogSystem>> JournalLogSystem::connect(
+    const std::string& socketPath) {
   sockaddr_un address = {};
   address.sun_family = AF_UNIX;
   if (socketPath.size() >= sizeof(address.sun_path)) {
-    error = pathFailure(kOpenOperation, socketPath, ENAMETOOLONG);
-    return nullptr;
+    return pathFailure(kOpenOperation, socketPath, ENAMETOOLONG);
   }
   std::memcpy(address.sun_path, socketPath.data(), socketPath.size());
   FileDescriptor socket(::socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0));
@@ -58,8 +57,7 @@ std::unique_ptr<JournalLogSystem> JournalLogSystem::connect(const std::string& s
           0 ||
       ::connect(socket.number(), reinterpret_cast<const sockaddr*>(&address), sizeof(address)) !=
           0) {
-    error = pathFailure(kOpenOperation, socketPath, errno);
-    return nullptr;
+    return pathFailure(kOpenOperation, socketPath, errno);
   }
   return std::unique_ptr<JournalLogSystem>(new JournalLogSystem(std::move(socket)));
 }

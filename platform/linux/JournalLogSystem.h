@@ -3,7 +3,6 @@
 #include <atomic>
 #include <memory>
 #include <mutex>
-#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -25,9 +24,9 @@ inline constexpr const char* kJournalSocket = "/run/systemd/journal/socket";
 /// went away, gets no more.
 class JournalLogSystem final : public LogSystem {
  public:
-  /// A log to the journal whose socket is at a path of the host. Null, with `error` set, when
-  /// nothing takes entries there.
-  static std::unique_ptr<JournalLogSystem> connect(const std::string& socketPath, Failure& error);
+  /// A log to the journal whose socket is at a path of the host. A failure when nothing
+  /// takes entries there.
+  static OrFailure<std::unique_ptr<JournalLogSystem>> connect(const std::string& socketPath);
 
   /// The journal's socket.
   [[nodiscard]] int descriptor() const { return socket_.number(); }

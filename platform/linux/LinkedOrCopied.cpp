@@ -20,46 +20,44 @@ int copyAttributes(const FileDescriptor& copy, const struct stat& status) {
              : errno;
 }
 
-bool copyWithAttributes(const DirectoryEntry& source, const DirectoryEntry& destination,
-                        Failure& error) {
-  const auto original = source.openRegularFile(O_RDONLY, error);
-  const auto status = original ? fileStatus(*original, source.path(), error) : std::nullopt;
-  const auto copy = status ? destination.createFile(kOwnerOnlyFile, error) : std::nullopt;
+Result copyWithAttributes(const DirectoryEntry& source, const DirectoryEntry& destination) {
+  const auto original = source.openRegularFile(O_RDONLY);
+  const auto status = original ? fileStatus(*original, source.path()) : original.error();
+  const auto copy = status ? destination.createFile(kOwnerOnlyFile) : status.error();
   if (!copy) {
-    return false;
+    return copy.error();
   }
-  if (copyContents(*original, source.path(), *copy, destination.path(), error)) {
-    int number = copyAttributes(*copy, *status);
-    if (number == 0) {
-      number = flush(*copy);
-    }
-    if (number == 0) {
-      return true;
-    }
-    error = pathFailure("copy to", destination.path(), number);
+  Result copied = copyContents(*original, source.path(), *copy, destination.path());
+  if (copied) {
+    const int number = copyAttributes(*copy, *status);
+    copied = asResult("copy to", destination.path(), number == 0 ? flush(*copy) : number);
   }
-  (void)destination.remove();
-  return false;
+  if (!copied) {
+    (void)destination.remove();
+  }
+  return copied;
 }
 
 }  // namespace
 
-bool linkOrCopy(const DirectoryEntry& source, const DirectoryEntry& destination, Failure& error) {
+Result linkOrCopy(const DirectoryEntry& source, const DirectoryEntry& destination) {
   if (::linkat(source.directory(), source.name(), destination.directory(), destination.name(), 0) !=
       0) {
-    return copyWithAttributes(source, destination, error);
+    return copyWithAttributes(source, destination);
   }
   struct stat status = {};
   const bool isRegular =
       ::fstatat(destination.directory(), destination.name(), &status, AT_SYMLINK_NOFOLLOW) == 0 &&
       S_ISREG(status.st_mode);
-  const auto file = isRegular ? destination.openRegularFile(O_RDONLY, error) : std::nullopt;
+  if (!isRegular) {
+    return {};
+  }
+  const auto file = destination.openRegularFile(O_RDONLY);
   const int number = file ? flush(*file) : 0;
   if (number != 0) {
-    error = pathFailure("flush", source.path(), number);
     (void)destination.remove();
   }
-  return number == 0;
+  return asResult("flush", source.path(), number);
 }
 
 }  // namespace accounts

@@ -17,9 +17,8 @@ bool LinuxBundleResources::hasPropertyList(std::string_view name) {
 }
 
 std::optional<PropertyDictionary> LinuxBundleResources::readPropertyList(std::string_view name) {
-  Failure error;
-  const std::optional<std::string> bytes = files_.read(fileName(name), error);
-  return bytes ? dictionaryFromBytes(*bytes, name, error) : std::nullopt;
+  const auto bytes = files_.read(fileName(name));
+  return valueOrNone(bytes ? dictionaryFromBytes(*bytes, name) : bytes.error());
 }
 
 }  // namespace accounts

@@ -47,14 +47,12 @@ bool isImmutable(const FileDescriptor& directory, const char* name) {
 }
 
 /// Opens a file that was found to be a regular one.
-std::optional<FileDescriptor> openIn(const FileDescriptor& directory, const std::string& path,
-                                     Failure& error) {
+OrFailure<FileDescriptor> openIn(const FileDescriptor& directory, const std::string& path) {
   const std::string name(splitPath(path).name);
   const int flags = O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC | O_NOCTTY;
   const int number = ::openat(directory.number(), name.c_str(), flags);
   if (number < 0) {
-    error = pathFailure("open", path, errno);
-    return std::nullopt;
+    return pathFailure("open", path, errno);
   }
   return FileDescriptor(number);
 }
@@ -95,16 +93,16 @@ int LinuxDevicePlaces::numberThatCounts(int number) const {
   return number == EROFS && readOnlyMounts_ == ReadOnlyMounts::Overlook ? 0 : number;
 }
 
-std::shared_ptr<const LinuxDevicePlaces::Directory> LinuxDevicePlaces::directoryOf(
-    const std::string& path, Failure& error) {
+OrFailure<std::shared_ptr<const LinuxDevicePlaces::Directory>> LinuxDevicePlaces::directoryOf(
+    const std::string& path) {
   const std::string_view parent = splitPath(path).directory;
   if (const auto known = opened_.find(parent); known != opened_.end()) {
     return known->second;
   }
-  auto descriptor = root_.open(parent, O_PATH | O_DIRECTORY, error);
-  const auto status = descriptor ? fileStatus(*descriptor, parent, error) : std::nullopt;
+  auto descriptor = root_.open(parent, O_PATH | O_DIRECTORY);
+  const auto status = descriptor ? fileStatus(*descriptor, parent) : descriptor.error();
   if (!status) {
-    return nullptr;
+    return status.error();
   }
   const int number = whyNotChanged(*descriptor);
   metReadOnlyMount_ = metReadOnlyMount_ || number == EROFS;
@@ -115,20 +113,23 @@ std::shared_ptr<const LinuxDevicePlaces::Directory> LinuxDevicePlaces::directory
   return directory;
 }
 
-const LinuxDevicePlaces::Directory* LinuxDevicePlaces::openDirectoryAt(DevicePlace place,
-                                                                       Failure& error) {
+OrFailure<std::shared_ptr<const LinuxDevicePlaces::Directory>> LinuxDevicePlaces::openDirectoryAt(
+    DevicePlace place) {
   auto& directory = directories_[indexOf(place)];
   if (directory == nullptr) {
-    directory = directoryOf(pathOf(place), error);
+    auto opened = directoryOf(pathOf(place));
+    if (!opened) {
+      return opened;
+    }
+    directory = *std::move(opened);
   }
-  return directory.get();
+  return directory;
 }
 
 std::optional<Failure> LinuxDevicePlaces::look(DevicePlace place, PlaceState& state) {
-  Failure error;
-  const auto directory = directoryOf(state.path, error);
-  directories_[indexOf(place)] = directory;
-  if (directory == nullptr) {
+  const auto opened = directoryOf(state.path);
+  if (!opened) {
+    const Failure& error = opened.error();
     if (isDecisive(place) && !isMissing(error.number)) {
       return error;
     }
@@ -142,6 +143,8 @@ std::optional<Failure> LinuxDevicePlaces::look(DevicePlace place, PlaceState& st
     }
     return std::nullopt;
   }
+  const auto& directory = *opened;
+  directories_[indexOf(place)] = directory;
   const std::string name(splitPath(state.path).name);
   struct stat status = {};
   if (::fstatat(directory->descriptor->number(), name.c_str(), &status, AT_SYMLINK_NOFOLLOW) == 0) {
@@ -169,12 +172,12 @@ std::optional<Failure> LinuxDevicePlaces::lookAtTarget(DevicePlace place, PlaceS
     return state.target == EntryKind::Other ? lookThroughLink(place, state) : std::nullopt;
   }
   // A regular file is opened where it was found; anything else might be a link to one.
-  Failure error;
   auto file = state.identity.kind == EntryKind::RegularFile
-                  ? openIn(*directoryAt(place)->descriptor, state.path, error)
-                  : root_.openRegularFile(state.path, error);
-  const auto opened = file ? fileStatus(*file, state.path, error) : std::nullopt;
+                  ? openIn(*directoryAt(place)->descriptor, state.path)
+                  : root_.openRegularFile(state.path);
+  const auto opened = file ? fileStatus(*file, state.path) : file.error();
   if (!opened) {
+    const Failure& error = opened.error();
     // An error without a number says that it is no regular file.
     if (error.number != 0 && !isMissing(error.number) && isDecisive(place)) {
       return error;
@@ -199,11 +202,10 @@ std::optional<Failure> LinuxDevicePlaces::lookAtTarget(DevicePlace place, PlaceS
 }
 
 std::optional<Failure> LinuxDevicePlaces::lookThroughLink(DevicePlace place, PlaceState& state) {
-  Failure error;
-  const auto entry = root_.open(state.path, O_PATH, error);
-  const auto status = entry ? fileStatus(*entry, state.path, error) : std::nullopt;
-  if (!status && isDecisive(place) && !isMissing(error.number)) {
-    return error;
+  const auto entry = root_.open(state.path, O_PATH);
+  const auto status = entry ? fileStatus(*entry, state.path) : entry.error();
+  if (!status && isDecisive(place) && !isMissing(status.error().number)) {
+    return status.error();
   }
   state.target = status ? kindOfMode(status->st_mode) : EntryKind::Nothing;
   return std::nullopt;
@@ -233,8 +235,7 @@ void LinuxDevicePlaces::foresee(DevicePlace place, const Directory& directory,
     state.whyNotMade = state.identity.exists()
                            ? std::nullopt
                            : why("create the directory", directory.whyNotChanged);
-    Failure error;
-    const auto own = root_.open(state.path, O_PATH | O_DIRECTORY, error);
+    const auto own = root_.open(state.path, O_PATH | O_DIRECTORY);
     state.whyNotReplaced =
         own ? why("create a file in", numberThatCounts(whyNotChanged(*own))) : std::nullopt;
     return;
@@ -246,20 +247,22 @@ void LinuxDevicePlaces::foreseeInformationDirectory(PlaceState& state) {
   std::size_t end = state.path.find('/', 1);
   for (; end != std::string::npos; end = state.path.find('/', end + 1)) {
     const std::string parent = state.path.substr(0, end);
-    Failure error;
-    if (root_.open(parent, O_PATH | O_DIRECTORY, error)) {
+    if (root_.open(parent, O_PATH | O_DIRECTORY)) {
       continue;
     }
-    const auto directory = directoryOf(parent, error);
+    const auto opened = directoryOf(parent);
+    if (!opened) {
+      state.whyNotMade = opened.error();
+      return;
+    }
+    const auto& directory = *opened;
     const std::string name(splitPath(parent).name);
     const auto isThere = [&] {
       struct stat status = {};
       return ::fstatat(directory->descriptor->number(), name.c_str(), &status,
                        AT_SYMLINK_NOFOLLOW) == 0;
     };
-    if (directory == nullptr) {
-      state.whyNotMade = error;
-    } else if (isThere()) {
+    if (isThere()) {
       state.whyNotMade = pathFailure("create the directory", parent, EEXIST);
     } else if (directory->whyNotChanged != 0) {
       state.whyNotMade = pathFailure("create the directory", parent, directory->whyNotChanged);
@@ -288,14 +291,14 @@ std::optional<Failure> LinuxDevicePlaces::whyTwoAreOne() const {
 }
 
 std::variant<FileIdentity, Failure> LinuxDevicePlaces::identityAt(DevicePlace place) {
-  Failure error;
-  const Directory* const directory = openDirectoryAt(place, error);
+  const auto directory = openDirectoryAt(place);
   const std::string path = pathOf(place);
-  if (directory == nullptr) {
-    return isMissing(error.number) ? std::variant<FileIdentity, Failure>(FileIdentity()) : error;
+  if (!directory) {
+    return isMissing(directory.error().number) ? std::variant<FileIdentity, Failure>(FileIdentity())
+                                               : directory.error();
   }
   const std::string name(splitPath(path).name);
-  const auto found = entryIn(directory->descriptor->number(), name.c_str());
+  const auto found = entryIn((*directory)->descriptor->number(), name.c_str());
   return found ? std::variant<FileIdentity, Failure>(*found) : pathFailure("examine", path, errno);
 }
 

@@ -60,14 +60,14 @@ class LinuxDevicePlaces final : public DevicePlaces {
   };
 
   [[nodiscard]] std::string pathOf(DevicePlace place) const { return pathOfPlace(place, home_); }
-  /// The directory of a path; null, with `error` set, when it cannot be opened.
-  std::shared_ptr<const Directory> directoryOf(const std::string& path, Failure& error);
+  /// The directory of a path.
+  OrFailure<std::shared_ptr<const Directory>> directoryOf(const std::string& path);
   /// The directory of a place of the snapshot; null for one that could not be opened.
   [[nodiscard]] const Directory* directoryAt(DevicePlace place) const {
     return directories_[indexOf(place)].get();
   }
-  /// The directory of a place, opened now where it was missing; null, with `error` set, for none.
-  const Directory* openDirectoryAt(DevicePlace place, Failure& error);
+  /// The directory of a place, opened now where it was missing.
+  OrFailure<std::shared_ptr<const Directory>> openDirectoryAt(DevicePlace place);
   /// Looks at one place. A failure when what stands there cannot be told or opened and the
   /// migration would read it.
   std::optional<Failure> look(DevicePlace place, PlaceState& state);

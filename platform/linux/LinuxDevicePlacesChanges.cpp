@@ -114,14 +114,12 @@ void handBack(DevicePlace place, DirectoryEntry& own, const char* name, FileIden
 
 std::variant<std::unique_ptr<StagedFile>, Failure> LinuxDevicePlaces::stage(DevicePlace place,
                                                                             const NewFile& file) {
-  Failure error;
   const std::string path = pathOf(place);
-  const Directory* const directory = openDirectoryAt(place, error);
-  auto made = directory != nullptr
-                  ? makeTemporaryFileIn(directory->descriptor, splitPath(path).directory, error)
-                  : std::nullopt;
+  const auto directory = openDirectoryAt(place);
+  auto made = directory ? makeTemporaryFileIn((*directory)->descriptor, splitPath(path).directory)
+                        : directory.error();
   if (!made) {
-    return error;
+    return made.error();
   }
   const int descriptor = made->file.number();
   auto staged = std::make_unique<StagedEntry>(std::move(made->entry), std::move(made->file));
@@ -138,9 +136,9 @@ std::variant<std::unique_ptr<StagedFile>, Failure> LinuxDevicePlaces::stage(Devi
   if (const int number = accounts::flush(staged->file); number != 0) {
     return pathFailure("write", path, number);
   }
-  const auto status = fileStatus(staged->file, path, error);
+  const auto status = fileStatus(staged->file, path);
   if (!status) {
-    return error;
+    return status.error();
   }
   staged->identity = identityOf(*status);
   return staged;
@@ -148,21 +146,20 @@ std::variant<std::unique_ptr<StagedFile>, Failure> LinuxDevicePlaces::stage(Devi
 
 std::variant<std::unique_ptr<StagedFile>, Failure> LinuxDevicePlaces::stageKept(
     DevicePlace place, std::string_view keptPath) {
-  Failure error;
   const std::string path = pathOf(place);
-  const auto kept = root_.locate(keptPath, error);
-  const Directory* const directory = kept ? openDirectoryAt(place, error) : nullptr;
-  auto entry = directory != nullptr
-                   ? freeEntryIn(directory->descriptor, splitPath(path).directory, error)
-                   : std::nullopt;
-  if (!entry || !linkOrCopy(*kept, *entry, error)) {
-    return error;
+  const auto kept = root_.locate(keptPath);
+  const auto directory = kept ? openDirectoryAt(place) : kept.error();
+  auto entry = directory ? freeEntryIn((*directory)->descriptor, splitPath(path).directory)
+                         : directory.error();
+  const Result made = entry ? linkOrCopy(*kept, *entry) : entry.error();
+  if (!made) {
+    return made.error();
   }
-  auto file = entry->openForItsPath(error);
-  const auto status = file ? fileStatus(*file, path, error) : std::nullopt;
+  auto file = entry->openForItsPath();
+  const auto status = file ? fileStatus(*file, path) : file.error();
   if (!status) {
     (void)entry->remove();
-    return error;
+    return status.error();
   }
   auto staged = std::make_unique<StagedEntry>(std::move(*entry), std::move(*file));
   staged->identity = identityOf(*status);
@@ -243,17 +240,16 @@ PlaceOutcome LinuxDevicePlaces::put(DevicePlace place, StagedFile& file,
 }
 
 PlaceOutcome LinuxDevicePlaces::remove(DevicePlace place, const FileIdentity& expected) {
-  Failure error;
   const std::string path = pathOf(place);
-  const Directory* const opened = openDirectoryAt(place, error);
-  if (opened == nullptr) {
-    return PlaceOutcome::failed(error);
+  const auto directory = openDirectoryAt(place);
+  if (!directory) {
+    return PlaceOutcome::failed(directory.error());
   }
   if (expected.kind == EntryKind::Directory) {
     return PlaceOutcome::failed(pathFailure("remove", path, EISDIR));
   }
   const std::string name(splitPath(path).name);
-  DirectoryEntry aside(opened->descriptor, name, path);
+  DirectoryEntry aside((*directory)->descriptor, name, path);
   int number = renameTo({place, 0, markOf(expected)}, aside);
   if (number == ENOENT) {
     return PlaceOutcome::disturbed();
@@ -272,24 +268,23 @@ PlaceOutcome LinuxDevicePlaces::remove(DevicePlace place, const FileIdentity& ex
 
 PlaceOutcome LinuxDevicePlaces::keep(DevicePlace place, std::string_view keptPath,
                                      const FileIdentity& expected) {
-  Failure error;
   const std::string path = pathOf(place);
-  const auto source = root_.locate(path, error);
-  const auto kept = source ? root_.locate(keptPath, error) : std::nullopt;
+  const auto source = root_.locate(path);
+  const auto kept = source ? root_.locate(keptPath) : source.error();
   if (!kept) {
-    return PlaceOutcome::failed(error);
+    return PlaceOutcome::failed(kept.error());
   }
   const bool isSame = identityIn(source->directory(), source->name()).isSameFileAs(expected);
   if (!isSame) {
     return PlaceOutcome::disturbed();
   }
-  if (!linkOrCopy(*source, *kept, error)) {
-    return PlaceOutcome::failed(error);
+  if (const Result made = linkOrCopy(*source, *kept); !made) {
+    return PlaceOutcome::failed(made.error());
   }
-  const FileIdentity made = identityIn(kept->directory(), kept->name());
-  const bool isOther = made.inode == expected.inode
-                           ? !made.isSameFileAs(expected)
-                           : made.size != expected.size || made.modified != expected.modified;
+  const FileIdentity copy = identityIn(kept->directory(), kept->name());
+  const bool isOther = copy.inode == expected.inode
+                           ? !copy.isSameFileAs(expected)
+                           : copy.size != expected.size || copy.modified != expected.modified;
   if (isOther) {
     (void)kept->remove();
     return PlaceOutcome::disturbed();
@@ -298,16 +293,14 @@ PlaceOutcome LinuxDevicePlaces::keep(DevicePlace place, std::string_view keptPat
 }
 
 std::optional<Failure> LinuxDevicePlaces::flush(DevicePlace place) {
-  Failure error;
   const std::string path = pathOf(place);
-  const Directory* const opened = openDirectoryAt(place, error);
-  const auto directory = opened != nullptr ? DirectoryEntry(opened->descriptor,
-                                                            std::string(splitPath(path).name), path)
-                                                 .openDirectory(error)
-                                           : std::nullopt;
+  const auto opened = openDirectoryAt(place);
+  const auto directory =
+      opened ? DirectoryEntry((*opened)->descriptor, std::string(splitPath(path).name), path)
+                   .openDirectory()
+             : opened.error();
   if (!directory) {
-    const bool isMissing = error.number == ENOENT || error.number == ENOTDIR;
-    return isMissing ? std::nullopt : std::optional(error);
+    return directory.error().isMissing() ? std::nullopt : std::optional(directory.error());
   }
   const int number = flushDirectory(*directory);
   return number == 0 ? std::nullopt
@@ -330,12 +323,11 @@ std::optional<Failure> LinuxDevicePlaces::writeInformationFile(std::string_view 
     return failure;
   }
   const std::string directory = pathOf(DevicePlace::InformationDirectory);
-  Failure error;
   const std::string path = joinedPath(directory, name);
-  const auto entry = root_.locate(path, error);
-  auto temporary = entry ? makeTemporaryFileIn(root_, directory, error) : std::nullopt;
+  const auto entry = root_.locate(path);
+  const auto temporary = entry ? makeTemporaryFileIn(root_, directory) : entry.error();
   if (!temporary) {
-    return error;
+    return temporary.error();
   }
   auto failure = writeContents(contents, temporary->file, path);
   int number = failure ? 0 : accounts::flush(temporary->file);

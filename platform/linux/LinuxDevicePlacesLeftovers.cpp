@@ -58,11 +58,10 @@ std::vector<std::string> LinuxDevicePlaces::settleLeftovers() {
       if (!staged || splitPath(standing).directory != directory) {
         continue;
       }
-      Failure error;
       const std::string name(splitPath(standing).name);
-      const auto entry = root_.locate(joinedPath(directory, own), error);
-      const int number =
-          entry ? settle(entry->directory(), *staged, own.c_str(), name.c_str()) : error.number;
+      const auto entry = root_.locate(joinedPath(directory, own));
+      const int number = entry ? settle(entry->directory(), *staged, own.c_str(), name.c_str())
+                               : entry.error().number;
       if (number != 0) {
         sentences.push_back(pathFailure("settle what an interrupted run left at",
                                         joinedPath(directory, own), number)

@@ -18,10 +18,9 @@ namespace {
 // Moves an entry, whose contents are flushed already, over another and waits until that is on the
 // medium. The directory is opened before the move so that little can fail after it.
 Result moveOver(const DirectoryEntry& source, const DirectoryEntry& destination) {
-  Failure error;
-  const auto directory = destination.openDirectory(error);
+  const auto directory = destination.openDirectory();
   if (!directory) {
-    return error;
+    return directory.error();
   }
   if (::renameat(source.directory(), source.name(), destination.directory(), destination.name()) !=
       0) {
@@ -36,27 +35,24 @@ LinuxFileSystem::LinuxFileSystem(const DeviceRoot& root, std::string temporaryDi
     : root_(root), ownerNames_(root), temporaryDirectory_(std::move(temporaryDirectory)) {}
 
 bool LinuxFileSystem::fileExists(std::string_view path) {
-  Failure error;
-  return root_.open(path, O_PATH, error).has_value();
+  return root_.open(path, O_PATH).has_value();
 }
 
 bool LinuxFileSystem::isDirectory(std::string_view path) {
-  Failure error;
-  return root_.open(path, O_PATH | O_DIRECTORY, error).has_value();
+  return root_.open(path, O_PATH | O_DIRECTORY).has_value();
 }
 
 Result LinuxFileSystem::copyFile(std::string_view source, std::string_view destination) {
-  Failure error;
-  const auto original = root_.openRegularFile(source, error);
-  const auto status = original ? fileStatus(*original, source, error) : std::nullopt;
-  const auto entry = status ? root_.locate(destination, error) : std::nullopt;
-  const auto copy = entry ? entry->createFile(kOwnerOnlyFile, error) : std::nullopt;
+  const auto original = root_.openRegularFile(source);
+  const auto status = original ? fileStatus(*original, source) : original.error();
+  const auto entry = status ? root_.locate(destination) : status.error();
+  const auto copy = entry ? entry->createFile(kOwnerOnlyFile) : entry.error();
   if (!copy) {
-    return error;
+    return copy.error();
   }
-  if (!copyContents(*original, source, *copy, destination, error)) {
+  if (Result copied = copyContents(*original, source, *copy, destination); !copied) {
     (void)entry->remove();
-    return error;
+    return copied;
   }
   if (::fchmod(copy->number(), status->st_mode & kPermissionBits) != 0) {
     const int number = errno;
@@ -67,9 +63,8 @@ Result LinuxFileSystem::copyFile(std::string_view source, std::string_view desti
 }
 
 Result LinuxFileSystem::removeFile(std::string_view path) {
-  Failure error;
-  const auto entry = entryOf(path, error);
-  const Result result = entry ? asResult("remove", path, entry->remove()) : error;
+  const auto entry = entryOf(path);
+  const Result result = entry ? asResult("remove", path, entry->remove()) : entry.error();
   temporaryFiles_.erase(std::string(path));
   return result;
 }
@@ -81,16 +76,15 @@ Result LinuxFileSystem::createFile(std::string_view path, std::string_view conte
 Result LinuxFileSystem::createDirectoryWithIntermediates(std::string_view path,
                                                          unsigned permissions) {
   const std::string_view whole = withoutTrailingSeparators(path);
-  Failure error;
   for (std::size_t end = whole.find('/', 1); end != std::string_view::npos;
        end = whole.find('/', end + 1)) {
     const std::string_view parent = whole.substr(0, end);
     if (isDirectory(parent)) {
       continue;
     }
-    const auto entry = root_.locate(parent, error);
+    const auto entry = root_.locate(parent);
     if (!entry) {
-      return error;
+      return entry.error();
     }
     if (::mkdirat(entry->directory(), entry->name(), kPermissionBits) != 0) {
       const int number = errno;
@@ -100,22 +94,18 @@ Result LinuxFileSystem::createDirectoryWithIntermediates(std::string_view path,
       }
     }
   }
-  const auto entry = root_.locate(whole, error);
-  return entry && entry->createDirectory(permissions & kPermissionBits, error) ? Result() : error;
+  const auto entry = root_.locate(whole);
+  return entry ? entry->createDirectory(permissions & kPermissionBits) : entry.error();
 }
 
 Result LinuxFileSystem::writeFile(std::string_view path, const SerializedPropertyList& contents) {
-  Failure error;
-  const auto entry = entryOf(path, error);
-  if (!entry) {
-    return error;
-  }
-  auto file = entry->openRegularFile(O_WRONLY, error);
-  if (!file && error.number == ENOENT) {
-    file = entry->createFile(kOwnerOnlyFile, error);
+  const auto entry = entryOf(path);
+  auto file = entry ? entry->openRegularFile(O_WRONLY) : entry.error();
+  if (entry && !file && file.error().number == ENOENT) {
+    file = entry->createFile(kOwnerOnlyFile);
   }
   if (!file) {
-    return error;
+    return file.error();
   }
   if (::ftruncate(file->number(), 0) != 0) {
     return asResult("empty", path, errno);
@@ -130,13 +120,12 @@ Result LinuxFileSystem::writeFileAtomically(std::string_view path,
 
 template <class Contents>
 Result LinuxFileSystem::replaceFile(std::string_view path, const Contents& contents) {
-  Failure error;
-  const auto destination = root_.locate(path, error);
+  const auto destination = root_.locate(path);
   // In the target's own directory, so that both are on one file system.
   const auto temporary =
-      destination ? makeTemporaryFileIn(root_, splitPath(path).directory, error) : std::nullopt;
+      destination ? makeTemporaryFileIn(root_, splitPath(path).directory) : destination.error();
   if (!temporary) {
-    return error;
+    return temporary.error();
   }
   int number = writeAll(temporary->file.number(), contents);
   if (number == 0) {
@@ -155,14 +144,12 @@ Result LinuxFileSystem::replaceFile(std::string_view path, const Contents& conte
 
 Result LinuxFileSystem::setOwnerAndGroup(std::string_view path, std::string_view ownerName,
                                          std::string_view groupName) {
-  Failure error;
-  const auto user = ownerNames_.userIdentifier(std::string(ownerName), error);
-  const auto group =
-      user ? ownerNames_.groupIdentifier(std::string(groupName), error) : std::nullopt;
-  const auto entry = group ? entryOf(path, error) : nullptr;
-  const auto file = entry ? entry->openRegularFile(O_RDONLY, error) : std::nullopt;
+  const auto user = ownerNames_.userIdentifier(std::string(ownerName));
+  const auto group = user ? ownerNames_.groupIdentifier(std::string(groupName)) : user.error();
+  const auto entry = group ? entryOf(path) : group.error();
+  const auto file = entry ? entry->openRegularFile(O_RDONLY) : entry.error();
   if (!file) {
-    return error;
+    return file.error();
   }
   if (::fchown(file->number(), *user, *group) != 0) {
     return asResult("set the owner of", path, errno);
@@ -171,12 +158,11 @@ Result LinuxFileSystem::setOwnerAndGroup(std::string_view path, std::string_view
 }
 
 Result LinuxFileSystem::renameFile(std::string_view source, std::string_view destination) {
-  Failure error;
-  const auto from = entryOf(source, error);
-  const auto to = from ? root_.locate(destination, error) : std::nullopt;
-  const auto file = to ? from->openRegularFile(O_RDONLY, error) : std::nullopt;
+  const auto from = entryOf(source);
+  const auto to = from ? root_.locate(destination) : from.error();
+  const auto file = to ? from->openRegularFile(O_RDONLY) : to.error();
   if (!file) {
-    return error;
+    return file.error();
   }
   const int number = flush(*file);
   const Result result = number == 0 ? moveOver(*from, *to) : asResult("flush", source, number);
@@ -187,11 +173,10 @@ Result LinuxFileSystem::renameFile(std::string_view source, std::string_view des
 }
 
 Result LinuxFileSystem::renameDirectory(std::string_view source, std::string_view destination) {
-  Failure error;
-  const auto from = root_.locate(source, error);
-  const auto to = from ? root_.locate(destination, error) : std::nullopt;
+  const auto from = root_.locate(source);
+  const auto to = from ? root_.locate(destination) : from.error();
   if (!to) {
-    return error;
+    return to.error();
   }
   struct stat status = {};
   if (::fstatat(from->directory(), from->name(), &status, AT_SYMLINK_NOFOLLOW) != 0) {

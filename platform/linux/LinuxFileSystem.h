@@ -2,7 +2,6 @@
 
 #include <functional>
 #include <map>
-#include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -66,15 +65,14 @@ class LinuxFileSystem final : public FileSystem, public FileKeeping {
   Result replaceFile(std::string_view path, const Contents& contents);
   void removeAbandonedTemporaryFilesIn(const std::string& directory);
   /// As `DeviceRoot::locate`, but a temporary file is found in the directory in which it was made,
-  /// without looking the directory up again. Null, with `error` set, for none.
-  [[nodiscard]] std::shared_ptr<const DirectoryEntry> entryOf(std::string_view path,
-                                                              Failure& error) const;
+  /// without looking the directory up again.
+  [[nodiscard]] OrFailure<DirectoryEntry> entryOf(std::string_view path) const;
 
   const DeviceRoot& root_;
   OwnerNames ownerNames_;
   std::string temporaryDirectory_;
   /// By their paths, the temporary files that are neither renamed nor removed yet.
-  std::map<std::string, std::shared_ptr<const TemporaryFile>, std::less<>> temporaryFiles_;
+  std::map<std::string, TemporaryFile, std::less<>> temporaryFiles_;
 };
 
 }  // namespace accounts

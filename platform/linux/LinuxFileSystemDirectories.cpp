@@ -22,19 +22,17 @@ struct CloseDirectory {
 }  // namespace
 
 std::optional<EntryKind> LinuxFileSystem::kindOfEntry(std::string_view path) {
-  Failure error;
-  const auto entry = root_.locate(path, error);
+  const auto entry = root_.locate(path);
   struct stat status = {};
   if (entry && ::fstatat(entry->directory(), entry->name(), &status, AT_SYMLINK_NOFOLLOW) == 0) {
     return kindOfMode(status.st_mode);
   }
-  const bool isMissing = entry ? errno == ENOENT : error.isMissing();
+  const bool isMissing = entry ? errno == ENOENT : entry.error().isMissing();
   return isMissing ? std::optional(EntryKind::Nothing) : std::nullopt;
 }
 
 std::optional<std::vector<std::string>> LinuxFileSystem::directoryEntries(std::string_view path) {
-  Failure error;
-  auto file = root_.open(path, O_RDONLY | O_DIRECTORY, error);
+  auto file = root_.open(path, O_RDONLY | O_DIRECTORY);
   if (!file) {
     return std::nullopt;
   }
@@ -64,28 +62,27 @@ std::optional<std::vector<std::string>> LinuxFileSystem::directoryEntries(std::s
 }
 
 std::optional<std::string> LinuxFileSystem::shortContents(std::string_view path, std::size_t most) {
-  Failure error;
-  const auto file = root_.openRegularFile(path, error);
-  const auto status = file ? fileStatus(*file, path, error) : std::nullopt;
-  return status && static_cast<std::size_t>(status->st_size) <= most
-             ? readContents(*file, path, error)
-             : std::nullopt;
+  const auto file = root_.openRegularFile(path);
+  const auto status = file ? fileStatus(*file, path) : file.error();
+  if (!status || static_cast<std::size_t>(status->st_size) > most) {
+    return std::nullopt;
+  }
+  return valueOrNone(readContents(*file, path));
 }
 
 Result LinuxFileSystem::removeDirectory(std::string_view path) {
-  Failure error;
-  const auto entry = root_.locate(path, error);
+  const auto entry = root_.locate(path);
   if (!entry) {
-    return error;
+    return entry.error();
   }
   const bool removed = ::unlinkat(entry->directory(), entry->name(), AT_REMOVEDIR) == 0;
   return asResult("remove the directory", path, removed ? 0 : errno);
 }
 
 Result LinuxFileSystem::synchronizeDirectory(std::string_view path) {
-  Failure error;
-  const auto directory = root_.open(path, O_RDONLY | O_DIRECTORY, error);
-  return directory ? asResult("flush the directory", path, flushDirectory(*directory)) : error;
+  const auto directory = root_.open(path, O_RDONLY | O_DIRECTORY);
+  return directory ? asResult("flush the directory", path, flushDirectory(*directory))
+                   : directory.error();
 }
 
 }  // namespace accounts

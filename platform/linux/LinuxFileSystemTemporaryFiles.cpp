@@ -2,7 +2,6 @@
 #include <sys/file.h>
 
 #include <cerrno>
-#include <memory>
 #include <string>
 #include <utility>
 
@@ -19,13 +18,12 @@ constexpr mode_t kOwnerOnlyDirectory = 0700;
 }  // namespace
 
 std::optional<std::string> LinuxFileSystem::makeTemporaryFile() {
-  Failure error;
-  auto temporary = makeTemporaryFileIn(root_, temporaryDirectory_, error);
-  if (!temporary && error.isMissing()) {
-    const auto entry = root_.locate(temporaryDirectory_, error);
-    const bool made = entry && entry->createDirectory(kOwnerOnlyDirectory, error);
-    if (made || error.number == EEXIST) {
-      temporary = makeTemporaryFileIn(root_, temporaryDirectory_, error);
+  auto temporary = makeTemporaryFileIn(root_, temporaryDirectory_);
+  if (!temporary && temporary.error().isMissing()) {
+    const auto entry = root_.locate(temporaryDirectory_);
+    const Result made = entry ? entry->createDirectory(kOwnerOnlyDirectory) : entry.error();
+    if (made || made.error().number == EEXIST) {
+      temporary = makeTemporaryFileIn(root_, temporaryDirectory_);
     }
   }
   if (!temporary) {
@@ -33,18 +31,13 @@ std::optional<std::string> LinuxFileSystem::makeTemporaryFile() {
   }
   std::string path = temporary->entry.path();
   // Open, and so locked, until it is renamed or removed: as long as it is, it is not abandoned.
-  temporaryFiles_.insert_or_assign(path,
-                                   std::make_shared<const TemporaryFile>(*std::move(temporary)));
+  temporaryFiles_.insert_or_assign(path, *std::move(temporary));
   return path;
 }
 
-std::shared_ptr<const DirectoryEntry> LinuxFileSystem::entryOf(std::string_view path,
-                                                               Failure& error) const {
-  if (const auto temporary = temporaryFiles_.find(path); temporary != temporaryFiles_.end()) {
-    return {temporary->second, &temporary->second->entry};
-  }
-  auto entry = root_.locate(path, error);
-  return entry ? std::make_shared<const DirectoryEntry>(*std::move(entry)) : nullptr;
+OrFailure<DirectoryEntry> LinuxFileSystem::entryOf(std::string_view path) const {
+  const auto temporary = temporaryFiles_.find(path);
+  return temporary != temporaryFiles_.end() ? temporary->second.entry : root_.locate(path);
 }
 
 void LinuxFileSystem::removeAbandonedTemporaryFiles(
@@ -57,12 +50,12 @@ void LinuxFileSystem::removeAbandonedTemporaryFiles(
 
 void LinuxFileSystem::removeAbandonedTemporaryFilesIn(const std::string& directory) {
   for (const std::string& name : directoryEntries(directory).value_or(std::vector<std::string>())) {
-    Failure error;
     // What a commit left is dealt with by those who know what it replaced.
-    const auto entry = name.starts_with(kTemporaryFilePrefix) && !StagedName::parse(name)
-                           ? root_.locate(joinedPath(directory, name), error)
-                           : std::nullopt;
-    const auto file = entry ? entry->openRegularFile(O_RDONLY, error) : std::nullopt;
+    if (!name.starts_with(kTemporaryFilePrefix) || StagedName::parse(name)) {
+      continue;
+    }
+    const auto entry = root_.locate(joinedPath(directory, name));
+    const auto file = entry ? entry->openRegularFile(O_RDONLY) : entry.error();
     // The lock is held over the removal: a maker that has made its file but not locked it yet waits
     // for it, and then sees that its file is gone.
     if (file && ::flock(file->number(), LOCK_EX | LOCK_NB) == 0) {

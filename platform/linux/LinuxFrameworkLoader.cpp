@@ -32,10 +32,9 @@ Result registerClassesOf(void* entryPoint, ClassRegistry& registry) {
 }  // namespace
 
 Result LinuxFrameworkLoader::loadFramework(std::string_view path) {
-  Failure error;
-  std::optional<FileDescriptor> file = root_.openRegularFile(path, error);
+  const auto file = root_.openRegularFile(path);
   if (!file) {
-    return error;
+    return file.error();
   }
   struct stat status = {};
   if (::fstat(file->number(), &status) != 0) {

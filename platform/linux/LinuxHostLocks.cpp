@@ -97,22 +97,22 @@ LockEnd LinuxHostLocks::wait(const FileDescriptor& file, std::string_view what,
 }
 
 LockEnd LinuxHostLocks::takeRoot(std::optional<std::chrono::seconds> timeLimit) {
-  Failure error;
-  directory_ = root_.open("/", O_RDONLY | O_DIRECTORY, error);
-  if (!directory_) {
-    reason_ = error.text;
-    return endWith(error.number);
+  auto directory = root_.open("/", O_RDONLY | O_DIRECTORY);
+  if (!directory) {
+    reason_ = directory.error().text;
+    return endWith(directory.error().number);
   }
+  directory_ = *std::move(directory);
   return wait(*directory_, "the device root", timeLimit);
 }
 
 LockEnd LinuxHostLocks::takeMigration(std::optional<std::chrono::seconds> timeLimit) {
-  Failure error;
-  migration_ = openLockFile(root_, kMigrationLockName, error);
-  if (!migration_) {
-    reason_ = error.text;
-    return endWith(error.number);
+  auto file = openLockFile(root_, kMigrationLockName);
+  if (!file) {
+    reason_ = file.error().text;
+    return endWith(file.error().number);
   }
+  migration_ = *std::move(file);
   const LockEnd end = wait(*migration_, "the migration lock", timeLimit);
   if (end != LockEnd::Taken) {
     migration_.reset();
@@ -121,19 +121,19 @@ LockEnd LinuxHostLocks::takeMigration(std::optional<std::chrono::seconds> timeLi
 }
 
 bool LinuxHostLocks::canTakeMigration() {
-  Failure error;
-  const auto entry = root_.locate(joinedPath(kLockDirectory, kMigrationLockName), error);
-  if (entry && entry->openRegularFile(O_RDONLY, error)) {
+  const auto entry = root_.locate(joinedPath(kLockDirectory, kMigrationLockName));
+  auto file = entry ? entry->openRegularFile(O_RDONLY) : entry.error();
+  if (file) {
     return true;
   }
   // A mount that may only be read does not count: a run is made on one that may be written.
-  if (entry && error.number == ENOENT) {
+  if (entry && file.error().number == ENOENT) {
     if (::faccessat(entry->directory(), ".", W_OK | X_OK, AT_EACCESS) == 0 || errno == EROFS) {
       return true;
     }
-    error = pathFailure("create", entry->path(), errno);
+    file = pathFailure("create", entry->path(), errno);
   }
-  reason_ = error.text;
+  reason_ = file.error().text;
   return false;
 }
 

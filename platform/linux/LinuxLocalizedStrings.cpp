@@ -25,9 +25,8 @@ const PropertyDictionary& LinuxLocalizedStrings::stringTable(const std::string& 
   if (known != tablesByName_.end()) {
     return known->second;
   }
-  Failure error;
-  const std::optional<std::string> bytes = files_.read(name, error);
-  auto read = bytes ? dictionaryFromBytes(*bytes, name, error) : std::nullopt;
+  const auto bytes = files_.read(name);
+  auto read = bytes ? dictionaryFromBytes(*bytes, name) : bytes.error();
   // A table that cannot be read translates nothing.
   return tablesByName_.emplace(std::move(name), std::move(read).value_or(PropertyDictionary()))
       .first->second;

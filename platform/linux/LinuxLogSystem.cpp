@@ -49,12 +49,11 @@ void LinuxLogSystem::writeLine(std::string_view prefix, std::string_view line) {
   (void)writeAll(output_->number(), text);
 }
 
-std::optional<FileDescriptor> openLogOutput(const std::string& path, Failure& error) {
+OrFailure<FileDescriptor> openLogOutput(const std::string& path) {
   if (path == kStandardError) {
     const int duplicate = ::fcntl(STDERR_FILENO, F_DUPFD_CLOEXEC, 0);
     if (duplicate < 0) {
-      error = pathFailure("open", "standard error", errno);
-      return std::nullopt;
+      return pathFailure("open", "standard error", errno);
     }
     return FileDescriptor(duplicate);
   }
@@ -62,8 +61,7 @@ std::optional<FileDescriptor> openLogOutput(const std::string& path, Failure& er
   const int flags = O_WRONLY | O_CREAT | O_APPEND | O_CLOEXEC | O_NOCTTY | O_NONBLOCK;
   const int number = ::open(path.c_str(), flags, kOwnerReadsAndWrites);
   if (number < 0) {
-    error = pathFailure("open the log channel", path, errno);
-    return std::nullopt;
+    return pathFailure("open the log channel", path, errno);
   }
   return FileDescriptor(number);
 }

@@ -34,8 +34,7 @@ class LinuxLogSystem final : public LogSystem {
 };
 
 /// Opens the file that channel lines are appended to, by its path on the host; it is made, readable
-/// by its owner alone, if missing. "-" stands for standard error. None, with `error` set, when it
-/// cannot be written.
-std::optional<FileDescriptor> openLogOutput(const std::string& path, Failure& error);
+/// by its owner alone, if missing. "-" stands for standard error.
+OrFailure<FileDescriptor> openLogOutput(const std::string& path);
 
 }  // namespace accounts

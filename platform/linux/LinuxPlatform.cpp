@@ -66,30 +66,31 @@ struct OpenedLog {
   std::optional<int> descriptor = {};
 };
 
-/// Without a log, with `error` set, when the channel cannot be opened.
-OpenedLog openLog(const LinuxPlatformOptions& options, Failure& error) {
+OrFailure<OpenedLog> openLog(const LinuxPlatformOptions& options) {
   if (!options.channel) {
-    return {std::make_unique<LinuxLogSystem>()};
+    return OpenedLog{std::make_unique<LinuxLogSystem>()};
   }
   if (*options.channel == kJournal) {
-    auto journal = JournalLogSystem::connect(options.journalSocket, error);
-    const int descriptor = journal != nullptr ? journal->descriptor() : -1;
-    return {std::move(journal), descriptor};
+    auto journal = JournalLogSystem::connect(options.journalSocket);
+    if (!journal) {
+      return journal.error();
+    }
+    const int descriptor = (*journal)->descriptor();
+    return OpenedLog{*std::move(journal), descriptor};
   }
-  std::optional<FileDescriptor> output = openLogOutput(*options.channel, error);
+  auto output = openLogOutput(*options.channel);
   if (!output) {
-    return {};
+    return output.error();
   }
   const int descriptor = output->number();
-  return {std::make_unique<LinuxLogSystem>(std::move(output)), descriptor};
+  return OpenedLog{std::make_unique<LinuxLogSystem>(*std::move(output)), descriptor};
 }
 
-/// The device description as it stands in its file; null, with `error` set, when it cannot be read.
-std::optional<DescriptionBytes> readDescription(const LinuxPlatformOptions& options,
-                                                const DeviceRoot& root, Failure& error) {
-  return options.deviceDescriptionFile
-             ? readHostDeviceDescription(*options.deviceDescriptionFile, error)
-             : readDeviceDescription(root, error);
+/// The device description as it stands in its file.
+OrFailure<DescriptionBytes> readDescription(const LinuxPlatformOptions& options,
+                                            const DeviceRoot& root) {
+  return options.deviceDescriptionFile ? readHostDeviceDescription(*options.deviceDescriptionFile)
+                                       : readDeviceDescription(root);
 }
 
 }  // namespace
@@ -174,34 +175,33 @@ std::unique_ptr<LinuxPlatform> LinuxPlatform::create(const LinuxPlatformOptions&
       !checkResources(options.bundleResourcesDirectory, error)) {
     return nullptr;
   }
-  Failure failure;
-  auto root = DeviceRoot::openRoot(options.rootDirectory, failure);
+  auto root = DeviceRoot::openRoot(options.rootDirectory);
   if (!root) {
-    fail(error, failure.number == ENOSYS ? Kind::InputOutput : Kind::MissingInput, failure);
+    const Kind kind = root.error().number == ENOSYS ? Kind::InputOutput : Kind::MissingInput;
+    fail(error, kind, root.error());
     return nullptr;
   }
-  auto description = readDescription(options, *root, failure);
+  auto description = readDescription(options, *root);
   if (!description) {
-    fail(error, Kind::MissingInput, failure);
+    fail(error, Kind::MissingInput, description.error());
     return nullptr;
   }
-  OpenedLog log = openLog(options, failure);
-  if (log.log == nullptr) {
-    fail(error, Kind::CannotCreate, failure);
+  auto log = openLog(options);
+  if (!log) {
+    fail(error, Kind::CannotCreate, log.error());
     return nullptr;
   }
-  std::unique_ptr<LinuxPlatform> platform(new LinuxPlatform(
-      std::make_unique<Parts>(options, std::move(*root), std::move(*description), std::move(log))));
+  std::unique_ptr<LinuxPlatform> platform(new LinuxPlatform(std::make_unique<Parts>(
+      options, std::move(*root), *std::move(description), *std::move(log))));
   const bool isUsable = options.descriptionDecoding == DescriptionDecoding::Later ||
                         platform->decodeDescription(error);
   return isUsable ? std::move(platform) : nullptr;
 }
 
 bool LinuxPlatform::decodeDescription(LinuxPlatformError& error) {
-  Failure failure;
-  auto description = decodeDeviceDescription(parts_->descriptionBytes, failure);
+  auto description = decodeDeviceDescription(parts_->descriptionBytes);
   if (!description) {
-    return fail(error, Kind::MissingInput, failure);
+    return fail(error, Kind::MissingInput, description.error());
   }
   parts_->description = *std::move(description);
   return true;

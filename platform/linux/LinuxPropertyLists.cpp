@@ -7,9 +7,8 @@
 namespace accounts {
 
 std::optional<PropertyDictionary> LinuxPropertyLists::readDictionary(std::string_view path) {
-  Failure error;
-  const std::optional<std::string> bytes = root_.readFile(path, error);
-  return bytes ? dictionaryFromBytes(*bytes, path, error) : std::nullopt;
+  const auto bytes = root_.readFile(path);
+  return valueOrNone(bytes ? dictionaryFromBytes(*bytes, path) : bytes.error());
 }
 
 Result LinuxPropertyLists::serializeBinary(const PropertyValue& value,

@@ -6,7 +6,6 @@
 
 #include <cerrno>
 #include <chrono>
-#include <optional>
 #include <thread>
 #include <utility>
 
@@ -44,23 +43,23 @@ class FileLock final : public NamedLock {
 // Opened for writing where that is allowed: some network file systems lock no other files. Never
 // with O_CREAT where the file exists: the kernel can refuse that in a directory such as /tmp when
 // the file is another user's.
-std::optional<FileDescriptor> openExisting(const DirectoryEntry& entry, Failure& error) {
-  auto file = entry.openRegularFile(O_RDWR, error);
-  return file || error.number == ENOENT ? std::move(file) : entry.openRegularFile(O_RDONLY, error);
+OrFailure<FileDescriptor> openExisting(const DirectoryEntry& entry) {
+  auto file = entry.openRegularFile(O_RDWR);
+  return file || file.error().number == ENOENT ? std::move(file) : entry.openRegularFile(O_RDONLY);
 }
 
-std::optional<FileDescriptor> openOrCreate(const DirectoryEntry& entry, Failure& error) {
-  auto file = openExisting(entry, error);
-  if (file || error.number != ENOENT) {
+OrFailure<FileDescriptor> openOrCreate(const DirectoryEntry& entry) {
+  auto file = openExisting(entry);
+  if (file || file.error().number != ENOENT) {
     return file;
   }
-  file = entry.createFile(kLockFilePermissions, error);
+  file = entry.createFile(kLockFilePermissions);
   if (file) {
     ::fchmod(file->number(), kLockFilePermissions);
     return file;
   }
   // Another process may have made it meanwhile.
-  return error.number == EEXIST ? openExisting(entry, error) : std::nullopt;
+  return file.error().number == EEXIST ? openExisting(entry) : std::move(file);
 }
 
 bool canBeLocked(const FileDescriptor& file) {
@@ -73,10 +72,9 @@ bool canBeLocked(const FileDescriptor& file) {
 
 }  // namespace
 
-std::optional<FileDescriptor> openLockFile(const DeviceRoot& root, std::string_view name,
-                                           Failure& error) {
-  const auto entry = root.locate(joinedPath(kLockDirectory, name), error);
-  return entry ? openOrCreate(*entry, error) : std::nullopt;
+OrFailure<FileDescriptor> openLockFile(const DeviceRoot& root, std::string_view name) {
+  const auto entry = root.locate(joinedPath(kLockDirectory, name));
+  return entry ? openOrCreate(*entry) : entry.error();
 }
 
 std::string LinuxSharedResources::systemRootDirectory() {
@@ -91,8 +89,7 @@ std::unique_ptr<NamedLock> LinuxSharedResources::makeLock(std::string_view name)
   if (name.find('/') != std::string_view::npos) {
     return nullptr;
   }
-  Failure error;
-  auto file = openLockFile(root_, name, error);
+  auto file = openLockFile(root_, name);
   if (!file || !canBeLocked(*file)) {
     return nullptr;
   }

@@ -1,7 +1,6 @@
 #pragma once
 
 #include <memory>
-#include <optional>
 #include <string>
 #include <string_view>
 
@@ -15,10 +14,9 @@ namespace accounts {
 /// Where the files of locks are, a device path.
 inline constexpr std::string_view kLockDirectory = "/tmp";
 
-/// Opens the file of a named lock, made if missing. None, with `error` set, when that cannot be
-/// done or something else than a regular file is there.
-std::optional<FileDescriptor> openLockFile(const DeviceRoot& root, std::string_view name,
-                                           Failure& error);
+/// Opens the file of a named lock, made if missing. A failure when that cannot be done or
+/// something else than a regular file is there.
+OrFailure<FileDescriptor> openLockFile(const DeviceRoot& root, std::string_view name);
 
 /// Places and locks of the device beneath a root, which must outlive this. The lock NAME is an
 /// exclusive flock on the regular file /tmp/NAME. The file is made if missing, never changed and

@@ -46,9 +46,8 @@ Failure unknownName(std::string_view database, std::string_view name) {
 // Asks one of the C library's two lookups, which share their shape, with a buffer that grows until
 // the entry fits.
 template <class Entry, class LookUp, class Number>
-std::optional<std::uint32_t> askNameService(LookUp lookUp, Number Entry::*number,
-                                            std::string_view database, const std::string& name,
-                                            Failure& error) {
+OrFailure<std::uint32_t> askNameService(LookUp lookUp, Number Entry::*number,
+                                        std::string_view database, const std::string& name) {
   for (std::size_t size = kFirstBufferSize; size <= kLargestBufferSize; size *= 2) {
     std::vector<char> buffer(size);
     Entry entry = {};
@@ -58,13 +57,11 @@ std::optional<std::uint32_t> askNameService(LookUp lookUp, Number Entry::*number
       continue;
     }
     if (found == nullptr) {
-      error = unknownName(database, name);
-      return std::nullopt;
+      return unknownName(database, name);
     }
     return entry.*number;
   }
-  error = pathFailure("read the entry \"" + name + "\" of", database, ERANGE);
-  return std::nullopt;
+  return pathFailure("read the entry \"" + name + "\" of", database, ERANGE);
 }
 
 }  // namespace
@@ -87,83 +84,71 @@ std::optional<std::uint32_t> identifierInDatabase(std::string_view database,
 void OwnerNames::readAhead(const std::string& name) {
   if (root_.isSystemRoot()) {
     // The name service keeps no promise of what it opens; its numbers are remembered.
-    Failure error;
-    static_cast<void>(userIdentifier(name, error));
-    static_cast<void>(groupIdentifier(name, error));
+    static_cast<void>(userIdentifier(name));
+    static_cast<void>(groupIdentifier(name));
     isNameServiceAsked_ = true;
     return;
   }
   for (const std::string_view path : {kUserDatabase, kGroupDatabase}) {
-    Database database;
-    database.bytes = root_.readFile(path, database.error);
-    databases_.insert_or_assign(std::string(path), std::move(database));
+    databases_.insert_or_assign(std::string(path), root_.readFile(path));
   }
 }
 
-std::optional<std::string> OwnerNames::databaseAt(std::string_view path, Failure& error) const {
+OrFailure<std::string> OwnerNames::databaseAt(std::string_view path) const {
   const auto database = databases_.find(path);
-  if (database == databases_.end()) {
-    return root_.readFile(path, error);
-  }
-  if (!database->second.bytes) {
-    error = database->second.error;
-  }
-  return database->second.bytes;
+  return database == databases_.end() ? root_.readFile(path) : database->second;
 }
 
-std::optional<std::uint32_t> OwnerNames::numberInDatabase(std::string_view databasePath,
-                                                          const std::string& name,
-                                                          Failure& error) const {
-  const auto database = databaseAt(databasePath, error);
+OrFailure<std::uint32_t> OwnerNames::numberInDatabase(std::string_view databasePath,
+                                                      const std::string& name) const {
+  const auto database = databaseAt(databasePath);
   if (!database) {
-    return std::nullopt;
+    return database.error();
   }
   const auto identifier = identifierInDatabase(*database, name);
   if (!identifier) {
-    error = unknownName(databasePath, name);
+    return unknownName(databasePath, name);
   }
-  return identifier;
+  return *identifier;
 }
 
 template <class Entry, class LookUp, class Number>
-std::optional<std::uint32_t> OwnerNames::askIfPossible(LookUp lookUp, Number Entry::*number,
-                                                       std::string_view database,
-                                                       const std::string& name,
-                                                       Failure& error) const {
+OrFailure<std::uint32_t> OwnerNames::askIfPossible(LookUp lookUp, Number Entry::*number,
+                                                   std::string_view database,
+                                                   const std::string& name) const {
   if (isNameServiceAsked_) {
-    error = unknownName(database, name);
-    return std::nullopt;
+    return unknownName(database, name);
   }
-  return askNameService<Entry>(lookUp, number, database, name, error);
+  return askNameService<Entry>(lookUp, number, database, name);
 }
 
 template <class LookUp>
-std::optional<std::uint32_t> OwnerNames::rememberedOr(const LookUp& lookUp, const std::string& name,
-                                                      Found& found) {
+OrFailure<std::uint32_t> OwnerNames::rememberedOr(const LookUp& lookUp, const std::string& name,
+                                                  Found& found) {
   if (const auto known = found.find(name); known != found.end()) {
     return known->second;
   }
-  const std::optional<std::uint32_t> identifier = lookUp();
+  const OrFailure<std::uint32_t> identifier = lookUp();
   if (identifier) {
     found.emplace(name, *identifier);
   }
   return identifier;
 }
 
-std::optional<std::uint32_t> OwnerNames::userIdentifier(const std::string& name, Failure& error) {
+OrFailure<std::uint32_t> OwnerNames::userIdentifier(const std::string& name) {
   const auto lookUpUser = [&] {
     return root_.isSystemRoot()
-               ? askIfPossible<passwd>(::getpwnam_r, &passwd::pw_uid, kUserDatabase, name, error)
-               : numberInDatabase(kUserDatabase, name, error);
+               ? askIfPossible<passwd>(::getpwnam_r, &passwd::pw_uid, kUserDatabase, name)
+               : numberInDatabase(kUserDatabase, name);
   };
   return rememberedOr(lookUpUser, name, users_);
 }
 
-std::optional<std::uint32_t> OwnerNames::groupIdentifier(const std::string& name, Failure& error) {
+OrFailure<std::uint32_t> OwnerNames::groupIdentifier(const std::string& name) {
   const auto lookUpGroup = [&] {
     return root_.isSystemRoot()
-               ? askIfPossible<group>(::getgrnam_r, &group::gr_gid, kGroupDatabase, name, error)
-               : numberInDatabase(kGroupDatabase, name, error);
+               ? askIfPossible<group>(::getgrnam_r, &group::gr_gid, kGroupDatabase, name)
+               : numberInDatabase(kGroupDatabase, name);
   };
   return rememberedOr(lookUpGroup, name, groups_);
 }

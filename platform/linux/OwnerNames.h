@@ -27,39 +27,30 @@ class OwnerNames {
   /// name is known afterwards. The root's databases are read, but not looked into.
   void readAhead(const std::string& name);
 
-  /// The number of a user or group; none, with `error` set, when the device does not know the name.
-  [[nodiscard]] std::optional<std::uint32_t> userIdentifier(const std::string& name,
-                                                            Failure& error);
-  [[nodiscard]] std::optional<std::uint32_t> groupIdentifier(const std::string& name,
-                                                             Failure& error);
+  /// The number of a user or group; a failure when the device does not know the name.
+  [[nodiscard]] OrFailure<std::uint32_t> userIdentifier(const std::string& name);
+  [[nodiscard]] OrFailure<std::uint32_t> groupIdentifier(const std::string& name);
 
  private:
   using Found = std::map<std::string, std::uint32_t>;
   template <class Entry, class LookUp, class Number>
-  [[nodiscard]] std::optional<std::uint32_t> askIfPossible(LookUp lookUp, Number Entry::*number,
-                                                           std::string_view database,
-                                                           const std::string& name,
-                                                           Failure& error) const;
+  [[nodiscard]] OrFailure<std::uint32_t> askIfPossible(LookUp lookUp, Number Entry::*number,
+                                                       std::string_view database,
+                                                       const std::string& name) const;
   template <class LookUp>
-  static std::optional<std::uint32_t> rememberedOr(const LookUp& lookUp, const std::string& name,
-                                                   Found& found);
-  [[nodiscard]] std::optional<std::uint32_t> numberInDatabase(std::string_view databasePath,
-                                                              const std::string& name,
-                                                              Failure& error) const;
+  static OrFailure<std::uint32_t> rememberedOr(const LookUp& lookUp, const std::string& name,
+                                               Found& found);
+  [[nodiscard]] OrFailure<std::uint32_t> numberInDatabase(std::string_view databasePath,
+                                                          const std::string& name) const;
 
-  /// The bytes of a database, read ahead or now; none, with `error` set, for none.
-  [[nodiscard]] std::optional<std::string> databaseAt(std::string_view path, Failure& error) const;
+  /// The bytes of a database, read ahead or now.
+  [[nodiscard]] OrFailure<std::string> databaseAt(std::string_view path) const;
 
-  struct Database {
-    std::optional<std::string> bytes;
-    /// Why there are no bytes.
-    Failure error;
-  };
   const DeviceRoot& root_;
   /// Whether the running system's name service has been asked for the last time.
   bool isNameServiceAsked_ = false;
   /// Of a root that is not "/", by path, once they are read ahead.
-  std::map<std::string, Database, std::less<>> databases_;
+  std::map<std::string, OrFailure<std::string>, std::less<>> databases_;
   Found users_;
   Found groups_;
 };

@@ -48,48 +48,49 @@ std::optional<std::string> randomDigits() {
   return digits;
 }
 
-std::optional<DirectoryEntry> freeEntryIn(const std::shared_ptr<const FileDescriptor>& directory,
-                                          std::string_view directoryPath, Failure& error) {
+OrFailure<DirectoryEntry> freeEntryIn(const std::shared_ptr<const FileDescriptor>& directory,
+                                      std::string_view directoryPath) {
   auto name = uniqueName();
   if (!name) {
-    error = pathFailure("make a temporary name in", directoryPath, errno);
-    return std::nullopt;
+    return pathFailure("make a temporary name in", directoryPath, errno);
   }
   std::string path = joinedPath(directoryPath, *name);
   return DirectoryEntry(directory, *std::move(name), std::move(path));
 }
 
-std::optional<TemporaryFile> makeTemporaryFileIn(
-    const std::shared_ptr<const FileDescriptor>& directory, std::string_view directoryPath,
-    Failure& error) {
+OrFailure<TemporaryFile> makeTemporaryFileIn(const std::shared_ptr<const FileDescriptor>& directory,
+                                             std::string_view directoryPath) {
+  Failure error;
   for (int attempt = 0; attempt < kMostNames; ++attempt) {
-    auto entry = freeEntryIn(directory, directoryPath, error);
+    auto entry = freeEntryIn(directory, directoryPath);
     if (!entry) {
-      return std::nullopt;
+      return entry.error();
     }
-    auto file = entry->createFile(kOwnerOnlyFile, error);
+    auto file = entry->createFile(kOwnerOnlyFile);
     // The process's mask applies to open but not to fchmod.
     if (file && ::fchmod(file->number(), kOwnerOnlyFile) != 0) {
       error = pathFailure("set the permissions of", entry->path(), errno);
       (void)entry->remove();
-      return std::nullopt;
+      return error;
     }
     if (file && isOurs(*file)) {
       return TemporaryFile{std::move(*entry), std::move(*file)};
     }
-    if (!file && error.number != EEXIST) {
-      return std::nullopt;
+    if (!file) {
+      error = file.error();
+      if (error.number != EEXIST) {
+        break;
+      }
     }
   }
-  return std::nullopt;
+  return error;
 }
 
-std::optional<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::string_view directory,
-                                                 Failure& error) {
-  auto opened = root.open(directory, O_PATH | O_DIRECTORY, error);
+OrFailure<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::string_view directory) {
+  auto opened = root.open(directory, O_PATH | O_DIRECTORY);
   return opened ? makeTemporaryFileIn(std::make_shared<const FileDescriptor>(*std::move(opened)),
-                                      directory, error)
-                : std::nullopt;
+                                      directory)
+                : opened.error();
 }
 
 }  // namespace accounts

@@ -26,18 +26,15 @@ struct TemporaryFile {
   FileDescriptor file;
 };
 
-/// A temporary name in an open directory that nothing has yet. None, with `error` set, when the
-/// system has no random bytes.
-std::optional<DirectoryEntry> freeEntryIn(const std::shared_ptr<const FileDescriptor>& directory,
-                                          std::string_view directoryPath, Failure& error);
+/// A temporary name in an open directory that nothing has yet. A failure when the system has no
+/// random bytes.
+OrFailure<DirectoryEntry> freeEntryIn(const std::shared_ptr<const FileDescriptor>& directory,
+                                      std::string_view directoryPath);
 
-/// Makes a temporary file in an open directory. None, with `error` set, when it cannot be made.
-std::optional<TemporaryFile> makeTemporaryFileIn(
-    const std::shared_ptr<const FileDescriptor>& directory, std::string_view directoryPath,
-    Failure& error);
-/// Makes a temporary file in a directory that exists. None, with `error` set, when it cannot be
-/// made.
-std::optional<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::string_view directory,
-                                                 Failure& error);
+/// Makes a temporary file in an open directory.
+OrFailure<TemporaryFile> makeTemporaryFileIn(const std::shared_ptr<const FileDescriptor>& directory,
+                                             std::string_view directoryPath);
+/// Makes a temporary file in a directory that exists.
+OrFailure<TemporaryFile> makeTemporaryFileIn(const DeviceRoot& root, std::string_view directory);
 
 }  // namespace accounts

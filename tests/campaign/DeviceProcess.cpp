@@ -14,11 +14,9 @@ namespace accounts {
 namespace {
 
 DeviceRoot openDevice() {
-  Failure error;
-  std::optional<DeviceRoot> root =
-      DeviceRoot::openRoot(std::string(SimulatedKernel::kDeviceDirectory), error);
+  auto root = DeviceRoot::openRoot(std::string(SimulatedKernel::kDeviceDirectory));
   if (!root) {
-    throw std::logic_error(error.text);
+    throw std::logic_error(root.error().text);
   }
   return std::move(*root);
 }

@@ -85,9 +85,8 @@ void RegisterClasses(accounts::ClassRegistry& registry) {
       "AccountsInterfaceVersion\nRegisterClasses\n");
   // Moved: what is found is what stands beside it.
   fs::rename(build() / "frameworks", directory() / "device");
-  Failure error;
-  const auto device = DeviceRoot::openRoot((directory() / "device").string(), error);
-  ASSERT_TRUE(device) << error.text;
+  const auto device = DeviceRoot::openRoot((directory() / "device").string());
+  ASSERT_TRUE(device) << device.error().text;
   LinuxConsoleLog log;
   LinuxFrameworkLoader loader(*device, log);
   const Result loaded = loader.loadFramework("/Mine.framework/Mine.so");

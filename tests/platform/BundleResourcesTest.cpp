@@ -58,8 +58,7 @@ TEST_F(BundleResourcesTest, WhatWasReadAheadNeedsNoFileAnyMore) {
 
   EXPECT_TRUE(resources.hasPropertyList("Types"));
   EXPECT_EQ(resources.readPropertyList("Types"), (PropertyDictionary{{"Mail", "IMAP"}}));
-  Failure error;
-  EXPECT_EQ(files.read("en.lproj/Table.strings", error), "a table");
+  EXPECT_EQ(files.read("en.lproj/Table.strings"), "a table");
 }
 
 TEST_F(BundleResourcesTest, WhatCannotBeReadAheadIsThereButHoldsNothing) {
@@ -70,9 +69,7 @@ TEST_F(BundleResourcesTest, WhatCannotBeReadAheadIsThereButHoldsNothing) {
   EXPECT_TRUE(resources.hasPropertyList("Types"));
   EXPECT_FALSE(resources.readPropertyList("Types"));
   EXPECT_FALSE(resources.hasPropertyList("Others"));
-  Failure error;
-  EXPECT_FALSE(files.read("Others.plist", error));
-  EXPECT_TRUE(error.isMissing());
+  EXPECT_TRUE(failureOf(files.read("Others.plist")).isMissing());
 }
 
 }  // namespace

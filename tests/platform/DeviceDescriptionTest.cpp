@@ -9,17 +9,16 @@ namespace {
 
 class DeviceDescriptionTest : public DeviceFixture {
  protected:
-  std::optional<DeviceDescription> ownDescription() {
-    const auto read = readDeviceDescription(root, error);
-    return read ? decodeDeviceDescription(*read, error) : std::nullopt;
+  OrFailure<DeviceDescription> ownDescription() {
+    const auto read = readDeviceDescription(root);
+    return read ? decodeDeviceDescription(*read) : read.error();
   }
-  std::optional<DeviceDescription> hostDescription(const std::string& name) {
-    const auto read = readHostDeviceDescription((outside() / name).string(), error);
-    return read ? decodeDeviceDescription(*read, error) : std::nullopt;
+  OrFailure<DeviceDescription> hostDescription(const std::string& name) {
+    const auto read = readHostDeviceDescription((outside() / name).string());
+    return read ? decodeDeviceDescription(*read) : read.error();
   }
 
   DeviceRoot root = openImage();
-  Failure error;
 };
 
 TEST_F(DeviceDescriptionTest, ADeviceWithoutDescriptionHasNoAnswers) {
@@ -40,9 +39,8 @@ TEST_F(DeviceDescriptionTest, TheDevicesOwnDescriptionIsRead) {
 
 TEST_F(DeviceDescriptionTest, AMalformedDescriptionIsAnErrorWithItsPath) {
   makeFile("/etc/device.plist", "no property list");
-  EXPECT_FALSE(ownDescription());
-  EXPECT_TRUE(error.text.starts_with("Cannot read the property list /etc/device.plist: "))
-      << error.text;
+  const std::string text = failureOf(ownDescription()).text;
+  EXPECT_TRUE(text.starts_with("Cannot read the property list /etc/device.plist: ")) << text;
 }
 
 TEST_F(DeviceDescriptionTest, ADescriptionThatIsNoDictionaryIsAnError) {
@@ -63,8 +61,7 @@ TEST_F(DeviceDescriptionTest, AHostFileIsReadByItsPath) {
 }
 
 TEST_F(DeviceDescriptionTest, AMissingHostFileIsAnError) {
-  EXPECT_FALSE(hostDescription("none.plist"));
-  EXPECT_TRUE(error.isMissing());
+  EXPECT_TRUE(failureOf(hostDescription("none.plist")).isMissing());
 }
 
 }  // namespace

@@ -105,9 +105,8 @@ std::vector<std::string> DeviceFixture::namesIn(std::string_view devicePath) con
 }
 
 DeviceRoot DeviceFixture::openImage() const {
-  Failure error;
-  auto root = DeviceRoot::openRoot(image().string(), error);
-  require(root.has_value(), error.text);
+  auto root = DeviceRoot::openRoot(image().string());
+  require(root.has_value(), failureOf(root).text);
   return std::move(*root);
 }
 

@@ -13,6 +13,12 @@
 
 namespace accounts {
 
+/// Why there is no value; a failure without words for one that is there.
+template <class Value>
+Failure failureOf(const OrFailure<Value>& result) {
+  return result ? Failure() : result.error();
+}
+
 /// A small device image in a temporary directory of the host, and a directory beside it that
 /// nothing may reach from the device. Device paths given to its helpers start with "/".
 class DeviceFixture : public testing::Test {

@@ -21,10 +21,9 @@ namespace fs = std::filesystem;
 
 class DeviceRootTest : public DeviceFixture {
  protected:
-  std::optional<std::string> read(std::string_view path) { return root.readFile(path, error); }
+  OrFailure<std::string> read(std::string_view path) { return root.readFile(path); }
 
   DeviceRoot root = openImage();
-  Failure error;
 };
 
 TEST_F(DeviceRootTest, AnAbsolutePathStartsAtTheRoot) {
@@ -35,7 +34,7 @@ TEST_F(DeviceRootTest, AnAbsolutePathStartsAtTheRoot) {
 TEST_F(DeviceRootTest, APathOfParentDirectoriesStaysInTheRoot) {
   makeHostFile(outside() / "secret", "secret");
   makeDirectory("/outside");
-  EXPECT_EQ(read("/../outside/secret"), std::nullopt);
+  EXPECT_FALSE(read("/../outside/secret"));
   makeFile("/outside/secret", "the device's own");
   EXPECT_EQ(read("/../../outside/secret"), "the device's own");
 }
@@ -43,8 +42,7 @@ TEST_F(DeviceRootTest, APathOfParentDirectoriesStaysInTheRoot) {
 TEST_F(DeviceRootTest, AnAbsoluteLinkIsFollowedWithinTheRoot) {
   makeHostFile(outside() / "secret", "secret");
   makeLink("/link", outside() / "secret");
-  EXPECT_EQ(read("/link"), std::nullopt);
-  EXPECT_TRUE(error.isMissing());
+  EXPECT_TRUE(failureOf(read("/link")).isMissing());
 }
 
 TEST_F(DeviceRootTest, AnAbsoluteLinkFindsItsTargetInTheRoot) {
@@ -56,59 +54,56 @@ TEST_F(DeviceRootTest, AnAbsoluteLinkFindsItsTargetInTheRoot) {
 TEST_F(DeviceRootTest, ARelativeLinkLeadingOutIsFollowedWithinTheRoot) {
   makeHostFile(outside() / "secret", "secret");
   makeLink("/directory/link", "../../outside/secret");
-  EXPECT_EQ(read("/directory/link"), std::nullopt);
-  EXPECT_TRUE(error.isMissing());
+  EXPECT_TRUE(failureOf(read("/directory/link")).isMissing());
 }
 
 TEST_F(DeviceRootTest, ALinkedDirectoryLeadingOutDoesNotHoldTheFilesOutside) {
   makeHostFile(outside() / "file", "outside");
   makeLink("/absolute", outside());
   makeLink("/relative", "../outside");
-  EXPECT_FALSE(root.locate("/absolute/file", error));
-  EXPECT_FALSE(root.locate("/relative/file", error));
+  EXPECT_FALSE(root.locate("/absolute/file"));
+  EXPECT_FALSE(root.locate("/relative/file"));
 }
 
 TEST_F(DeviceRootTest, LinksThatGoInACircleAreAnError) {
   makeLink("/one", "two");
   makeLink("/two", "one");
-  EXPECT_EQ(read("/one"), std::nullopt);
-  EXPECT_EQ(error.number, ELOOP);
+  EXPECT_EQ(failureOf(read("/one")).number, ELOOP);
 }
 
 TEST_F(DeviceRootTest, ALinkOfTheKernelsOwnIsNotFollowed) {
-  const auto systemRoot = DeviceRoot::openRoot("/", error);
+  const auto systemRoot = DeviceRoot::openRoot("/");
   ASSERT_TRUE(systemRoot);
   for (const std::string_view link : {"/proc/self/exe", "/proc/self/root/etc/passwd"}) {
-    EXPECT_EQ(systemRoot->readFile(link, error), std::nullopt);
-    EXPECT_EQ(error.number, ELOOP) << error.text;
+    EXPECT_EQ(failureOf(systemRoot->readFile(link)).number, ELOOP) << link;
   }
 }
 
 TEST_F(DeviceRootTest, AnErrorNamesTheDevicePathAndTheReason) {
-  EXPECT_EQ(read("/etc/name"), std::nullopt);
-  EXPECT_EQ(error.text, "Cannot open /etc/name: No such file or directory");
-  EXPECT_TRUE(error.isMissing());
+  const Failure failure = failureOf(read("/etc/name"));
+  EXPECT_EQ(failure.text, "Cannot open /etc/name: No such file or directory");
+  EXPECT_TRUE(failure.isMissing());
 }
 
 TEST_F(DeviceRootTest, AnUnreadableFileIsAnErrorButNotMissing) {
   makeFile("/secret", "secret");
   fs::permissions(onHost("/secret"), fs::perms::none);
   const WithoutPrivileges restricted;
-  EXPECT_EQ(read("/secret"), std::nullopt);
-  EXPECT_EQ(error.number, EACCES);
-  EXPECT_FALSE(error.isMissing());
+  const Failure failure = failureOf(read("/secret"));
+  EXPECT_EQ(failure.number, EACCES);
+  EXPECT_FALSE(failure.isMissing());
 }
 
 TEST_F(DeviceRootTest, ANamedPipeInPlaceOfAFileIsRefusedAtOnce) {
   makeNamedPipe("/pipe");
-  EXPECT_EQ(read("/pipe"), std::nullopt);
-  EXPECT_EQ(error.text, "Cannot open /pipe: It is a named pipe, not a regular file");
+  EXPECT_EQ(failureOf(read("/pipe")).text,
+            "Cannot open /pipe: It is a named pipe, not a regular file");
 }
 
 TEST_F(DeviceRootTest, ADirectoryInPlaceOfAFileIsRefused) {
   makeDirectory("/directory");
-  EXPECT_EQ(read("/directory"), std::nullopt);
-  EXPECT_EQ(error.text, "Cannot open /directory: It is a directory, not a regular file");
+  EXPECT_EQ(failureOf(read("/directory")).text,
+            "Cannot open /directory: It is a directory, not a regular file");
 }
 
 TEST_F(DeviceRootTest, ASocketInPlaceOfAFileIsRefused) {
@@ -117,15 +112,14 @@ TEST_F(DeviceRootTest, ASocketInPlaceOfAFileIsRefused) {
   address.sun_family = AF_UNIX;
   onHost("/socket").string().copy(address.sun_path, sizeof address.sun_path - 1);
   ASSERT_EQ(::bind(socket.number(), reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
-  EXPECT_EQ(read("/socket"), std::nullopt);
-  EXPECT_EQ(error.text, "Cannot open /socket: It is a socket, not a regular file");
+  EXPECT_EQ(failureOf(read("/socket")).text,
+            "Cannot open /socket: It is a socket, not a regular file");
 }
 
 TEST_F(DeviceRootTest, AFileAboveTheLargestSizeIsRefused) {
   makeFile("/large", "");
   fs::resize_file(onHost("/large"), kLargestFileSize + 1);
-  EXPECT_EQ(read("/large"), std::nullopt);
-  EXPECT_EQ(error.text, "Cannot read /large: File too large");
+  EXPECT_EQ(failureOf(read("/large")).text, "Cannot read /large: File too large");
 }
 
 TEST_F(DeviceRootTest, AnEmptyFileHasEmptyContents) {
@@ -135,39 +129,39 @@ TEST_F(DeviceRootTest, AnEmptyFileHasEmptyContents) {
 
 TEST_F(DeviceRootTest, APathWithAZeroByteIsRefused) {
   makeFile("/file", "contents");
-  EXPECT_EQ(read(std::string_view("/file\0more", 10)), std::nullopt);
-  EXPECT_FALSE(root.locate(std::string_view("/file\0more", 10), error));
+  EXPECT_FALSE(read(std::string_view("/file\0more", 10)));
+  EXPECT_FALSE(root.locate(std::string_view("/file\0more", 10)));
 }
 
 TEST_F(DeviceRootTest, APathThatNamesNothingInADirectoryHasNoEntry) {
   makeDirectory("/directory");
   for (const std::string_view path : {"/", "", "/directory/.", "/directory/.."}) {
-    EXPECT_FALSE(root.locate(path, error)) << path;
+    EXPECT_FALSE(root.locate(path)) << path;
   }
 }
 
 TEST_F(DeviceRootTest, AnEntryIsFoundInALinkedDirectoryOfTheRoot) {
   makeDirectory("/private/var");
   makeLink("/var", "/private/var");
-  const auto entry = root.locate("/var/file", error);
+  const auto entry = root.locate("/var/file");
   ASSERT_TRUE(entry);
-  ASSERT_TRUE(entry->createFile(0600, error));
+  ASSERT_TRUE(entry->createFile(0600));
   EXPECT_TRUE(fs::exists(onHost("/private/var/file")));
 }
 
 TEST_F(DeviceRootTest, ARootThatDoesNotExistIsAnError) {
-  EXPECT_FALSE(DeviceRoot::openRoot((outside() / "none").string(), error));
-  EXPECT_TRUE(error.isMissing());
-  EXPECT_NE(error.text.find((outside() / "none").string()), std::string::npos);
+  const Failure failure = failureOf(DeviceRoot::openRoot((outside() / "none").string()));
+  EXPECT_TRUE(failure.isMissing());
+  EXPECT_NE(failure.text.find((outside() / "none").string()), std::string::npos);
 }
 
 TEST_F(DeviceRootTest, AFileIsNoRoot) {
   makeHostFile(outside() / "file", "");
-  EXPECT_FALSE(DeviceRoot::openRoot((outside() / "file").string(), error));
+  EXPECT_FALSE(DeviceRoot::openRoot((outside() / "file").string()));
 }
 
 TEST_F(DeviceRootTest, OnlyTheRunningSystemsRootIsTheSystemRoot) {
-  const auto systemRoot = DeviceRoot::openRoot("/", error);
+  const auto systemRoot = DeviceRoot::openRoot("/");
   ASSERT_TRUE(systemRoot);
   EXPECT_TRUE(systemRoot->isSystemRoot());
   EXPECT_FALSE(root.isSystemRoot());
@@ -177,9 +171,9 @@ TEST_F(DeviceRootTest, AKernelThatCannotResolveBeneathARootIsAClearError) {
   EXPECT_EXIT(
       {
         makeSystemCallFail(SYS_openat2, ENOSYS);
-        const bool opened = DeviceRoot::openRoot(image().string(), error).has_value();
-        std::fprintf(stderr, "%s\n", error.text.c_str());
-        std::_Exit(opened ? 1 : 0);
+        const Failure failure = failureOf(DeviceRoot::openRoot(image().string()));
+        std::fprintf(stderr, "%s\n", failure.text.c_str());
+        std::_Exit(0);
       },
       ExitedWithCode(0),
       "Function not implemented \\(openat2, of Linux 5.6 or later, is needed\\)");

@@ -29,17 +29,14 @@ struct Pipe {
   explicit Pipe(Numbers numbers) : readingEnd(numbers.ends[0]), writingEnd(numbers.ends[1]) {}
 };
 
-class FileContentsTest : public DeviceFixture {
- protected:
-  Failure error;
-};
+class FileContentsTest : public DeviceFixture {};
 
 TEST_F(FileContentsTest, AFileOfTheLargestSizeIsRead) {
   makeFile("/large", "");
   std::filesystem::resize_file(onHost("/large"), kLargestFileSize);
   const FileDescriptor file(::open(onHost("/large").c_str(), O_RDONLY | O_CLOEXEC));
 
-  const auto contents = readContents(file, "/large", error);
+  const auto contents = readContents(file, "/large");
 
   ASSERT_TRUE(contents);
   EXPECT_EQ(contents->size(), kLargestFileSize);
@@ -48,15 +45,13 @@ TEST_F(FileContentsTest, AFileOfTheLargestSizeIsRead) {
 TEST_F(FileContentsTest, AFileThatHoldsMoreThanItsSizeSaysIsReadUpToTheLargestSizeOnly) {
   const FileDescriptor endless(::open("/dev/zero", O_RDONLY | O_CLOEXEC));
 
-  EXPECT_FALSE(readContents(endless, "/file", error));
-
-  EXPECT_EQ(error.text, "Cannot read /file: File too large");
+  EXPECT_EQ(failureOf(readContents(endless, "/file")).text, "Cannot read /file: File too large");
 }
 
 TEST_F(FileContentsTest, ASignalDoesNotEndAReading) {
   Pipe pipe;
-  std::optional<std::string> contents;
-  WaitingThread reader([&] { contents = readContents(pipe.readingEnd, "/pipe", error); });
+  OrFailure<std::string> contents;
+  WaitingThread reader([&] { contents = readContents(pipe.readingEnd, "/pipe"); });
 
   reader.interrupt();
   EXPECT_FALSE(reader.hasEnded());
@@ -64,7 +59,7 @@ TEST_F(FileContentsTest, ASignalDoesNotEndAReading) {
   ::close(pipe.writingEnd.release());
   reader.join();
 
-  EXPECT_EQ(contents, "contents") << error.text;
+  EXPECT_EQ(contents, "contents") << failureOf(contents).text;
 }
 
 TEST_F(FileContentsTest, WhatCannotBeFlushedIsAnErrorOfAFileAndNoneOfADirectory) {

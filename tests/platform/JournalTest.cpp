@@ -25,9 +25,7 @@ class Journal : public DeviceFixture {
   }
 
   [[nodiscard]] std::unique_ptr<JournalLogSystem> connect() {
-    auto journal = JournalLogSystem::connect(path, error);
-    EXPECT_NE(journal, nullptr) << error.text;
-    return journal;
+    return JournalLogSystem::connect(path).value();
   }
   /// The next entry: a datagram's bytes, or those of the file that came in its place. Empty when
   /// there is none.
@@ -55,7 +53,6 @@ class Journal : public DeviceFixture {
 
   const std::string path = (outside() / "journal").string();
   FileDescriptor receiver{::socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0)};
-  Failure error;
 };
 
 TEST_F(Journal, ALineIsOneEntryWithWhatItIsMadeOfInFieldsOfTheirOwn) {
@@ -87,13 +84,12 @@ TEST_F(Journal, AnEntryThatIsTooLargeForADatagramArrivesWhole) {
 
 TEST_F(Journal, WhereNothingListensTheChannelCannotBeOpened) {
   const std::string missing = (outside() / "none").string();
-  EXPECT_EQ(JournalLogSystem::connect(missing, error), nullptr);
-  EXPECT_EQ(error.text, "Cannot open the log channel " + missing + ": No such file or directory");
+  EXPECT_EQ(failureOf(JournalLogSystem::connect(missing)).text,
+            "Cannot open the log channel " + missing + ": No such file or directory");
 }
 
 TEST_F(Journal, APathThatIsNoSocketsIsAnError) {
-  EXPECT_EQ(JournalLogSystem::connect(std::string(200, 'x'), error), nullptr);
-  EXPECT_EQ(error.number, ENAMETOOLONG);
+  EXPECT_EQ(failureOf(JournalLogSystem::connect(std::string(200, 'x'))).number, ENAMETOOLONG);
 }
 
 TEST_F(Journal, OneThatGoesAwayGetsNoMoreLines) {

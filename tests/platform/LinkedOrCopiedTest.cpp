@@ -20,10 +20,9 @@ class LinkedOrCopiedTest : public DeviceFixture {
 
   /// Why /kept/file was not made of what is at a path; nothing when it was.
   std::string keep(const char* source = "/file") {
-    Failure error;
-    const auto from = root.locate(source, error);
-    const auto to = root.locate("/kept/file", error);
-    return from && to && linkOrCopy(*from, *to, error) ? "" : error.text;
+    const auto from = root.locate(source);
+    const auto to = from ? root.locate("/kept/file") : from.error();
+    return failureOf(to ? linkOrCopy(*from, *to) : to.error()).text;
   }
 
   DeviceRoot root = openImage();

@@ -68,10 +68,9 @@ TEST(ConsoleLogTest, AClosedOutputIsNoFailure) {
 
 class LogSystemTest : public DeviceFixture {
  protected:
-  std::optional<FileDescriptor> open(const std::string& file) { return openLogOutput(file, error); }
+  static FileDescriptor open(const std::string& file) { return openLogOutput(file).value(); }
 
   const std::string path = (outside() / "channel.log").string();
-  Failure error;
 };
 
 TEST_F(LogSystemTest, WithoutAnOutputNoChannelIsEnabled) {
@@ -105,7 +104,7 @@ TEST_F(LogSystemTest, LinesAreAppendedToAnExistingFile) {
 }
 
 TEST_F(LogSystemTest, ANewFileIsForItsOwnerAlone) {
-  ASSERT_TRUE(open(path));
+  ASSERT_TRUE(openLogOutput(path));
   EXPECT_EQ(fs::status(path).permissions(), fs::perms(0600));
 }
 
@@ -117,13 +116,13 @@ TEST_F(LogSystemTest, AHyphenStandsForStandardError) {
 
 TEST_F(LogSystemTest, AFileThatCannotBeMadeIsAnErrorWithItsPath) {
   const std::string missing = (outside() / "none" / "channel.log").string();
-  EXPECT_FALSE(open(missing));
-  EXPECT_EQ(error.text, "Cannot open the log channel " + missing + ": No such file or directory");
+  EXPECT_EQ(failureOf(openLogOutput(missing)).text,
+            "Cannot open the log channel " + missing + ": No such file or directory");
 }
 
 TEST_F(LogSystemTest, ANamedPipeThatNobodyReadsIsAnErrorAtOnce) {
   makeNamedPipe("/pipe");
-  EXPECT_FALSE(open(onHost("/pipe").string()));
+  EXPECT_FALSE(openLogOutput(onHost("/pipe").string()));
 }
 
 }  // namespace

@@ -51,45 +51,44 @@ class OwnerNamesTest : public DeviceFixture {
  protected:
   DeviceRoot root = openImage();
   OwnerNames names{root};
-  Failure error;
 };
 
 TEST_F(OwnerNamesTest, NamesComeFromTheRootsOwnDatabases) {
   makeFile("/etc/passwd", "mobile:*:4711:1:::\n");
   makeFile("/etc/group", "mobile:*:4712:\n");
-  EXPECT_EQ(names.userIdentifier("mobile", error), 4711u);
-  EXPECT_EQ(names.groupIdentifier("mobile", error), 4712u);
+  EXPECT_EQ(names.userIdentifier("mobile"), 4711u);
+  EXPECT_EQ(names.groupIdentifier("mobile"), 4712u);
 }
 
 TEST_F(OwnerNamesTest, TheRunningSystemsUsersAreNotTheImages) {
   makeFile("/etc/passwd", "mobile:*:501:501:::\n");
-  EXPECT_EQ(names.userIdentifier("root", error), std::nullopt);
-  EXPECT_EQ(error.text, "Cannot find \"root\" in /etc/passwd: There is no usable entry");
+  EXPECT_EQ(failureOf(names.userIdentifier("root")).text,
+            "Cannot find \"root\" in /etc/passwd: There is no usable entry");
 }
 
 TEST_F(OwnerNamesTest, AMissingDatabaseIsAnError) {
-  EXPECT_EQ(names.groupIdentifier("mobile", error), std::nullopt);
-  EXPECT_EQ(error.text, "Cannot open /etc/group: No such file or directory");
+  EXPECT_EQ(failureOf(names.groupIdentifier("mobile")).text,
+            "Cannot open /etc/group: No such file or directory");
 }
 
 TEST_F(OwnerNamesTest, ANumberThatWasFoundIsKept) {
   makeFile("/etc/passwd", "mobile:*:4711:1:::\n");
   makeFile("/etc/group", "mobile:*:4712:\n");
-  ASSERT_TRUE(names.userIdentifier("mobile", error) && names.groupIdentifier("mobile", error));
+  ASSERT_TRUE(names.userIdentifier("mobile") && names.groupIdentifier("mobile"));
 
   std::filesystem::remove(onHost("/etc/passwd"));
   std::filesystem::remove(onHost("/etc/group"));
 
-  EXPECT_EQ(names.userIdentifier("mobile", error), 4711u);
-  EXPECT_EQ(names.groupIdentifier("mobile", error), 4712u);
+  EXPECT_EQ(names.userIdentifier("mobile"), 4711u);
+  EXPECT_EQ(names.groupIdentifier("mobile"), 4712u);
 }
 
 TEST_F(OwnerNamesTest, ANameThatWasNotFoundIsLookedForAgain) {
-  ASSERT_EQ(names.userIdentifier("mobile", error), std::nullopt);
+  ASSERT_FALSE(names.userIdentifier("mobile"));
 
   makeFile("/etc/passwd", "mobile:*:4711:1:::\n");
 
-  EXPECT_EQ(names.userIdentifier("mobile", error), 4711u);
+  EXPECT_EQ(names.userIdentifier("mobile"), 4711u);
 }
 
 TEST_F(OwnerNamesTest, DatabasesThatWereReadAheadAreNotOpenedAgain) {
@@ -98,14 +97,14 @@ TEST_F(OwnerNamesTest, DatabasesThatWereReadAheadAreNotOpenedAgain) {
   std::filesystem::remove(onHost("/etc/passwd"));
   makeFile("/etc/group", "mobile:*:4712:\n");
 
-  EXPECT_EQ(names.userIdentifier("mobile", error), 4711u);
-  EXPECT_EQ(names.groupIdentifier("mobile", error), std::nullopt);
-  EXPECT_EQ(error.text, "Cannot open /etc/group: No such file or directory");
+  EXPECT_EQ(names.userIdentifier("mobile"), 4711u);
+  EXPECT_EQ(failureOf(names.groupIdentifier("mobile")).text,
+            "Cannot open /etc/group: No such file or directory");
 }
 
 // The name service is set to one that knows nobody, which cannot be undone.
 TEST_F(OwnerNamesTest, TheRunningSystemIsAskedAheadForTheNameAlone) {
-  const auto systemRoot = DeviceRoot::openRoot("/", error);
+  const auto systemRoot = DeviceRoot::openRoot("/");
   ASSERT_TRUE(systemRoot);
   EXPECT_EXIT(
       {
@@ -115,34 +114,33 @@ TEST_F(OwnerNamesTest, TheRunningSystemIsAskedAheadForTheNameAlone) {
         ::__nss_configure_lookup("passwd", "none");
         unknown.readAhead("root");
         ::__nss_configure_lookup("passwd", "files");
-        std::_Exit((known.userIdentifier("root", error) == 0u ? 0 : 1) +
-                   (unknown.userIdentifier("root", error) ? 2 : 0));
+        std::_Exit((known.userIdentifier("root") == 0u ? 0 : 1) +
+                   (unknown.userIdentifier("root") ? 2 : 0));
       },
       testing::ExitedWithCode(0), "");
 }
 
 TEST_F(OwnerNamesTest, TheRunningSystemAsksItsNameService) {
-  const auto systemRoot = DeviceRoot::openRoot("/", error);
+  const auto systemRoot = DeviceRoot::openRoot("/");
   ASSERT_TRUE(systemRoot);
   OwnerNames systemNames(*systemRoot);
-  EXPECT_EQ(systemNames.userIdentifier("root", error), 0u);
-  EXPECT_EQ(systemNames.groupIdentifier("root", error), 0u);
-  EXPECT_EQ(systemNames.userIdentifier("no such user here", error), std::nullopt);
-  EXPECT_EQ(error.text,
+  EXPECT_EQ(systemNames.userIdentifier("root"), 0u);
+  EXPECT_EQ(systemNames.groupIdentifier("root"), 0u);
+  EXPECT_EQ(failureOf(systemNames.userIdentifier("no such user here")).text,
             "Cannot find \"no such user here\" in /etc/passwd: There is no usable entry");
 }
 
 // The name service is set to one that knows nobody, which cannot be undone.
 TEST_F(OwnerNamesTest, TheRunningSystemAsksItsNameServiceAndNotItsFiles) {
-  const auto systemRoot = DeviceRoot::openRoot("/", error);
+  const auto systemRoot = DeviceRoot::openRoot("/");
   ASSERT_TRUE(systemRoot);
   EXPECT_EXIT(
       {
         ::__nss_configure_lookup("passwd", "none");
         ::__nss_configure_lookup("group", "none");
         OwnerNames systemNames(*systemRoot);
-        const auto user = systemNames.userIdentifier("root", error);
-        const auto group = systemNames.groupIdentifier("root", error);
+        const auto user = systemNames.userIdentifier("root");
+        const auto group = systemNames.groupIdentifier("root");
         std::_Exit((user ? 1 : 0) + (group ? 2 : 0));
       },
       testing::ExitedWithCode(0), "");

@@ -14,7 +14,6 @@ class PropertyListsTest : public DeviceFixture {
  protected:
   DeviceRoot root = openImage();
   LinuxPropertyLists propertyLists{root};
-  Failure error;
 
   SerializedPropertyList serialize(const PropertyValue& value) {
     SerializedPropertyList serialized;
@@ -71,10 +70,10 @@ TEST_F(PropertyListsTest, AMissingOrMalformedFileHoldsNoDictionary) {
 }
 
 TEST_F(PropertyListsTest, TheErrorOfMalformedBytesNamesTheirPathAndIsNotThatOfAMissingFile) {
-  EXPECT_FALSE(dictionaryFromBytes("no property list", "/malformed.plist", error));
-  EXPECT_TRUE(error.text.starts_with("Cannot read the property list /malformed.plist: "))
-      << error.text;
-  EXPECT_FALSE(error.isMissing());
+  const Failure failure = failureOf(dictionaryFromBytes("no property list", "/malformed.plist"));
+  EXPECT_TRUE(failure.text.starts_with("Cannot read the property list /malformed.plist: "))
+      << failure.text;
+  EXPECT_FALSE(failure.isMissing());
 }
 
 TEST_F(PropertyListsTest, AnEmptyFileHoldsNoDictionary) {
@@ -85,8 +84,8 @@ TEST_F(PropertyListsTest, AnEmptyFileHoldsNoDictionary) {
 TEST_F(PropertyListsTest, AFileThatHoldsSomethingElseHoldsNoDictionary) {
   makeFile("/array.plist", xmlPropertyList("<array/>"));
   EXPECT_FALSE(propertyLists.readDictionary("/array.plist"));
-  EXPECT_FALSE(dictionaryFromBytes(xmlPropertyList("<array/>"), "/array.plist", error));
-  EXPECT_EQ(error.text, "Cannot read the property list /array.plist: Its root is not a dictionary");
+  EXPECT_EQ(failureOf(dictionaryFromBytes(xmlPropertyList("<array/>"), "/array.plist")).text,
+            "Cannot read the property list /array.plist: Its root is not a dictionary");
 }
 
 TEST_F(PropertyListsTest, AFileWithoutReadPermissionHoldsNoDictionary) {

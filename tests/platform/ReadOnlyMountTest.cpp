@@ -34,8 +34,7 @@ class ReadOnlyMountTest : public DevicePlacesTest {
   }
   /// Takes a snapshot with a view of the mounts of its own.
   static DeviceSnapshot taken(const std::string& directory, ReadOnlyMounts mounts) {
-    Failure error;
-    const DeviceRoot device = DeviceRoot::openRoot(directory, error).value();
+    const DeviceRoot device = DeviceRoot::openRoot(directory).value();
     LinuxFileSystem system(device, "/var/mobile/tmp");
     return std::get<DeviceSnapshot>(
         LinuxDevicePlaces(device, system, "/var/mobile", mounts).takeSnapshot());
