@@ -30,8 +30,8 @@ std::variant<std::unique_ptr<DevicePlatform>, ProgramError> DevicePlatform::open
   if (platform == nullptr) {
     return programErrorOf(error);
   }
-  if (const auto unread = platform->readAhead()) {
-    return programErrorOf(*unread, ExitStatus::MissingInput);
+  if (const Result read = platform->readAhead(); !read) {
+    return programErrorOf(read.error(), ExitStatus::MissingInput);
   }
   return std::unique_ptr<DevicePlatform>(
       new DevicePlatform(std::move(platform), options.bundleResourcesDirectory));

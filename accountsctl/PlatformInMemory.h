@@ -19,7 +19,7 @@ class PlatformInMemory {
   /// Lets everybody have a file: who looks at an image is not who will migrate it.
   class AnyOwner final : public OwnershipRule {
    public:
-    std::variant<FileOwner, Failure> ownerNamed(std::string_view, std::string_view) override {
+    OrFailure<FileOwner> ownerNamed(std::string_view, std::string_view) override {
       return FileOwner();
     }
   };

@@ -16,9 +16,9 @@ namespace {
 class OwnedBytes final : public ReadableBytes {
  public:
   explicit OwnedBytes(std::string bytes) : bytes_(std::move(bytes)) {}
-  std::optional<Failure> giveTo(const Taker& take) const override {
+  Result giveTo(const Taker& take) const override {
     static_cast<void>(take(bytes_));
-    return std::nullopt;
+    return {};
   }
 
  private:

@@ -130,10 +130,10 @@ CommandResult status(const StatusOptions& options, const Terminal& terminal,
   }
   LinuxDevicePlaces places(linux.root(), linux.fileSystem(), linux.platform().homeDirectory.path());
   const auto taken = places.takeSnapshot();
-  if (const auto* failure = std::get_if<Failure>(&taken)) {
-    return readingError(*failure);
+  if (!taken) {
+    return readingError(taken.error());
   }
-  const auto& snapshot = std::get<DeviceSnapshot>(taken);
+  const DeviceSnapshot& snapshot = *taken;
   DeviceStatus found = leftoversOn(linux);
   worker.giveUpRights(openInputsOf(snapshot));
   if (auto error = device.decode()) {

@@ -62,14 +62,14 @@ void tellHowThisWorkerEnds(const FileDescriptor& socket) {
   sigaction(SIGSYS, &action, nullptr);
 }
 
-void endUnlessGivenUp(const std::optional<Failure>& whyNot, const FileDescriptor& socket) {
-  if (!whyNot) {
+void endUnlessGivenUp(const Result& givenUp, const FileDescriptor& socket) {
+  if (givenUp) {
     return;
   }
-  if (whyNot->number == ENOMEM) {
+  if (givenUp.error().number == ENOMEM) {
     throw std::bad_alloc();
   }
-  static_cast<void>(sendFrame(socket, FrameKind::Fault, whyNot->text));
+  static_cast<void>(sendFrame(socket, FrameKind::Fault, givenUp.error().text));
   _exit(static_cast<int>(ExitStatus::PluginEnded));
 }
 

@@ -16,7 +16,7 @@ namespace accounts {
 void tellHowThisWorkerEnds(const FileDescriptor& socket);
 
 /// Ends this process where rights could not be given up, for the reason given; its keeper is told.
-void endUnlessGivenUp(const std::optional<Failure>& whyNot, const FileDescriptor& socket);
+void endUnlessGivenUp(const Result& givenUp, const FileDescriptor& socket);
 
 /// What a keeper says of a worker's end. `who` worked there: "The plug-in".
 class WorkerEnd {

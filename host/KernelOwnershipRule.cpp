@@ -12,8 +12,8 @@ namespace accounts {
 KernelOwnershipRule::KernelOwnershipRule(const DeviceRoot& root)
     : names_(root), self_{::geteuid(), ::getegid()} {}
 
-std::variant<FileOwner, Failure> KernelOwnershipRule::ownerNamed(std::string_view ownerName,
-                                                                 std::string_view groupName) {
+OrFailure<FileOwner> KernelOwnershipRule::ownerNamed(std::string_view ownerName,
+                                                     std::string_view groupName) {
   const auto user = names_.userIdentifier(std::string(ownerName));
   const auto group = user ? names_.groupIdentifier(std::string(groupName)) : user.error();
   if (!group) {

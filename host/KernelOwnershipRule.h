@@ -2,7 +2,6 @@
 
 #include <string>
 #include <string_view>
-#include <variant>
 
 #include "platform/linux/DeviceRoot.h"
 #include "platform/linux/OwnerNames.h"
@@ -20,8 +19,7 @@ class KernelOwnershipRule final : public OwnershipRule {
   /// Opens now what tells who `name` is; no other name is known afterwards.
   void readAhead(const std::string& name) { names_.readAhead(name); }
 
-  std::variant<FileOwner, Failure> ownerNamed(std::string_view ownerName,
-                                              std::string_view groupName) override;
+  OrFailure<FileOwner> ownerNamed(std::string_view ownerName, std::string_view groupName) override;
 
  private:
   OwnerNames names_;

@@ -240,8 +240,8 @@ void workInMemory(const PluginWork& work, const WorkerSide& side, const DeviceSn
   LinuxPlatform& linux = *work.device.platform;
   // Whatever has to be opened is opened here.
   Loaded loaded = work.device.bundle.load();
-  if (const auto unread = linux.readAhead()) {
-    loaded = programErrorOf(*unread, ExitStatus::MissingInput);
+  if (const Result read = linux.readAhead(); !read) {
+    loaded = programErrorOf(read.error(), ExitStatus::MissingInput);
   }
   KernelOwnershipRule ownership(linux.root());
   ownership.readAhead(std::string(kSettingsFileOwner));

@@ -4,10 +4,10 @@
 #include <optional>
 #include <string>
 #include <string_view>
-#include <variant>
 #include <vector>
 
 #include "platform/DeviceSnapshot.h"
+#include "platform/Result.h"
 
 namespace accounts {
 
@@ -63,18 +63,17 @@ class DevicePlaces {
   /// What stands at all places now. A failure when that cannot be told, when a file that a
   /// migration reads cannot be opened for another reason than that none is there, or when two
   /// places are one.
-  virtual std::variant<DeviceSnapshot, Failure> takeSnapshot() = 0;
+  virtual OrFailure<DeviceSnapshot> takeSnapshot() = 0;
 
   /// What stands at a place now; a failure when that cannot be told.
-  virtual std::variant<FileIdentity, Failure> identityAt(DevicePlace place) = 0;
+  virtual OrFailure<FileIdentity> identityAt(DevicePlace place) = 0;
 
   /// Makes a new file beside a place.
-  virtual std::variant<std::unique_ptr<StagedFile>, Failure> stage(DevicePlace place,
-                                                                   const NewFile& file) = 0;
+  virtual OrFailure<std::unique_ptr<StagedFile>> stage(DevicePlace place, const NewFile& file) = 0;
   /// The same with a second name of the kept file at a device path; with a copy that has its
   /// contents, owner, permissions and time, where the file can have no second name.
-  virtual std::variant<std::unique_ptr<StagedFile>, Failure> stageKept(
-      DevicePlace place, std::string_view keptPath) = 0;
+  virtual OrFailure<std::unique_ptr<StagedFile>> stageKept(DevicePlace place,
+                                                           std::string_view keptPath) = 0;
 
   /// Gives a staged file its place, in one step, if what stands there is `expected` but for the
   /// time of its change. What it replaces is gone afterwards. Where the file system cannot exchange
@@ -92,14 +91,13 @@ class DevicePlaces {
 
   /// Waits until the names in a place's directory are on the medium; there are none where it has no
   /// directory.
-  virtual std::optional<Failure> flush(DevicePlace place) = 0;
+  virtual Result flush(DevicePlace place) = 0;
 
   /// Makes the directory of the migration-information files, with its missing parents, if nothing
   /// is there.
-  virtual std::optional<Failure> makeInformationDirectory() = 0;
+  virtual Result makeInformationDirectory() = 0;
   /// Does the same, and makes a file in it. `name` is one component.
-  virtual std::optional<Failure> writeInformationFile(std::string_view name,
-                                                      const ReadableBytes& contents) = 0;
+  virtual Result writeInformationFile(std::string_view name, const ReadableBytes& contents) = 0;
 
   /// Deals with what killed runs left beside the places: their own files go, what they had moved
   /// away of others comes back. A sentence for each file that could not be dealt with.

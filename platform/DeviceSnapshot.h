@@ -8,8 +8,8 @@
 #include <string>
 #include <string_view>
 
-#include "platform/Failure.h"
 #include "platform/FileIdentity.h"
+#include "platform/Result.h"
 #include "vocabulary/DevicePlaces.h"
 
 namespace accounts {
@@ -24,7 +24,7 @@ class ReadableBytes {
 
   /// Passes the bytes to `take`, piece by piece, until it wants no more. A failure when they cannot
   /// be read; pieces may have been passed before.
-  [[nodiscard]] virtual std::optional<Failure> giveTo(const Taker& take) const = 0;
+  virtual Result giveTo(const Taker& take) const = 0;
 };
 
 /// Who a file belongs to, as numbers.

@@ -24,9 +24,9 @@ constexpr std::array kKeptPlaces = {
 class TextBytes final : public ReadableBytes {
  public:
   explicit TextBytes(std::string_view text) : text_(text) {}
-  std::optional<Failure> giveTo(const Taker& take) const override {
+  Result giveTo(const Taker& take) const override {
     static_cast<void>(take(text_));
-    return std::nullopt;
+    return {};
   }
 
  private:
@@ -89,10 +89,10 @@ std::optional<CommitOutcome> Commit::replaceSettings() {
   if (change != nullptr) {
     const auto contents = contentsOf_(*change);
     auto made = places_.stage(change->place, {.contents = contents.get(), .owner = change->owner});
-    if (const auto* failure = std::get_if<Failure>(&made)) {
-      return failed(writingError("The settings file cannot be written", *failure));
+    if (!made) {
+      return failed(writingError("The settings file cannot be written", made.error()));
     }
-    staged = std::move(std::get<std::unique_ptr<StagedFile>>(made));
+    staged = *std::move(made);
   }
   std::optional<CommitOutcome> refusal = keepFiles();
   if (!refusal) {
@@ -125,16 +125,16 @@ std::optional<CommitOutcome> Commit::whyNotUndisturbed() {
       continue;
     }
     const auto now = places_.identityAt(each.place);
-    if (const auto* failure = std::get_if<Failure>(&now)) {
+    if (!now) {
       const PlaceState& state = snapshot_.at(each.place);
       if (!state.identity.exists() && state.whyNotReplaced) {
         // Nothing could be told of it before either, and nothing is done there.
         continue;
       }
-      return failed(readingError(*failure));
+      return failed(readingError(now.error()));
     }
     // A directory's own times tell of other files; and a second name moves the time of a change.
-    const auto& standing = std::get<FileIdentity>(now);
+    const FileIdentity& standing = *now;
     const FileIdentity& before = identity(each.place);
     const bool isSame = before.kind == EntryKind::Directory ? standing.kind == before.kind
                         : outcome_.keptFolder               ? standing.isSameFileAs(before)
@@ -186,16 +186,16 @@ std::optional<CommitOutcome> Commit::writeRecord() {
     }
   }
   // That of an earlier run may not be on the medium either, if it was killed.
-  const auto failure = places_.flush(DevicePlace::CommitRecord);
-  return failure ? std::optional(failed(writingError(kOperation, *failure))) : std::nullopt;
+  const Result flushed = places_.flush(DevicePlace::CommitRecord);
+  return flushed ? std::nullopt : std::optional(failed(writingError(kOperation, flushed.error())));
 }
 
 PlaceOutcome Commit::write(DevicePlace place, const NewFile& file, FileIdentity& written) {
   auto made = places_.stage(place, file);
-  if (auto* failure = std::get_if<Failure>(&made)) {
-    return PlaceOutcome::failed(std::move(*failure));
+  if (!made) {
+    return PlaceOutcome::failed(made.error());
   }
-  StagedFile& staged = *std::get<std::unique_ptr<StagedFile>>(made);
+  StagedFile& staged = **made;
   PlaceOutcome outcome = places_.put(place, staged, identity(place));
   if (outcome.isDone()) {
     written = staged.identity;
@@ -296,14 +296,15 @@ void Commit::writeInformation() {
     return;
   }
   if (change->action == Action::MakeDirectory) {
-    if (const auto failure = places_.makeInformationDirectory()) {
-      warn("The migration-information directory was not made: " + failure->text);
+    if (const Result made = places_.makeInformationDirectory(); !made) {
+      warn("The migration-information directory was not made: " + made.error().text);
     }
     return;
   }
   const std::unique_ptr<ReadableBytes> contents = contentsOf_(*change);
-  if (const auto failure = places_.writeInformationFile(proposal_.informationFileName, *contents)) {
-    warn("The migration-information file was not written: " + failure->text);
+  const Result written = places_.writeInformationFile(proposal_.informationFileName, *contents);
+  if (!written) {
+    warn("The migration-information file was not written: " + written.error().text);
   }
 }
 
@@ -321,11 +322,11 @@ void Commit::endRecord() {
 }
 
 bool Commit::flushOrWarn(DevicePlace place) {
-  const auto failure = places_.flush(place);
-  if (failure) {
-    warn("A change may not outlive a loss of power: " + failure->text);
+  const Result flushed = places_.flush(place);
+  if (!flushed) {
+    warn("A change may not outlive a loss of power: " + flushed.error().text);
   }
-  return !failure;
+  return flushed.has_value();
 }
 
 }  // namespace accounts

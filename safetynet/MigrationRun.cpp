@@ -68,11 +68,11 @@ std::optional<ProgramError> MigrationRun::takeLocks(RunPurpose purpose) {
 }
 
 MigrationRun::Attempt MigrationRun::attempt(RunPurpose purpose, KeepFiles keep) {
-  auto taken = means_.places.takeSnapshot();
-  if (const auto* failure = std::get_if<Failure>(&taken)) {
-    return fail(readingError(*failure));
+  const auto taken = means_.places.takeSnapshot();
+  if (!taken) {
+    return fail(readingError(taken.error()));
   }
-  const auto& snapshot = std::get<DeviceSnapshot>(taken);
+  const DeviceSnapshot& snapshot = *taken;
   worker_.reset();
   worker_ = means_.makeWorker();
   const auto worked = worker_->work(snapshot, {.purpose = purpose, .lock = lock_, .keep = keep});

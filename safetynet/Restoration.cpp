@@ -72,16 +72,15 @@ class Restorer {
         continue;
       }
       const auto now = places_.identityAt(place);
-      if (const auto* failure = std::get_if<Failure>(&now)) {
-        return writingError(kOperation, *failure);
+      if (!now) {
+        return writingError(kOperation, now.error());
       }
-      const auto& identity = std::get<FileIdentity>(now);
-      if (identity.kind == EntryKind::Directory) {
+      if (now->kind == EntryKind::Directory) {
         return ProgramError{ExitStatus::CannotCreate,
                             pathOf(place) + " is a directory, so it is not replaced"};
       }
-      if (listed->second != EntryKind::Nothing || identity.exists()) {
-        differences_.push_back({place, listed->second, identity});
+      if (listed->second != EntryKind::Nothing || now->exists()) {
+        differences_.push_back({place, listed->second, *now});
       }
     }
     return std::nullopt;
@@ -108,12 +107,11 @@ class Restorer {
 
   std::optional<ProgramError> end(DevicePlace place) {
     const auto now = places_.identityAt(place);
-    const auto* identity = std::get_if<FileIdentity>(&now);
     PlaceOutcome outcome;
-    if (identity == nullptr) {
-      outcome = PlaceOutcome::failed(std::get<Failure>(now));
-    } else if (identity->exists()) {
-      outcome = places_.remove(place, *identity);
+    if (!now) {
+      outcome = PlaceOutcome::failed(now.error());
+    } else if (now->exists()) {
+      outcome = places_.remove(place, *now);
       if (outcome.isDone()) {
         flush(place, outcome);
       }
@@ -128,10 +126,8 @@ class Restorer {
     } else {
       auto staged = places_.stageKept(difference.place,
                                       KeptFolders::pathIn(*restoration_.folder, difference.place));
-      outcome = std::holds_alternative<Failure>(staged)
-                    ? PlaceOutcome::failed(std::get<Failure>(std::move(staged)))
-                    : places_.put(difference.place, *std::get<std::unique_ptr<StagedFile>>(staged),
-                                  difference.now);
+      outcome = staged ? places_.put(difference.place, **staged, difference.now)
+                       : PlaceOutcome::failed(staged.error());
     }
     if (outcome.isDone()) {
       flush(difference.place, outcome);
@@ -145,8 +141,8 @@ class Restorer {
   }
 
   void flush(DevicePlace place, PlaceOutcome& outcome) {
-    if (auto failure = places_.flush(place)) {
-      outcome = PlaceOutcome::failed(*std::move(failure));
+    if (const Result flushed = places_.flush(place); !flushed) {
+      outcome = PlaceOutcome::failed(flushed.error());
     }
   }
 

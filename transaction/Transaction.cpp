@@ -37,13 +37,13 @@ std::optional<std::string> Transaction::bytesBefore(DevicePlace place) {
   }
   std::string bytes;
   bytes.reserve(state.identity.size);
-  std::optional<Failure> failure = state.contents->giveTo([&bytes](std::string_view piece) {
+  const Result given = state.contents->giveTo([&bytes](std::string_view piece) {
     bytes.append(piece);
     return true;
   });
-  if (failure) {
+  if (!given) {
     if (!readFailure_) {
-      readFailure_ = std::move(failure);
+      readFailure_ = given.error();
     }
     return std::nullopt;
   }

@@ -173,10 +173,10 @@ Result TransactionFileSystem::setOwnerAndGroup(std::string_view path, std::strin
     return failure("set the owner of", path, ENOENT);
   }
   const auto owner = ownership_.ownerNamed(ownerName, groupName);
-  if (const auto* whyNot = std::get_if<Failure>(&owner)) {
-    return ofSave(*whyNot);
+  if (!owner) {
+    return ofSave(owner.error());
   }
-  temporary->second.owner = std::get<FileOwner>(owner);
+  temporary->second.owner = *owner;
   return {};
 }
 

@@ -5,7 +5,6 @@
 #include <optional>
 #include <string>
 #include <string_view>
-#include <variant>
 
 #include "platform/FileSystem.h"
 #include "transaction/Transaction.h"
@@ -20,8 +19,8 @@ class OwnershipRule {
 
   /// The numbers of a user and a group with these account names; a failure with the reason when
   /// the device does not know them or a file could not be given to them.
-  virtual std::variant<FileOwner, Failure> ownerNamed(std::string_view ownerName,
-                                                      std::string_view groupName) = 0;
+  virtual OrFailure<FileOwner> ownerNamed(std::string_view ownerName,
+                                          std::string_view groupName) = 0;
 };
 
 /// The file system of a migration in memory. What the device would refuse is refused as the

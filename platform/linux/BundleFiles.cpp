@@ -21,7 +21,7 @@ std::string BundleFiles::pathOf(const std::string& name) const {
   return joinedPath(directory_, name);
 }
 
-std::optional<Failure> BundleFiles::readAhead() {
+Result BundleFiles::readAhead() {
   std::map<std::string, OrFailure<std::string>> found;
   std::error_code error;
   fs::recursive_directory_iterator entry(directory_, error);
@@ -40,7 +40,7 @@ std::optional<Failure> BundleFiles::readAhead() {
     return pathFailure("open", directory_, error.value());
   }
   found_ = std::move(found);
-  return std::nullopt;
+  return {};
 }
 
 bool BundleFiles::exists(const std::string& name) const {

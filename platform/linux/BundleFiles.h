@@ -18,7 +18,7 @@ class BundleFiles {
   /// Reads everything there is now, so that nothing needs to be opened later. What comes into the
   /// directory afterwards is not seen. An error when this machine's want or its medium keeps
   /// something from being read.
-  std::optional<Failure> readAhead();
+  Result readAhead();
 
   [[nodiscard]] bool exists(const std::string& name) const;
   /// The bytes of a regular file.

@@ -103,9 +103,9 @@ bool dropCapabilities() {
 
 }  // namespace
 
-std::optional<Failure> giveUpRights(const Confinement& kept) {
+Result giveUpRights(const Confinement& kept) {
   if (kIsExemptFromConfinement) {
-    return std::nullopt;
+    return {};
   }
   const pid_t parent = ::getppid();
   if (!closeOthers(kept.descriptors)) {
@@ -133,12 +133,12 @@ std::optional<Failure> giveUpRights(const Confinement& kept) {
     return cannotGiveUp("the files", number);
   }
   const int number = filterSystemCalls(kept.journalEntries);
-  return number != 0 ? std::optional(cannotGiveUp("system calls", number)) : std::nullopt;
+  return number != 0 ? cannotGiveUp("system calls", number) : Result();
 }
 
-std::optional<Failure> giveUpForeignRights(int directory) {
+Result giveUpForeignRights(int directory) {
   if (kIsExemptFromConfinement) {
-    return std::nullopt;
+    return {};
   }
   if (::prctl(PR_SET_NO_NEW_PRIVS, 1, 0, 0, 0) != 0) {
     return cannotGiveUp("new rights", errno);
@@ -147,7 +147,7 @@ std::optional<Failure> giveUpForeignRights(int directory) {
     return cannotGiveUp("files outside the root", number);
   }
   const int number = filterForeignCalls();
-  return number != 0 ? std::optional(cannotGiveUp("system calls", number)) : std::nullopt;
+  return number != 0 ? cannotGiveUp("system calls", number) : Result();
 }
 
 }  // namespace accounts

@@ -2,7 +2,6 @@
 
 #include <chrono>
 #include <cstdint>
-#include <optional>
 #include <vector>
 
 #include "platform/linux/PathFailure.h"
@@ -40,12 +39,12 @@ struct Confinement {
 /// has it), memory and time without end, and every system call that `SystemCallFilter.h` does not
 /// list. The process dies with its parent. It must have one thread; a lower limit that it has
 /// already stays. An error when that cannot be done: the process must not go on then.
-std::optional<Failure> giveUpRights(const Confinement& kept);
+Result giveUpRights(const Confinement& kept);
 
 /// Gives up, for good, what a process does not need that changes a device by itself: files outside
 /// `directory`, the device's root, which may be open for its path (Landlock, where the kernel has
 /// it), and the calls of `filterForeignCalls`. Its user and its capabilities stay. An error when
 /// that cannot be done: the process must not go on then.
-std::optional<Failure> giveUpForeignRights(int directory);
+Result giveUpForeignRights(int directory);
 
 }  // namespace accounts

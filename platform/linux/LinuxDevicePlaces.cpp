@@ -70,7 +70,7 @@ LinuxDevicePlaces::LinuxDevicePlaces(const DeviceRoot& root, LinuxFileSystem& fi
                                      std::string home, ReadOnlyMounts readOnlyMounts)
     : root_(root), files_(files), home_(std::move(home)), readOnlyMounts_(readOnlyMounts) {}
 
-std::variant<DeviceSnapshot, Failure> LinuxDevicePlaces::takeSnapshot() {
+OrFailure<DeviceSnapshot> LinuxDevicePlaces::takeSnapshot() {
   directories_ = {};
   opened_.clear();
   metReadOnlyMount_ = false;
@@ -78,12 +78,12 @@ std::variant<DeviceSnapshot, Failure> LinuxDevicePlaces::takeSnapshot() {
   for (const ListedPlace& each : kDevicePlaces) {
     PlaceState& state = snapshot.places[indexOf(each.place)];
     state.path = pathOf(each.place);
-    if (auto failure = look(each.place, state)) {
-      return *std::move(failure);
+    if (const Result looked = look(each.place, state); !looked) {
+      return looked.error();
     }
   }
-  if (auto failure = whyTwoAreOne()) {
-    return *std::move(failure);
+  if (const Result apart = checkThatNoTwoAreOne(); !apart) {
+    return apart.error();
   }
   snapshot.isReadOnly = metReadOnlyMount_;
   return snapshot;
@@ -126,7 +126,7 @@ OrFailure<std::shared_ptr<const LinuxDevicePlaces::Directory>> LinuxDevicePlaces
   return directory;
 }
 
-std::optional<Failure> LinuxDevicePlaces::look(DevicePlace place, PlaceState& state) {
+Result LinuxDevicePlaces::look(DevicePlace place, PlaceState& state) {
   const auto opened = directoryOf(state.path);
   if (!opened) {
     const Failure& error = opened.error();
@@ -141,7 +141,7 @@ std::optional<Failure> LinuxDevicePlaces::look(DevicePlace place, PlaceState& st
     } else {
       state.whyNotReplaced = error;
     }
-    return std::nullopt;
+    return {};
   }
   const auto& directory = *opened;
   directories_[indexOf(place)] = directory;
@@ -157,19 +157,19 @@ std::optional<Failure> LinuxDevicePlaces::look(DevicePlace place, PlaceState& st
     state.whyNotReplaced = pathFailure("create", state.path, number);
     state.whyNotRemoved = pathFailure("remove", state.path, number);
     state.whyNotMade = pathFailure("create the directory", state.path, number);
-    return std::nullopt;
+    return {};
   }
-  if (auto failure = lookAtTarget(place, state)) {
-    return failure;
+  Result looked = lookAtTarget(place, state);
+  if (looked) {
+    foresee(place, *directory, status, state);
   }
-  foresee(place, *directory, status, state);
-  return std::nullopt;
+  return looked;
 }
 
-std::optional<Failure> LinuxDevicePlaces::lookAtTarget(DevicePlace place, PlaceState& state) {
+Result LinuxDevicePlaces::lookAtTarget(DevicePlace place, PlaceState& state) {
   state.target = state.identity.kind;
   if (!isRead(place)) {
-    return state.target == EntryKind::Other ? lookThroughLink(place, state) : std::nullopt;
+    return state.target == EntryKind::Other ? lookThroughLink(place, state) : Result();
   }
   // A regular file is opened where it was found; anything else might be a link to one.
   auto file = state.identity.kind == EntryKind::RegularFile
@@ -187,7 +187,7 @@ std::optional<Failure> LinuxDevicePlaces::lookAtTarget(DevicePlace place, PlaceS
       state.target = EntryKind::Directory;
     }
     state.whyNotRead = error;
-    return std::nullopt;
+    return {};
   }
   if (state.identity.kind == EntryKind::RegularFile) {
     state.identity = identityOf(*opened);
@@ -198,17 +198,17 @@ std::optional<Failure> LinuxDevicePlaces::lookAtTarget(DevicePlace place, PlaceS
   }
   state.permissions = opened->st_mode & kPermissionBits;
   state.contents = std::make_shared<OpenedBytes>(std::move(*file), state.path);
-  return std::nullopt;
+  return {};
 }
 
-std::optional<Failure> LinuxDevicePlaces::lookThroughLink(DevicePlace place, PlaceState& state) {
+Result LinuxDevicePlaces::lookThroughLink(DevicePlace place, PlaceState& state) {
   const auto entry = root_.open(state.path, O_PATH);
   const auto status = entry ? fileStatus(*entry, state.path) : entry.error();
   if (!status && isDecisive(place) && !isMissing(status.error().number)) {
     return status.error();
   }
   state.target = status ? kindOfMode(status->st_mode) : EntryKind::Nothing;
-  return std::nullopt;
+  return {};
 }
 
 void LinuxDevicePlaces::foresee(DevicePlace place, const Directory& directory,
@@ -271,7 +271,7 @@ void LinuxDevicePlaces::foreseeInformationDirectory(PlaceState& state) {
   }
 }
 
-std::optional<Failure> LinuxDevicePlaces::whyTwoAreOne() const {
+Result LinuxDevicePlaces::checkThatNoTwoAreOne() const {
   for (std::size_t one = 0; one < kDevicePlaceCount; ++one) {
     for (std::size_t other = one + 1; other < kDevicePlaceCount; ++other) {
       const auto& first = directories_[one];
@@ -287,19 +287,22 @@ std::optional<Failure> LinuxDevicePlaces::whyTwoAreOne() const {
       }
     }
   }
-  return std::nullopt;
+  return {};
 }
 
-std::variant<FileIdentity, Failure> LinuxDevicePlaces::identityAt(DevicePlace place) {
+OrFailure<FileIdentity> LinuxDevicePlaces::identityAt(DevicePlace place) {
   const auto directory = openDirectoryAt(place);
   const std::string path = pathOf(place);
   if (!directory) {
-    return isMissing(directory.error().number) ? std::variant<FileIdentity, Failure>(FileIdentity())
-                                               : directory.error();
+    return directory.error().isMissing() ? FileIdentity()
+                                         : OrFailure<FileIdentity>(directory.error());
   }
   const std::string name(splitPath(path).name);
   const auto found = entryIn((*directory)->descriptor->number(), name.c_str());
-  return found ? std::variant<FileIdentity, Failure>(*found) : pathFailure("examine", path, errno);
+  if (!found) {
+    return pathFailure("examine", path, errno);
+  }
+  return *found;
 }
 
 }  // namespace accounts

@@ -3,10 +3,8 @@
 #include <array>
 #include <map>
 #include <memory>
-#include <optional>
 #include <string>
 #include <string_view>
-#include <variant>
 #include <vector>
 
 #include "platform/DevicePlaces.h"
@@ -28,20 +26,18 @@ class LinuxDevicePlaces final : public DevicePlaces {
   LinuxDevicePlaces(const DeviceRoot& root, LinuxFileSystem& files, std::string home,
                     ReadOnlyMounts readOnlyMounts = ReadOnlyMounts::Refuse);
 
-  std::variant<DeviceSnapshot, Failure> takeSnapshot() override;
-  std::variant<FileIdentity, Failure> identityAt(DevicePlace place) override;
-  std::variant<std::unique_ptr<StagedFile>, Failure> stage(DevicePlace place,
-                                                           const NewFile& file) override;
-  std::variant<std::unique_ptr<StagedFile>, Failure> stageKept(DevicePlace place,
-                                                               std::string_view keptPath) override;
+  OrFailure<DeviceSnapshot> takeSnapshot() override;
+  OrFailure<FileIdentity> identityAt(DevicePlace place) override;
+  OrFailure<std::unique_ptr<StagedFile>> stage(DevicePlace place, const NewFile& file) override;
+  OrFailure<std::unique_ptr<StagedFile>> stageKept(DevicePlace place,
+                                                   std::string_view keptPath) override;
   PlaceOutcome put(DevicePlace place, StagedFile& file, const FileIdentity& expected) override;
   PlaceOutcome remove(DevicePlace place, const FileIdentity& expected) override;
   PlaceOutcome keep(DevicePlace place, std::string_view keptPath,
                     const FileIdentity& expected) override;
-  std::optional<Failure> flush(DevicePlace place) override;
-  std::optional<Failure> makeInformationDirectory() override;
-  std::optional<Failure> writeInformationFile(std::string_view name,
-                                              const ReadableBytes& contents) override;
+  Result flush(DevicePlace place) override;
+  Result makeInformationDirectory() override;
+  Result writeInformationFile(std::string_view name, const ReadableBytes& contents) override;
   std::vector<std::string> settleLeftovers() override;
   /// Only removes the temporary files of killed runs that no commit knows of, as those of a plug-in
   /// that works on the device itself. Needs no lock. What cannot be removed stays for the next
@@ -70,13 +66,13 @@ class LinuxDevicePlaces final : public DevicePlaces {
   OrFailure<std::shared_ptr<const Directory>> openDirectoryAt(DevicePlace place);
   /// Looks at one place. A failure when what stands there cannot be told or opened and the
   /// migration would read it.
-  std::optional<Failure> look(DevicePlace place, PlaceState& state);
-  std::optional<Failure> lookAtTarget(DevicePlace place, PlaceState& state);
-  std::optional<Failure> lookThroughLink(DevicePlace place, PlaceState& state);
+  Result look(DevicePlace place, PlaceState& state);
+  Result lookAtTarget(DevicePlace place, PlaceState& state);
+  Result lookThroughLink(DevicePlace place, PlaceState& state);
   void foresee(DevicePlace place, const Directory& directory, const struct stat& status,
                PlaceState& state) const;
   void foreseeInformationDirectory(PlaceState& state);
-  [[nodiscard]] std::optional<Failure> whyTwoAreOne() const;
+  [[nodiscard]] Result checkThatNoTwoAreOne() const;
 
   const DeviceRoot& root_;
   LinuxFileSystem& files_;

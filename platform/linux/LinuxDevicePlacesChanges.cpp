@@ -51,14 +51,14 @@ bool isSameInode(const FileIdentity& one, const FileIdentity& other) {
 }
 
 /// Writes all into a new file.
-std::optional<Failure> writeContents(const ReadableBytes& contents, const FileDescriptor& file,
-                                     std::string_view path) {
+Result writeContents(const ReadableBytes& contents, const FileDescriptor& file,
+                     std::string_view path) {
   int number = 0;
-  auto failure = contents.giveTo([&](std::string_view piece) {
+  Result given = contents.giveTo([&](std::string_view piece) {
     number = writeAll(file.number(), piece);
     return number == 0;
   });
-  return number == 0 ? failure : pathFailure("write", path, number);
+  return number == 0 ? std::move(given) : pathFailure("write", path, number);
 }
 
 /// A file that has a name of its own beside its place.
@@ -112,8 +112,8 @@ void handBack(DevicePlace place, DirectoryEntry& own, const char* name, FileIden
 
 }  // namespace
 
-std::variant<std::unique_ptr<StagedFile>, Failure> LinuxDevicePlaces::stage(DevicePlace place,
-                                                                            const NewFile& file) {
+OrFailure<std::unique_ptr<StagedFile>> LinuxDevicePlaces::stage(DevicePlace place,
+                                                                const NewFile& file) {
   const std::string path = pathOf(place);
   const auto directory = openDirectoryAt(place);
   auto made = directory ? makeTemporaryFileIn((*directory)->descriptor, splitPath(path).directory)
@@ -123,8 +123,8 @@ std::variant<std::unique_ptr<StagedFile>, Failure> LinuxDevicePlaces::stage(Devi
   }
   const int descriptor = made->file.number();
   auto staged = std::make_unique<StagedEntry>(std::move(made->entry), std::move(made->file));
-  if (auto failure = writeContents(*file.contents, staged->file, path)) {
-    return *std::move(failure);
+  if (const Result written = writeContents(*file.contents, staged->file, path); !written) {
+    return written.error();
   }
   // All by the descriptor: whatever another process puts under the name, only this file changes.
   if (file.owner && ::fchown(descriptor, file.owner->user, file.owner->group) != 0) {
@@ -144,8 +144,8 @@ std::variant<std::unique_ptr<StagedFile>, Failure> LinuxDevicePlaces::stage(Devi
   return staged;
 }
 
-std::variant<std::unique_ptr<StagedFile>, Failure> LinuxDevicePlaces::stageKept(
-    DevicePlace place, std::string_view keptPath) {
+OrFailure<std::unique_ptr<StagedFile>> LinuxDevicePlaces::stageKept(DevicePlace place,
+                                                                    std::string_view keptPath) {
   const std::string path = pathOf(place);
   const auto kept = root_.locate(keptPath);
   const auto directory = kept ? openDirectoryAt(place) : kept.error();
@@ -292,7 +292,7 @@ PlaceOutcome LinuxDevicePlaces::keep(DevicePlace place, std::string_view keptPat
   return PlaceOutcome::done();
 }
 
-std::optional<Failure> LinuxDevicePlaces::flush(DevicePlace place) {
+Result LinuxDevicePlaces::flush(DevicePlace place) {
   const std::string path = pathOf(place);
   const auto opened = openDirectoryAt(place);
   const auto directory =
@@ -300,27 +300,25 @@ std::optional<Failure> LinuxDevicePlaces::flush(DevicePlace place) {
                    .openDirectory()
              : opened.error();
   if (!directory) {
-    return directory.error().isMissing() ? std::nullopt : std::optional(directory.error());
+    return directory.error().isMissing() ? Result() : directory.error();
   }
-  const int number = flushDirectory(*directory);
-  return number == 0 ? std::nullopt
-                     : std::optional(pathFailure("flush the directory of", path, number));
+  return asResult("flush the directory of", path, flushDirectory(*directory));
 }
 
-std::optional<Failure> LinuxDevicePlaces::makeInformationDirectory() {
+Result LinuxDevicePlaces::makeInformationDirectory() {
   const std::string directory = pathOf(DevicePlace::InformationDirectory);
   if (files_.isDirectory(directory)) {
-    return std::nullopt;
+    return {};
   }
   constexpr unsigned kEverybody = 0777;
   const Result made = files_.createDirectoryWithIntermediates(directory, kEverybody);
-  return made ? std::nullopt : std::optional(Failure{0, made.error().text});
+  return made ? made : Failure{.text = made.error().text};
 }
 
-std::optional<Failure> LinuxDevicePlaces::writeInformationFile(std::string_view name,
-                                                               const ReadableBytes& contents) {
-  if (auto failure = makeInformationDirectory()) {
-    return failure;
+Result LinuxDevicePlaces::writeInformationFile(std::string_view name,
+                                               const ReadableBytes& contents) {
+  if (Result made = makeInformationDirectory(); !made) {
+    return made;
   }
   const std::string directory = pathOf(DevicePlace::InformationDirectory);
   const std::string path = joinedPath(directory, name);
@@ -329,20 +327,19 @@ std::optional<Failure> LinuxDevicePlaces::writeInformationFile(std::string_view 
   if (!temporary) {
     return temporary.error();
   }
-  auto failure = writeContents(contents, temporary->file, path);
-  int number = failure ? 0 : accounts::flush(temporary->file);
-  if (!failure && number == 0 &&
-      ::renameat(temporary->entry.directory(), temporary->entry.name(), entry->directory(),
-                 entry->name()) != 0) {
-    number = errno;
+  Result written = writeContents(contents, temporary->file, path);
+  if (written) {
+    int number = accounts::flush(temporary->file);
+    if (number == 0 && ::renameat(temporary->entry.directory(), temporary->entry.name(),
+                                  entry->directory(), entry->name()) != 0) {
+      number = errno;
+    }
+    written = asResult("write", path, number);
   }
-  if (number != 0) {
-    failure = pathFailure("write", path, number);
-  }
-  if (failure) {
+  if (!written) {
     (void)temporary->entry.remove();
   }
-  return failure;
+  return written;
 }
 
 }  // namespace accounts

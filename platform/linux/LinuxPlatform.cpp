@@ -207,7 +207,7 @@ bool LinuxPlatform::decodeDescription(LinuxPlatformError& error) {
   return true;
 }
 
-std::optional<Failure> LinuxPlatform::readAhead() {
+Result LinuxPlatform::readAhead() {
   readLocalTimeZoneAhead();
   return parts_->bundleFiles.readAhead();
 }

@@ -76,7 +76,7 @@ class LinuxPlatform {
   /// Opens and reads what else the plug-in may ask for outside the root: the bundle's resources and
   /// the local time zone. Nothing needs to be opened for them from then on. An error when this
   /// machine's want or its medium keeps something from being read.
-  std::optional<Failure> readAhead();
+  Result readAhead();
 
   /// Valid as long as this object.
   [[nodiscard]] Platform& platform();

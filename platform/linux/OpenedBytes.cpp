@@ -16,12 +16,12 @@ constexpr std::size_t kBlockSize = std::size_t{128} << 10;
 
 }  // namespace
 
-std::optional<Failure> OpenedBytes::giveTo(const Taker& take) const {
+Result OpenedBytes::giveTo(const Taker& take) const {
   // A file that grows is read as far as no reader would take it.
   return PartOfOpenedBytes(file_, 0, kLargestFileSize + 1, path_).giveTo(take);
 }
 
-std::optional<Failure> PartOfOpenedBytes::giveTo(const Taker& take) const {
+Result PartOfOpenedBytes::giveTo(const Taker& take) const {
   std::string block(static_cast<std::size_t>(std::min<std::uint64_t>(kBlockSize, length_)), '\0');
   for (std::uint64_t done = 0; done < length_;) {
     const std::size_t wanted =
@@ -40,7 +40,7 @@ std::optional<Failure> PartOfOpenedBytes::giveTo(const Taker& take) const {
     }
     done += given;
   }
-  return std::nullopt;
+  return {};
 }
 
 }  // namespace accounts

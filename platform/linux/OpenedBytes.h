@@ -17,7 +17,7 @@ class OpenedBytes final : public ReadableBytes {
       : file_(std::move(file)), path_(std::move(path)) {}
 
   [[nodiscard]] const FileDescriptor& file() const { return file_; }
-  std::optional<Failure> giveTo(const Taker& take) const override;
+  Result giveTo(const Taker& take) const override;
 
  private:
   FileDescriptor file_;
@@ -32,7 +32,7 @@ class PartOfOpenedBytes final : public ReadableBytes {
                     std::string path)
       : file_(file), offset_(offset), length_(length), path_(std::move(path)) {}
 
-  std::optional<Failure> giveTo(const Taker& take) const override;
+  Result giveTo(const Taker& take) const override;
 
  private:
   const FileDescriptor& file_;

@@ -26,9 +26,9 @@ ProgramError ended() {
 class PartOfText final : public ReadableBytes {
  public:
   explicit PartOfText(std::string_view text) : text_(text) {}
-  std::optional<Failure> giveTo(const Taker& take) const override {
+  Result giveTo(const Taker& take) const override {
     static_cast<void>(take(text_));
-    return std::nullopt;
+    return {};
   }
 
  private:

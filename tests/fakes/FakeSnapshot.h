@@ -19,14 +19,14 @@ class FakeBytes final : public ReadableBytes {
   explicit FakeBytes(std::string bytes, std::optional<Failure> failure = std::nullopt)
       : bytes_(std::move(bytes)), failure_(std::move(failure)) {}
 
-  std::optional<Failure> giveTo(const Taker& take) const override {
+  Result giveTo(const Taker& take) const override {
     ++readings;
     // In two pieces: nobody may count on getting all at once.
     const std::string_view all = bytes_;
     if (take(all.substr(0, all.size() / 2)) && !failure_) {
       static_cast<void>(take(all.substr(all.size() / 2)));
     }
-    return failure_;
+    return failure_ ? Result(*failure_) : Result();
   }
 
   /// How often somebody began to read.

@@ -53,7 +53,7 @@ TEST_F(BundleResourcesTest, WhatWasReadAheadNeedsNoFileAnyMore) {
   std::filesystem::create_directory(outside() / "en.lproj");
   makeHostFile(outside() / "en.lproj" / "Table.strings", "a table");
 
-  ASSERT_FALSE(files.readAhead());
+  ASSERT_TRUE(files.readAhead());
   std::filesystem::remove_all(outside());
 
   EXPECT_TRUE(resources.hasPropertyList("Types"));
@@ -64,7 +64,7 @@ TEST_F(BundleResourcesTest, WhatWasReadAheadNeedsNoFileAnyMore) {
 TEST_F(BundleResourcesTest, WhatCannotBeReadAheadIsThereButHoldsNothing) {
   std::filesystem::create_symlink("/dev/null", outside() / "Types.plist");
 
-  ASSERT_FALSE(files.readAhead());
+  ASSERT_TRUE(files.readAhead());
 
   EXPECT_TRUE(resources.hasPropertyList("Types"));
   EXPECT_FALSE(resources.readPropertyList("Types"));

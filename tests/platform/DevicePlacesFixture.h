@@ -7,7 +7,6 @@
 #include <optional>
 #include <string>
 #include <string_view>
-#include <variant>
 
 #include "platform/linux/LinuxDevicePlaces.h"
 #include "platform/linux/LinuxFileSystem.h"
@@ -39,22 +38,18 @@ class DevicePlacesTest : public DeviceFixture {
   /// The snapshot; a failure of the test and an empty one where none can be taken.
   DeviceSnapshot snapshot() {
     auto taken = places.takeSnapshot();
-    if (const auto* failure = std::get_if<Failure>(&taken)) {
-      ADD_FAILURE() << failure->text;
-      return {};
-    }
-    return std::get<DeviceSnapshot>(std::move(taken));
+    EXPECT_EQ(textOf(taken), "(none)");
+    return std::move(taken).value_or(DeviceSnapshot());
   }
   /// Why no snapshot can be taken.
   std::string whyNoSnapshot() {
     const auto taken = places.takeSnapshot();
-    const auto* failure = std::get_if<Failure>(&taken);
-    return failure != nullptr ? failure->text : "(there is one)";
+    return taken ? "(there is one)" : taken.error().text;
   }
   FileIdentity identity(DevicePlace place) {
     const auto now = places.identityAt(place);
-    EXPECT_TRUE(std::holds_alternative<FileIdentity>(now));
-    return std::holds_alternative<FileIdentity>(now) ? std::get<FileIdentity>(now) : FileIdentity();
+    EXPECT_TRUE(now);
+    return now.value_or(FileIdentity());
   }
   /// A file staged for a place.
   std::unique_ptr<StagedFile> stage(DevicePlace place, const std::string& text,
@@ -63,11 +58,8 @@ class DevicePlacesTest : public DeviceFixture {
     const FakeBytes contents(text);
     auto staged =
         places.stage(place, {.contents = &contents, .permissions = permissions, .owner = owner});
-    if (const auto* failure = std::get_if<Failure>(&staged)) {
-      ADD_FAILURE() << failure->text;
-      return nullptr;
-    }
-    return std::get<std::unique_ptr<StagedFile>>(std::move(staged));
+    EXPECT_EQ(textOf(staged), "(none)");
+    return std::move(staged).value_or(nullptr);
   }
   /// Another program gives a place new contents, by a file of its own.
   void writeAsAnotherProgram(DevicePlace place, std::string_view text) const {
@@ -90,12 +82,16 @@ class DevicePlacesTest : public DeviceFixture {
   static std::string textOf(const std::optional<Failure>& failure) {
     return failure ? failure->text : "(none)";
   }
+  template <class Value>
+  static std::string textOf(const OrFailure<Value>& result) {
+    return result ? "(none)" : result.error().text;
+  }
   static std::string bytesOf(const PlaceState& state) {
     std::string bytes;
     if (state.contents == nullptr) {
       return "(none)";
     }
-    EXPECT_FALSE(state.contents->giveTo([&](std::string_view piece) {
+    EXPECT_TRUE(state.contents->giveTo([&](std::string_view piece) {
       bytes.append(piece);
       return true;
     }));

@@ -75,10 +75,9 @@ TEST_F(DevicePlacesKeepingTest, AKeptFileComesBackWithItsContentsAndIsStillKept)
   makeFile(path(kStore), "newer");
   const FileIdentity found = snapshot().at(kStore).identity;
   auto staged = places.stageKept(kStore, kKept);
-  ASSERT_TRUE(std::holds_alternative<std::unique_ptr<StagedFile>>(staged));
+  ASSERT_TRUE(staged);
 
-  EXPECT_EQ(wordOf(places.put(kStore, *std::get<std::unique_ptr<StagedFile>>(staged), found)),
-            "done");
+  EXPECT_EQ(wordOf(places.put(kStore, **staged, found)), "done");
 
   EXPECT_EQ(contentsOf(path(kStore)), "store");
   EXPECT_EQ(contentsOf(kKept), "store");
@@ -88,10 +87,8 @@ TEST_F(DevicePlacesKeepingTest, AKeptFileComesBackWithItsContentsAndIsStillKept)
 TEST_F(DevicePlacesKeepingTest, AKeptLinkComesBackAsOne) {
   makeLink(kKept, "/nowhere");
   auto staged = places.stageKept(kStore, kKept);
-  ASSERT_TRUE(std::holds_alternative<std::unique_ptr<StagedFile>>(staged));
-  EXPECT_EQ(
-      wordOf(places.put(kStore, *std::get<std::unique_ptr<StagedFile>>(staged), FileIdentity())),
-      "done");
+  ASSERT_TRUE(staged);
+  EXPECT_EQ(wordOf(places.put(kStore, **staged, FileIdentity())), "done");
   EXPECT_EQ(fs::read_symlink(hostPath(kStore)), "/nowhere");
 }
 
@@ -104,8 +101,8 @@ TEST_F(DevicePlacesKeepingTest, AKeptFileThatGetsNoPlaceIsKeptAlone) {
 
 TEST_F(DevicePlacesKeepingTest, AMissingKeptFileIsAFailure) {
   const auto staged = places.stageKept(kStore, kKept);
-  ASSERT_TRUE(std::holds_alternative<Failure>(staged));
-  EXPECT_EQ(std::get<Failure>(staged).number, ENOENT);
+  ASSERT_FALSE(staged);
+  EXPECT_EQ(staged.error().number, ENOENT);
 }
 
 /// Where a file can have no second name: these tests end their process, in which link() fails.
@@ -135,7 +132,7 @@ TEST_F(DevicePlacesWithoutLinksDeathTest, ACopyComesBackAsAnother) {
   const auto putBack = [&] {
     makeSystemCallFail(SYS_linkat, EPERM);
     auto staged = places.stageKept(kStore, kKept);
-    exitWith(places.put(kStore, *std::get<std::unique_ptr<StagedFile>>(staged), FileIdentity()));
+    exitWith(places.put(kStore, **staged, FileIdentity()));
   };
   EXPECT_EXIT(putBack(), testing::ExitedWithCode(0), "done");
   EXPECT_EQ(contentsOf(path(kStore)), "store");

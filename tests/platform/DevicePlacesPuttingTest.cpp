@@ -93,8 +93,8 @@ TEST_F(DevicePlacesPuttingTest, AFileThatCannotBeGivenAwayIsAFailureAndLeavesNot
   const FakeBytes contents("new");
   const auto staged =
       places.stage(kReplacedSettings, {.contents = &contents, .owner = FileOwner{12345, 12345}});
-  ASSERT_TRUE(std::holds_alternative<Failure>(staged));
-  EXPECT_EQ(std::get<Failure>(staged).text,
+  ASSERT_FALSE(staged);
+  EXPECT_EQ(staged.error().text,
             "Cannot set the owner of " + path(kReplacedSettings) + ": Operation not permitted");
   EXPECT_TRUE(namesIn(kPreferences).empty());
 }
@@ -102,8 +102,8 @@ TEST_F(DevicePlacesPuttingTest, AFileThatCannotBeGivenAwayIsAFailureAndLeavesNot
 TEST_F(DevicePlacesPuttingTest, BytesThatCannotBeReadAreAFailureAndLeaveNothing) {
   const FakeBytes contents("half of it", Failure{EIO, "Cannot read it"});
   const auto staged = places.stage(kReplacedSettings, {.contents = &contents});
-  ASSERT_TRUE(std::holds_alternative<Failure>(staged));
-  EXPECT_EQ(std::get<Failure>(staged).text, "Cannot read it");
+  ASSERT_FALSE(staged);
+  EXPECT_EQ(staged.error().text, "Cannot read it");
   EXPECT_TRUE(namesIn(kPreferences).empty());
 }
 
@@ -111,8 +111,8 @@ TEST_F(DevicePlacesPuttingTest, AFullDiskIsAFailureAndLeavesNothing) {
   const WithLargestWrittenFile limit(4);
   const FakeBytes contents("more than four");
   const auto staged = places.stage(kReplacedSettings, {.contents = &contents});
-  ASSERT_TRUE(std::holds_alternative<Failure>(staged));
-  EXPECT_EQ(std::get<Failure>(staged).number, EFBIG);
+  ASSERT_FALSE(staged);
+  EXPECT_EQ(staged.error().number, EFBIG);
   EXPECT_TRUE(namesIn(kPreferences).empty());
 }
 
@@ -120,8 +120,7 @@ TEST_F(DevicePlacesPuttingTest, AMissingDirectoryIsAFailure) {
   fs::remove(onHost(kMail));
   static_cast<void>(snapshot());
   const FakeBytes contents("new");
-  EXPECT_TRUE(std::holds_alternative<Failure>(
-      places.stage(DevicePlace::LegacyMail, {.contents = &contents})));
+  EXPECT_FALSE(places.stage(DevicePlace::LegacyMail, {.contents = &contents}));
 }
 
 TEST_F(DevicePlacesPuttingTest, ADirectoryThatIsMadeAfterTheSnapshotIsUsed) {
@@ -262,10 +261,9 @@ TEST_F(ForeignLinkTest, PutThereInALoopNeverChangesTheForeignFile) {
     auto staged = places.stage(
         kReplacedSettings,
         {.contents = &contents, .permissions = 0666, .owner = FileOwner{::geteuid(), ::getegid()}});
-    if (auto* file = std::get_if<std::unique_ptr<StagedFile>>(&staged)) {
-      if (places.put(kReplacedSettings, **file, taken.at(kReplacedSettings).identity).isDone()) {
-        EXPECT_EQ(contentsOf(path(kReplacedSettings)), text);
-      }
+    if (staged &&
+        places.put(kReplacedSettings, **staged, taken.at(kReplacedSettings).identity).isDone()) {
+      EXPECT_EQ(contentsOf(path(kReplacedSettings)), text);
     }
   }
   ::kill(attacker, SIGKILL);

@@ -36,8 +36,7 @@ class ReadOnlyMountTest : public DevicePlacesTest {
   static DeviceSnapshot taken(const std::string& directory, ReadOnlyMounts mounts) {
     const DeviceRoot device = DeviceRoot::openRoot(directory).value();
     LinuxFileSystem system(device, "/var/mobile/tmp");
-    return std::get<DeviceSnapshot>(
-        LinuxDevicePlaces(device, system, "/var/mobile", mounts).takeSnapshot());
+    return LinuxDevicePlaces(device, system, "/var/mobile", mounts).takeSnapshot().value();
   }
 };
 

@@ -46,9 +46,7 @@ class CommitTest : public testing::Test {
     }
   }
   /// The snapshot that the migration was made over.
-  static DeviceSnapshot snapshotOf(FakeDevice& of) {
-    return std::get<DeviceSnapshot>(of.takeSnapshot());
-  }
+  static DeviceSnapshot snapshotOf(FakeDevice& of) { return of.takeSnapshot().value(); }
   CommitOutcome commit(FakeDevice& to, const DeviceSnapshot& snapshot) const {
     KeptFolders folders(to, to);
     const ContentsOf contentsOf = [](const ProposedChange& change) {

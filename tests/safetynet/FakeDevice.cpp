@@ -142,7 +142,7 @@ FileIdentity FakeDevice::identityOf(std::string_view path) const {
   return found != entries.end() ? found->second->identity : FileIdentity();
 }
 
-std::variant<DeviceSnapshot, Failure> FakeDevice::takeSnapshot() {
+OrFailure<DeviceSnapshot> FakeDevice::takeSnapshot() {
   if (auto failure = begin("takeSnapshot", Recorded::No)) {
     return *failure;
   }
@@ -166,24 +166,24 @@ std::variant<DeviceSnapshot, Failure> FakeDevice::takeSnapshot() {
   return snapshot;
 }
 
-std::variant<FileIdentity, Failure> FakeDevice::identityAt(DevicePlace place) {
+OrFailure<FileIdentity> FakeDevice::identityAt(DevicePlace place) {
   if (auto failure = begin(line("identityAt", nameOf(place)), Recorded::No)) {
     return *failure;
   }
   return identityOf(pathOf(place));
 }
 
-std::variant<std::unique_ptr<StagedFile>, Failure> FakeDevice::stage(DevicePlace place,
-                                                                     const NewFile& file) {
+OrFailure<std::unique_ptr<StagedFile>> FakeDevice::stage(DevicePlace place, const NewFile& file) {
   if (auto failure = begin(line("stage", nameOf(place)))) {
     return *failure;
   }
   std::string bytes;
-  if (auto failure = file.contents->giveTo([&](std::string_view piece) {
-        bytes.append(piece);
-        return true;
-      })) {
-    return *failure;
+  const Result given = file.contents->giveTo([&](std::string_view piece) {
+    bytes.append(piece);
+    return true;
+  });
+  if (!given) {
+    return given.error();
   }
   auto entry = make(EntryKind::RegularFile, std::move(bytes));
   entry->identity.mode = file.permissions;
@@ -191,8 +191,8 @@ std::variant<std::unique_ptr<StagedFile>, Failure> FakeDevice::stage(DevicePlace
   return std::make_unique<FakeStagedFile>(std::move(entry));
 }
 
-std::variant<std::unique_ptr<StagedFile>, Failure> FakeDevice::stageKept(
-    DevicePlace place, std::string_view keptPath) {
+OrFailure<std::unique_ptr<StagedFile>> FakeDevice::stageKept(DevicePlace place,
+                                                             std::string_view keptPath) {
   if (auto failure = begin(line("stageKept", keptPath, nameOf(place)))) {
     return *failure;
   }
@@ -246,22 +246,21 @@ PlaceOutcome FakeDevice::keep(DevicePlace place, std::string_view keptPath,
   return PlaceOutcome::done();
 }
 
-std::optional<Failure> FakeDevice::flush(DevicePlace place) {
-  return begin(line("flush", nameOf(place)));
+Result FakeDevice::flush(DevicePlace place) {
+  return resultOf(begin(line("flush", nameOf(place))));
 }
 
-std::optional<Failure> FakeDevice::makeInformationDirectory() {
+Result FakeDevice::makeInformationDirectory() {
   if (auto failure = begin("makeInformationDirectory")) {
-    return failure;
+    return *failure;
   }
   write(pathOf(DevicePlace::InformationDirectory), "", EntryKind::Directory);
-  return std::nullopt;
+  return {};
 }
 
-std::optional<Failure> FakeDevice::writeInformationFile(std::string_view name,
-                                                        const ReadableBytes& contents) {
+Result FakeDevice::writeInformationFile(std::string_view name, const ReadableBytes& contents) {
   if (auto failure = begin(line("writeInformationFile", name))) {
-    return failure;
+    return *failure;
   }
   std::string bytes;
   static_cast<void>(contents.giveTo([&](std::string_view piece) {
@@ -270,7 +269,7 @@ std::optional<Failure> FakeDevice::writeInformationFile(std::string_view name,
   }));
   write(pathOf(DevicePlace::InformationDirectory), "", EntryKind::Directory);
   write(pathOf(DevicePlace::InformationDirectory) + "/" + std::string(name), bytes);
-  return std::nullopt;
+  return {};
 }
 
 std::vector<std::string> FakeDevice::settleLeftovers() {

@@ -67,20 +67,18 @@ class FakeDevice final : public DevicePlaces, public FileKeeping {
   void removeFaults();
   [[nodiscard]] std::size_t operationCount() const { return operationCount_; }
 
-  std::variant<DeviceSnapshot, Failure> takeSnapshot() override;
-  std::variant<FileIdentity, Failure> identityAt(DevicePlace place) override;
-  std::variant<std::unique_ptr<StagedFile>, Failure> stage(DevicePlace place,
-                                                           const NewFile& file) override;
-  std::variant<std::unique_ptr<StagedFile>, Failure> stageKept(DevicePlace place,
-                                                               std::string_view keptPath) override;
+  OrFailure<DeviceSnapshot> takeSnapshot() override;
+  OrFailure<FileIdentity> identityAt(DevicePlace place) override;
+  OrFailure<std::unique_ptr<StagedFile>> stage(DevicePlace place, const NewFile& file) override;
+  OrFailure<std::unique_ptr<StagedFile>> stageKept(DevicePlace place,
+                                                   std::string_view keptPath) override;
   PlaceOutcome put(DevicePlace place, StagedFile& staged, const FileIdentity& expected) override;
   PlaceOutcome remove(DevicePlace place, const FileIdentity& expected) override;
   PlaceOutcome keep(DevicePlace place, std::string_view keptPath,
                     const FileIdentity& expected) override;
-  std::optional<Failure> flush(DevicePlace place) override;
-  std::optional<Failure> makeInformationDirectory() override;
-  std::optional<Failure> writeInformationFile(std::string_view name,
-                                              const ReadableBytes& contents) override;
+  Result flush(DevicePlace place) override;
+  Result makeInformationDirectory() override;
+  Result writeInformationFile(std::string_view name, const ReadableBytes& contents) override;
   std::vector<std::string> settleLeftovers() override;
 
   std::optional<EntryKind> kindOfEntry(std::string_view path) override;

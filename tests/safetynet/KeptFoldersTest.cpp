@@ -21,7 +21,7 @@ class KeptFoldersTest : public testing::Test {
     return std::string(kAccountMigrationDirectory) + "/" + std::string(name);
   }
   static FileIdentity identity(FakeDevice& device, DevicePlace place) {
-    return std::get<FileIdentity>(device.identityAt(place));
+    return device.identityAt(place).value();
   }
   static std::vector<PlaceToKeep> toKeep(FakeDevice& device) {
     return {{kSettings, identity(device, kSettings)}, {kMail, identity(device, kMail)}};

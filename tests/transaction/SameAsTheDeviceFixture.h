@@ -34,10 +34,10 @@ class SameAsTheDeviceTest : public DeviceFixture {
   }
   [[nodiscard]] std::string inMemory(const Operation& operation) {
     auto taken = LinuxDevicePlaces(root, files, std::string(kHome)).takeSnapshot();
-    if (const auto* failure = std::get_if<Failure>(&taken)) {
-      return "no snapshot: " + failure->text;
+    if (!taken) {
+      return "no snapshot: " + taken.error().text;
     }
-    Transaction transaction(std::get<DeviceSnapshot>(taken), kHome);
+    Transaction transaction(*taken, kHome);
     MobileAlone ownership;
     TransactionFileSystem memory(transaction, ownership, [](std::string_view path) {
       throw MetForeignPath{std::string(path)};

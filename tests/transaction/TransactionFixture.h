@@ -5,7 +5,6 @@
 #include <stdexcept>
 #include <string>
 #include <string_view>
-#include <variant>
 #include <vector>
 
 #include "propertylist/binary/BinaryPropertyListSerializer.h"
@@ -17,8 +16,7 @@ namespace accounts {
 /// Files can be given to user 501 and group 502, who are called "mobile".
 class MobileAlone final : public OwnershipRule {
  public:
-  std::variant<FileOwner, Failure> ownerNamed(std::string_view ownerName,
-                                              std::string_view groupName) override {
+  OrFailure<FileOwner> ownerNamed(std::string_view ownerName, std::string_view groupName) override {
     if (ownerName == "mobile" && groupName == "mobile") {
       return FileOwner{501, 502};
     }
