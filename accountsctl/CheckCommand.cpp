@@ -91,15 +91,15 @@ std::string objectLine(const CheckOptions& options, FileKind kind,
 CommandResult check(const CheckOptions& options, const Terminal& terminal,
                     const CommandWorker& worker) {
   const auto opened = DevicePlatform::open(platformOptions(options));
-  if (const auto* error = std::get_if<ProgramError>(&opened)) {
-    return *error;
+  if (!opened) {
+    return opened.error();
   }
-  DevicePlatform& platform = *std::get<std::unique_ptr<DevicePlatform>>(opened);
+  DevicePlatform& platform = **opened;
   const auto input = readPropertyListInputs({options.file}, worker);
-  if (const auto* error = std::get_if<ProgramError>(&input)) {
-    return *error;
+  if (!input) {
+    return input.error();
   }
-  const PropertyValue& content = std::get<std::vector<PropertyValue>>(input).front();
+  const PropertyValue& content = input->front();
   const FileKind kind = kindOf(content);
   const CheckedKind* checked = checkedKind(kind);
   if (checked == nullptr) {

@@ -2,7 +2,6 @@
 
 #include <optional>
 #include <string>
-#include <variant>
 
 #include "commandline/ExitStatus.h"
 
@@ -17,6 +16,6 @@ struct CommandReport {
   std::optional<std::string> file = {};
 };
 
-using CommandResult = std::variant<CommandReport, ProgramError>;
+using CommandResult = OrProgramError<CommandReport>;
 
 }  // namespace accounts

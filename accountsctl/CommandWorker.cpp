@@ -26,14 +26,11 @@ ProgramError temporaryFailure() {
 
 /// A result as a frame has it: whether it is an error, the exit status, and the text.
 void send(const FileDescriptor& socket, const CommandResult& result) {
-  const auto* const error = std::get_if<ProgramError>(&result);
-  const auto* const report = std::get_if<CommandReport>(&result);
-  std::string bytes = {
-      static_cast<char>(error != nullptr),
-      static_cast<char>(error != nullptr ? error->exitStatus : report->exitStatus)};
-  bytes += error != nullptr ? error->message : report->text;
+  std::string bytes = {static_cast<char>(!result),
+                       static_cast<char>(result ? result->exitStatus : result.error().exitStatus)};
+  bytes += result ? result->text : result.error().message;
   // Without a reader there is nobody to tell.
-  if (report == nullptr || !report->file || sendFrame(socket, FrameKind::Page, *report->file)) {
+  if (!result || !result->file || sendFrame(socket, FrameKind::Page, *result->file)) {
     static_cast<void>(sendFrame(socket, FrameKind::ToldResult, bytes));
   }
 }

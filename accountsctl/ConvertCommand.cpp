@@ -12,14 +12,13 @@ namespace accounts {
 
 CommandResult convert(const ConvertOptions& options, const CommandWorker& worker) {
   const auto input = readPropertyListInputs({options.input}, worker);
-  if (const auto* error = std::get_if<ProgramError>(&input)) {
-    return *error;
+  if (!input) {
+    return input.error();
   }
   PropertyListError unwritable;
   auto* const write =
       options.form == PropertyListForm::XML ? &writeXMLPropertyList : &writeBinaryPropertyList;
-  std::optional<std::string> bytes =
-      write(std::get<std::vector<PropertyValue>>(input).front(), unwritable);
+  std::optional<std::string> bytes = write(input->front(), unwritable);
   if (!bytes) {
     return ProgramError{ExitStatus::MalformedInput, unwritable.text};
   }

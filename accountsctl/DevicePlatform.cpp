@@ -19,8 +19,7 @@ DevicePlatform::DevicePlatform(std::unique_ptr<LinuxPlatform> platform, std::str
       resources_(std::move(resources)),
       process_(platform_->platform()) {}
 
-std::variant<std::unique_ptr<DevicePlatform>, ProgramError> DevicePlatform::open(
-    LinuxPlatformOptions options) {
+OrProgramError<std::unique_ptr<DevicePlatform>> DevicePlatform::open(LinuxPlatformOptions options) {
   if (options.bundleResourcesDirectory.empty()) {
     options.bundleResourcesDirectory = resourcesOfBundle(bundleOfProgram()).string();
   }

@@ -3,7 +3,6 @@
 #include <memory>
 #include <optional>
 #include <string>
-#include <variant>
 
 #include "accountsettings/Process.h"
 #include "commandline/ExitStatus.h"
@@ -17,8 +16,7 @@ class DevicePlatform {
   /// On the device of the options' root. Options without a directory of resources have that of the
   /// bundle of the program. Reads what it will need of the bundle and of this machine. An error
   /// when the root, the device description or the resources are missing or unreadable.
-  static std::variant<std::unique_ptr<DevicePlatform>, ProgramError> open(
-      LinuxPlatformOptions options);
+  static OrProgramError<std::unique_ptr<DevicePlatform>> open(LinuxPlatformOptions options);
 
   /// Decodes what was read, before any use. An error when that cannot be done.
   std::optional<ProgramError> decode();

@@ -87,10 +87,10 @@ CommandReport jsonReport(const std::vector<ComparedPart>& parts, const DiffOptio
 CommandResult diff(const DiffOptions& options, const Terminal& terminal,
                    const CommandWorker& worker) {
   const auto inputs = readPropertyListInputs({options.before, options.after}, worker);
-  if (const auto* error = std::get_if<ProgramError>(&inputs)) {
-    return *error;
+  if (!inputs) {
+    return inputs.error();
   }
-  const auto& values = std::get<std::vector<PropertyValue>>(inputs);
+  const auto& values = *inputs;
   const PropertyValue& left = values[0];
   const PropertyValue& right = values[1];
   const FileKind kind = kindOf(left);

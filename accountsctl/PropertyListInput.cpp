@@ -9,7 +9,7 @@
 
 namespace accounts {
 
-std::variant<std::vector<PropertyValue>, ProgramError> readPropertyListInputs(
+OrProgramError<std::vector<PropertyValue>> readPropertyListInputs(
     const std::vector<std::string>& files, const CommandWorker& worker) {
   std::vector<std::string> contents;
   OpenInputs inputs;

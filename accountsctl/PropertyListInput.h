@@ -1,7 +1,6 @@
 #pragma once
 
 #include <string>
-#include <variant>
 #include <vector>
 
 #include "accountsctl/CommandWorker.h"
@@ -13,7 +12,7 @@ namespace accounts {
 /// The values of property-list files of this machine, pipes or standard input ("-"), in either
 /// format. An error when one is missing, unreadable, too large (kLargestFileSize) or malformed.
 /// The worker gives up its rights once all are read.
-std::variant<std::vector<PropertyValue>, ProgramError> readPropertyListInputs(
+OrProgramError<std::vector<PropertyValue>> readPropertyListInputs(
     const std::vector<std::string>& files, const CommandWorker& worker);
 
 }  // namespace accounts

@@ -76,23 +76,22 @@ Rehearsed rehearseFile(DevicePlatform& device, FileKind kind, const PropertyValu
   const DevicePlace place = placeOf(kind);
   Rehearsed rehearsed =
       rehearse(linux, snapshotOf(place, *std::move(bytes), linux.platform().homeDirectory.path()));
-  if (auto* ledger = std::get_if<AccountLedger>(&rehearsed)) {
-    ledger->paths[indexOf(place)] = name;
+  if (rehearsed) {
+    rehearsed->paths[indexOf(place)] = name;
   }
   return rehearsed;
 }
 
 JSON ledgerObject(const Rehearsed& rehearsed) {
-  const auto* ledger = std::get_if<AccountLedger>(&rehearsed);
-  return ledger != nullptr ? ledgerObject(*ledger, LedgerDetail::LossesAlone) : JSON(nullptr);
+  return rehearsed ? ledgerObject(*rehearsed, LedgerDetail::LossesAlone) : JSON(nullptr);
 }
 
 std::string linesOf(const Rehearsed& rehearsed) {
-  if (const auto* error = std::get_if<ProgramError>(&rehearsed)) {
-    return "A migration would fail: " + escapedText(error->message) + "\n";
+  if (!rehearsed) {
+    return "A migration would fail: " + escapedText(rehearsed.error().message) + "\n";
   }
   std::string lines;
-  for (const std::string& loss : std::get<AccountLedger>(rehearsed).losses()) {
+  for (const std::string& loss : rehearsed->losses()) {
     lines += "Not carried over: " + escapedText(loss) + "\n";
   }
   return lines;

@@ -1,7 +1,6 @@
 #pragma once
 
 #include <string>
-#include <variant>
 
 #include "accountsctl/DevicePlatform.h"
 #include "inspection/PropertyListJSON.h"
@@ -13,7 +12,7 @@ namespace accounts {
 
 /// The ledger of a migration that was made in memory, as a run makes it, and of which nothing is
 /// written; or why a run would fail.
-using Rehearsed = std::variant<AccountLedger, ProgramError>;
+using Rehearsed = OrProgramError<AccountLedger>;
 
 /// Rehearses the migration of a device.
 Rehearsed rehearse(LinuxPlatform& linux, const DeviceSnapshot& snapshot);

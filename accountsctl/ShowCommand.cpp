@@ -31,10 +31,10 @@ CommandResult shownXML(const PropertyValue& content) {
 CommandResult show(const ShowOptions& options, const Terminal& terminal,
                    const CommandWorker& worker) {
   const auto input = readPropertyListInputs({options.file}, worker);
-  if (const auto* error = std::get_if<ProgramError>(&input)) {
-    return *error;
+  if (!input) {
+    return input.error();
   }
-  const PropertyValue& value = std::get<std::vector<PropertyValue>>(input).front();
+  const PropertyValue& value = input->front();
   const PropertyValue content = options.secrets == Secrets::Hide ? withSecretsHidden(value) : value;
   switch (options.form) {
     case ShownForm::Tables:

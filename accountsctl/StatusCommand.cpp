@@ -120,10 +120,10 @@ std::string objectLine(const StatusOptions& options, const DeviceStatus& status,
 CommandResult status(const StatusOptions& options, const Terminal& terminal,
                      const CommandWorker& worker) {
   const auto opened = DevicePlatform::open(platformOptions(options));
-  if (const auto* error = std::get_if<ProgramError>(&opened)) {
-    return *error;
+  if (!opened) {
+    return opened.error();
   }
-  DevicePlatform& device = *std::get<std::unique_ptr<DevicePlatform>>(opened);
+  DevicePlatform& device = **opened;
   LinuxPlatform& linux = device.linuxPlatform();
   if (const auto missing = whyNoDevice(linux.root(), options.root)) {
     return *missing;
@@ -144,10 +144,9 @@ CommandResult status(const StatusOptions& options, const Terminal& terminal,
       options.failsIfPending && found.isPending() ? ExitStatus::Attention : ExitStatus::Success;
   const Rehearsed rehearsed = rehearse(linux, snapshot);
   // What this machine lacks or its medium does not give says nothing of the device.
-  const auto* const error = std::get_if<ProgramError>(&rehearsed);
-  if (error != nullptr && (error->exitStatus == ExitStatus::TemporaryFailure ||
-                           error->exitStatus == ExitStatus::InputOutputError)) {
-    return *error;
+  if (!rehearsed && (rehearsed.error().exitStatus == ExitStatus::TemporaryFailure ||
+                     rehearsed.error().exitStatus == ExitStatus::InputOutputError)) {
+    return rehearsed.error();
   }
   return CommandReport{options.reportsJSON ? objectLine(options, found, rehearsed, exitStatus)
                                            : textOf(found, rehearsed, terminal),

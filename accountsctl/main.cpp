@@ -91,12 +91,11 @@ CommandResult resultOf(const CommandLine& commandLine) {
     }
     CommandResult result =
         std::visit([](const auto& asked) { return runCommand(asked); }, commandLine.asked);
-    const auto* const report = std::get_if<CommandReport>(&result);
     const std::string* const output = outputFileOf(commandLine);
-    if (report == nullptr || !report->file || output == nullptr) {
+    if (!result || !result->file || output == nullptr) {
       return result;
     }
-    auto error = replaceFile(*output, *report->file);
+    auto error = replaceFile(*output, *result->file);
     return error ? CommandResult(*std::move(error)) : result;
   } catch (const std::bad_alloc&) {
     return outOfMemory();
@@ -105,14 +104,14 @@ CommandResult resultOf(const CommandLine& commandLine) {
 
 ExitStatus run(const CommandLine& commandLine) {
   const CommandResult result = resultOf(commandLine);
-  if (const auto* error = std::get_if<ProgramError>(&result)) {
-    printError(kProgramName, error->message);
-    return commandLine.wantsJSON ? printResult(kProgramName, errorObject(commandLine, *error),
-                                               error->exitStatus, ReaderThatLeft::HasSeenEnough)
-                                 : error->exitStatus;
+  if (!result) {
+    printError(kProgramName, result.error().message);
+    return commandLine.wantsJSON
+               ? printResult(kProgramName, errorObject(commandLine, result.error()),
+                             result.error().exitStatus, ReaderThatLeft::HasSeenEnough)
+               : result.error().exitStatus;
   }
-  const auto& report = std::get<CommandReport>(result);
-  return printResult(kProgramName, report.text, report.exitStatus, ReaderThatLeft::HasSeenEnough);
+  return printResult(kProgramName, result->text, result->exitStatus, ReaderThatLeft::HasSeenEnough);
 }
 
 }  // namespace

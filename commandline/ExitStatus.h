@@ -4,7 +4,7 @@
 
 #include <string>
 
-#include "platform/Failure.h"
+#include "platform/Result.h"
 
 namespace accounts {
 
@@ -55,5 +55,9 @@ struct ProgramError {
   /// One line for a person, without a full stop.
   std::string message;
 };
+
+/// What a part of a program that can fail gives back.
+template <class Value>
+using OrProgramError = OrError<Value, ProgramError>;
 
 }  // namespace accounts

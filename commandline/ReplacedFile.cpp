@@ -7,7 +7,6 @@
 #include <cerrno>
 #include <filesystem>
 #include <system_error>
-#include <variant>
 
 #include "commandline/PlatformError.h"
 #include "platform/linux/DeviceRoot.h"
@@ -95,8 +94,7 @@ struct Replacement {
   struct stat replaced = {};
 };
 
-std::variant<Replacement, ProgramError> makeReplacement(const std::string& path,
-                                                        const struct stat& replaced) {
+OrProgramError<Replacement> makeReplacement(const std::string& path, const struct stat& replaced) {
   std::error_code unresolved;
   std::string target = resolved(path, replaced.st_mode != 0, unresolved);
   if (unresolved) {
@@ -126,11 +124,11 @@ std::optional<ProgramError> replaceFile(const std::string& path, std::string_vie
   if (S_ISFIFO(status.st_mode)) {
     return writeToPipe(path, contents);
   }
-  const std::variant<Replacement, ProgramError> made = makeReplacement(path, status);
-  if (const auto* error = std::get_if<ProgramError>(&made)) {
-    return *error;
+  const auto made = makeReplacement(path, status);
+  if (!made) {
+    return made.error();
   }
-  const auto& [machine, temporary, directory, target, replaced] = std::get<Replacement>(made);
+  const auto& [machine, temporary, directory, target, replaced] = *made;
   const int number = fill(temporary.file, contents, replaced);
   const Result moved =
       number != 0 ? pathFailure("write", path, number)
@@ -154,11 +152,11 @@ std::optional<ProgramError> whyNotReplaceable(const std::string& path) {
                ? std::nullopt
                : std::optional(cannotCreate(pathFailure("write", path, errno)));
   }
-  const std::variant<Replacement, ProgramError> made = makeReplacement(path, status);
-  if (const auto* error = std::get_if<ProgramError>(&made)) {
-    return *error;
+  const auto made = makeReplacement(path, status);
+  if (!made) {
+    return made.error();
   }
-  (void)std::get<Replacement>(made).temporary.entry.remove();
+  (void)made->temporary.entry.remove();
   return std::nullopt;
 }
 

@@ -4,17 +4,16 @@
 
 namespace accounts {
 
-std::variant<OpenedDevice, ProgramError> openDevice(const DeviceOptions& options) {
-  std::variant<PluginBundle, ProgramError> bundle = PluginBundle::find(options.plugin);
-  if (const auto* error = std::get_if<ProgramError>(&bundle)) {
-    return *error;
+OrProgramError<OpenedDevice> openDevice(const DeviceOptions& options) {
+  auto bundle = PluginBundle::find(options.plugin);
+  if (!bundle) {
+    return bundle.error();
   }
-  auto& found = std::get<PluginBundle>(bundle);
   LinuxPlatformOptions wanted;
   wanted.rootDirectory = options.root;
   wanted.homeDirectory = options.home.value_or(wanted.homeDirectory);
   wanted.temporaryDirectory = options.temporaryDirectory;
-  wanted.bundleResourcesDirectory = found.resourcesDirectory().string();
+  wanted.bundleResourcesDirectory = bundle->resourcesDirectory().string();
   wanted.deviceDescriptionFile = options.deviceDescription;
   wanted.channel = options.channel;
   wanted.descriptionDecoding = DescriptionDecoding::Later;
@@ -26,7 +25,7 @@ std::variant<OpenedDevice, ProgramError> openDevice(const DeviceOptions& options
   if (const auto missing = whyNoDevice(platform->root(), options.root)) {
     return *missing;
   }
-  return OpenedDevice{std::move(found), std::move(platform)};
+  return OpenedDevice{*std::move(bundle), std::move(platform)};
 }
 
 }  // namespace accounts

@@ -4,7 +4,6 @@
 #include <memory>
 #include <optional>
 #include <string>
-#include <variant>
 
 #include "commandline/ExitStatus.h"
 #include "host/PluginBundle.h"
@@ -39,6 +38,6 @@ struct OpenedDevice {
 
 /// Finds the bundle and makes the platform. That changes nothing beneath the root, and looks into
 /// no file: whoever is to use the platform decodes the device description.
-std::variant<OpenedDevice, ProgramError> openDevice(const DeviceOptions& options);
+OrProgramError<OpenedDevice> openDevice(const DeviceOptions& options);
 
 }  // namespace accounts

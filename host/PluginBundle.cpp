@@ -34,8 +34,7 @@ std::filesystem::path PluginBundle::plugin() const {
   return path_ / kPluginName;
 }
 
-std::variant<PluginBundle, ProgramError> PluginBundle::find(
-    const std::optional<std::filesystem::path>& path) {
+OrProgramError<PluginBundle> PluginBundle::find(const std::optional<std::filesystem::path>& path) {
   // Absolute, because dlopen would search its own directories for a bare file name.
   std::error_code error;
   PluginBundle bundle(std::filesystem::absolute(path ? *path : bundleOfProgram(), error));
@@ -48,7 +47,7 @@ std::variant<PluginBundle, ProgramError> PluginBundle::find(
   return bundle;
 }
 
-std::variant<LoadedPlugin, ProgramError> PluginBundle::load() const {
+OrProgramError<LoadedPlugin> PluginBundle::load() const {
   // Never closed: objects of the plug-in may live as long as the process.
   void* const library = dlopen(plugin().c_str(), RTLD_NOW | RTLD_LOCAL);
   if (library == nullptr) {
@@ -68,7 +67,7 @@ std::variant<LoadedPlugin, ProgramError> PluginBundle::load() const {
   return LoadedPlugin(*entryPoint);
 }
 
-std::variant<std::unique_ptr<MigrationPluginBase>, ProgramError> LoadedPlugin::makeInstance(
+OrProgramError<std::unique_ptr<MigrationPluginBase>> LoadedPlugin::makeInstance(
     Platform& platform) const {
   std::unique_ptr<MigrationPluginBase> instance(entryPoint_(platform));
   if (instance == nullptr) {

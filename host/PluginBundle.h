@@ -3,7 +3,6 @@
 #include <filesystem>
 #include <memory>
 #include <optional>
-#include <variant>
 
 #include "commandline/BundleLocation.h"
 #include "commandline/ExitStatus.h"
@@ -20,7 +19,7 @@ class LoadedPlugin {
 
   /// Makes one instance of its principal class. The platform must stay alive as long as the
   /// process. An error when it makes none.
-  [[nodiscard]] std::variant<std::unique_ptr<MigrationPluginBase>, ProgramError> makeInstance(
+  [[nodiscard]] OrProgramError<std::unique_ptr<MigrationPluginBase>> makeInstance(
       Platform& platform) const;
 
  private:
@@ -32,8 +31,7 @@ class PluginBundle {
  public:
   /// The bundle at a path, or that of the running program. Nothing is loaded yet. An error
   /// when there is no such directory or no plug-in in it.
-  static std::variant<PluginBundle, ProgramError> find(
-      const std::optional<std::filesystem::path>& path);
+  static OrProgramError<PluginBundle> find(const std::optional<std::filesystem::path>& path);
 
   [[nodiscard]] const std::filesystem::path& path() const { return path_; }
   [[nodiscard]] std::filesystem::path resourcesDirectory() const {
@@ -42,7 +40,7 @@ class PluginBundle {
 
   /// Loads the plug-in into this process, for good. An error when it cannot be loaded or has no
   /// entry point.
-  [[nodiscard]] std::variant<LoadedPlugin, ProgramError> load() const;
+  [[nodiscard]] OrProgramError<LoadedPlugin> load() const;
 
  private:
   explicit PluginBundle(std::filesystem::path path) : path_(std::move(path)) {}

@@ -11,7 +11,6 @@
 #include <limits>
 #include <memory>
 #include <utility>
-#include <variant>
 
 #include "commandline/PlatformError.h"
 #include "commandline/WorkerEnd.h"
@@ -38,7 +37,7 @@ struct PluginOutcome {
   RecordedMigration recorded;
 };
 
-using Loaded = std::variant<LoadedPlugin, ProgramError>;
+using Loaded = OrProgramError<LoadedPlugin>;
 
 /// Makes an instance of the plug-in and lets it migrate.
 RunReport runPlugin(const LoadedPlugin& loaded, const Platform& platform, ToldFates& told) {
@@ -46,11 +45,11 @@ RunReport runPlugin(const LoadedPlugin& loaded, const Platform& platform, ToldFa
   Platform observed = platformWith(platform, {.migrationObserver = &told});
   RunReport report;
   auto made = loaded.makeInstance(observed);
-  if (const auto* error = std::get_if<ProgramError>(&made)) {
-    setError(report, *error);
+  if (!made) {
+    setError(report, made.error());
     return report;
   }
-  auto& plugin = std::get<std::unique_ptr<MigrationPluginBase>>(made);
+  auto& plugin = *made;
   report.dataClassName = plugin->dataClassName();
   report.result = plugin->performMigration();
   plugin.reset();
@@ -100,13 +99,13 @@ PluginOutcome failedOutcome(const ProgramError& error) {
 
 PluginOutcome runRecordedPlugin(const PluginWork& work, const Loaded& loaded,
                                 const Platform& platform, ToldFates& told) {
-  if (const auto* error = std::get_if<ProgramError>(&loaded)) {
-    return failedOutcome(*error);
+  if (!loaded) {
+    return failedOutcome(loaded.error());
   }
   if (LinuxPlatformError error; !work.device.platform->decodeDescription(error)) {
     return failedOutcome(programErrorOf(error));
   }
-  const auto& plugin = std::get<LoadedPlugin>(loaded);
+  const LoadedPlugin& plugin = *loaded;
   if (!work.options.recorded) {
     return {runPlugin(plugin, platform, told), {}};
   }
@@ -239,10 +238,9 @@ void workInMemory(const PluginWork& work, const WorkerSide& side, const DeviceSn
   work.leaveHost();
   LinuxPlatform& linux = *work.device.platform;
   // Whatever has to be opened is opened here.
-  Loaded loaded = work.device.bundle.load();
-  if (const Result read = linux.readAhead(); !read) {
-    loaded = programErrorOf(read.error(), ExitStatus::MissingInput);
-  }
+  const Result read = linux.readAhead();
+  const Loaded loaded =
+      read ? work.device.bundle.load() : programErrorOf(read.error(), ExitStatus::MissingInput);
   KernelOwnershipRule ownership(linux.root());
   ownership.readAhead(std::string(kSettingsFileOwner));
   giveUpRights(work, side);

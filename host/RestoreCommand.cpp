@@ -77,10 +77,10 @@ RestoreResult listFolders(const KeptFolders& folders, const RestoreOptions& opti
   std::vector<std::string> paths;
   if (options.folder) {
     auto chosen = chosenFolder(folders, options.folder);
-    if (auto* error = std::get_if<ProgramError>(&chosen)) {
-      return failed(std::move(*error));
+    if (!chosen) {
+      return failed(chosen.error());
     }
-    paths.push_back(std::get<std::string>(std::move(chosen)));
+    paths.push_back(*std::move(chosen));
   } else {
     paths = folders.keptFor(KeptFor::Migration);
     std::ranges::move(folders.keptFor(KeptFor::Restoration), std::back_inserter(paths));
@@ -94,11 +94,11 @@ RestoreResult listFolders(const KeptFolders& folders, const RestoreOptions& opti
 
 RestoreResult discardFolder(KeptFolders& folders, const RestoreOptions& options) {
   auto chosen = chosenFolder(folders, options.folder);
-  if (auto* error = std::get_if<ProgramError>(&chosen)) {
-    return failed(std::move(*error));
+  if (!chosen) {
+    return failed(chosen.error());
   }
   RestoreResult result;
-  std::string& folder = std::get<std::string>(chosen);
+  std::string& folder = *chosen;
   if (const Result discarded = folders.discard(folder); !discarded) {
     return failed({programErrorOf(discarded.error(), ExitStatus::InputOutputError).exitStatus,
                    "The folder cannot be removed and is still whole: " + discarded.error().text});

@@ -5,7 +5,6 @@
 #include <memory>
 #include <string>
 #include <utility>
-#include <variant>
 
 #include "commandline/MemoryReserve.h"
 #include "commandline/StandardStreams.h"
@@ -161,7 +160,7 @@ class OpenedRun {
     WorkerProcess teller([this](const WorkerSide& side, const DeviceSnapshot&,
                                 const WorkerTask&) { accounts::tellOfEndedWorker(work_, side); },
                          stop_, WorkerRights::GivenUp);
-    const bool isThere = std::holds_alternative<HandedOver>(teller.work({}, {}));
+    const bool isThere = teller.work({}, {}).has_value();
     return tell(options_, conclusion, isThere ? &teller : nullptr);
   }
 
@@ -181,11 +180,10 @@ class OpenedRun {
                          stop_, WorkerRights::ThoseOfTheHost);
     RunConclusion conclusion;
     const auto worked = worker.work({}, {});
-    if (const auto* error = std::get_if<ProgramError>(&worked)) {
-      conclusion = conclusionOf(*error);
+    if (!worked) {
+      conclusion = conclusionOf(worked.error());
     } else {
-      const auto& handedOver = std::get<HandedOver>(worked);
-      const auto proposal = proposalFrom(handedOver.proposal, handedOver.memoryFileSize);
+      const auto proposal = proposalFrom(worked->proposal, worked->memoryFileSize);
       conclusion.exitStatus = proposal ? proposal->status : ExitStatus::PluginEnded;
       if (options_.broadcastsOnDBus) {
         announce(worker.announcements(), conclusion);
@@ -223,11 +221,11 @@ ExitStatus runMigration(const RunOptions& options) {
     return tellAlone(withoutReports, conclusionOf(*error));
   }
   StopSignals stop;
-  const std::variant<OpenedDevice, ProgramError> opened = openDevice(options.device);
-  if (const auto* error = std::get_if<ProgramError>(&opened)) {
-    return tellAlone(options, conclusionOf(*error));
+  const auto opened = openDevice(options.device);
+  if (!opened) {
+    return tellAlone(options, conclusionOf(opened.error()));
   }
-  return OpenedRun(options, std::get<OpenedDevice>(opened), stop).run();
+  return OpenedRun(options, *opened, stop).run();
 }
 
 }  // namespace accounts

@@ -131,7 +131,7 @@ ProgramError WorkerProcess::describeEnd() {
   return WorkerEnd(kPlugin, limits_).withStatus(status);
 }
 
-std::variant<HandedOver, ProgramError> WorkerProcess::takeOver(std::string proposal) {
+OrProgramError<HandedOver> WorkerProcess::takeOver(std::string proposal) {
   // From here on nobody changes what the list speaks of.
   struct stat status = {};
   const int seals = F_SEAL_SHRINK | F_SEAL_GROW | F_SEAL_WRITE | F_SEAL_SEAL;
@@ -142,8 +142,8 @@ std::variant<HandedOver, ProgramError> WorkerProcess::takeOver(std::string propo
   return HandedOver{std::move(proposal), static_cast<std::uint64_t>(status.st_size)};
 }
 
-std::variant<HandedOver, ProgramError> WorkerProcess::work(const DeviceSnapshot& snapshot,
-                                                           const WorkerTask& task) {
+OrProgramError<HandedOver> WorkerProcess::work(const DeviceSnapshot& snapshot,
+                                               const WorkerTask& task) {
   if (auto error = start(snapshot, task)) {
     return *std::move(error);
   }

@@ -6,7 +6,6 @@
 #include <memory>
 #include <optional>
 #include <string>
-#include <variant>
 #include <vector>
 
 #include "commandline/WorkerChannel.h"
@@ -47,8 +46,7 @@ class WorkerProcess final : public Worker {
   /// Ends the process.
   ~WorkerProcess() override;
 
-  std::variant<HandedOver, ProgramError> work(const DeviceSnapshot& snapshot,
-                                              const WorkerTask& task) override;
+  OrProgramError<HandedOver> work(const DeviceSnapshot& snapshot, const WorkerTask& task) override;
   std::unique_ptr<ReadableBytes> contentsOf(const ProposedChange& change) override;
 
   /// Whether the process is gone, or never was.
@@ -67,7 +65,7 @@ class WorkerProcess final : public Worker {
   /// Waits for the worker's end and says how it ended.
   ProgramError describeEnd();
   /// Takes what the worker made. An error when others could still change it.
-  std::variant<HandedOver, ProgramError> takeOver(std::string proposal);
+  OrProgramError<HandedOver> takeOver(std::string proposal);
   void end();
 
   WorkerFunction function_;

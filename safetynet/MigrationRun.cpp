@@ -76,12 +76,10 @@ MigrationRun::Attempt MigrationRun::attempt(RunPurpose purpose, KeepFiles keep) 
   worker_.reset();
   worker_ = means_.makeWorker();
   const auto worked = worker_->work(snapshot, {.purpose = purpose, .lock = lock_, .keep = keep});
-  if (const auto* error = std::get_if<ProgramError>(&worked)) {
-    return fail(*error);
+  if (!worked) {
+    return fail(worked.error());
   }
-  const auto& handedOver = std::get<HandedOver>(worked);
-  const std::optional<Proposal> proposal =
-      proposalFrom(handedOver.proposal, handedOver.memoryFileSize);
+  const std::optional<Proposal> proposal = proposalFrom(worked->proposal, worked->memoryFileSize);
   if (!proposal) {
     return fail({ExitStatus::PluginEnded, "The migration handed over no usable list of changes"});
   }

@@ -7,7 +7,6 @@
 #include <optional>
 #include <string>
 #include <string_view>
-#include <variant>
 #include <vector>
 
 #include "commandline/ExitStatus.h"
@@ -49,8 +48,8 @@ class Worker {
   virtual ~Worker() = default;
 
   /// Migrates in memory and hands over. An error when it ended before it had, or could not begin.
-  virtual std::variant<HandedOver, ProgramError> work(const DeviceSnapshot& snapshot,
-                                                      const WorkerTask& task) = 0;
+  virtual OrProgramError<HandedOver> work(const DeviceSnapshot& snapshot,
+                                          const WorkerTask& task) = 0;
   /// The contents of a change, in the memory file.
   virtual std::unique_ptr<ReadableBytes> contentsOf(const ProposedChange& change) = 0;
 };

@@ -3,7 +3,6 @@
 #include <array>
 #include <memory>
 #include <utility>
-#include <variant>
 
 #include "safetynet/PlaceErrors.h"
 
@@ -170,8 +169,8 @@ class Restorer {
 
 }  // namespace
 
-std::variant<std::string, ProgramError> chosenFolder(const KeptFolders& folders,
-                                                     const std::optional<std::string>& asked) {
+OrProgramError<std::string> chosenFolder(const KeptFolders& folders,
+                                         const std::optional<std::string>& asked) {
   if (asked) {
     const std::string name = asked->substr(asked->rfind('/') + 1);
     const bool isElsewhere = *asked != name && *asked != KeptFolders::pathOf(name);
@@ -198,11 +197,11 @@ Restoration restoreKeptFiles(DevicePlaces& places, KeptFolders& folders, std::st
                              const std::optional<std::string>& folder, std::string_view time) {
   Restoration restoration;
   auto chosen = chosenFolder(folders, folder);
-  if (auto* error = std::get_if<ProgramError>(&chosen)) {
-    restoration.error = std::move(*error);
+  if (!chosen) {
+    restoration.error = chosen.error();
     return restoration;
   }
-  restoration.folder = std::get<std::string>(std::move(chosen));
+  restoration.folder = *std::move(chosen);
   restoration.error = Restorer(places, folders, home, restoration).run(time);
   if (restoration.error) {
     return restoration;

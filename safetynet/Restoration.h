@@ -26,8 +26,8 @@ struct Restoration {
 
 /// The folder that a name or a device path means, or the only one that was kept for a migration
 /// where none is given.
-std::variant<std::string, ProgramError> chosenFolder(const KeptFolders& folders,
-                                                     const std::optional<std::string>& asked);
+OrProgramError<std::string> chosenFolder(const KeptFolders& folders,
+                                         const std::optional<std::string>& asked);
 
 /// Brings the places of a device back to what a folder of kept files says stood there, and removes
 /// the folder. What is replaced or removed is itself kept first. A commit record and a removal

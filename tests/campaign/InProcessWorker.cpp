@@ -75,8 +75,8 @@ std::optional<Frame> frameIn(std::string_view sent) {
 
 }  // namespace
 
-std::variant<HandedOver, ProgramError> InProcessWorker::work(const DeviceSnapshot& snapshot,
-                                                             const WorkerTask& task) {
+OrProgramError<HandedOver> InProcessWorker::work(const DeviceSnapshot& snapshot,
+                                                 const WorkerTask& task) {
   ++handover_.attempts;
   try {
     return handOver(migrate(snapshot, task));
@@ -118,7 +118,7 @@ Proposal InProcessWorker::migrate(const DeviceSnapshot& snapshot, const WorkerTa
       .value();
 }
 
-std::variant<HandedOver, ProgramError> InProcessWorker::handOver(const Proposal& proposal) {
+OrProgramError<HandedOver> InProcessWorker::handOver(const Proposal& proposal) {
   const std::string list = bytesOf(proposal);
   const AllocationsSucceed whileObserving;
   handover_.memoryFileSize = memoryFile_.size();
@@ -138,9 +138,7 @@ std::variant<HandedOver, ProgramError> InProcessWorker::handOver(const Proposal&
       }
       const std::optional<Frame> frame =
           frameIn(frameOf(list).substr(0, bytes - memoryFile_.size()));
-      return frame ? std::variant<HandedOver, ProgramError>(
-                         HandedOver{frame->bytes, memoryFile_.size()})
-                   : ended();
+      return frame ? OrProgramError<HandedOver>({frame->bytes, memoryFile_.size()}) : ended();
     }
     case Handover::Cut::ListIsShort:
       return HandedOver{list.substr(0, bytes), memoryFile_.size()};

@@ -4,7 +4,6 @@
 #include <memory>
 #include <optional>
 #include <string>
-#include <variant>
 #include <vector>
 
 #include "host/KernelOwnershipRule.h"
@@ -53,13 +52,12 @@ class InProcessWorker final : public Worker {
   InProcessWorker(DeviceProcess& device, Handover& handover)
       : device_(device), handover_(handover) {}
 
-  std::variant<HandedOver, ProgramError> work(const DeviceSnapshot& snapshot,
-                                              const WorkerTask& task) override;
+  OrProgramError<HandedOver> work(const DeviceSnapshot& snapshot, const WorkerTask& task) override;
   std::unique_ptr<ReadableBytes> contentsOf(const ProposedChange& change) override;
 
  private:
   [[nodiscard]] Proposal migrate(const DeviceSnapshot& snapshot, const WorkerTask& task);
-  std::variant<HandedOver, ProgramError> handOver(const Proposal& proposal);
+  OrProgramError<HandedOver> handOver(const Proposal& proposal);
 
   DeviceProcess& device_;
   Handover& handover_;

@@ -127,7 +127,7 @@ TEST_F(MigrationRunTest, ADeviceOfWhichNoSnapshotCanBeTakenIsAnError) {
 }
 
 TEST_F(MigrationRunTest, AWorkerThatEndsEarlyChangesNothing) {
-  useWorker([](const WorkerTask&) -> std::variant<HandedOver, ProgramError> {
+  useWorker([](const WorkerTask&) -> OrProgramError<HandedOver> {
     return ProgramError{ExitStatus::PluginEnded, "The plug-in ended"};
   });
   const auto before = device.contents();

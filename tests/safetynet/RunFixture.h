@@ -7,7 +7,6 @@
 #include <memory>
 #include <string>
 #include <utility>
-#include <variant>
 #include <vector>
 
 #include "safetynet/MigrationRun.h"
@@ -50,8 +49,7 @@ class FakeHostLocks final : public HostLocks {
 /// conversion of accounts without identifiers does, and removes the store.
 class FakeWorker final : public Worker {
  public:
-  std::variant<HandedOver, ProgramError> work(const DeviceSnapshot& snapshot,
-                                              const WorkerTask& task) override {
+  OrProgramError<HandedOver> work(const DeviceSnapshot& snapshot, const WorkerTask& task) override {
     MigrationInMemory migration(snapshot, "/var/mobile");
     if (task.purpose != RunPurpose::FinishingAlone) {
       runPlugin(migration.transaction());
@@ -96,11 +94,11 @@ class FakeWorker final : public Worker {
 /// A worker that does what a test says.
 class ScriptedWorker final : public Worker {
  public:
-  using Work = std::function<std::variant<HandedOver, ProgramError>(const WorkerTask& task)>;
+  using Work = std::function<OrProgramError<HandedOver>(const WorkerTask& task)>;
   explicit ScriptedWorker(Work work) : work_(std::move(work)) {}
 
-  std::variant<HandedOver, ProgramError> work(const DeviceSnapshot& /*snapshot*/,
-                                              const WorkerTask& task) override {
+  OrProgramError<HandedOver> work(const DeviceSnapshot& /*snapshot*/,
+                                  const WorkerTask& task) override {
     return work_(task);
   }
   std::unique_ptr<ReadableBytes> contentsOf(const ProposedChange& /*change*/) override {

@@ -70,8 +70,7 @@ class InMemory final : public Worker {
   InMemory(const SmallDevice& device, unsigned turn, EndingOfRun& ending)
       : services_(device, turn), ending_(ending) {}
 
-  std::variant<HandedOver, ProgramError> work(const DeviceSnapshot& snapshot,
-                                              const WorkerTask& task) override {
+  OrProgramError<HandedOver> work(const DeviceSnapshot& snapshot, const WorkerTask& task) override {
     MigrationInMemory migration(snapshot, "/var/mobile");
     AnyOwner owners;
     TransactionFileSystem files(migration.transaction(), owners, [](std::string_view path) {
