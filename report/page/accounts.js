@@ -34,22 +34,35 @@ function shortName(dataclass) {
   return String(dataclass).split(".").pop();
 }
 
-/** The dataclasses as a line of names; those that are not enabled are dim, changed ones are marked. */
+/** What a dataclass is, next to the partner's: "added", "removed", "changed" or null. */
+function markOfDataclass(dataclass, { partner, side }) {
+  if (partner === null) {
+    return null;
+  }
+  const other = (partner.content.dataclasses ?? []).find(({ name }) => name === dataclass.name);
+  if (other === undefined || (dataclass.enabled && !other.enabled)) {
+    return side === "before" ? "removed" : "added";
+  }
+  // What only the partner has enabled is said there.
+  return isSame(dataclass, other) || other.enabled !== dataclass.enabled ? null : "changed";
+}
+
+/** The dataclasses as a line of names; those that are not enabled are dim, those that differ are marked. */
 function dataclassLine(account) {
   const { dataclasses } = account.content;
   if (!dataclasses?.length) {
     return null;
   }
-  const others = new Map((account.partner?.content.dataclasses ?? []).map((each) => [each.name, each]));
   return make("span", { class: "dataclasses" }, dataclasses.map((each) => {
+    const mark = markOfDataclass(each, account);
     const state = [each.enabled ? "enabled" : "not enabled",
                    each.provisioned ? "provisioned" : "not provisioned"].join(", ");
-    const isChanged = account.partner !== null && !isSame(each, others.get(each.name));
     return make("span", {
-      class: `dataclass ${each.enabled ? "on" : "off"} ${isChanged ? "changed" : ""}`,
+      class: `dataclass ${each.enabled ? "on" : "off"} ${mark ?? ""}`,
       title: shown(`${each.name}: ${state}`),
-    }, marked(shown(shortName(each.name))),
-      make("span", { class: "unseen" }, ` (${state}${isChanged ? ", changed" : ""}) `));
+    }, mark === null ? null : make("span", { "aria-hidden": "true" }, `${kMarks[mark]} `),
+      marked(shown(shortName(each.name))),
+      make("span", { class: "unseen" }, ` (${state}${mark === null ? "" : `, ${mark}`}) `));
   }));
 }
 

@@ -52,16 +52,35 @@ TEST(AccountTreesTest, BothSidesListTheirAccountsWithWhatBecameOfThem) {
   EXPECT_EQ(noted["source"], "legacy Exchange store");
 }
 
-TEST(AccountTreesTest, AnAccountShowsItsDataclassesAndWhichOfThemChanged) {
-  const json noted = notedOnTrees(sampleReport(), R"js(
-    note("before", textsIn(accountOn("before", "Gmail 'Ada at Gmail'"), ".dataclass"));
-    note("after", textsIn(accountOn("after", "Gmail 'Ada at Gmail'"), ".dataclass"));
+TEST(AccountTreesTest, AnAccountShowsWhichDataclassesItGainedAndLost) {
+  const auto dataclass = [](const char* name, bool isEnabled, bool isProvisioned) {
+    return json{{"name", name}, {"enabled", isEnabled}, {"provisioned", isProvisioned}};
+  };
+  json before = standingAt("Accounts[0]", plainAccount("A", "IMAP 'Work'"));
+  json after = before;
+  before["dataclasses"] = {dataclass("d.Mail", true, true), dataclass("d.Calendars", false, true),
+                           dataclass("d.Notes", true, true), dataclass("d.Contacts", true, false)};
+  after["dataclasses"] = {dataclass("d.Mail", true, true), dataclass("d.Calendars", true, true),
+                          dataclass("d.Contacts", true, true), dataclass("d.Tasks", true, true)};
+
+  const json noted = notedOnTrees(
+      {{"accountsBefore", json::array({before})},
+       {"accountsAfter", json::array({after})},
+       {"ledger",
+        {{"accounts", json::array({fateOf("Accounts[0]", "changed", {"Accounts[0]"})})}}}},
+      R"js(
+    note("before", textsIn(one("#before .account"), ".dataclass"));
+    note("after", textsIn(one("#after .account"), ".dataclass"));
   )js");
 
-  EXPECT_EQ(noted["before"], json({"Mail (enabled, provisioned) ",
-                                   "Calendars (not enabled, provisioned, changed) "}));
+  EXPECT_EQ(noted["before"],
+            json({"Mail (enabled, provisioned) ", "Calendars (not enabled, provisioned) ",
+                  "− Notes (enabled, provisioned, removed) ",
+                  "≠ Contacts (enabled, not provisioned, changed) "}));
   EXPECT_EQ(noted["after"],
-            json({"Mail (enabled, provisioned) ", "Calendars (enabled, provisioned, changed) "}));
+            json({"Mail (enabled, provisioned) ", "+ Calendars (enabled, provisioned, added) ",
+                  "≠ Contacts (enabled, provisioned, changed) ",
+                  "+ Tasks (enabled, provisioned, added) "}));
 }
 
 TEST(AccountTreesTest, AnOpenAccountShowsItsPropertiesWithTheChangedOnesMarked) {
