@@ -34,12 +34,8 @@ function shortName(dataclass) {
   return String(dataclass).split(".").pop();
 }
 
-/** What a dataclass is, next to the partner's: "added", "removed", "changed" or null. */
-function markOfDataclass(dataclass, { partner, side }) {
-  if (partner === null) {
-    return null;
-  }
-  const other = (partner.content.dataclasses ?? []).find(({ name }) => name === dataclass.name);
+/** What a dataclass of a side is, next to the partner's of its name: "added", "removed", "changed" or null. */
+function markOfDataclass(dataclass, other, side) {
   if (other === undefined || (dataclass.enabled && !other.enabled)) {
     return side === "before" ? "removed" : "added";
   }
@@ -53,8 +49,9 @@ function dataclassLine(account) {
   if (!dataclasses?.length) {
     return null;
   }
+  const others = new Map((account.partner?.content.dataclasses ?? []).map((each) => [each.name, each]));
   return make("span", { class: "dataclasses" }, dataclasses.map((each) => {
-    const mark = markOfDataclass(each, account);
+    const mark = account.partner === null ? null : markOfDataclass(each, others.get(each.name), account.side);
     const state = [each.enabled ? "enabled" : "not enabled",
                    each.provisioned ? "provisioned" : "not provisioned"].join(", ");
     return make("span", {
