@@ -1,7 +1,7 @@
 # Makes the source file that holds the page of a report, for ReportPage.h.
 #   cmake -DPAGE=DIRECTORY -DOUTPUT=FILE -P EmbedPage.cmake
 # The scripts are put one after the other in this order; the last one starts the page.
-set(scripts values filter parts pairing accounts tree stages overview report)
+set(scripts values filter parts pairing accounts rows stages overview report)
 
 file(READ ${PAGE}/report.html page)
 file(READ ${PAGE}/report.css style)

@@ -1,13 +1,13 @@
-// How an account is shown: its title, what became of it, its dataclasses, its properties.
+// How a row is shown: its accounts with what became of them, their dataclasses and their properties.
 
 const kSources = { mailStore: "legacy mail store", exchangeStore: "legacy Exchange store" };
 
-/** Whether the filter shows an account for its own sake, and not for its children's. */
-function isChosen(account) {
-  const { marks } = account;
+/** Whether the filter shows a row for its own sake, and not for its children's. */
+function isChosen(row) {
+  const { marks, accounts } = row;
   return (!filter.changedOnly || marks.length > 0) &&
-    (filter.mark === null || (filter.mark === kUnchanged ? isUnchanged(account) : marks.includes(filter.mark))) &&
-    matches(account, () => textsOf(account));
+    (filter.mark === null || (filter.mark === kUnchanged ? isUnchanged(row) : marks.includes(filter.mark))) &&
+    matches(row, () => accounts.flatMap(textsOf));
 }
 
 /** What of an account a filter looks through: what is shown of it, its properties' paths included. */
@@ -22,12 +22,13 @@ function badge(mark, words = kMarkNames[mark] ?? mark) {
     make("span", { "aria-hidden": "true" }, `${kMarks[mark] ?? "•"} `), words);
 }
 
-/** A mark of an account, with what it was joined into or why it was not carried over. */
-function badgeOf(mark, { others, entry, side }) {
-  if (side === "before" && mark === "joined") {
-    return badge(mark, shown(`joined into ${others.map(({ title }) => title).join(", ")}`));
-  }
-  return side === "before" && mark === "lost" ? badge(mark, shown(`not carried over: ${entry.reason ?? ""}`)) : badge(mark);
+/** A mark of a row, with what its account was joined into or why it was not carried over. */
+function badgeOf(mark, { before }) {
+  const words = {
+    joined: () => `joined into ${before.others.map(({ title }) => title).join(", ")}`,
+    lost: () => `not carried over: ${before.entry.reason ?? ""}`,
+  }[mark];
+  return words === undefined ? badge(mark) : badge(mark, shown(words()));
 }
 
 function shortName(dataclass) {
@@ -63,49 +64,70 @@ function dataclassLine(account) {
   }));
 }
 
-function accountSummary(account) {
-  const source = kSources[account.content.source];
-  return [
-    make("span", { class: "line" }, data("strong", { class: "title" }, account.title),
-      source ? make("span", { class: "source" }, source) : null, account.marks.map((mark) => badgeOf(mark, account))),
-    dataclassLine(account),
-  ];
-}
-
-/** What an account has beside its properties, as a list of terms. */
-function accountFacts(account) {
-  const { content } = account;
-  const facts = [["Identifier", content.identifier], ["Type", content.type], ["Class", content.class],
-                 ["Place", content.place], ["Below", account.parent?.title]];
-  return make("dl", { class: "facts" }, facts.filter(([, value]) => value)
-    .map(([name, value]) => make("div", {}, make("dt", {}, name), data("dd", {}, value))));
-}
-
-/** The properties of an account; those that its partner has otherwise or not at all are marked. */
-function propertyRows(account) {
-  const other = account.partner?.properties;
-  const rows = [];
-  for (const [path, value] of account.properties) {
-    const isChanged = other !== undefined && !(other.has(path) && isSame(value, other.get(path)));
-    if (filter.changedOnly && other !== undefined && !isChanged) {
-      continue;
-    }
-    rows.push(make("tr", { class: isChanged ? `changed ${account.side}` : null },
-      data("th", { scope: "row" }, path),
-      make("td", {}, data(isChanged ? (account.side === "before" ? "del" : "ins") : "span",
-                          { class: `value ${typeof value}` }, describe(value)))));
+/** A row's account of one side, after with what became of it; a gap if there is neither. */
+function accountCell(row, side) {
+  const account = row[side];
+  const marks = side === "after" ? row.marks : [];
+  if (account === null && marks.length === 0) {
+    return make("span", { class: `cell ${side} gap` });
   }
-  return rows;
+  const source = kSources[account?.content.source];
+  const name = side === "before" ? "Before" : "After";
+  return make("span", { class: `cell ${side}` },
+    make("span", { class: "line" }, make("span", { class: "side unseen" }, `${name}: `),
+      account && data("strong", { class: "title" }, account.title),
+      source ? make("span", { class: "source" }, source) : null, marks.map((mark) => badgeOf(mark, row))),
+    account && dataclassLine(account));
 }
 
-function accountBody(account, page) {
-  const rows = propertyRows(account);
-  const otherSide = account.side === "before" ? "after" : "before";
-  return [
-    accountFacts(account),
-    rows.length === 0 ? null : make("table", { class: "properties" },
-      make("caption", { class: "unseen" }, "Properties"), make("tbody", {}, rows)),
-    account.partner === null ? null :
-      make("p", { class: "links" }, button(`Show it ${otherSide}`, () => page.reveal(account.partner))),
-  ];
+function rowSummary(row) {
+  return make("span", { class: "cells" }, accountCell(row, "before"), accountCell(row, "after"));
+}
+
+/** What is known of an account by the words for it: what it is, and the properties. */
+function valuesOf({ content, properties }) {
+  const facts = [["Identifier", content.identifier], ["Type", content.type], ["Class", content.class]];
+  return new Map([...facts.filter(([, value]) => value), ...properties]);
+}
+
+/** The values of a row's accounts; those that differ stand beside each other. */
+function valueTable({ before, after, accounts }) {
+  const values = accounts.map(valuesOf);
+  const paths = [...new Set(values.flatMap((each) => [...each.keys()]))];
+  const names = ["Property", before && "Before", after && "After"].filter((name) => name !== null);
+  const differs = (path) => !values.every((each) => each.has(path) && isSame(each.get(path), values[0].get(path)));
+  const shownPaths = accounts.length === 2 && filter.changedOnly ? paths.filter(differs) : paths;
+  return shownPaths.length === 0 ? null : makeTable("values", names, shownPaths.map((path) => {
+    const value = values[0].get(path);
+    const texts = values.map((each) => (each.has(path) ? describe(each.get(path)) : null));
+    return make("tr", {}, data("th", { scope: "row" }, path), differs(path) ? differenceCells(...texts) :
+      make("td", { colspan: values.length }, data("span", { class: `value ${typeof value}` }, texts[0])));
+  }));
+}
+
+/** Where a row's account stands on a side: its place and whose child it is. */
+function standingOf(account) {
+  return account?.content.place && [account.content.place, account.parent?.title];
+}
+
+function rowBody(row, page) {
+  return [placeLine(standingOf(row.before), standingOf(row.after)), valueTable(row),
+          links({ before: row.before ?? row.after.partner, after: row.after ?? row.before.partner }, page, row)];
+}
+
+/** Places before and after, each with the title of the account that it is below, as a line; none without any. */
+function placeLine(before, after) {
+  const [was, is] = [before, after].map((standing) =>
+    (standing ? standing.filter((each) => each).join(", below ") : null));
+  return was || is ? make("p", { class: "place" }, "Place: ",
+    data("span", {}, was && is && was !== is ? `${was} → ${is}` : is || was)) : null;
+}
+
+/** Ways to where an account stands before and after, which may be one row; none to the row that they are in. */
+function links({ before, after }, page, within = null) {
+  const ways = before?.row === after?.row ? [["Show it", after]] :
+    [["Show it before", before], ["Show it after", after]];
+  const buttons = ways.filter(([, account]) => account && account.row !== within)
+    .map(([words, account]) => button(words, () => page.reveal(account.row)));
+  return buttons.length > 0 ? make("p", { class: "links" }, buttons) : null;
 }

@@ -41,10 +41,11 @@ function versionWords({ before, after } = {}) {
 }
 
 /** How many accounts of the inputs have each mark, and how many of the result are new. */
-function countMarks({ allBefore, allAfter }) {
-  const counts = { unchanged: 0, added: allAfter.filter(({ marks }) => marks.includes("added")).length };
-  for (const account of allBefore) {
-    for (const mark of isUnchanged(account) ? [kUnchanged] : account.marks) {
+function countMarks({ allRows }) {
+  const counts = { unchanged: 0, added: 0 };
+  // What stands in a row of its own after was counted where it stands before.
+  for (const row of allRows.filter(({ before, marks }) => before !== null || marks.includes("added"))) {
+    for (const mark of isUnchanged(row) ? [kUnchanged] : row.marks) {
       counts[mark] = (counts[mark] ?? 0) + 1;
     }
   }

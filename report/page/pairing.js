@@ -1,4 +1,5 @@
-// The accounts before and after. What became of each is what the ledger of the migration says.
+// The accounts before and after, and the rows in which they stand beside each other. What became of each
+// is what the ledger of the migration says.
 
 /** One account of one side. */
 class Account {
@@ -8,20 +9,33 @@ class Account {
     this.parent = parent;
     this.title = content.title || content.identifier || "an account";
     this.valuesByPath = null;
+    this.row = null;
     this.children = (content.children ?? []).map((child) => new Account(child, side, this));
     // Before: the ledger's entry. What the account became, or was, on the other side; the first one
     // is what it is compared with.
     this.entry = null;
     this.others = [];
     this.partner = null;
-    this.marks = [];
-    this.part = null;
   }
 
   /** Its values by their paths, made when they are first asked for. */
   get properties() {
     this.valuesByPath ??= propertiesOf(this.content);
     return this.valuesByPath;
+  }
+}
+
+/** An account before and after, or one of the two beside a gap; and the rows of its children. */
+class Row {
+  constructor(before, after, parent) {
+    this.before = before;
+    this.after = after;
+    this.parent = parent;
+    this.part = null;
+    this.accounts = [before, after].filter((account) => account !== null);
+    this.accounts.forEach((account) => { account.row = this; });
+    this.marks = [];
+    this.children = rowsOf(before?.children ?? [], after?.children ?? [], this);
   }
 }
 
@@ -48,9 +62,9 @@ function propertiesOf(content) {
   return valuesByPath(properties);
 }
 
-/** The accounts of a side and their children, in one list. */
-function flattened(accounts) {
-  return accounts.flatMap((account) => [account, ...flattened(account.children)]);
+/** Accounts or rows and their children, in one list. */
+function flattened(items) {
+  return items.flatMap((item) => [item, ...flattened(item.children)]);
 }
 
 function hasSameProperties(one, other) {
@@ -91,28 +105,60 @@ function marksBefore(account) {
   return [isChanged ? "changed" : null, mark].filter((each) => each);
 }
 
-/** What an account of the result is new in. */
+/** What an account of the result is new in that stands beside a gap. */
 function marksAfter({ others, partner }) {
-  return others.length === 0 ? ["added"] : partner.marks.filter((each) => !["joined", "lost"].includes(each));
+  return others.length === 0 ? ["added"] : marksBefore(partner).filter((each) => !["joined", "lost"].includes(each));
+}
+
+/**
+ * The accounts of both sides, or of one parent, in rows: each beside what it was if that stands below the
+ * same parent, in the order before. What is alone after stands below the account that it follows there.
+ */
+function rowsOf(before, after, parent = null) {
+  const besideOf = (account) => {
+    const { partner } = account;
+    return partner?.partner === account && (partner.parent?.row ?? null) === parent ? partner : null;
+  };
+  const alone = new Map([[null, []]]);
+  let last = null;
+  for (const account of after) {
+    if (besideOf(account) === null) {
+      alone.get(last).push(account);
+    } else {
+      last = account;
+      alone.set(last, []);
+    }
+  }
+  const rowsAlone = (followed) => alone.get(followed).map((account) => new Row(null, account, parent));
+  const rows = rowsAlone(null);
+  for (const account of before) {
+    const other = besideOf(account);
+    rows.push(new Row(account, other, parent), ...(other === null ? [] : rowsAlone(other)));
+  }
+  return rows;
 }
 
 // What chips call the accounts without a mark.
 const kUnchanged = "unchanged";
 
-function isUnchanged({ marks, entry, partner }) {
-  return marks.length === 0 && (entry !== null || partner !== null);
+function isUnchanged({ marks, before, after }) {
+  return marks.length === 0 && (before?.entry ?? after?.partner ?? null) !== null;
 }
 
 /** Both sides of a report as accounts that know each other; without a ledger nobody knows. */
 function accountsOf(report) {
   const before = (report.accountsBefore ?? []).map((each) => new Account(each, "before", null));
   const after = (report.accountsAfter ?? []).map((each) => new Account(each, "after", null));
-  const sides = { before, after, allBefore: flattened(before), allAfter: flattened(after) };
+  const sides = { allBefore: flattened(before), allAfter: flattened(after) };
   sides.beforeByElement = byElement(sides.allBefore);
-  if (Array.isArray(report.ledger?.accounts)) {
+  const hasLedger = Array.isArray(report.ledger?.accounts);
+  if (hasLedger) {
     pairByLedger(report.ledger.accounts, sides);
-    sides.allBefore.forEach((account) => { account.marks = marksBefore(account); });
-    sides.allAfter.forEach((account) => { account.marks = marksAfter(account); });
+  }
+  sides.rows = rowsOf(before, after);
+  sides.allRows = flattened(sides.rows);
+  if (hasLedger) {
+    sides.allRows.forEach((row) => { row.marks = row.before ? marksBefore(row.before) : marksAfter(row.after); });
   }
   sides.withIdentifier = { before: new Map(), after: new Map() };
   for (const account of [...sides.allBefore, ...sides.allAfter]) {

@@ -73,7 +73,7 @@ function stageSummary(stage, longest) {
 
 /** A titled list within a step; none if there is nothing to list. */
 function titledList(title, items, makeItem, nameOf, attributes = {}) {
-  return items.length === 0 ? null : [make("h4", {}, title),
+  return items.length === 0 ? null : [make("h3", {}, title),
     fillList(make("ul", attributes), items, makeItem, nameOf)];
 }
 
@@ -87,7 +87,7 @@ function stageBody(stage, page) {
       (change) => makePart({ class: `change ${change.change}` }, changeSummary(change),
         () => changeBody(change, page), change),
       (change) => change.title ?? "an account", { class: "changes" }),
-    others.length === 0 ? null : [make("h4", {}, "Beside the accounts"), differenceTable(others)],
+    others.length === 0 ? null : [make("h3", {}, "Beside the accounts"), differenceTable(others)],
     titledList(counted(files.length, "file"), files, fileLine, (file) => file.path, { class: "files" }),
     titledList("Log", log, logLine, (line) => line.text, { class: "log" }),
   ].flat().filter((child) => child !== null);
@@ -109,29 +109,17 @@ function changeSummary(change) {
     change.identifier ? data("code", { class: "dim" }, change.identifier) : null);
 }
 
-/** Where an account stands: its place and whose child it is. */
+/** Where an account stands on a side: its place and whose child it is. */
 function standing(where, side, page) {
-  if (!where) {
-    return null;
-  }
-  const parent = where.parent;
-  const title = accountOn(side, parent, page.accounts)?.title ?? parent;
-  return parent ? `${where.place}, below ${title}` : `${where.place}`;
+  const parent = where?.parent;
+  return where?.place && [where.place, parent && (accountOn(side, parent, page.accounts)?.title ?? parent)];
 }
 
 function changeBody(change, page) {
-  const before = standing(change.before, "before", page);
-  const after = standing(change.after, "after", page);
-  const links = Object.entries(accountsOfChange(change, page.accounts))
-    .filter(([, account]) => account !== null)
-    .map(([side, account]) => [button(`Show it ${side}`, () => page.reveal(account)), " "]);
   return [
     change.properties?.length > 0 ? differenceTable(change.properties) : null,
-    before === null && after === null ? null : make("p", { class: "place" }, "Place: ",
-      before === after ? data("span", {}, after) :
-        [before === null ? null : data("del", {}, before), before && after ? " → " : null,
-         after === null ? null : data("ins", {}, after)]),
-    links.length > 0 ? make("p", { class: "links" }, links.flat()) : null,
+    placeLine(standing(change.before, "before", page), standing(change.after, "after", page)),
+    links(accountsOfChange(change, page.accounts), page),
   ];
 }
 
@@ -147,16 +135,21 @@ function differenceCell(tag, text, other) {
   return make("td", {}, make(tag, { class: "value", dir: "auto" }, children));
 }
 
+/** The cells of both sides of a changed value; a side that has none gives null. */
+function differenceCells(before, after) {
+  return [differenceCell("del", before, after), differenceCell("ins", after, before)];
+}
+
+function makeTable(kind, names, rows) {
+  return make("table", { class: kind },
+    make("thead", {}, make("tr", {}, names.map((name) => make("th", { scope: "col" }, name)))),
+    make("tbody", {}, rows));
+}
+
 /** Changed properties as a table: each with its value before and after. */
 function differenceTable(properties) {
   const text = (property, side) => (Object.hasOwn(property, side) ? describe(property[side]) : null);
-  return make("table", { class: "differences" },
-    make("thead", {}, make("tr", {}, ["Property", "Before", "After"].map((name) =>
-      make("th", { scope: "col" }, name)))),
-    make("tbody", {}, properties.map((property) => {
-      const before = text(property, "before");
-      const after = text(property, "after");
-      return make("tr", {}, data("th", { scope: "row" }, property.path ?? ""),
-        differenceCell("del", before, after), differenceCell("ins", after, before));
-    })));
+  return makeTable("differences", ["Property", "Before", "After"], properties.map((property) =>
+    make("tr", {}, data("th", { scope: "row" }, property.path ?? ""),
+      differenceCells(text(property, "before"), text(property, "after")))));
 }

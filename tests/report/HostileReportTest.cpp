@@ -111,18 +111,25 @@ TEST(HostileReportTest, UnseenCharactersAndHalvesOfCharactersAreShownAsWhatTheyA
 TEST(HostileReportTest, NamesThatObjectsHaveAnywayAreOrdinaryKeys) {
   const json properties = {
       {"__proto__", "P"}, {"constructor", "C"}, {"toString", 1}, {"hasOwn", 2}};
-  const json before = json::array({plainAccount("__proto__", "IMAP 'constructor'", properties)});
+  const json account =
+      standingAt("constructor", plainAccount("__proto__", "IMAP 'constructor'", properties));
 
-  const json noted = notedOn(pageOf({{"accountsBefore", before}, {"accountsAfter", before}}), R"js(
+  const json noted = notedOn(
+      pageOf({{"accountsBefore", json::array({account})},
+              {"accountsAfter", json::array({account})},
+              {"ledger",
+               {{"accounts", json::array({fateOf("constructor", "kept", {"constructor"})})}}}}),
+      R"js(
     one("#expand").click();
     await pause();
-    note("rows", all("#after .properties tr").map((each) => each.textContent));
+    note("rows", all(".account tbody tr").map((each) => each.textContent));
     note("badges", all(".account .badge").length);
     await enter("toString 2");
-    note("found", all("#before .account").length);
+    note("found", all(".account").length);
   )js");
 
-  EXPECT_EQ(noted["rows"], json({"__proto__P", "constructorC", "hasOwn2", "toString1"}));
+  EXPECT_EQ(noted["rows"], json({"Identifier__proto__", "TypeIMAP", "ClassIMAPAccount",
+                                 "__proto__P", "constructorC", "hasOwn2", "toString1"}));
   EXPECT_EQ(noted["badges"], 0);
   EXPECT_EQ(noted["found"], 1);
 }

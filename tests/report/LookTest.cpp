@@ -109,7 +109,7 @@ constexpr std::string_view kMeasure = R"js(
   note("scrolls", page.documentElement.scrollWidth > page.documentElement.clientWidth);
   note("sticksOut", all("main *").filter((each) => each.checkVisibility() && !each.closest(".unseen") &&
     each.getBoundingClientRect().right > view.innerWidth + 1).map((each) => each.outerHTML.slice(0, 80)));
-  const [before, after] = [one("#before"), one("#after")].map((each) => each.getBoundingClientRect());
+  const [before, after] = [one(".before"), one(".after")].map((each) => each.getBoundingClientRect());
   note("sideBySide", before.top === after.top && before.right <= after.left);
   note("belowOneAnother", before.bottom <= after.top && before.left === after.left);
 )js";
@@ -132,6 +132,19 @@ TEST(LookTest, OnADeskNothingSticksOutAndTheSidesStandBesideEachOther) {
   EXPECT_EQ(noted["scrolls"], false);
   EXPECT_EQ(noted["sticksOut"], json::array());
   EXPECT_EQ(noted["sideBySide"], true);
+}
+
+TEST(LookTest, ALongTitleIsCutAfterTwoLines) {
+  const json noted = notedOn(pageOf(reportWithLongNames()), R"js(
+    const longOnes = all(".title").filter((each) => each.textContent.startsWith("xxx"));
+    note("areCut", longOnes.map((each) => each.scrollHeight > each.clientHeight + 1));
+    note("lines", longOnes.map((each) =>
+      Math.round(each.getBoundingClientRect().height / parseFloat(view.getComputedStyle(each).lineHeight))));
+  )js",
+                             {.width = kPhone});
+
+  EXPECT_EQ(noted["areCut"], json({true, true}));
+  EXPECT_EQ(noted["lines"], json({2, 2}));
 }
 
 }  // namespace

@@ -90,6 +90,22 @@ TEST(StepsTest, AnOpenStepShowsEachChangedPropertyBeforeAndAfterAndWhatDiffersIn
   EXPECT_EQ(noted["coloursDiffer"], 3);
 }
 
+TEST(StepsTest, AStepThatAddedAnAccountShowsItAndLeadsToItsValues) {
+  const json noted = notedWithSteps(sampleReport(), R"js(
+    const step = await openStep("Convert the mail accounts");
+    note("amount", step.querySelector(".count").textContent);
+    note("added", textsIn(step, ".change > summary > .line > *"));
+    step.querySelector(".change button").click();
+    await pause();
+    note("values", textsIn(page.activeElement.closest(".account"), "tbody ins"));
+  )js");
+
+  EXPECT_EQ(noted["amount"], "1 account");
+  EXPECT_EQ(noted["added"],
+            json({"+ added", "IMAP 'Family'", "7F1C2E90-5A4B-4C0D-9E21-0A6B5C4D3E05"}));
+  EXPECT_THAT(noted["values"].get<std::vector<std::string>>(), testing::Contains("Family"));
+}
+
 TEST(StepsTest, AnotherKindOfValueIsToldFromTheSameText) {
   const json noted = notedWithSteps(sampleReport(), R"js(
     note("port", textsIn(await openStep("Upgrade from version 5"), ".change td"));
