@@ -28,6 +28,7 @@ constexpr std::pair<std::string_view, ListedImages> kLists[] = {{"retry", {Remed
                                                                 {"losses", {Remedy::Losses}},
                                                                 {"migrated", {Remedy::None}},
                                                                 {"missing", {std::nullopt}}};
+constexpr const char* kListNames = "retry, attention, losses, migrated or missing";
 
 std::optional<ListedImages> listNamed(std::string_view name) {
   for (const auto& [known, images] : kLists) {
@@ -57,7 +58,7 @@ std::string requireCount(const std::string& value) {
 }
 
 std::string requireList(const std::string& value) {
-  return listNamed(value) ? "" : "must be retry, attention, migrated or missing";
+  return listNamed(value) ? "" : std::string("must be ") + kListNames;
 }
 
 /// What is said of names of which only one may be standard input; none when it is said of none.
@@ -244,9 +245,10 @@ void addSummarize(CLI::App& command, Arguments& arguments) {
   CLI::Option* list =
       command
           .add_option("--list", arguments.list,
-                      "Write only the roots of the images to retry, that need attention, that are\n"
-                      "migrated, or that --roots names and no result: WHICH is retry, attention,\n"
-                      "migrated or missing")
+                      std::string("Write only the roots of the images to retry, that need "
+                                  "attention, that are\nmigrated but not with everything, that "
+                                  "are migrated, or that --roots names\nand no result: WHICH is ") +
+                          kListNames)
           ->option_text("WHICH")
           ->check(requireList)
           ->excludes(html);

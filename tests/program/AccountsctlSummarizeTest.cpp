@@ -185,7 +185,10 @@ TEST_F(AccountsctlSummarize, AMissingFileIsMissingInput) {
 TEST_F(AccountsctlSummarize, UnusableArgumentsAreRefused) {
   expectRefused(run({"summarize"}), kUnusableArguments, "FILE");
   expectRefused(run({"summarize", "a", "--list", "all"}), kUnusableArguments,
-                "must be retry, attention, migrated or missing");
+                "must be retry, attention, losses, migrated or missing");
+  const std::string help = run({"summarize", "--help"}).output;
+  EXPECT_NE(help.find("WHICH is retry, attention, losses, migrated or missing"), std::string::npos)
+      << help;
   expectRefused(run({"summarize", "a", "--null"}), kUnusableArguments, "--list");
   expectRefused(run({"summarize", "a", "--expected", "-1"}), kUnusableArguments, "--expected");
 }

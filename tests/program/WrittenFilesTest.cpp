@@ -36,6 +36,10 @@ class WrittenFiles : public NamedFiles {
              [this](const std::string& file) {
                return host("run", {"--html", file});
              }},
+            {"summarize --html", "<!",
+             [this](const std::string& file) {
+               return tool({"summarize", "--html", file, "/dev/null"});
+             }},
             {"convert", "<?xml", [this](const std::string& file) {
                return tool({"convert", "--to", "xml", "--", "settings.plist", file});
              }}};
@@ -168,6 +172,10 @@ TEST_F(WrittenFiles, ReplaceTheSummaryOnStandardOutputNowhere) {
           << result.errors;
     }
   }
+  const ProgramResult page = tool({"summarize", "--html", "-", "/dev/null"});
+  EXPECT_EQ(page.exitStatus, kUnusableArguments);
+  EXPECT_NE(page.errors.find("standard output carries the summary"), std::string::npos)
+      << page.errors;
   EXPECT_EQ(filesHere(), std::vector<std::string>{"settings.plist"});
   EXPECT_EQ(readDictionary(kSettingsPath), accountSettings(11));
 }
