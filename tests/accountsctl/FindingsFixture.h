@@ -10,7 +10,7 @@
 #include "accountsctl/LegacyFindings.h"
 #include "accountsctl/SettingsFindings.h"
 #include "tests/fakes/FakePlatform.h"
-#include "tests/inspection/SettingsFiles.h"
+#include "tests/fakes/StoreContents.h"
 
 namespace accounts {
 

@@ -2,7 +2,7 @@
 
 #include "accountsctl/ShowCommand.h"
 #include "inspection/StoreLayout.h"
-#include "tests/inspection/SettingsFiles.h"
+#include "tests/fakes/StoreContents.h"
 
 namespace accounts {
 namespace {

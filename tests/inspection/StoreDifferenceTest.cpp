@@ -4,7 +4,7 @@
 
 #include "inspection/DifferenceJSON.h"
 #include "inspection/DifferenceText.h"
-#include "tests/inspection/SettingsFiles.h"
+#include "tests/fakes/StoreContents.h"
 
 namespace accounts {
 namespace {

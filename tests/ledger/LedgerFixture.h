@@ -15,6 +15,7 @@
 #include "safetynet/MigrationInMemory.h"
 #include "tests/fakes/FakePlatform.h"
 #include "tests/fakes/FakeSnapshot.h"
+#include "tests/fakes/StoreContents.h"
 #include "transaction/TransactionPlatform.h"
 #include "vocabulary/AccountClasses.h"
 #include "vocabulary/AccountVocabulary.h"
@@ -142,47 +143,5 @@ class MigratedInMemory {
   AnyOwner owners_;
   std::optional<MigrationInMemory> migration_;
 };
-
-// Contents of files, in a few words.
-
-inline PropertyDictionary anAccount(std::string_view identifier, std::string_view type,
-                                    std::string_view accountClass) {
-  return {{kAccountIdentifier, identifier},
-          {kAccountType, type},
-          {kAccountClass, accountClass},
-          {"Hostname", std::string(identifier) + ".example"}};
-}
-inline PropertyDictionary with(PropertyDictionary account, std::string_view key,
-                               PropertyValue value) {
-  account.set(key, std::move(value));
-  return account;
-}
-inline PropertyDictionary without(PropertyDictionary account, std::string_view key) {
-  account.remove(key);
-  return account;
-}
-inline PropertyDictionary settings(int version, std::vector<PropertyValue> accounts) {
-  return {{kPlistVersionKey, version}, {kPlistAccountsKey, PropertyArray(std::move(accounts))}};
-}
-inline PropertyDictionary mailDescription(std::string_view identifier,
-                                          std::string_view accountClass) {
-  return {{kLegacyMailIdentifier, identifier},
-          {kLegacyMailClass, accountClass},
-          {kLegacyMailDisplayName, std::string("Name of ") + std::string(identifier)},
-          {"Password", std::string("of ") + std::string(identifier)}};
-}
-inline PropertyDictionary exchangeDescription(std::string_view identifier) {
-  return {{kLegacyExchangeIdentifier, identifier},
-          {kLegacyExchangeClass, "ASAccount"},
-          {"Password", std::string("of ") + std::string(identifier)}};
-}
-inline PropertyDictionary mailStore(std::vector<PropertyValue> incoming,
-                                    std::vector<PropertyValue> outgoing = {}) {
-  return {{kLegacyIncomingAccounts, PropertyArray(std::move(incoming))},
-          {kLegacyOutgoingAccounts, PropertyArray(std::move(outgoing))}};
-}
-inline PropertyDictionary exchangeStore(std::vector<PropertyValue> descriptions) {
-  return {{kLegacyExchangeAccounts, PropertyArray(std::move(descriptions))}};
-}
 
 }  // namespace accounts

@@ -6,6 +6,7 @@
 #include <functional>
 #include <optional>
 
+#include "tests/fakes/StoreContents.h"
 #include "tests/program/ExitStatuses.h"
 #include "tests/program/Programs.h"
 #include "tests/program/SafetyNetFixture.h"
@@ -16,38 +17,12 @@ namespace {
 using testing::ElementsAreArray;
 using testing::HasSubstr;
 
-PropertyDictionary accountOf(std::string_view identifier, std::string_view type,
-                             std::string_view accountClass) {
-  return {{"Identifier", identifier},
-          {"Type", type},
-          {"Class", accountClass},
-          {"Hostname", std::string(identifier) + ".example"}};
-}
 PropertyDictionary calendars(std::string_view identifier) {
-  return accountOf(identifier, "CalDAV", "CalDAVAccount");
-}
-PropertyDictionary with(PropertyDictionary account, std::string_view key, PropertyValue value) {
-  account.set(key, std::move(value));
-  return account;
-}
-PropertyDictionary without(PropertyDictionary account, std::string_view key) {
-  account.remove(key);
-  return account;
-}
-PropertyDictionary mailOf(std::vector<PropertyValue> incoming,
-                          std::vector<PropertyValue> outgoing = {}) {
-  return {{"MailAccounts", PropertyArray(std::move(incoming))},
-          {"DeliveryAccounts", PropertyArray(std::move(outgoing))}};
+  return anAccount(identifier, "CalDAV", "CalDAVAccount");
 }
 PropertyDictionary description(std::string_view identifier,
                                std::string_view accountClass = "IMAPAccount") {
   return {{"uniqueId", identifier}, {"AccountType", accountClass}, {"Password", identifier}};
-}
-PropertyDictionary exchangeOf(std::vector<PropertyValue> descriptions) {
-  return {{"DAAccountsKey", PropertyArray(std::move(descriptions))}};
-}
-PropertyDictionary settingsOf(std::vector<PropertyValue> accounts) {
-  return {{"Version", 12}, {"Accounts", PropertyArray(std::move(accounts))}};
 }
 
 struct Loss {
@@ -74,27 +49,27 @@ std::vector<Loss> losses() {
   return {
       {"TwoDescriptionsOfOneIdentifier",
        {},
-       mailOf({description("A"), with(description("A"), "Password", "x")}),
+       mailStore({description("A"), with(description("A"), "Password", "x")}),
        {},
        {"MailAccounts[1] (identifier A)" + ofMail + "its \"Password\" gave way to another value" +
         shared}},
       {"OneIdentifierInBothStores",
        {},
-       mailOf({description("A")}),
-       exchangeOf({exchange}),
+       mailStore({description("A")}),
+       exchangeStore({exchange}),
        {"DAAccountsKey[0] (identifier A)" + ofExchange +
         "another account with its identifier took its place: it has a \"Password\" that it did not "
         "have"}},
       {"AnIdentifierOfTheSettingsFile",
-       settingsOf({calendars("A")}),
-       mailOf({description("A")}),
+       accounts::settings({calendars("A")}),
+       mailStore({description("A")}),
        {},
        {"MailAccounts[0] (identifier A)" + ofMail + "its \"Class\" gave way to another value" +
         shared}},
       {"AnIdentifierOfAChild",
-       settingsOf({with(accountOf("Q", "QuarxAccount", "ZQAccount"), "ChildAccounts",
-                        PropertyArray{calendars("A")})}),
-       mailOf({description("A")}),
+       accounts::settings({with(anAccount("Q", "QuarxAccount", "ZQAccount"), "ChildAccounts",
+                                PropertyArray{calendars("A")})}),
+       mailStore({description("A")}),
        {},
        {"MailAccounts[0] (identifier A)" + ofMail}},
       {"AStoreOfAnotherForm",
@@ -105,34 +80,35 @@ std::vector<Loss> losses() {
         " holds accounts in an unknown form: its \"MailAccounts\" is no array"}},
       {"ARefusedDescription",
        {},
-       mailOf({description("A"), without(description("B"), "AccountType")},
-              {description("C", "SMTPAccount")}),
+       mailStore({description("A"), without(description("B"), "AccountType")},
+                 {description("C", "SMTPAccount")}),
        {},
        {"DeliveryAccounts[0] (identifier C)" + ofMail + "another account of its store was refused",
         "MailAccounts[0] (identifier A)" + ofMail + "another account of its store was refused",
         "MailAccounts[1] (identifier B)" + ofMail + "it has no class"}},
       {"AKeyThatAnotherKeyReplaces",
        {},
-       mailOf({with(description("A"), "Class", "Odd")}),
+       mailStore({with(description("A"), "Class", "Odd")}),
        {},
        {"MailAccounts[0] (identifier A)" + ofMail +
         "its \"Class\" gave way to the value under \"AccountType\""}},
       {"AnEmptyMailStore",
-       settingsOf({accountOf("A", "Mail", "IMAPAccount"), accountOf("B", "SMTP", "SMTPAccount")}),
-       mailOf({}),
+       accounts::settings(
+           {anAccount("A", "Mail", "IMAPAccount"), anAccount("B", "SMTP", "SMTPAccount")}),
+       mailStore({}),
        {},
        {"Accounts[0] (identifier A)" + ofSettings + replaced + "_migrateMailAccounts:)",
         "Accounts[1] (identifier B)" + ofSettings + replaced + "_migrateMailAccounts:)"}},
       {"AnEmptyExchangeStore",
-       settingsOf({accountOf("A", "Exchange", "ASAccount")}),
+       accounts::settings({anAccount("A", "Exchange", "ASAccount")}),
        {},
-       exchangeOf({}),
+       exchangeStore({}),
        {"Accounts[0] (identifier A)" + ofSettings + replaced + "_migrateDAAccounts:)"}},
       {"AccountsThatAreRefused",
-       settingsOf({accountOf("A", "Unknown", "X"), without(calendars("B"), "Type"),
-                   with(calendars("C"), "Type", 5), without(calendars("D"), "Class"),
-                   with(calendars("E"), "Class", ""), with(calendars("F"), "Class", 5),
-                   accountOf("G", "Mail", "Odd"), "no dictionary"}),
+       accounts::settings({anAccount("A", "Unknown", "X"), without(calendars("B"), "Type"),
+                           with(calendars("C"), "Type", 5), without(calendars("D"), "Class"),
+                           with(calendars("E"), "Class", ""), with(calendars("F"), "Class", 5),
+                           anAccount("G", "Mail", "Odd"), "no dictionary"}),
        {},
        {},
        {"Accounts[0] (identifier A)" + ofSettings + "its type is unknown",
@@ -150,16 +126,17 @@ std::vector<Loss> losses() {
        {std::string(kSettingsPath) +
         " holds accounts in an unknown form: its \"Accounts\" is no array"}},
       {"ChildrenOfADroppedAccount",
-       settingsOf(
-           {with(accountOf("A", "Unknown", "X"), "ChildAccounts", PropertyArray{calendars("K")})}),
+       accounts::settings(
+           {with(anAccount("A", "Unknown", "X"), "ChildAccounts", PropertyArray{calendars("K")})}),
        {},
        {},
        {"Accounts[0] (identifier A)" + ofSettings + "its type is unknown",
         "Accounts[0].ChildAccounts[0] (identifier K)" + ofSettings +
             "its parent was not carried over"}},
       {"TheFirstOfThreeOfOneIdentifier",
-       settingsOf({with(calendars("A"), "Hostname", "1"), with(calendars("A"), "Hostname", "2"),
-                   with(calendars("A"), "Hostname", "3")}),
+       accounts::settings({with(calendars("A"), "Hostname", "1"),
+                           with(calendars("A"), "Hostname", "2"),
+                           with(calendars("A"), "Hostname", "3")}),
        {},
        {},
        {"Accounts[0] (identifier A)" + ofSettings + "its \"Hostname\" gave way to another value" +
