@@ -48,15 +48,6 @@ std::string requireNamedPage(const std::string& value) {
                                   : "";
 }
 
-/// More than there are devices.
-constexpr std::size_t kMostDigitsOfACount = 9;
-
-std::string requireCount(const std::string& value) {
-  const bool isCount = !value.empty() && value.size() <= kMostDigitsOfACount &&
-                       value.find_first_not_of("0123456789") == std::string::npos;
-  return isCount ? "" : "must be a whole number, at most 999999999";
-}
-
 std::string requireList(const std::string& value) {
   return listNamed(value) ? "" : std::string("must be ") + kListNames;
 }

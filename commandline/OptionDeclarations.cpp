@@ -3,6 +3,12 @@
 #include <CLI/CLI.hpp>
 
 namespace accounts {
+namespace {
+
+// More devices than there are, and seconds than anybody waits.
+constexpr std::size_t kMostDigitsOfACount = 9;
+
+}  // namespace
 
 std::string requireText(const std::string& value) {
   return value.empty() ? "must not be empty" : "";
@@ -10,6 +16,12 @@ std::string requireText(const std::string& value) {
 
 std::string requireDevicePath(const std::string& value) {
   return value.starts_with('/') ? "" : "must be an absolute device path, such as /var/mobile";
+}
+
+std::string requireCount(const std::string& value) {
+  const bool isCount = !value.empty() && value.size() <= kMostDigitsOfACount &&
+                       value.find_first_not_of("0123456789") == std::string::npos;
+  return isCount ? "" : "must be a whole number, at most 999999999";
 }
 
 void addHelpAndVersion(CLI::App& part, const std::string& version) {

@@ -10,6 +10,9 @@ namespace accounts {
 std::string requireText(const std::string& value);
 /// What is wrong with a value that must be an absolute path of a device; empty when nothing is.
 std::string requireDevicePath(const std::string& value);
+/// What is wrong with a value that must be a whole number of at most nine digits; empty when
+/// nothing is.
+std::string requireCount(const std::string& value);
 
 /// Declares --help and --version of a program or of one of its subcommands.
 void addHelpAndVersion(CLI::App& part, const std::string& version);

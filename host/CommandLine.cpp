@@ -13,8 +13,9 @@ namespace {
 
 constexpr const char* kVersion = "migration-host " MIGRATION_HOST_VERSION;
 
-// A month, which is as good as no limit.
-constexpr unsigned kLongestLockTimeout = 31 * 24 * 60 * 60;
+std::string requireBus(const std::string& value) {
+  return value == "dbus" ? "" : "must be dbus";
+}
 
 /// The arguments of every subcommand; those of the one that is chosen are filled.
 struct Arguments {
@@ -38,7 +39,7 @@ void addLockTimeout(CLI::App& command, std::optional<std::chrono::seconds>& time
           "How long each lock is waited for that another process has (default: as long as it "
           "takes)")
       ->option_text("SECONDS")
-      ->check(CLI::Range(0U, kLongestLockTimeout));
+      ->check(requireCount);
 }
 
 void addDeviceOptions(CLI::App& command, DeviceOptions& options) {
@@ -89,7 +90,7 @@ void addRun(CLI::App& command, Arguments& arguments) {
           [&arguments](const std::string&) { arguments.run.broadcastsOnDBus = true; },
           "Announce changed preferences and cloud tabs on BUS, which is dbus (default: not at all)")
       ->option_text("BUS")
-      ->check(CLI::IsMember({"dbus"}));
+      ->check(requireBus);
   command.add_flag_callback(
       "--keep", [&arguments] { arguments.run.keep = KeepFiles::Always; },
       "Keep the files as they were after a clean run, too");

@@ -69,11 +69,11 @@ TEST(CommandLine, EveryRefusalIsInTheProgramsOwnWords) {
   expectRefused({"run", "--root", "/a", "--root", "/b"}, ": --root is given more than once (");
   expectRefused({"--root", "/nowhere", "run"}, ": --root has to stand behind run (");
   expectRefused({"run", "--root", "/nowhere", "--lock-timeout", "99999999999"},
-                ": --lock-timeout cannot be 99999999999 (");
+                ": --lock-timeout: must be a whole number, at most 999999999 (");
   expectRefused({"run", "--root", "/nowhere", "--lock-timeout", "soon"},
-                ": --lock-timeout cannot be soon (");
+                ": --lock-timeout: must be a whole number, at most 999999999 (");
   expectRefused({"run", "--root", "/nowhere", "--broadcast", "radio"},
-                ": --broadcast cannot be radio (");
+                ": --broadcast: must be dbus (");
   expectRefused({"run", "--root", "/nowhere", "--report"}, ": The FILE of --report is missing (");
 }
 
