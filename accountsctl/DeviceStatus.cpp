@@ -61,8 +61,7 @@ void lookAtWork(DeviceStatus& status) {
 std::vector<std::string> pathsWithPrefix(LinuxPlatform& platform, std::string_view directory,
                                          std::string_view prefix) {
   std::vector<std::string> paths;
-  const std::optional<std::vector<std::string>> names =
-      platform.fileSystem().directoryEntries(directory);
+  const auto names = platform.fileSystem().directoryEntries(directory);
   for (const std::string& name : names.value_or(std::vector<std::string>())) {
     if (name.starts_with(prefix)) {
       paths.push_back(joinedPath(directory, name));
@@ -80,11 +79,15 @@ bool isAbandoned(const DeviceRoot& root, const std::string& path) {
 
 }  // namespace
 
-DeviceStatus leftoversOn(LinuxPlatform& platform) {
-  DeviceStatus status;
+OrFailure<DeviceStatus> leftoversOn(LinuxPlatform& platform) {
   const std::string home = platform.platform().homeDirectory.path();
   LinuxDevicePlaces places(platform.root(), platform.fileSystem(), home);
-  status.keptFolders = KeptFolders(platform.fileSystem(), places).keptFor(KeptFor::Migration);
+  auto kept = KeptFolders(platform.fileSystem(), places).keptFor(KeptFor::Migration);
+  if (!kept) {
+    return kept.error();
+  }
+  DeviceStatus status;
+  status.keptFolders = *std::move(kept);
   for (const std::string_view place : kTemporaryPlaces) {
     for (std::string& path :
          pathsWithPrefix(platform, joinedPath(home, place), kTemporaryFilePrefix)) {

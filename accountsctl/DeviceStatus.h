@@ -42,7 +42,7 @@ struct DeviceStatus {
 };
 
 /// What earlier runs left on a device. Changes nothing, and decodes nothing.
-DeviceStatus leftoversOn(LinuxPlatform& platform);
+OrFailure<DeviceStatus> leftoversOn(LinuxPlatform& platform);
 
 /// Completes that with what a snapshot of the device holds.
 void lookAtDevice(LinuxPlatform& platform, const DeviceSnapshot& snapshot, DeviceStatus& status);

@@ -134,7 +134,11 @@ CommandResult status(const StatusOptions& options, const Terminal& terminal,
     return readingError(taken.error());
   }
   const DeviceSnapshot& snapshot = *taken;
-  DeviceStatus found = leftoversOn(linux);
+  auto leftovers = leftoversOn(linux);
+  if (!leftovers) {
+    return readingError(leftovers.error());
+  }
+  DeviceStatus found = *std::move(leftovers);
   worker.giveUpRights(openInputsOf(snapshot));
   if (auto error = device.decode()) {
     return *std::move(error);

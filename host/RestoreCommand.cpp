@@ -1,7 +1,5 @@
 #include "host/RestoreCommand.h"
 
-#include <fcntl.h>
-
 #include <algorithm>
 #include <utility>
 
@@ -18,6 +16,7 @@
 #include "platform/linux/LinuxPlatform.h"
 #include "propertylist/value/Description.h"
 #include "safetynet/MigrationRun.h"
+#include "safetynet/PlaceErrors.h"
 
 namespace accounts {
 namespace {
@@ -63,15 +62,6 @@ RestoreResult failed(ProgramError error) {
   return result;
 }
 
-/// Why it cannot be told at the moment what is kept: that is not the same as nothing.
-std::optional<ProgramError> whyUnknown(const DeviceRoot& root) {
-  const auto opened = root.open(kAccountMigrationDirectory, O_RDONLY | O_DIRECTORY);
-  if (opened || opened.error().kind() == FailureKind::Lasting) {
-    return std::nullopt;
-  }
-  return programErrorOf(opened.error(), ExitStatus::MissingInput);
-}
-
 RestoreResult listFolders(const KeptFolders& folders, const RestoreOptions& options) {
   RestoreResult result;
   std::vector<std::string> paths;
@@ -82,12 +72,20 @@ RestoreResult listFolders(const KeptFolders& folders, const RestoreOptions& opti
     }
     paths.push_back(*std::move(chosen));
   } else {
-    paths = folders.keptFor(KeptFor::Migration);
-    std::ranges::move(folders.keptFor(KeptFor::Restoration), std::back_inserter(paths));
+    for (const KeptFor purpose : {KeptFor::Migration, KeptFor::Restoration}) {
+      auto kept = folders.keptFor(purpose);
+      if (!kept) {
+        return failed(readingError(kept.error()));
+      }
+      std::ranges::move(*kept, std::back_inserter(paths));
+    }
   }
   for (std::string& path : paths) {
-    result.folders.push_back(
-        {path, folders.reasonOf(path), folders.listOf(path).value_or(KeptPlaces())});
+    auto list = folders.listOf(path);
+    if (!list) {
+      return failed(readingError(list.error()));
+    }
+    result.folders.push_back({std::move(path), std::move(*list).value_or(KeptList())});
   }
   return result;
 }
@@ -120,8 +118,7 @@ RestoreResult runRestoration(const RestoreOptions& options) {
   LinuxDevicePlaces places(*root, files, home);
   KeptFolders folders(files, places);
   if (options.action == RestoreAction::List) {
-    auto unknown = whyUnknown(*root);
-    return unknown ? failed(*std::move(unknown)) : listFolders(folders, options);
+    return listFolders(folders, options);
   }
   StopSignals stop;
   LinuxHostLocks locks(
@@ -133,9 +130,6 @@ RestoreResult runRestoration(const RestoreOptions& options) {
   }
   if (end != LockEnd::Taken) {
     return failed(lockErrorOf(end, locks));
-  }
-  if (auto unknown = whyUnknown(*root)) {
-    return failed(*std::move(unknown));
   }
   if (options.action == RestoreAction::Discard) {
     return discardFolder(folders, options);
@@ -163,14 +157,14 @@ std::string jsonText(const RestoreResult& result, const RestoreOptions& options)
     JSON folders = JSON::array();
     for (const ListedFolder& each : result.folders) {
       JSON places = JSON::array();
-      for (const auto& [place, kind] : each.places) {
+      for (const auto& [place, kind] : each.list.places) {
         places.push_back({{"place", listed(place).name},
                           {"path", pathOfPlace(place, homeOf(options))},
                           {"stood", textOf(kind)}});
       }
       folders.push_back({{"name", nameOf(each.path)},
                          {"path", each.path},
-                         {"reason", textOrNull(textOf(each.reason))},
+                         {"reason", textOrNull(textOf(each.list.reason))},
                          {"places", std::move(places)}});
     }
     object["folders"] = std::move(folders);
@@ -198,8 +192,8 @@ std::string summaryText(const RestoreResult& result, const RestoreOptions& optio
   }
   for (const ListedFolder& each : result.folders) {
     summary += escapedText(nameOf(each.path)) + "  " +
-               textOf(each.reason).value_or("its list cannot be read") + "\n";
-    for (const auto& [place, kind] : each.places) {
+               textOf(each.list.reason).value_or("its list cannot be read") + "\n";
+    for (const auto& [place, kind] : each.list.places) {
       if (kind != EntryKind::Nothing) {
         summary += std::string("  ") + textOf(kind) + "  " +
                    escapedText(pathOfPlace(place, homeOf(options))) + "\n";

@@ -28,9 +28,8 @@ struct RestoreOptions {
 /// A folder of kept files, for people.
 struct ListedFolder {
   std::string path;
-  /// Why it was kept; none when its list does not say.
-  std::optional<KeptFor> reason;
-  KeptPlaces places;
+  /// Empty when it cannot be read.
+  KeptList list;
 };
 
 /// What the program has to say of kept files.

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -16,13 +15,12 @@ class FileKeeping {
  public:
   virtual ~FileKeeping() = default;
 
-  /// What stands at a path, a symbolic link there not followed; none when that cannot be told.
-  virtual std::optional<EntryKind> kindOfEntry(std::string_view path) = 0;
-  /// The names in a directory, sorted bytewise; none when it cannot be read.
-  virtual std::optional<std::vector<std::string>> directoryEntries(std::string_view path) = 0;
-  /// The bytes of a regular file, links followed; none when it cannot be read or has more than
-  /// `most`.
-  virtual std::optional<std::string> shortContents(std::string_view path, std::size_t most) = 0;
+  /// What stands at a path, a symbolic link there not followed.
+  virtual OrFailure<EntryKind> kindOfEntry(std::string_view path) = 0;
+  /// The names in a directory, sorted bytewise.
+  virtual OrFailure<std::vector<std::string>> directoryEntries(std::string_view path) = 0;
+  /// The bytes of a regular file, links followed; more than `most` are not read.
+  virtual OrFailure<std::string> shortContents(std::string_view path, std::size_t most) = 0;
 
   /// As with FileSystem.
   virtual Result createFile(std::string_view path, std::string_view contents) = 0;

@@ -92,23 +92,58 @@ std::string listText(KeptFor purpose, const std::vector<PlaceToKeep>& places) {
   return text;
 }
 
+std::optional<KeptList> listIn(std::string_view rest) {
+  KeptList list;
+  const auto* const reason = std::ranges::find_if(
+      kReasonLines, [rest](const ReasonLine& each) { return rest.starts_with(each.line); });
+  if (reason != std::end(kReasonLines)) {
+    list.reason = reason->reason;
+    rest.remove_prefix(reason->line.size());
+  }
+  while (!rest.empty()) {
+    const std::string_view line = rest.substr(0, rest.find('\n'));
+    const std::size_t tab = line.find('\t');
+    const auto* const kind = std::ranges::find(kKindNames, line.substr(0, tab), &KindName::name);
+    const auto place =
+        tab != std::string_view::npos ? placeNamed(line.substr(tab + 1)) : std::nullopt;
+    if (line.size() == rest.size() || kind == std::end(kKindNames) || !place ||
+        !list.places.emplace(*place, kind->kind).second) {
+      return std::nullopt;
+    }
+    rest.remove_prefix(line.size() + 1);
+  }
+  return list;
+}
+
 }  // namespace
 
-std::vector<std::string> KeptFolders::keptFor(KeptFor purpose) const {
+OrFailure<std::vector<std::string>> KeptFolders::keptFor(KeptFor purpose) const {
+  const auto names = files_.directoryEntries(kAccountMigrationDirectory);
   std::vector<std::string> folders;
-  for (const std::string& name :
-       files_.directoryEntries(kAccountMigrationDirectory).value_or(std::vector<std::string>())) {
-    if (name.starts_with(prefixOf(purpose)) && contains(name)) {
+  if (!names && !names.error().isMissing()) {
+    return names.error();
+  }
+  for (const std::string& name : names ? *names : std::vector<std::string>()) {
+    const auto isKept = name.starts_with(prefixOf(purpose)) ? contains(name) : false;
+    if (!isKept) {
+      return isKept.error();
+    }
+    if (*isKept) {
       folders.push_back(pathOf(name));
     }
   }
   return folders;
 }
 
-bool KeptFolders::contains(std::string_view name) const {
-  return (name.starts_with(kMigrationPrefix) || name.starts_with(kRestorationPrefix)) &&
-         name.find('/') == std::string_view::npos &&
-         files_.kindOfEntry(pathOf(name)) == EntryKind::Directory;
+OrFailure<bool> KeptFolders::contains(std::string_view name) const {
+  const bool isNameOfOne =
+      (name.starts_with(kMigrationPrefix) || name.starts_with(kRestorationPrefix)) &&
+      name.find('/') == std::string_view::npos;
+  if (!isNameOfOne) {
+    return false;
+  }
+  const auto kind = files_.kindOfEntry(pathOf(name));
+  return kind ? OrFailure<bool>(*kind == EntryKind::Directory) : kind.error();
 }
 
 std::string KeptFolders::pathOf(std::string_view name) {
@@ -119,40 +154,15 @@ std::string KeptFolders::pathIn(std::string_view folder, DevicePlace place) {
   return inDirectory(folder, listed(place).name);
 }
 
-std::optional<std::string> KeptFolders::listTextOf(std::string_view folder) const {
-  return files_.shortContents(inDirectory(folder, kList), kLongestList);
-}
-
-std::optional<KeptFor> KeptFolders::reasonOf(std::string_view folder) const {
-  const std::optional<std::string> text = listTextOf(folder);
-  for (const ReasonLine& each : kReasonLines) {
-    if (text && text->starts_with(each.line)) {
-      return each.reason;
-    }
+OrFailure<std::optional<KeptList>> KeptFolders::listOf(std::string_view folder) const {
+  const auto contents = files_.shortContents(inDirectory(folder, kList), kLongestList);
+  if (contents) {
+    return listIn(*contents);
   }
-  return std::nullopt;
-}
-
-std::optional<KeptPlaces> KeptFolders::listOf(std::string_view folder) const {
-  const std::optional<std::string> contents = listTextOf(folder);
-  if (!contents) {
+  if (contents.error().kind() == FailureKind::Lasting) {
     return std::nullopt;
   }
-  const std::size_t reasonSize = reasonOf(folder) ? contents->find('\n') + 1 : 0;
-  KeptPlaces places;
-  for (std::string_view rest = std::string_view(*contents).substr(reasonSize); !rest.empty();) {
-    const std::string_view line = rest.substr(0, rest.find('\n'));
-    const std::size_t tab = line.find('\t');
-    const auto* const kind = std::ranges::find(kKindNames, line.substr(0, tab), &KindName::name);
-    const auto place =
-        tab != std::string_view::npos ? placeNamed(line.substr(tab + 1)) : std::nullopt;
-    if (line.size() == rest.size() || kind == std::end(kKindNames) || !place ||
-        !places.emplace(*place, kind->kind).second) {
-      return std::nullopt;
-    }
-    rest.remove_prefix(line.size() + 1);
-  }
-  return places;
+  return contents.error();
 }
 
 PlaceOutcome KeptFolders::keep(const std::vector<PlaceToKeep>& places, KeptFor purpose,

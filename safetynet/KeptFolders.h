@@ -23,8 +23,15 @@ enum class KeptFor : std::uint8_t {
   Restoration
 };
 
-/// What a folder of kept files says stood at each of its places.
+/// What stood at each place of a folder of kept files.
 using KeptPlaces = std::map<DevicePlace, EntryKind>;
+
+/// What a folder of kept files says of itself.
+struct KeptList {
+  /// Why it was kept; none when the list does not say.
+  std::optional<KeptFor> reason;
+  KeptPlaces places;
+};
 
 /// A place to be kept, with what stands there.
 struct PlaceToKeep {
@@ -42,17 +49,15 @@ class KeptFolders {
   KeptFolders(FileKeeping& files, DevicePlaces& places) : files_(files), places_(places) {}
 
   /// The paths of all folders that were kept for a migration, or for a restoration, oldest first.
-  [[nodiscard]] std::vector<std::string> keptFor(KeptFor purpose) const;
-  /// Why a folder was kept, as its list says; none when it does not.
-  [[nodiscard]] std::optional<KeptFor> reasonOf(std::string_view folder) const;
+  [[nodiscard]] OrFailure<std::vector<std::string>> keptFor(KeptFor purpose) const;
   /// Whether there is a folder of kept files with this name, of either purpose.
-  [[nodiscard]] bool contains(std::string_view name) const;
+  [[nodiscard]] OrFailure<bool> contains(std::string_view name) const;
   /// The path of the folder with a name.
   [[nodiscard]] static std::string pathOf(std::string_view name);
   /// Where a folder has what stood at a place.
   [[nodiscard]] static std::string pathIn(std::string_view folder, DevicePlace place);
-  /// What a folder says stood at its places; none when its list is missing or is no such list.
-  [[nodiscard]] std::optional<KeptPlaces> listOf(std::string_view folder) const;
+  /// What a folder says of itself; none when its list is missing or is no such list.
+  [[nodiscard]] OrFailure<std::optional<KeptList>> listOf(std::string_view folder) const;
 
   /// Gives what stands at places second names in a new folder, durably, and writes the folder's
   /// path to `folder`. `time` is sortable text; a folder that exists is never touched. Whatever is
@@ -78,7 +83,6 @@ class KeptFolders {
   PlaceOutcome fill(const std::string& unfinished, KeptFor purpose,
                     const std::vector<PlaceToKeep>& places);
   void removeWithContents(const std::string& folder);
-  [[nodiscard]] std::optional<std::string> listTextOf(std::string_view folder) const;
 
   FileKeeping& files_;
   DevicePlaces& places_;

@@ -36,7 +36,9 @@ RunConclusion MigrationRun::run(RunPurpose purpose, KeepFiles keep) {
     folders_.removeUnfinished();
     conclusion_.warnings = means_.places.settleLeftovers();
   }
-  conclusion_.earlierFolders = folders_.keptFor(KeptFor::Migration);
+  // They are only told of.
+  conclusion_.earlierFolders =
+      folders_.keptFor(KeptFor::Migration).value_or(std::vector<std::string>());
   Attempt result = Attempt::GivenUp;
   for (int number = 1; number <= kMostAttempts && result == Attempt::GivenUp; ++number) {
     result = attempt(purpose, keep);

@@ -36,34 +36,37 @@ class Restorer {
            Restoration& restoration)
       : places_(places), folders_(folders), home_(home), restoration_(restoration) {}
 
-  std::optional<ProgramError> run(std::string_view time) {
-    const std::optional<KeptPlaces> list = folders_.listOf(*restoration_.folder);
-    if (!list || list->empty()) {
+  OrProgramError<void> run(std::string_view time) {
+    const auto list = folders_.listOf(*restoration_.folder);
+    if (!list) {
+      return readingError(list.error());
+    }
+    if (!*list || (*list)->places.empty()) {
       return missing("No kept files in " + *restoration_.folder);
     }
     folders_.removeUnfinished();
     static_cast<void>(places_.settleLeftovers());
-    std::optional<ProgramError> error = findDifferences(*list);
-    if (!error) {
-      error = keepReplaced(time);
+    OrProgramError<void> done = findDifferences((*list)->places);
+    if (done) {
+      done = keepReplaced(time);
     }
     for (const DevicePlace place : {DevicePlace::CommitRecord, DevicePlace::RemovalSentinel}) {
-      if (!error) {
-        error = end(place);
+      if (done) {
+        done = end(place);
       }
     }
     for (const Difference& each : differences_) {
-      if (!error) {
-        error = putBack(each);
+      if (done) {
+        done = putBack(each);
       }
     }
-    return error;
+    return done;
   }
 
  private:
   [[nodiscard]] std::string pathOf(DevicePlace place) const { return pathOfPlace(place, home_); }
 
-  std::optional<ProgramError> findDifferences(const KeptPlaces& list) {
+  OrProgramError<void> findDifferences(const KeptPlaces& list) {
     for (const DevicePlace place : kOrder) {
       const auto listed = list.find(place);
       // Of a directory nothing is kept, and nothing was done to it.
@@ -82,10 +85,10 @@ class Restorer {
         differences_.push_back({place, listed->second, *now});
       }
     }
-    return std::nullopt;
+    return {};
   }
 
-  std::optional<ProgramError> keepReplaced(std::string_view time) {
+  OrProgramError<void> keepReplaced(std::string_view time) {
     std::vector<PlaceToKeep> replaced;
     bool isAny = false;
     for (const Difference& each : differences_) {
@@ -93,7 +96,7 @@ class Restorer {
       isAny = isAny || each.now.exists();
     }
     if (!isAny) {
-      return std::nullopt;
+      return {};
     }
     std::string folder;
     const PlaceOutcome kept = folders_.keep(replaced, KeptFor::Restoration, time, folder);
@@ -101,10 +104,10 @@ class Restorer {
       return writingError("What would be replaced cannot be kept", failureOf(kept));
     }
     restoration_.replaced = std::move(folder);
-    return std::nullopt;
+    return {};
   }
 
-  std::optional<ProgramError> end(DevicePlace place) {
+  OrProgramError<void> end(DevicePlace place) {
     const auto now = places_.identityAt(place);
     PlaceOutcome outcome;
     if (!now) {
@@ -115,10 +118,10 @@ class Restorer {
         flush(place, outcome);
       }
     }
-    return outcome.isDone() ? std::nullopt : std::optional(wholeStill(outcome));
+    return outcome.isDone() ? OrProgramError<void>() : wholeStill(outcome);
   }
 
-  std::optional<ProgramError> putBack(const Difference& difference) {
+  OrProgramError<void> putBack(const Difference& difference) {
     PlaceOutcome outcome;
     if (difference.before == EntryKind::Nothing) {
       outcome = places_.remove(difference.place, difference.now);
@@ -136,7 +139,7 @@ class Restorer {
     }
     (difference.before == EntryKind::Nothing ? restoration_.removed : restoration_.restored)
         .push_back(pathOf(difference.place));
-    return std::nullopt;
+    return {};
   }
 
   void flush(DevicePlace place, PlaceOutcome& outcome) {
@@ -174,23 +177,30 @@ OrProgramError<std::string> chosenFolder(const KeptFolders& folders,
   if (asked) {
     const std::string name = asked->substr(asked->rfind('/') + 1);
     const bool isElsewhere = *asked != name && *asked != KeptFolders::pathOf(name);
-    if (isElsewhere || !folders.contains(name)) {
+    const auto isKept = isElsewhere ? false : folders.contains(name);
+    if (!isKept) {
+      return readingError(isKept.error());
+    }
+    if (!*isKept) {
       return missing("No folder of kept files: " + *asked);
     }
     return KeptFolders::pathOf(name);
   }
-  const std::vector<std::string> kept = folders.keptFor(KeptFor::Migration);
-  if (kept.empty()) {
+  const auto kept = folders.keptFor(KeptFor::Migration);
+  if (!kept) {
+    return readingError(kept.error());
+  }
+  if (kept->empty()) {
     return missing("No files are kept in " + std::string(kAccountMigrationDirectory));
   }
-  if (kept.size() > 1) {
+  if (kept->size() > 1) {
     std::string message = "Several folders hold kept files, --from must name one:";
-    for (const std::string& folder : kept) {
+    for (const std::string& folder : *kept) {
       message.append(" ").append(folder.substr(folder.rfind('/') + 1));
     }
     return ProgramError{ExitStatus::UnusableArguments, std::move(message)};
   }
-  return kept.front();
+  return kept->front();
 }
 
 Restoration restoreKeptFiles(DevicePlaces& places, KeptFolders& folders, std::string_view home,
@@ -202,8 +212,8 @@ Restoration restoreKeptFiles(DevicePlaces& places, KeptFolders& folders, std::st
     return restoration;
   }
   restoration.folder = *std::move(chosen);
-  restoration.error = Restorer(places, folders, home, restoration).run(time);
-  if (restoration.error) {
+  if (auto done = Restorer(places, folders, home, restoration).run(time); !done) {
+    restoration.error = std::move(done).error();
     return restoration;
   }
   if (const Result discarded = folders.discard(*restoration.folder); !discarded) {

@@ -30,9 +30,9 @@ class LinuxFileSystem final : public FileSystem, public FileKeeping {
 
   bool fileExists(std::string_view path) override;
   bool isDirectory(std::string_view path) override;
-  std::optional<EntryKind> kindOfEntry(std::string_view path) override;
-  std::optional<std::vector<std::string>> directoryEntries(std::string_view path) override;
-  std::optional<std::string> shortContents(std::string_view path, std::size_t most) override;
+  OrFailure<EntryKind> kindOfEntry(std::string_view path) override;
+  OrFailure<std::vector<std::string>> directoryEntries(std::string_view path) override;
+  OrFailure<std::string> shortContents(std::string_view path, std::size_t most) override;
 
   /// The copy gets the permission bits of its source. Files above kLargestFileSize are not copied.
   Result copyFile(std::string_view source, std::string_view destination) override;

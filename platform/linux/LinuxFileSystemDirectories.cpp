@@ -21,24 +21,27 @@ struct CloseDirectory {
 
 }  // namespace
 
-std::optional<EntryKind> LinuxFileSystem::kindOfEntry(std::string_view path) {
+OrFailure<EntryKind> LinuxFileSystem::kindOfEntry(std::string_view path) {
   const auto entry = root_.locate(path);
   struct stat status = {};
   if (entry && ::fstatat(entry->directory(), entry->name(), &status, AT_SYMLINK_NOFOLLOW) == 0) {
     return kindOfMode(status.st_mode);
   }
-  const bool isMissing = entry ? errno == ENOENT : entry.error().isMissing();
-  return isMissing ? std::optional(EntryKind::Nothing) : std::nullopt;
+  Failure failure = entry ? pathFailure("look at", path, errno) : entry.error();
+  if (failure.isMissing()) {
+    return EntryKind::Nothing;
+  }
+  return failure;
 }
 
-std::optional<std::vector<std::string>> LinuxFileSystem::directoryEntries(std::string_view path) {
+OrFailure<std::vector<std::string>> LinuxFileSystem::directoryEntries(std::string_view path) {
   auto file = root_.open(path, O_RDONLY | O_DIRECTORY);
   if (!file) {
-    return std::nullopt;
+    return file.error();
   }
   const std::unique_ptr<DIR, CloseDirectory> directory(::fdopendir(file->number()));
   if (!directory) {
-    return std::nullopt;
+    return pathFailure("read the directory", path, errno);
   }
   // The stream closes it.
   (void)file->release();
@@ -55,19 +58,22 @@ std::optional<std::vector<std::string>> LinuxFileSystem::directoryEntries(std::s
     }
   }
   if (errno != 0) {
-    return std::nullopt;
+    return pathFailure("read the directory", path, errno);
   }
   std::ranges::sort(names);
   return names;
 }
 
-std::optional<std::string> LinuxFileSystem::shortContents(std::string_view path, std::size_t most) {
+OrFailure<std::string> LinuxFileSystem::shortContents(std::string_view path, std::size_t most) {
   const auto file = root_.openRegularFile(path);
   const auto status = file ? fileStatus(*file, path) : file.error();
-  if (!status || static_cast<std::size_t>(status->st_size) > most) {
-    return std::nullopt;
+  if (!status) {
+    return status.error();
   }
-  return valueOrNone(readContents(*file, path));
+  if (static_cast<std::size_t>(status->st_size) > most) {
+    return pathFailure("read", path, EFBIG);
+  }
+  return readContents(*file, path);
 }
 
 Result LinuxFileSystem::removeDirectory(std::string_view path) {

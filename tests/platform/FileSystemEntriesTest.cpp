@@ -41,7 +41,7 @@ TEST_F(FileSystemEntriesTest, WhatMayNotBeLookedAtIsUnknownRatherThanMissing) {
   makeFile("/closed/file", "contents");
   fs::permissions(onHost("/closed"), fs::perms::none);
   const WithoutPrivileges everyone;
-  EXPECT_EQ(files.kindOfEntry("/closed/file"), std::nullopt);
+  EXPECT_EQ(files.kindOfEntry("/closed/file").error().number, EACCES);
 }
 
 TEST_F(FileSystemEntriesTest, TheNamesInADirectoryAreSorted) {
@@ -54,8 +54,8 @@ TEST_F(FileSystemEntriesTest, TheNamesInADirectoryAreSorted) {
 
 TEST_F(FileSystemEntriesTest, OnlyADirectoryHasNamesInIt) {
   makeFile("/file", "contents");
-  EXPECT_EQ(files.directoryEntries("/file"), std::nullopt);
-  EXPECT_EQ(files.directoryEntries("/missing"), std::nullopt);
+  EXPECT_EQ(files.directoryEntries("/file").error().number, ENOTDIR);
+  EXPECT_EQ(files.directoryEntries("/missing").error().number, ENOENT);
 }
 
 TEST_F(FileSystemEntriesTest, AnEmptyDirectoryIsRemoved) {

@@ -146,7 +146,7 @@ class LittleMemory : public DeviceRootFixture,
     call.program = "sh";
     return call;
   }
-  /// A call with a number of descriptors, those that the tests' own program leaves open included.
+  /// A call with a number of descriptors, the standard streams included.
   static ProgramCall withDescriptors(int count, ProgramCall call) {
     return withLimit("-n " + std::to_string(count), std::move(call));
   }

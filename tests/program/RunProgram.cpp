@@ -71,6 +71,8 @@ void becomeProgram(const ProgramCall& call, int output, int errors) {
       call.outputFile ? open(call.outputFile->c_str(), O_WRONLY | O_CLOEXEC) : output;
   dup2(outputFile, STDOUT_FILENO);
   dup2(errors, STDERR_FILENO);
+  // What whoever started the tests left open is none of the program's.
+  close_range(STDERR_FILENO + 1, ~0U, CLOSE_RANGE_CLOEXEC);
   for (const auto& [name, value] : call.environment) {
     setenv(name.c_str(), value.c_str(), 1);
   }

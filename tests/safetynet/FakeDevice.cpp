@@ -277,16 +277,19 @@ std::vector<std::string> FakeDevice::settleLeftovers() {
   return leftovers;
 }
 
-std::optional<EntryKind> FakeDevice::kindOfEntry(std::string_view path) {
-  if (begin(line("kindOfEntry", path), Recorded::No)) {
-    return std::nullopt;
+OrFailure<EntryKind> FakeDevice::kindOfEntry(std::string_view path) {
+  if (const auto failure = begin(line("kindOfEntry", path), Recorded::No)) {
+    return *failure;
   }
   return identityOf(path).kind;
 }
 
-std::optional<std::vector<std::string>> FakeDevice::directoryEntries(std::string_view path) {
-  if (begin(line("directoryEntries", path), Recorded::No) || !entries.contains(path)) {
-    return std::nullopt;
+OrFailure<std::vector<std::string>> FakeDevice::directoryEntries(std::string_view path) {
+  if (const auto failure = begin(line("directoryEntries", path), Recorded::No)) {
+    return *failure;
+  }
+  if (!entries.contains(path)) {
+    return failureOf("open", path, ENOENT);
   }
   std::vector<std::string> names;
   for (const auto& [other, entry] : entries) {
@@ -297,12 +300,17 @@ std::optional<std::vector<std::string>> FakeDevice::directoryEntries(std::string
   return names;
 }
 
-std::optional<std::string> FakeDevice::shortContents(std::string_view path, std::size_t most) {
+OrFailure<std::string> FakeDevice::shortContents(std::string_view path, std::size_t most) {
+  if (const auto failure = begin(line("shortContents", path), Recorded::No)) {
+    return *failure;
+  }
   const auto found = entries.find(path);
-  const bool isRead = !begin(line("shortContents", path), Recorded::No) && found != entries.end() &&
-                      found->second->identity.kind == EntryKind::RegularFile &&
-                      found->second->contents.size() <= most;
-  return isRead ? std::optional(found->second->contents) : std::nullopt;
+  const bool isFile =
+      found != entries.end() && found->second->identity.kind == EntryKind::RegularFile;
+  if (!isFile || found->second->contents.size() > most) {
+    return failureOf("read", path, isFile ? EFBIG : ENOENT);
+  }
+  return found->second->contents;
 }
 
 Result FakeDevice::createFile(std::string_view path, std::string_view contents) {

@@ -81,9 +81,9 @@ class FakeDevice final : public DevicePlaces, public FileKeeping {
   Result writeInformationFile(std::string_view name, const ReadableBytes& contents) override;
   std::vector<std::string> settleLeftovers() override;
 
-  std::optional<EntryKind> kindOfEntry(std::string_view path) override;
-  std::optional<std::vector<std::string>> directoryEntries(std::string_view path) override;
-  std::optional<std::string> shortContents(std::string_view path, std::size_t most) override;
+  OrFailure<EntryKind> kindOfEntry(std::string_view path) override;
+  OrFailure<std::vector<std::string>> directoryEntries(std::string_view path) override;
+  OrFailure<std::string> shortContents(std::string_view path, std::size_t most) override;
   Result createFile(std::string_view path, std::string_view contents) override;
   Result createDirectoryWithIntermediates(std::string_view path, unsigned permissions) override;
   Result removeFile(std::string_view path) override;

@@ -35,6 +35,9 @@ class KeptFoldersTest : public testing::Test {
                                                            : outcome.failure.text;
   }
 
+  /// What the folder says of itself.
+  KeptList list() { return folders.listOf(folder).value().value_or(KeptList()); }
+
   FakeDevice device;
   KeptFolders folders{device, device};
   const std::string folder = folderPath("Kept-20260102T030405Z");
@@ -76,8 +79,8 @@ TEST_F(KeptFoldersTest, AListSaysWhatStoodAtEachPlaceNothingIncluded) {
   device.write(kSettings, "settings");
   ASSERT_EQ(keep(), folder);
   EXPECT_EQ(device.at(folder + "/List"), "kept on request\nfile\tSettings\nnothing\tLegacyMail\n");
-  EXPECT_EQ(folders.reasonOf(folder), KeptFor::Migration);
-  EXPECT_EQ(folders.listOf(folder),
+  EXPECT_EQ(list().reason, KeptFor::Migration);
+  EXPECT_EQ(list().places,
             (KeptPlaces{{kSettings, EntryKind::RegularFile}, {kMail, EntryKind::Nothing}}));
 }
 
@@ -87,7 +90,7 @@ TEST_F(KeptFoldersTest, ALinkIsKeptAndADirectoryIsOnlyListed) {
   ASSERT_EQ(keep(), folder);
   EXPECT_EQ(device.at(folder + "/Settings"), "link");
   EXPECT_FALSE(device.entries.contains(folder + "/LegacyMail"));
-  EXPECT_EQ(folders.listOf(folder),
+  EXPECT_EQ(list().places,
             (KeptPlaces{{kSettings, EntryKind::Other}, {kMail, EntryKind::Directory}}));
 }
 
@@ -133,13 +136,13 @@ TEST_F(KeptFoldersTest, FoldersAreListedByPurposeOldestFirst) {
     device.write(folderPath(name), "", EntryKind::Directory);
   }
   device.write(folderPath("Kept-0"), "a file");
-  EXPECT_THAT(folders.keptFor(KeptFor::Migration),
+  EXPECT_THAT(folders.keptFor(KeptFor::Migration).value(),
               ElementsAre(folderPath("Kept-1"), folderPath("Kept-2")));
-  EXPECT_THAT(folders.keptFor(KeptFor::Restoration), ElementsAre(folderPath("Replaced-3")));
-  EXPECT_TRUE(folders.contains("Replaced-3"));
-  EXPECT_FALSE(folders.contains("Unfinished-4"));
-  EXPECT_FALSE(folders.contains("Kept-0"));
-  EXPECT_FALSE(folders.contains("Kept-missing"));
+  EXPECT_THAT(folders.keptFor(KeptFor::Restoration).value(), ElementsAre(folderPath("Replaced-3")));
+  EXPECT_TRUE(folders.contains("Replaced-3").value());
+  EXPECT_FALSE(folders.contains("Unfinished-4").value());
+  EXPECT_FALSE(folders.contains("Kept-0").value());
+  EXPECT_FALSE(folders.contains("Kept-missing").value());
 }
 
 TEST_F(KeptFoldersTest, ADiscardedFolderIsGoneWithTheDirectoryThatWasMadeForIt) {
@@ -165,7 +168,7 @@ TEST_F(KeptFoldersTest, AFolderThatCannotBeDiscardedIsWhole) {
   device.failWhenLineBegins("renameDirectory ");
   EXPECT_FALSE(folders.discard(folder));
   EXPECT_EQ(device.at(folder + "/Settings"), "settings");
-  EXPECT_TRUE(folders.listOf(folder));
+  EXPECT_TRUE(folders.listOf(folder).value());
 }
 
 TEST_F(KeptFoldersTest, WhatKilledRunsLeftUnfinishedIsRemovedAndNothingElse) {
@@ -179,14 +182,31 @@ TEST_F(KeptFoldersTest, WhatKilledRunsLeftUnfinishedIsRemovedAndNothingElse) {
 }
 
 TEST_F(KeptFoldersTest, AListThatIsNoneIsNone) {
-  EXPECT_FALSE(folders.listOf(folder));
+  EXPECT_FALSE(folders.listOf(folder).value());
   for (const char* text :
        {"file\tSettings", "file Settings\n", "File\tSettings\n", "file\tSettings\n\n",
         "file\tNowhere\n", "file\tSettings\nnothing\tSettings\n", "\tSettings\n", "\n"}) {
     device.write(folder + "/List", text);
-    EXPECT_FALSE(folders.listOf(folder)) << text;
+    EXPECT_FALSE(folders.listOf(folder).value()) << text;
   }
   device.write(folder + "/List", std::string(5000, 'x'));
+  EXPECT_FALSE(folders.listOf(folder).value());
+}
+
+TEST_F(KeptFoldersTest, WhatCannotBeToldAtTheMomentIsNotNothing) {
+  device.write(kSettings, "settings");
+  ASSERT_EQ(keep(), folder);
+  const std::string name = folder.substr(folder.rfind('/') + 1);
+  const auto failing = [this](const char* operation) {
+    device.removeFaults();
+    device.failWhenLineBegins(operation, ENFILE);
+  };
+  failing("directoryEntries ");
+  EXPECT_FALSE(folders.keptFor(KeptFor::Migration));
+  failing("kindOfEntry ");
+  EXPECT_FALSE(folders.keptFor(KeptFor::Migration));
+  EXPECT_FALSE(folders.contains(name));
+  failing("shortContents ");
   EXPECT_FALSE(folders.listOf(folder));
 }
 
@@ -249,7 +269,7 @@ TEST_F(KeptFoldersTest, ARunThatIsKilledAnywhereLeavesAWholeFolderOrNone) {
       EXPECT_EQ(killed.at(folder + "/Settings"), "settings");
       EXPECT_EQ(killed.at(folder + "/LegacyMail"), "store");
       killed.removeFaults();
-      EXPECT_TRUE(KeptFolders(killed, killed).listOf(folder));
+      EXPECT_TRUE(KeptFolders(killed, killed).listOf(folder).value());
     }
   }
 }
