@@ -107,8 +107,8 @@ CommandResult check(const CheckOptions& options, const Terminal& terminal,
                         fmt::format("Neither account settings nor a legacy store: {} ({})",
                                     options.file, nameOf(kind))};
   }
-  if (auto error = platform.decode()) {
-    return *std::move(error);
+  if (const auto decoded = platform.decode(); !decoded) {
+    return decoded.error();
   }
   const std::vector<Finding> findings = checked->findings(*content.asDictionary());
   const Rehearsed rehearsed = rehearseFile(platform, kind, content, options.file);

@@ -130,21 +130,21 @@ CommandResult runInWorker(const Command& command, const ReadAloud& readAloud,
     work(command, *theirs, keeper);
   }
   theirs.reset();
-  std::optional<ProgramError> error;
+  OrProgramError<void> heard;
   if (readAloud) {
-    error = readAloud(
+    heard = readAloud(
         [&own](std::string_view piece) { return sendFrame(*own, FrameKind::Piece, piece); });
   }
   std::optional<ProcessLimits> limits;
   std::optional<CommandResult> result;
-  if (!error) {
+  if (heard) {
     result = receiveResult(*own, limits, who);
   }
   // Without a keeper to hear it a worker comes to its end.
   own.reset();
   const int status = waitFor(child);
-  if (error) {
-    return *std::move(error);
+  if (!heard) {
+    return heard.error();
   }
   return result ? *std::move(result) : WorkerEnd(who, limits).withStatus(status);
 }

@@ -33,7 +33,7 @@ using Command = std::function<CommandResult(const CommandWorker& worker)>;
 /// Takes a piece of a file, an empty one for its end; false when nobody listens any more.
 using TakePiece = std::function<bool(std::string_view)>;
 /// What the keeper reads aloud meanwhile. An error is the command's.
-using ReadAloud = std::function<std::optional<ProgramError>(const TakePiece& take)>;
+using ReadAloud = std::function<OrProgramError<void>(const TakePiece& take)>;
 
 /// Who works in a command's process, as a message begins.
 inline constexpr std::string_view kCommand = "The command";

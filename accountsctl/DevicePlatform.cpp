@@ -24,21 +24,20 @@ OrProgramError<std::unique_ptr<DevicePlatform>> DevicePlatform::open(LinuxPlatfo
     options.bundleResourcesDirectory = resourcesOfBundle(bundleOfProgram()).string();
   }
   options.descriptionDecoding = DescriptionDecoding::Later;
-  LinuxPlatformError error;
-  std::unique_ptr<LinuxPlatform> platform = LinuxPlatform::create(options, error);
-  if (platform == nullptr) {
-    return programErrorOf(error);
+  auto platform = LinuxPlatform::create(options);
+  if (!platform) {
+    return programErrorOf(platform.error());
   }
-  if (const Result read = platform->readAhead(); !read) {
+  if (const Result read = (*platform)->readAhead(); !read) {
     return programErrorOf(read.error(), ExitStatus::MissingInput);
   }
   return std::unique_ptr<DevicePlatform>(
-      new DevicePlatform(std::move(platform), options.bundleResourcesDirectory));
+      new DevicePlatform(*std::move(platform), options.bundleResourcesDirectory));
 }
 
-std::optional<ProgramError> DevicePlatform::decode() {
-  if (LinuxPlatformError error; !platform_->decodeDescription(error)) {
-    return programErrorOf(error);
+OrProgramError<void> DevicePlatform::decode() {
+  if (const Result decoded = platform_->decodeDescription(); !decoded) {
+    return programErrorOf(decoded.error(), ExitStatus::MissingInput);
   }
   for (const char* name : kNeededResources) {
     if (!platform_->platform().bundleResources.readPropertyList(name)) {
@@ -46,7 +45,7 @@ std::optional<ProgramError> DevicePlatform::decode() {
                           std::string("No readable resource ") + name + " in " + resources_};
     }
   }
-  return std::nullopt;
+  return {};
 }
 
 }  // namespace accounts

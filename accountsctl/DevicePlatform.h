@@ -19,7 +19,7 @@ class DevicePlatform {
   static OrProgramError<std::unique_ptr<DevicePlatform>> open(LinuxPlatformOptions options);
 
   /// Decodes what was read, before any use. An error when that cannot be done.
-  std::optional<ProgramError> decode();
+  OrProgramError<void> decode();
 
   LinuxPlatform& linuxPlatform() { return *platform_; }
 

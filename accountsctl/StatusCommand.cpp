@@ -125,8 +125,8 @@ CommandResult status(const StatusOptions& options, const Terminal& terminal,
   }
   DevicePlatform& device = **opened;
   LinuxPlatform& linux = device.linuxPlatform();
-  if (const auto missing = whyNoDevice(linux.root(), options.root)) {
-    return *missing;
+  if (const auto isDevice = checkIsDevice(linux.root(), options.root); !isDevice) {
+    return isDevice.error();
   }
   LinuxDevicePlaces places(linux.root(), linux.fileSystem(), linux.platform().homeDirectory.path());
   const auto taken = places.takeSnapshot();
@@ -140,8 +140,8 @@ CommandResult status(const StatusOptions& options, const Terminal& terminal,
   }
   DeviceStatus found = *std::move(leftovers);
   worker.giveUpRights(openInputsOf(snapshot));
-  if (auto error = device.decode()) {
-    return *std::move(error);
+  if (const auto decoded = device.decode(); !decoded) {
+    return decoded.error();
   }
   lookAtDevice(linux, snapshot, found);
   const ExitStatus exitStatus =

@@ -104,7 +104,7 @@ std::uint64_t sizeOf(const SummarizedFile& file) {
   return error ? kLargestFileSize : size;
 }
 
-std::optional<ProgramError> readAloud(const std::string& file, const TakePiece& take) {
+OrProgramError<void> readAloud(const std::string& file, const TakePiece& take) {
   constexpr std::size_t kPiece = std::size_t{64} << 10;
   std::string piece(kPiece, '\0');
   const FileDescriptor opened(file == kStandardStream
@@ -121,7 +121,7 @@ std::optional<ProgramError> readAloud(const std::string& file, const TakePiece& 
     }
     const bool isHeard = take(std::string_view(piece).substr(0, static_cast<std::size_t>(count)));
     if (count == 0 || !isHeard) {
-      return std::nullopt;
+      return {};
     }
   }
 }
@@ -275,14 +275,13 @@ std::vector<SummarizedFile> filesToSummarize(const SummarizeOptions& options) {
   return files;
 }
 
-std::optional<ProgramError> readAloud(const std::vector<SummarizedFile>& files,
-                                      const TakePiece& take) {
+OrProgramError<void> readAloud(const std::vector<SummarizedFile>& files, const TakePiece& take) {
   for (const SummarizedFile& file : files) {
-    if (auto error = readAloud(file.name, take)) {
-      return error;
+    if (auto read = readAloud(file.name, take); !read) {
+      return read;
     }
   }
-  return std::nullopt;
+  return {};
 }
 
 CommandResult summarize(const SummarizeOptions& asked, const std::vector<SummarizedFile>& files,

@@ -49,8 +49,7 @@ struct SummarizedFile {
 std::vector<SummarizedFile> filesToSummarize(const SummarizeOptions& options);
 
 /// Reads them to the worker that summarizes them. An error when one cannot be read.
-std::optional<ProgramError> readAloud(const std::vector<SummarizedFile>& files,
-                                      const TakePiece& take);
+OrProgramError<void> readAloud(const std::vector<SummarizedFile>& files, const TakePiece& take);
 
 /// Counts what runs of migration-host on many images reported: by outcome, stage and error. While
 /// it reads, a terminal at standard error shows how far the fleet has come. The exit status of the

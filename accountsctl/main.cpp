@@ -86,8 +86,8 @@ const std::string* outputFileOf(const CommandLine& commandLine) {
 /// What a command came to, its file written; want of memory is an error like another.
 CommandResult resultOf(const CommandLine& commandLine) {
   try {
-    if (auto error = askForStack()) {
-      return *std::move(error);
+    if (const auto stack = askForStack(); !stack) {
+      return stack.error();
     }
     CommandResult result =
         std::visit([](const auto& asked) { return runCommand(asked); }, commandLine.asked);
@@ -95,8 +95,8 @@ CommandResult resultOf(const CommandLine& commandLine) {
     if (!result || !result->file || output == nullptr) {
       return result;
     }
-    auto error = replaceFile(*output, *result->file);
-    return error ? CommandResult(*std::move(error)) : result;
+    const auto replaced = replaceFile(*output, *result->file);
+    return replaced ? result : replaced.error();
   } catch (const std::bad_alloc&) {
     return outOfMemory();
   }

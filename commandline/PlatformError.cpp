@@ -35,13 +35,13 @@ ProgramError programErrorOf(const Failure& failure, ExitStatus lasting) {
   return {exitStatusOf(failure, lasting), failure.text};
 }
 
-std::optional<ProgramError> whyNoDevice(const DeviceRoot& root, std::string_view name) {
+OrProgramError<void> checkIsDevice(const DeviceRoot& root, std::string_view name) {
   std::string missing;
   for (const std::string_view each : kDeviceDirectories) {
     // What cannot be looked at is there, as far as this is concerned.
     const auto opened = root.open(each, O_PATH | O_DIRECTORY);
     if (opened || opened.error().number != ENOENT) {
-      return std::nullopt;
+      return {};
     }
     missing.append(missing.empty() ? "" : ", ").append(each);
   }

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <optional>
 #include <string_view>
 
 #include "commandline/ExitStatus.h"
@@ -14,8 +13,9 @@ ProgramError programErrorOf(const LinuxPlatformError& error);
 /// A failure as the program's error, with the exit status for its kind.
 ProgramError programErrorOf(const Failure& failure, ExitStatus lasting);
 
-/// Why a root is no device's, such as the empty directory on which an image was to be mounted; none
-/// when it has any of the directories that every device has. `name` is the root as it was named.
-std::optional<ProgramError> whyNoDevice(const DeviceRoot& root, std::string_view name);
+/// An error when a root is no device's, such as the empty directory on which an image was to be
+/// mounted: it has none of the directories that every device has. `name` is the root as it was
+/// named.
+OrProgramError<void> checkIsDevice(const DeviceRoot& root, std::string_view name);
 
 }  // namespace accounts

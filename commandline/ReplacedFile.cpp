@@ -29,19 +29,18 @@ ProgramError cannotWrite(const Failure& error) {
 }
 
 /// What stat says of the file to replace; a mode of 0 when there is none.
-std::optional<ProgramError> examine(const std::string& path, struct stat& status) {
+OrProgramError<void> examine(const std::string& path, struct stat& status) {
   if (::stat(path.c_str(), &status) != 0) {
     const int number = errno;
     struct stat link = {};
     status = {};
     const bool isDanglingLink = number == ENOENT && ::lstat(path.c_str(), &link) == 0;
-    return number == ENOENT && !isDanglingLink
-               ? std::nullopt
-               : std::optional(cannotCreate(pathFailure("write", path, number)));
+    return number == ENOENT && !isDanglingLink ? OrProgramError<void>()
+                                               : cannotCreate(pathFailure("write", path, number));
   }
   return S_ISREG(status.st_mode) || S_ISFIFO(status.st_mode)
-             ? std::nullopt
-             : std::optional(cannotCreate(notRegularFailure("write", path, status.st_mode)));
+             ? OrProgramError<void>()
+             : cannotCreate(notRegularFailure("write", path, status.st_mode));
 }
 
 /// The path from the machine's root, without links, of a file that is there or is to be made; a
@@ -61,7 +60,7 @@ std::string resolved(const std::string& path, bool exists, std::error_code& erro
 }
 
 /// Writes to a pipe, which somebody must be reading.
-std::optional<ProgramError> writeToPipe(const std::string& path, std::string_view contents) {
+OrProgramError<void> writeToPipe(const std::string& path, std::string_view contents) {
   const int opened = ::open(path.c_str(), O_WRONLY | O_NONBLOCK | O_NOCTTY | O_CLOEXEC);
   if (opened < 0) {
     return cannotCreate(errno == ENXIO ? pathFailure("write", path, "Nobody reads this pipe")
@@ -69,8 +68,7 @@ std::optional<ProgramError> writeToPipe(const std::string& path, std::string_vie
   }
   const FileDescriptor pipe(opened);
   const int number = writeAll(pipe.number(), contents);
-  return number == 0 ? std::nullopt
-                     : std::optional(cannotWrite(pathFailure("write", path, number)));
+  return number == 0 ? OrProgramError<void>() : cannotWrite(pathFailure("write", path, number));
 }
 
 /// Fills a temporary file; returns 0 or the error number.
@@ -116,10 +114,10 @@ OrProgramError<Replacement> makeReplacement(const std::string& path, const struc
 
 }  // namespace
 
-std::optional<ProgramError> replaceFile(const std::string& path, std::string_view contents) {
+OrProgramError<void> replaceFile(const std::string& path, std::string_view contents) {
   struct stat status = {};
-  if (std::optional<ProgramError> error = examine(path, status)) {
-    return error;
+  if (auto examined = examine(path, status); !examined) {
+    return examined;
   }
   if (S_ISFIFO(status.st_mode)) {
     return writeToPipe(path, contents);
@@ -134,30 +132,29 @@ std::optional<ProgramError> replaceFile(const std::string& path, std::string_vie
       number != 0 ? pathFailure("write", path, number)
                   : LinuxFileSystem(machine, directory).renameFile(temporary.entry.path(), target);
   if (moved) {
-    return std::nullopt;
+    return {};
   }
   // Gone already when only the directory could not be flushed; then there is nothing to remove.
   (void)temporary.entry.remove();
   return programErrorOf(moved.error(), ExitStatus::InputOutputError);
 }
 
-std::optional<ProgramError> whyNotReplaceable(const std::string& path) {
+OrProgramError<void> checkReplaceable(const std::string& path) {
   struct stat status = {};
-  if (std::optional<ProgramError> error = examine(path, status)) {
-    return error;
+  if (auto examined = examine(path, status); !examined) {
+    return examined;
   }
   if (S_ISFIFO(status.st_mode)) {
     // Not opened: closing it again would be the end for whoever reads it.
-    return ::access(path.c_str(), W_OK) == 0
-               ? std::nullopt
-               : std::optional(cannotCreate(pathFailure("write", path, errno)));
+    return ::access(path.c_str(), W_OK) == 0 ? OrProgramError<void>()
+                                             : cannotCreate(pathFailure("write", path, errno));
   }
   const auto made = makeReplacement(path, status);
   if (!made) {
     return made.error();
   }
   (void)made->temporary.entry.remove();
-  return std::nullopt;
+  return {};
 }
 
 }  // namespace accounts

@@ -14,15 +14,15 @@ constexpr rlim_t kKibibyte = 1024;
 
 }  // namespace
 
-std::optional<ProgramError> askForStack() {
+OrProgramError<void> askForStack() {
   rlimit limit = {};
   if (::getrlimit(RLIMIT_STACK, &limit) != 0 || limit.rlim_cur >= kNeeded) {
-    return std::nullopt;
+    return {};
   }
   const rlim_t allowed = limit.rlim_max;
   limit = {.rlim_cur = kNeeded, .rlim_max = std::max(kNeeded, limit.rlim_max)};
   if (::setrlimit(RLIMIT_STACK, &limit) == 0) {
-    return std::nullopt;
+    return {};
   }
   return ProgramError{ExitStatus::TemporaryFailure,
                       "Needs a stack of " + std::to_string(kNeeded / kKibibyte) +

@@ -8,6 +8,6 @@ namespace accounts {
 
 /// Lets the stack of this process, and of those that it forks, grow as far as property lists of any
 /// depth need, whatever it was limited to. An error where no more is allowed; it may pass.
-std::optional<ProgramError> askForStack();
+OrProgramError<void> askForStack();
 
 }  // namespace accounts

@@ -17,15 +17,14 @@ OrProgramError<OpenedDevice> openDevice(const DeviceOptions& options) {
   wanted.deviceDescriptionFile = options.deviceDescription;
   wanted.channel = options.channel;
   wanted.descriptionDecoding = DescriptionDecoding::Later;
-  LinuxPlatformError error;
-  std::unique_ptr<LinuxPlatform> platform = LinuxPlatform::create(wanted, error);
-  if (platform == nullptr) {
-    return programErrorOf(error);
+  auto platform = LinuxPlatform::create(wanted);
+  if (!platform) {
+    return programErrorOf(platform.error());
   }
-  if (const auto missing = whyNoDevice(platform->root(), options.root)) {
-    return *missing;
+  if (const auto device = checkIsDevice((*platform)->root(), options.root); !device) {
+    return device.error();
   }
-  return OpenedDevice{*std::move(bundle), std::move(platform)};
+  return OpenedDevice{*std::move(bundle), *std::move(platform)};
 }
 
 }  // namespace accounts

@@ -102,8 +102,8 @@ PluginOutcome runRecordedPlugin(const PluginWork& work, const Loaded& loaded,
   if (!loaded) {
     return failedOutcome(loaded.error());
   }
-  if (LinuxPlatformError error; !work.device.platform->decodeDescription(error)) {
-    return failedOutcome(programErrorOf(error));
+  if (const Result decoded = work.device.platform->decodeDescription(); !decoded) {
+    return failedOutcome(programErrorOf(decoded.error(), ExitStatus::MissingInput));
   }
   const LoadedPlugin& plugin = *loaded;
   if (!work.options.recorded) {
@@ -164,8 +164,8 @@ void handOverAndTell(const PluginWork& work, const WorkerSide& side, const Propo
   if (!errors || errors->kind != FrameKind::ReportErrors) {
     return;
   }
-  if (const auto error = reportErrorFrom(errors->bytes)) {
-    noteReportError(report, *error);
+  if (const auto written = writingFrom(errors->bytes); !written) {
+    noteReportError(report, written.error());
   }
   // What the plug-in printed, too, before the host ends.
   std::cout.flush();

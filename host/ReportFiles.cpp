@@ -16,27 +16,26 @@ JSON fullReport(std::string_view command, const RunReport& report,
   return object;
 }
 
-std::optional<ProgramError> whyNotWritable(const ReportFiles& files) {
+OrProgramError<void> checkWritable(const ReportFiles& files) {
+  OrProgramError<void> writable;
   for (const std::optional<std::string>& file : {files.json, files.html}) {
-    if (file) {
-      if (std::optional<ProgramError> error = whyNotReplaceable(*file)) {
-        return error;
-      }
+    if (file && writable) {
+      writable = checkReplaceable(*file);
     }
   }
-  return std::nullopt;
+  return writable;
 }
 
-std::optional<ProgramError> writeReport(const ReportFiles& files, std::string_view json,
-                                        std::string_view page) {
-  std::optional<ProgramError> error;
+OrProgramError<void> writeReport(const ReportFiles& files, std::string_view json,
+                                 std::string_view page) {
+  OrProgramError<void> written;
   if (files.json) {
-    error = replaceFile(*files.json, json);
+    written = replaceFile(*files.json, json);
   }
-  if (files.html && !error) {
-    error = replaceFile(*files.html, page);
+  if (files.html && written) {
+    written = replaceFile(*files.html, page);
   }
-  return error;
+  return written;
 }
 
 }  // namespace accounts

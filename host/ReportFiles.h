@@ -24,13 +24,13 @@ struct ReportFiles {
 JSON fullReport(std::string_view command, const RunReport& report,
                 const RecordedMigration& recorded);
 
-/// Why a report could not be written; none when it could be. To be asked before a migration, which
-/// is not run without the report that was asked for.
-std::optional<ProgramError> whyNotWritable(const ReportFiles& files);
+/// An error when a report could not be written. To be asked before a migration, which is not run
+/// without the report that was asked for.
+OrProgramError<void> checkWritable(const ReportFiles& files);
 
 /// Writes a report, as the bytes of each file that is wanted; an error for the first that cannot be
 /// written.
-std::optional<ProgramError> writeReport(const ReportFiles& files, std::string_view json,
-                                        std::string_view page);
+OrProgramError<void> writeReport(const ReportFiles& files, std::string_view json,
+                                 std::string_view page);
 
 }  // namespace accounts

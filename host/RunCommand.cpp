@@ -39,9 +39,10 @@ ExitStatus tellAlone(const RunOptions& options, const RunConclusion& conclusion)
   RunReport report;
   note(report, conclusion, options);
   const std::string text = lineOf(fullReport(commandOf(options), report, {}));
-  if (const auto error =
-          writeReport(options.reports, text + "\n", options.reports.html ? htmlReport(text) : "")) {
-    noteReportError(report, *error);
+  if (const auto written =
+          writeReport(options.reports, text + "\n", options.reports.html ? htmlReport(text) : "");
+      !written) {
+    noteReportError(report, written.error());
   }
   return print(toldResult(options, report, {}), report.exitStatus);
 }
@@ -59,16 +60,16 @@ ExitStatus tell(const RunOptions& options, const RunConclusion& conclusion, Work
     return tellAlone(options, conclusion);
   }
   ExitStatus exitStatus = conclusion.exitStatus;
-  std::optional<ProgramError> reportError;
+  OrProgramError<void> written;
   if (options.reports.areWanted()) {
-    reportError = writeReport(options.reports, reports->at(0), reports->at(1));
+    written = writeReport(options.reports, reports->at(0), reports->at(1));
   }
-  if (reportError && exitStatus == ExitStatus::Success) {
+  if (!written && exitStatus == ExitStatus::Success) {
     // A report that is missing is an error of a program that otherwise succeeded.
-    exitStatus = reportError->exitStatus;
+    exitStatus = written.error().exitStatus;
   }
-  const auto answer = worker->ask(FrameKind::ReportErrors, bytesOfReportError(reportError),
-                                  {FrameKind::ToldResult});
+  const auto answer =
+      worker->ask(FrameKind::ReportErrors, bytesOfWriting(written), {FrameKind::ToldResult});
   const auto told = answer ? toldResultFrom(answer->front()) : std::nullopt;
   return told ? print(*told, exitStatus) : tellAlone(options, conclusion);
 }
@@ -214,11 +215,11 @@ class OpenedRun {
 }  // namespace
 
 ExitStatus runMigration(const RunOptions& options) {
-  if (const auto error = whyNotWritable(options.reports)) {
+  if (const auto writable = checkWritable(options.reports); !writable) {
     // There is no file to tell it in either.
     RunOptions withoutReports = options;
     withoutReports.reports = {};
-    return tellAlone(withoutReports, conclusionOf(*error));
+    return tellAlone(withoutReports, conclusionOf(writable.error()));
   }
   StopSignals stop;
   const auto opened = openDevice(options.device);

@@ -73,21 +73,20 @@ std::optional<RunConclusion> conclusionFrom(std::string_view bytes) {
   return reader.isGood() && reader.isAtEnd() ? std::optional(std::move(conclusion)) : std::nullopt;
 }
 
-std::string bytesOfReportError(const std::optional<ProgramError>& error) {
+std::string bytesOfWriting(const OrProgramError<void>& written) {
   FlatWriter writer;
-  if (error) {
-    writer.add(static_cast<std::uint8_t>(error->exitStatus));
-    writer.addText(error->message);
+  if (!written) {
+    writer.add(static_cast<std::uint8_t>(written.error().exitStatus));
+    writer.addText(written.error().message);
   }
   return writer.take();
 }
 
-std::optional<ProgramError> reportErrorFrom(std::string_view bytes) {
+OrProgramError<void> writingFrom(std::string_view bytes) {
   FlatReader reader(bytes);
   const auto exitStatus = static_cast<ExitStatus>(reader.take<std::uint8_t>());
   std::string message = reader.takeText(kLongestText);
-  return reader.isGood() ? std::optional(ProgramError{exitStatus, std::move(message)})
-                         : std::nullopt;
+  return reader.isGood() ? ProgramError{exitStatus, std::move(message)} : OrProgramError<void>();
 }
 
 std::string_view commandOf(const RunOptions& options) {

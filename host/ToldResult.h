@@ -17,9 +17,9 @@ namespace accounts {
 std::string bytesOf(const RunConclusion& conclusion);
 std::optional<RunConclusion> conclusionFrom(std::string_view bytes);
 
-/// Why a report could not be written, or none, as bytes, and back.
-std::string bytesOfReportError(const std::optional<ProgramError>& error);
-std::optional<ProgramError> reportErrorFrom(std::string_view bytes);
+/// Whether a report was written, as bytes, and back.
+std::string bytesOfWriting(const OrProgramError<void>& written);
+OrProgramError<void> writingFrom(std::string_view bytes);
 
 /// What people and programs get of a run.
 struct ToldResult {

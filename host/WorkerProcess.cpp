@@ -73,8 +73,7 @@ void WorkerProcess::end() {
   }
 }
 
-std::optional<ProgramError> WorkerProcess::start(const DeviceSnapshot& snapshot,
-                                                 const WorkerTask& task) {
+OrProgramError<void> WorkerProcess::start(const DeviceSnapshot& snapshot, const WorkerTask& task) {
   const int memory = memfd_create("migration", MFD_CLOEXEC | MFD_ALLOW_SEALING);
   if (memory < 0) {
     return temporaryFailure("No memory for the migration's result");
@@ -105,18 +104,18 @@ std::optional<ProgramError> WorkerProcess::start(const DeviceSnapshot& snapshot,
     return temporaryFailure("The plug-in's process cannot be watched");
   }
   process_.emplace(process);
-  return std::nullopt;
+  return {};
 }
 
-std::optional<ProgramError> WorkerProcess::waitForIt() {
+OrProgramError<void> WorkerProcess::waitForIt() {
   // Both: a process that the plug-in left behind may hold the socket open.
   if (stop_.waitForEither(*process_, *socket_)) {
-    return std::nullopt;
+    return {};
   }
   const bool endedByItself =
       rights_ == WorkerRights::ThoseOfTheHost && stop_.waitForEndOf(*process_, kGrace);
   if (endedByItself) {
-    return std::nullopt;
+    return {};
   }
   end();
   return ProgramError{ExitStatus::TemporaryFailure,
@@ -144,12 +143,12 @@ OrProgramError<HandedOver> WorkerProcess::takeOver(std::string proposal) {
 
 OrProgramError<HandedOver> WorkerProcess::work(const DeviceSnapshot& snapshot,
                                                const WorkerTask& task) {
-  if (auto error = start(snapshot, task)) {
-    return *std::move(error);
+  if (const auto started = start(snapshot, task); !started) {
+    return started.error();
   }
   for (;;) {
-    if (auto error = waitForIt()) {
-      return *std::move(error);
+    if (const auto waited = waitForIt(); !waited) {
+      return waited.error();
     }
     pollfd readable = {socket_->number(), POLLIN, 0};
     std::optional<Frame> frame = poll(&readable, 1, 0) > 0 && (readable.revents & POLLIN) != 0

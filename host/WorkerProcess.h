@@ -59,9 +59,9 @@ class WorkerProcess final : public Worker {
                                               const std::vector<FrameKind>& answers);
 
  private:
-  std::optional<ProgramError> start(const DeviceSnapshot& snapshot, const WorkerTask& task);
+  OrProgramError<void> start(const DeviceSnapshot& snapshot, const WorkerTask& task);
   /// Waits until the worker has sent something or ended; an error when the host is to stop.
-  std::optional<ProgramError> waitForIt();
+  OrProgramError<void> waitForIt();
   /// Waits for the worker's end and says how it ended.
   ProgramError describeEnd();
   /// Takes what the worker made. An error when others could still change it.

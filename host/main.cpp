@@ -57,8 +57,8 @@ ExitStatus run(int argumentCount, char** arguments) {
   try {
     const MemoryReserve reserve;
     commandLine = parseCommandLine(argumentCount, arguments);
-    if (const auto error = askForStack()) {
-      return finish(*error, commandLine);
+    if (const auto stack = askForStack(); !stack) {
+      return finish(stack.error(), commandLine);
     }
     return std::visit([&](const auto& asked) { return finish(asked, commandLine); },
                       commandLine.asked);

@@ -28,8 +28,8 @@ ProgramError lockErrorOf(LockEnd end, const HostLocks& locks) {
 }
 
 RunConclusion MigrationRun::run(RunPurpose purpose, KeepFiles keep) {
-  if (auto error = takeLocks(purpose)) {
-    fail(*std::move(error));
+  if (auto taken = takeLocks(purpose); !taken) {
+    fail(std::move(taken).error());
     return std::move(conclusion_);
   }
   if (purpose != RunPurpose::Plan) {
@@ -51,7 +51,7 @@ RunConclusion MigrationRun::run(RunPurpose purpose, KeepFiles keep) {
   return std::move(conclusion_);
 }
 
-std::optional<ProgramError> MigrationRun::takeLocks(RunPurpose purpose) {
+OrProgramError<void> MigrationRun::takeLocks(RunPurpose purpose) {
   HostLocks& locks = means_.locks;
   if (const LockEnd end = locks.takeRoot(means_.lockTimeout); end != LockEnd::Taken) {
     return lockErrorOf(end, locks);
@@ -59,14 +59,13 @@ std::optional<ProgramError> MigrationRun::takeLocks(RunPurpose purpose) {
   if (purpose == RunPurpose::Plan) {
     lock_ =
         locks.canTakeMigration() ? MigrationLockState::Available : MigrationLockState::Impossible;
-    return std::nullopt;
+    return {};
   }
   const LockEnd end = locks.takeMigration(means_.lockTimeout);
   // Without a lock the plug-in says for itself that it cannot migrate.
   lock_ = end == LockEnd::Taken ? MigrationLockState::Available : MigrationLockState::Impossible;
-  return end == LockEnd::Taken || end == LockEnd::Impossible
-             ? std::nullopt
-             : std::optional(lockErrorOf(end, locks));
+  const bool goesOn = end == LockEnd::Taken || end == LockEnd::Impossible;
+  return goesOn ? OrProgramError<void>() : lockErrorOf(end, locks);
 }
 
 MigrationRun::Attempt MigrationRun::attempt(RunPurpose purpose, KeepFiles keep) {

@@ -99,7 +99,7 @@ class MigrationRun {
  private:
   enum class Attempt : std::uint8_t { Over, GivenUp };
 
-  std::optional<ProgramError> takeLocks(RunPurpose purpose);
+  OrProgramError<void> takeLocks(RunPurpose purpose);
   Attempt attempt(RunPurpose purpose, KeepFiles keep);
   Attempt commit(const DeviceSnapshot& snapshot, const Proposal& proposal);
   Attempt fail(ProgramError error);

@@ -51,13 +51,12 @@ int main(int argc, char** argv) {
   options.rootDirectory = argv[1];
   options.bundleResourcesDirectory = std::string(argv[2]) + "/Resources";
 
-  LinuxPlatformError error;
-  const std::unique_ptr<LinuxPlatform> platform = LinuxPlatform::create(options, error);
-  if (platform == nullptr) {
-    std::fprintf(stderr, "notify: %s\n", error.failure.text.c_str());
+  const auto platform = LinuxPlatform::create(options);
+  if (!platform) {
+    std::fprintf(stderr, "notify: %s\n", platform.error().failure.text.c_str());
     return 1;
   }
-  Process process(platform->platform());
+  Process process((*platform)->platform());
   const std::unique_ptr<AccountsManager> store = AccountsManager::init();
   renameFirst(*store, kYahooAccountType, kAccountDataclassMail);
   deleteFirst(*store, kExchangeAccountType);

@@ -36,28 +36,18 @@ using Kind = LinuxPlatformError::Kind;
 constexpr std::string_view kTemporaryDirectoryInHome = "tmp";
 constexpr std::string_view kJournal = "journal";
 
-bool fail(LinuxPlatformError& error, Kind kind, Failure failure) {
-  error = {kind, std::move(failure)};
-  return false;
-}
-
-bool checkDevicePath(std::string_view option, const std::string& path, LinuxPlatformError& error) {
+Result checkDevicePath(std::string_view option, const std::string& path) {
   if (path.starts_with('/')) {
-    return true;
+    return {};
   }
   std::string text = "The ";
   text.append(option).append(" \"").append(path).append("\" is not an absolute path of the device");
-  return fail(error, Kind::UnusableOption, {0, std::move(text)});
+  return Failure{.text = std::move(text)};
 }
 
-bool checkResources(const std::string& directory, LinuxPlatformError& error) {
-  const int number = ::open(directory.c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC);
-  if (number < 0) {
-    return fail(error, Kind::MissingInput,
-                pathFailure("open the bundle's resources", directory, errno));
-  }
-  ::close(number);
-  return true;
+Result checkResources(const std::string& directory) {
+  const FileDescriptor opened(::open(directory.c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC));
+  return asResult("open the bundle's resources", directory, opened.number() < 0 ? errno : 0);
 }
 
 /// A log, and what it writes to.
@@ -167,44 +157,49 @@ struct LinuxPlatform::Parts {
                        .uuidGenerator = uuidGenerator};
 };
 
-std::unique_ptr<LinuxPlatform> LinuxPlatform::create(const LinuxPlatformOptions& options,
-                                                     LinuxPlatformError& error) {
-  if (!checkDevicePath("home directory", options.homeDirectory, error) ||
-      (options.temporaryDirectory &&
-       !checkDevicePath("temporary directory", *options.temporaryDirectory, error)) ||
-      !checkResources(options.bundleResourcesDirectory, error)) {
-    return nullptr;
+OrError<std::unique_ptr<LinuxPlatform>, LinuxPlatformError> LinuxPlatform::create(
+    const LinuxPlatformOptions& options) {
+  Result usable = checkDevicePath("home directory", options.homeDirectory);
+  if (usable && options.temporaryDirectory) {
+    usable = checkDevicePath("temporary directory", *options.temporaryDirectory);
+  }
+  if (!usable) {
+    return LinuxPlatformError{Kind::UnusableOption, usable.error()};
+  }
+  if (const Result there = checkResources(options.bundleResourcesDirectory); !there) {
+    return LinuxPlatformError{Kind::MissingInput, there.error()};
   }
   auto root = DeviceRoot::openRoot(options.rootDirectory);
   if (!root) {
     const Kind kind = root.error().number == ENOSYS ? Kind::InputOutput : Kind::MissingInput;
-    fail(error, kind, root.error());
-    return nullptr;
+    return LinuxPlatformError{kind, root.error()};
   }
   auto description = readDescription(options, *root);
   if (!description) {
-    fail(error, Kind::MissingInput, description.error());
-    return nullptr;
+    return LinuxPlatformError{Kind::MissingInput, description.error()};
   }
   auto log = openLog(options);
   if (!log) {
-    fail(error, Kind::CannotCreate, log.error());
-    return nullptr;
+    return LinuxPlatformError{Kind::CannotCreate, log.error()};
   }
   std::unique_ptr<LinuxPlatform> platform(new LinuxPlatform(std::make_unique<Parts>(
       options, std::move(*root), *std::move(description), *std::move(log))));
-  const bool isUsable = options.descriptionDecoding == DescriptionDecoding::Later ||
-                        platform->decodeDescription(error);
-  return isUsable ? std::move(platform) : nullptr;
+  const Result decoded = options.descriptionDecoding == DescriptionDecoding::AtOnce
+                             ? platform->decodeDescription()
+                             : Result();
+  if (!decoded) {
+    return LinuxPlatformError{Kind::MissingInput, decoded.error()};
+  }
+  return platform;
 }
 
-bool LinuxPlatform::decodeDescription(LinuxPlatformError& error) {
+Result LinuxPlatform::decodeDescription() {
   auto description = decodeDeviceDescription(parts_->descriptionBytes);
   if (!description) {
-    return fail(error, Kind::MissingInput, description.error());
+    return description.error();
   }
   parts_->description = *std::move(description);
-  return true;
+  return {};
 }
 
 Result LinuxPlatform::readAhead() {

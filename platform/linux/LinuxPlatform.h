@@ -64,14 +64,12 @@ struct LinuxPlatformError {
 /// changes nothing beneath the root.
 class LinuxPlatform {
  public:
-  /// Null, with `error` set, when it cannot be made.
-  static std::unique_ptr<LinuxPlatform> create(const LinuxPlatformOptions& options,
-                                               LinuxPlatformError& error);
+  static OrError<std::unique_ptr<LinuxPlatform>, LinuxPlatformError> create(
+      const LinuxPlatformOptions& options);
   ~LinuxPlatform();
 
-  /// Looks into the device description, which was read when this was made. False, with `error` set,
-  /// when it is malformed.
-  bool decodeDescription(LinuxPlatformError& error);
+  /// Looks into the device description, which was read when this was made; it may be malformed.
+  Result decodeDescription();
 
   /// Opens and reads what else the plug-in may ask for outside the root: the bundle's resources and
   /// the local time zone. Nothing needs to be opened for them from then on. An error when this

@@ -107,13 +107,12 @@ TEST(HandedOver, WhatPeopleAreToldThatIsNotWholeIsNone) {
 }
 
 TEST(HandedOver, WhyAReportCouldNotBeWrittenArrivesAndNothingStandsForNoError) {
-  const auto arrived =
-      reportErrorFrom(bytesOfReportError(ProgramError{ExitStatus::CannotCreate, "Full"}));
+  const auto arrived = writingFrom(bytesOfWriting(ProgramError{ExitStatus::CannotCreate, "Full"}));
 
-  ASSERT_TRUE(arrived);
-  EXPECT_EQ(arrived->exitStatus, ExitStatus::CannotCreate);
-  EXPECT_EQ(arrived->message, "Full");
-  EXPECT_FALSE(reportErrorFrom(bytesOfReportError(std::nullopt)));
+  ASSERT_FALSE(arrived);
+  EXPECT_EQ(arrived.error().exitStatus, ExitStatus::CannotCreate);
+  EXPECT_EQ(arrived.error().message, "Full");
+  EXPECT_TRUE(writingFrom(bytesOfWriting({})));
 }
 
 }  // namespace

@@ -37,7 +37,14 @@ class LinuxPlatformTest : public DeviceFixture {
   }
 
   [[nodiscard]] fs::path resources() const { return outside() / "Resources"; }
-  std::unique_ptr<LinuxPlatform> create() { return LinuxPlatform::create(options, error); }
+  /// Null, with `error` set, when it cannot be made.
+  std::unique_ptr<LinuxPlatform> create() {
+    auto made = LinuxPlatform::create(options);
+    if (!made) {
+      error = made.error();
+    }
+    return std::move(made).value_or(nullptr);
+  }
 
   LinuxPlatformOptions options;
   LinuxPlatformError error;

@@ -45,15 +45,15 @@ int main(int argc, char** argv) {
   CLI11_PARSE(program, argc, argv);
   options.bundleResourcesDirectory = bundle + "/Resources";
 
-  LinuxPlatformError error;
-  const std::unique_ptr<LinuxPlatform> platform = LinuxPlatform::create(options, error);
-  if (platform == nullptr) {
-    std::fprintf(stderr, "observe: %s\n", error.failure.text.c_str());
+  const auto made = LinuxPlatform::create(options);
+  if (!made) {
+    std::fprintf(stderr, "observe: %s\n", made.error().failure.text.c_str());
     return 1;
   }
-  Process process(platform->platform());
+  Platform& platform = (*made)->platform();
+  Process process(platform);
   for (int time = 0; time < times; ++time) {
-    observe(platform->platform());
+    observe(platform);
     std::this_thread::sleep_for(kPause);
   }
   return 0;
