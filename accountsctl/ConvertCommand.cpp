@@ -15,24 +15,23 @@ CommandResult convert(const ConvertOptions& options, const CommandWorker& worker
   if (!input) {
     return input.error();
   }
-  PropertyListError unwritable;
   auto* const write =
       options.form == PropertyListForm::XML ? &writeXMLPropertyList : &writeBinaryPropertyList;
-  std::optional<std::string> bytes = write(input->front(), unwritable);
+  auto bytes = write(input->front());
   if (!bytes) {
-    return ProgramError{ExitStatus::MalformedInput, unwritable.text};
+    return ProgramError{ExitStatus::MalformedInput, bytes.error().text};
   }
   if (options.output == kStandardStream) {
     return CommandReport{*std::move(bytes)};
   }
   if (!options.reportsJSON) {
-    return CommandReport{.text = {}, .file = std::move(bytes)};
+    return CommandReport{.text = {}, .file = *std::move(bytes)};
   }
   JSON object = reportObject("convert");
   object["input"] = options.input;
   object["output"] = options.output;
   return CommandReport{.text = lineOf(std::move(object), ExitStatus::Success),
-                       .file = std::move(bytes)};
+                       .file = *std::move(bytes)};
 }
 
 }  // namespace accounts

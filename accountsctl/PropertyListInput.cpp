@@ -24,12 +24,12 @@ OrProgramError<std::vector<PropertyValue>> readPropertyListInputs(
   worker.giveUpRights(inputs);
   std::vector<PropertyValue> values;
   for (std::size_t index = 0; index < files.size(); ++index) {
-    PropertyListError malformed;
-    std::optional<PropertyValue> value = readPropertyList(contents[index], malformed);
+    auto value = readPropertyList(contents[index]);
     if (!value) {
       return ProgramError{
           ExitStatus::MalformedInput,
-          pathFailure("read the property list", nameOfInput(files[index]), malformed.text).text};
+          pathFailure("read the property list", nameOfInput(files[index]), value.error().text)
+              .text};
     }
     values.push_back(*std::move(value));
     contents[index] = {};

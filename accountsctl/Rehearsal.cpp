@@ -67,10 +67,9 @@ Rehearsed rehearse(LinuxPlatform& linux, const DeviceSnapshot& snapshot) {
 
 Rehearsed rehearseFile(DevicePlatform& device, FileKind kind, const PropertyValue& content,
                        const std::string& name) {
-  PropertyListError error;
-  std::optional<std::string> bytes = writeBinaryPropertyList(content, error);
+  auto bytes = writeBinaryPropertyList(content);
   if (!bytes) {
-    return ProgramError{ExitStatus::MalformedInput, error.text};
+    return ProgramError{ExitStatus::MalformedInput, bytes.error().text};
   }
   LinuxPlatform& linux = device.linuxPlatform();
   const DevicePlace place = placeOf(kind);

@@ -18,10 +18,9 @@ std::string shownJSON(const PropertyValue& content, const ShowOptions& options) 
 }
 
 CommandResult shownXML(const PropertyValue& content) {
-  PropertyListError error;
-  std::optional<std::string> text = writeXMLPropertyList(content, error);
+  auto text = writeXMLPropertyList(content);
   if (!text) {
-    return ProgramError{ExitStatus::MalformedInput, error.text};
+    return ProgramError{ExitStatus::MalformedInput, text.error().text};
   }
   return CommandReport{*std::move(text)};
 }

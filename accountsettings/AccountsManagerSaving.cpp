@@ -27,15 +27,13 @@ PropertyArray accountsOnDisk() {
 
 /// What the account settings file is to hold; none, with a channel line, when it cannot be written.
 SerializedPropertyList serialize(const PropertyDictionary& root) {
-  SerializedPropertyList serialized;
-  const Result serialization =
-      Process::current().platform.propertyLists.serializeBinary(root, serialized);
-  if (!serialized) {
+  auto serialized = Process::current().platform.propertyLists.serializeBinary(root);
+  if (!serialized || !*serialized) {
     logToChannel(kSaveOperation, "Failed to serialize account settings data: %@", [&] {
-      return logArguments(serialization ? std::optional<Text>() : Text(serialization.error().text));
+      return logArguments(serialized ? std::optional<Text>() : Text(serialized.error().text));
     });
   }
-  return serialized;
+  return std::move(serialized).value_or(SerializedPropertyList());
 }
 
 /// Fills the temporary file and moves it over the account settings file. False when a step fails.

@@ -44,10 +44,9 @@ Failure writeFile(const fs::path& path, std::string_view contents) {
 }
 
 Failure writePropertyList(const fs::path& path, const PropertyDictionary& contents) {
-  PropertyListError error;
-  const std::optional<std::string> bytes = writeBinaryPropertyList(contents, error);
+  const auto bytes = writeBinaryPropertyList(contents);
   return bytes ? writeFile(path, *bytes)
-               : Failure("No bytes for " + path.string() + ": " + error.text);
+               : Failure("No bytes for " + path.string() + ": " + bytes.error().text);
 }
 
 Failure makeDirectories(const fs::path& root) {

@@ -24,10 +24,7 @@ const PropertyValue& corpus() {
 }
 
 const std::string& binaryFile() {
-  static const std::string file = [] {
-    PropertyListError error;
-    return writeBinaryPropertyList(corpus(), error).value();
-  }();
+  static const std::string file = writeBinaryPropertyList(corpus()).value();
   return file;
 }
 
@@ -54,12 +51,11 @@ BENCHMARK(copyBytes)->Unit(benchmark::kMillisecond);
 
 void readBinary(benchmark::State& state) {
   const std::string& file = binaryFile();
-  PropertyListError error;
   for (auto _ : state) {
-    std::optional<PropertyValue> value = readBinaryPropertyList(file, error);
+    auto value = readBinaryPropertyList(file);
     benchmark::DoNotOptimize(value);
     state.PauseTiming();
-    value.reset();
+    value = PropertyValue();
     state.ResumeTiming();
   }
   countBytes(state, binaryFile().size());
@@ -68,9 +64,8 @@ BENCHMARK(readBinary)->Unit(benchmark::kMillisecond);
 
 void readBinaryAndLetGo(benchmark::State& state) {
   const std::string& file = binaryFile();
-  PropertyListError error;
   for (auto _ : state) {
-    std::optional<PropertyValue> value = readBinaryPropertyList(file, error);
+    auto value = readBinaryPropertyList(file);
     benchmark::DoNotOptimize(value);
   }
   countBytes(state, binaryFile().size());
@@ -78,9 +73,8 @@ void readBinaryAndLetGo(benchmark::State& state) {
 BENCHMARK(readBinaryAndLetGo)->Unit(benchmark::kMillisecond);
 
 void writeValue(benchmark::State& state, const PropertyValue& value) {
-  PropertyListError error;
   for (auto _ : state) {
-    std::optional<std::string> file = writeBinaryPropertyList(value, error);
+    auto file = writeBinaryPropertyList(value);
     benchmark::DoNotOptimize(file);
   }
   countBytes(state, binaryFile().size());
@@ -88,17 +82,15 @@ void writeValue(benchmark::State& state, const PropertyValue& value) {
 
 // Equal texts share their memory, as after reading a file.
 void writeBinaryAfterReading(benchmark::State& state) {
-  PropertyListError error;
-  writeValue(state, readBinaryPropertyList(binaryFile(), error).value());
+  writeValue(state, readBinaryPropertyList(binaryFile()).value());
 }
 BENCHMARK(writeBinaryAfterReading)->Unit(benchmark::kMillisecond);
 
 // As a save takes the bytes: they never stand in memory whole.
 void writeBinaryInPieces(benchmark::State& state) {
-  PropertyListError error;
-  const PropertyValue value = readBinaryPropertyList(binaryFile(), error).value();
+  const PropertyValue value = readBinaryPropertyList(binaryFile()).value();
   for (auto _ : state) {
-    const SerializedPropertyList file = BinaryPropertyListSerializer().serialize(value, error);
+    const SerializedPropertyList file = BinaryPropertyListSerializer().serialize(value).value();
     const bool areTaken = file.giveTo([](std::string_view piece) {
       benchmark::DoNotOptimize(piece.data());
       return true;
@@ -117,12 +109,11 @@ BENCHMARK(writeBinaryBuiltInMemory)->Unit(benchmark::kMillisecond);
 
 void readXML(benchmark::State& state) {
   const std::string& file = xmlFile();
-  PropertyListError error;
   for (auto _ : state) {
-    std::optional<PropertyValue> value = readXMLPropertyList(file, error);
+    auto value = readXMLPropertyList(file);
     benchmark::DoNotOptimize(value);
     state.PauseTiming();
-    value.reset();
+    value = PropertyValue();
     state.ResumeTiming();
   }
   countBytes(state, xmlFile().size());

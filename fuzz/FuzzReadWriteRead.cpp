@@ -9,22 +9,21 @@ namespace accounts {
 /// A value that is read, in either format, is written, and what is written reads as an equal value
 /// and is written to the same bytes again.
 void runOneInput(std::string_view bytes) {
-  PropertyListError error;
-  const std::optional<PropertyValue> value = readPropertyList(bytes, error);
+  const auto value = readPropertyList(bytes);
   if (!value) {
     return;
   }
-  const std::optional<std::string> written = writeBinaryPropertyList(*value, error);
+  const auto written = writeBinaryPropertyList(*value);
   if (!written) {
     // A file that has more bytes than its values take may stand for more than one without them.
-    require(error.text.find("more values than a file of its size") != error.text.npos,
+    require(written.error().text.find("more values than a file of its size") != std::string::npos,
             "what is read can be written");
     return;
   }
-  const std::optional<PropertyValue> again = readPropertyList(*written, error);
+  const auto again = readPropertyList(*written);
   require(again.has_value(), "what is written can be read");
   require(*again == *value, "what is written reads as an equal value");
-  require(writeBinaryPropertyList(*again, error) == written,
+  require(writeBinaryPropertyList(*again) == written,
           "an equal value is written to the same bytes");
 }
 

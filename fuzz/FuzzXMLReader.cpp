@@ -6,11 +6,10 @@ namespace accounts {
 
 /// Any bytes give the XML reader a value that can be written, or an error text.
 void runOneInput(std::string_view bytes) {
-  PropertyListError error;
-  const std::optional<PropertyValue> value = readXMLPropertyList(bytes, error);
-  require(value.has_value() || !error.text.empty(), "an error has a text");
+  const auto value = readXMLPropertyList(bytes);
+  require(value || !value.error().text.empty(), "an error has a text");
   if (value) {
-    require(writeBinaryPropertyList(*value, error).has_value(), "what is read can be written");
+    require(writeBinaryPropertyList(*value).has_value(), "what is read can be written");
   }
 }
 

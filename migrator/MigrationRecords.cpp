@@ -147,11 +147,10 @@ void AccountsDataMigrator::_saveCollatedMigrationInformation() {
   const std::string name = std::string(kInformationFilePrefix)
                                .append(platform.dateFormatter.currentDate(kInformationDatePattern))
                                .append(kInformationFileSuffix);
-  SerializedPropertyList information;
-  if (platform.propertyLists.serializeBinary(*_collatedMigrationData, information)) {
+  if (const auto information = platform.propertyLists.serializeBinary(*_collatedMigrationData)) {
     // The file is a help for engineers: a migration never fails for want of it, nor reports it.
     static_cast<void>(
-        platform.fileSystem.writeFileAtomically(joinedPath(directory, name), information));
+        platform.fileSystem.writeFileAtomically(joinedPath(directory, name), *information));
   }
 }
 

@@ -13,7 +13,7 @@ namespace accounts {
 
 /// The version of what frameworks and the bundle share with a program that loads them: all headers
 /// of platform/ and of the values. To be raised when one of them changes its layout.
-inline constexpr std::uint32_t kInterfaceVersion = 3;
+inline constexpr std::uint32_t kInterfaceVersion = 4;
 /// The name under which what is loaded tells the version that it was built with.
 inline constexpr const char* kInterfaceVersionFunction = "AccountsInterfaceVersion";
 

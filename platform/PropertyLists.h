@@ -19,10 +19,9 @@ class PropertyLists {
   /// dictionary.
   virtual std::optional<PropertyDictionary> readDictionary(std::string_view path) = 0;
 
-  /// Makes of a value what is written in the binary format; its bytes are made when it is. Fails,
-  /// leaving `serialized` none, for a value that no reader would take back (PropertyListLimits.h).
-  virtual Result serializeBinary(const PropertyValue& value,
-                                 SerializedPropertyList& serialized) = 0;
+  /// Makes of a value what is written in the binary format; its bytes are made when it is. An
+  /// error for a value that no reader would take back (PropertyListLimits.h).
+  virtual OrFailure<SerializedPropertyList> serializeBinary(const PropertyValue& value) = 0;
 };
 
 }  // namespace accounts

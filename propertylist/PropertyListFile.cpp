@@ -5,13 +5,11 @@
 
 namespace accounts {
 
-std::optional<PropertyValue> readPropertyList(std::string_view bytes, PropertyListError& error) {
+OrPropertyListError<PropertyValue> readPropertyList(std::string_view bytes) {
   if (bytes.empty()) {
-    error.text = "property list: the file is empty";
-    return std::nullopt;
+    return PropertyListError{"property list: the file is empty"};
   }
-  return isBinaryPropertyList(bytes) ? readBinaryPropertyList(bytes, error)
-                                     : readXMLPropertyList(bytes, error);
+  return isBinaryPropertyList(bytes) ? readBinaryPropertyList(bytes) : readXMLPropertyList(bytes);
 }
 
 }  // namespace accounts

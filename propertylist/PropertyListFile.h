@@ -1,6 +1,5 @@
 #pragma once
 
-#include <optional>
 #include <string_view>
 
 #include "propertylist/PropertyListError.h"
@@ -9,7 +8,7 @@
 namespace accounts {
 
 /// The value that the bytes of a property-list file hold, in whichever of the two formats they are.
-/// None, with `error` saying what is wrong and where, when they are malformed.
-std::optional<PropertyValue> readPropertyList(std::string_view bytes, PropertyListError& error);
+/// An error says what is wrong and where when they are malformed.
+OrPropertyListError<PropertyValue> readPropertyList(std::string_view bytes);
 
 }  // namespace accounts

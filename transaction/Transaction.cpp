@@ -55,8 +55,7 @@ std::optional<PropertyDictionary> Transaction::dictionaryBefore(DevicePlace plac
   if (!decoded.isDecoded) {
     decoded.isDecoded = true;
     if (const std::optional<std::string> bytes = bytesBefore(place)) {
-      PropertyListError malformed;
-      const std::optional<PropertyValue> value = readPropertyList(*bytes, malformed);
+      const auto value = readPropertyList(*bytes);
       const PropertyDictionary* const dictionary = value ? value->asDictionary() : nullptr;
       decoded.dictionary = dictionary != nullptr ? std::optional(*dictionary) : std::nullopt;
     }

@@ -17,8 +17,8 @@ class TransactionPropertyLists final : public PropertyLists {
     const std::optional<DevicePlace> place = transaction_.placeOf(path);
     return place ? transaction_.dictionaryAt(*place) : std::nullopt;
   }
-  Result serializeBinary(const PropertyValue& value, SerializedPropertyList& serialized) override {
-    return serializer_.serializeBinary(value, serialized);
+  OrFailure<SerializedPropertyList> serializeBinary(const PropertyValue& value) override {
+    return serializer_.serializeBinary(value);
   }
 
  private:

@@ -11,10 +11,9 @@ constexpr std::string_view kReadOperation = "read the property list";
 }  // namespace
 
 OrFailure<PropertyDictionary> dictionaryFromBytes(std::string_view bytes, std::string_view path) {
-  PropertyListError malformed;
-  const auto value = readPropertyList(bytes, malformed);
+  const auto value = readPropertyList(bytes);
   if (!value) {
-    return pathFailure(kReadOperation, path, malformed.text);
+    return pathFailure(kReadOperation, path, value.error().text);
   }
   const PropertyDictionary* dictionary = value->asDictionary();
   if (dictionary == nullptr) {

@@ -11,11 +11,12 @@ std::optional<PropertyDictionary> LinuxPropertyLists::readDictionary(std::string
   return valueOrNone(bytes ? dictionaryFromBytes(*bytes, path) : bytes.error());
 }
 
-Result LinuxPropertyLists::serializeBinary(const PropertyValue& value,
-                                           SerializedPropertyList& serialized) {
-  PropertyListError error;
-  serialized = serializer_.serialize(value, error);
-  return serialized ? Result() : Failure{.text = std::move(error.text)};
+OrFailure<SerializedPropertyList> LinuxPropertyLists::serializeBinary(const PropertyValue& value) {
+  auto serialized = serializer_.serialize(value);
+  if (!serialized) {
+    return Failure{.text = serialized.error().text};
+  }
+  return *std::move(serialized);
 }
 
 }  // namespace accounts

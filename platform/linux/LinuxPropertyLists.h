@@ -15,7 +15,7 @@ class LinuxPropertyLists final : public PropertyLists {
   explicit LinuxPropertyLists(const DeviceRoot& root) : root_(root) {}
 
   std::optional<PropertyDictionary> readDictionary(std::string_view path) override;
-  Result serializeBinary(const PropertyValue& value, SerializedPropertyList& serialized) override;
+  OrFailure<SerializedPropertyList> serializeBinary(const PropertyValue& value) override;
 
  private:
   const DeviceRoot& root_;

@@ -416,13 +416,14 @@ bool isBinaryPropertyList(std::string_view bytes) {
   return bytes.starts_with(binaryplist::kSignature);
 }
 
-std::optional<PropertyValue> readBinaryPropertyList(std::string_view bytes,
-                                                    PropertyListError& error) {
+OrPropertyListError<PropertyValue> readBinaryPropertyList(std::string_view bytes) {
   binaryplist::Layout layout;
-  if (!binaryplist::readTrailer(bytes, layout, error)) {
-    return std::nullopt;
+  PropertyListError error;
+  std::optional<PropertyValue> value;
+  if (binaryplist::readTrailer(bytes, layout, error)) {
+    value = binaryplist::Reader(layout, error).read();
   }
-  return binaryplist::Reader(layout, error).read();
+  return value ? OrPropertyListError<PropertyValue>(*std::move(value)) : std::move(error);
 }
 
 }  // namespace accounts

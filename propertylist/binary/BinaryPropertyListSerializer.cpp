@@ -18,8 +18,7 @@ namespace accounts {
 /// save that changed three accounts looks at three.
 class BinaryPropertyListSerializer::Check {
  public:
-  Check(const std::vector<Element>& lastElements, PropertyListError& error)
-      : lastElements_(lastElements), error_(error) {}
+  explicit Check(const std::vector<Element>& lastElements) : lastElements_(lastElements) {}
 
   bool passes(const PropertyValue& root) {
     const PropertyDictionary* const dictionary = root.asDictionary();
@@ -35,6 +34,8 @@ class BinaryPropertyListSerializer::Check {
 
   /// Those of the value that passed.
   [[nodiscard]] std::vector<Element> takeElements() { return std::move(elements_); }
+  /// Why a value did not pass.
+  [[nodiscard]] const PropertyListError& error() const { return error_; }
 
  private:
   /// How far off its place an element is looked for.
@@ -150,39 +151,37 @@ class BinaryPropertyListSerializer::Check {
   }
 
   const std::vector<Element>& lastElements_;
-  PropertyListError& error_;
+  PropertyListError error_;
   Extent whole_ = {.expandedCount = 0, .size = kSizeOfFrame};
   std::vector<Element> elements_;
   /// Where among the last elements the next one is looked for first.
   std::size_t next_ = 0;
 };
 
-SerializedPropertyList BinaryPropertyListSerializer::serialize(const PropertyValue& value,
-                                                               PropertyListError& error) {
-  Check check(lastElements_, error);
+OrPropertyListError<SerializedPropertyList> BinaryPropertyListSerializer::serialize(
+    const PropertyValue& value) {
+  Check check(lastElements_);
   if (!check.passes(value)) {
-    return {};
+    return check.error();
   }
   lastElements_ = check.takeElements();
   lastValue_ = value;
-  return {value, &binaryplist::giveFile};
+  return SerializedPropertyList(value, &binaryplist::giveFile);
 }
 
-std::optional<std::string> writeBinaryPropertyList(const PropertyValue& value,
-                                                   PropertyListError& error) {
-  const SerializedPropertyList serialized = BinaryPropertyListSerializer().serialize(value, error);
+OrPropertyListError<std::string> writeBinaryPropertyList(const PropertyValue& value) {
+  const auto serialized = BinaryPropertyListSerializer().serialize(value);
   if (!serialized) {
-    return std::nullopt;
+    return serialized.error();
   }
   std::string bytes;
-  const bool isWhole = serialized.giveTo([&bytes](std::string_view piece) {
+  const bool isWhole = serialized->giveTo([&bytes](std::string_view piece) {
     bytes.append(piece);
     return true;
   });
   if (!isWhole) {
-    error.text =
-        "binary property list: cannot write more values than a file of its size may stand for";
-    return std::nullopt;
+    return PropertyListError{
+        "binary property list: cannot write more values than a file of its size may stand for"};
   }
   return bytes;
 }

@@ -13,9 +13,9 @@ namespace accounts {
 /// Makes serialised property lists of values that the reader of binary files would take back.
 class BinaryPropertyListSerializer {
  public:
-  /// A value to be written in the binary format. None, with `error` saying why, for a value that
-  /// passes one of the limits in PropertyListLimits.h or holds a text that is not well-formed.
-  SerializedPropertyList serialize(const PropertyValue& value, PropertyListError& error);
+  /// A value to be written in the binary format. An error says why for a value that passes one of
+  /// the limits in PropertyListLimits.h or holds a text that is not well-formed.
+  OrPropertyListError<SerializedPropertyList> serialize(const PropertyValue& value);
 
  private:
   class Check;

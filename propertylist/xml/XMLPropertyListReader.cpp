@@ -16,10 +16,9 @@ namespace {
 /// the error.
 class Reader {
  public:
-  Reader(std::string_view bytes, PropertyListError& error)
-      : bytes_(bytes), error_(error), parser_(XML_ParserCreate(nullptr)) {}
+  explicit Reader(std::string_view bytes) : bytes_(bytes), parser_(XML_ParserCreate(nullptr)) {}
 
-  std::optional<PropertyValue> read() {
+  OrPropertyListError<PropertyValue> read() {
     if (!parser_) {
       throw std::bad_alloc();
     }
@@ -29,7 +28,7 @@ class Reader {
     XML_SetEntityDeclHandler(parser_.get(), onEntityDeclaration);
     XML_SetSkippedEntityHandler(parser_.get(), onSkippedEntity);
     if (!parse()) {
-      return std::nullopt;
+      return std::move(error_);
     }
     return builder_.take();
   }
@@ -140,7 +139,7 @@ class Reader {
   }
 
   std::string_view bytes_;
-  PropertyListError& error_;
+  PropertyListError error_;
   std::unique_ptr<XML_ParserStruct, ParserDeleter> parser_;
   ValueBuilder builder_;
   bool hasFailed_ = false;
@@ -150,8 +149,8 @@ class Reader {
 }  // namespace
 }  // namespace xmlplist
 
-std::optional<PropertyValue> readXMLPropertyList(std::string_view bytes, PropertyListError& error) {
-  return xmlplist::Reader(bytes, error).read();
+OrPropertyListError<PropertyValue> readXMLPropertyList(std::string_view bytes) {
+  return xmlplist::Reader(bytes).read();
 }
 
 }  // namespace accounts

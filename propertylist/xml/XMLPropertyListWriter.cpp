@@ -23,16 +23,14 @@ constexpr std::size_t kDeepestIndentation = 16;
 /// Writes one value, with a stack of its own for the containers that are open.
 class Writer {
  public:
-  explicit Writer(PropertyListError& error) : error_(error) {}
-
-  std::optional<std::string> write(const PropertyValue& value) {
+  OrPropertyListError<std::string> write(const PropertyValue& value) {
     output_ = kHead;
     bool isGood = count(1) && put(value);
     while (isGood && !open_.empty()) {
       isGood = putNextChild();
     }
     if (!isGood) {
-      return std::nullopt;
+      return std::move(error_);
     }
     output_ += kTail;
     return std::move(output_);
@@ -178,7 +176,7 @@ class Writer {
     return path.empty() ? "/" : path;
   }
 
-  PropertyListError& error_;
+  PropertyListError error_;
   std::string output_;
   std::vector<Container> open_;
   std::uint64_t expandedCount_ = 0;
@@ -187,9 +185,8 @@ class Writer {
 }  // namespace
 }  // namespace xmlplist
 
-std::optional<std::string> writeXMLPropertyList(const PropertyValue& value,
-                                                PropertyListError& error) {
-  return xmlplist::Writer(error).write(value);
+OrPropertyListError<std::string> writeXMLPropertyList(const PropertyValue& value) {
+  return xmlplist::Writer().write(value);
 }
 
 }  // namespace accounts

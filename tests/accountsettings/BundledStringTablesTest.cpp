@@ -30,8 +30,7 @@ PropertyDictionary stringTable(const std::string& language, const std::string& t
   std::ifstream file(std::string(ACCOUNTS_RESOURCES_DIRECTORY) + "/" + language + ".lproj/" +
                      table + ".strings");
   const std::string bytes{std::istreambuf_iterator<char>(file), {}};
-  PropertyListError error;
-  const std::optional<PropertyValue> value = readPropertyList(bytes, error);
+  const auto value = readPropertyList(bytes);
   const PropertyDictionary* texts = value ? value->asDictionary() : nullptr;
   return texts != nullptr ? *texts : PropertyDictionary();
 }

@@ -36,15 +36,15 @@ const FakeBundleResources& resources() {
 
 }  // namespace
 
-Result ObservedPropertyLists::serializeBinary(const PropertyValue& value,
-                                              SerializedPropertyList& serialized) {
-  Result result = real_.serializeBinary(value, serialized);
+OrFailure<SerializedPropertyList> ObservedPropertyLists::serializeBinary(
+    const PropertyValue& value) {
+  auto serialized = real_.serializeBinary(value);
   const AllocationsSucceed whileObserving;
   const PropertyDictionary* root = value.asDictionary();
-  if (result && root != nullptr && root->contains(kPlistAccountsKey)) {
-    settingsWritten.push_back(bytesOf(serialized));
+  if (serialized && root != nullptr && root->contains(kPlistAccountsKey)) {
+    settingsWritten.push_back(bytesOf(*serialized));
   }
-  return result;
+  return serialized;
 }
 
 std::optional<std::string> CountingUUIDs::randomUUID() {

@@ -41,7 +41,7 @@ class ObservedPropertyLists final : public PropertyLists {
   std::optional<PropertyDictionary> readDictionary(std::string_view path) override {
     return real_.readDictionary(path);
   }
-  Result serializeBinary(const PropertyValue& value, SerializedPropertyList& serialized) override;
+  OrFailure<SerializedPropertyList> serializeBinary(const PropertyValue& value) override;
 
  private:
   PropertyLists& real_;

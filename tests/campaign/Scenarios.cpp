@@ -22,17 +22,15 @@ constexpr std::string_view kCopyAside =
     "/var/mobile/Library/Logs/CrashReporter/com.quarx.accountsettings.plist";
 
 PropertyDictionary dictionaryOf(const std::string& bytes, const std::string& origin) {
-  PropertyListError error;
-  const std::optional<PropertyValue> value = readPropertyList(bytes, error);
+  const auto value = readPropertyList(bytes);
   if (!value || value->asDictionary() == nullptr) {
-    throw std::runtime_error(origin + ": " + error.text);
+    throw std::runtime_error(origin + ": " + (value ? "no dictionary" : value.error().text));
   }
   return *value->asDictionary();
 }
 
 std::string bytesOf(const PropertyDictionary& dictionary) {
-  PropertyListError error;
-  return writeBinaryPropertyList(dictionary, error).value();
+  return writeBinaryPropertyList(dictionary).value();
 }
 
 std::string textOfFile(const fs::path& path) {

@@ -36,15 +36,13 @@ void addIdentifiers(std::set<std::string>& identifiers, const PropertyValue& val
 }  // namespace
 
 std::optional<PropertyDictionary> dictionaryIn(const std::string& bytes) {
-  PropertyListError error;
-  const std::optional<PropertyValue> value = readPropertyList(bytes, error);
+  const auto value = readPropertyList(bytes);
   const PropertyDictionary* dictionary = value ? value->asDictionary() : nullptr;
   return dictionary != nullptr ? std::optional(*dictionary) : std::nullopt;
 }
 
 std::string propertyListOf(const PropertyDictionary& dictionary) {
-  PropertyListError error;
-  return writeBinaryPropertyList(dictionary, error).value();
+  return writeBinaryPropertyList(dictionary).value();
 }
 
 std::set<std::string> identifiersOf(const std::optional<std::string>& bytes) {

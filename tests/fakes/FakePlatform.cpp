@@ -19,14 +19,12 @@ FakePlatform::FakePlatform()
 }
 
 void FakePlatform::addPropertyList(std::string_view path, const PropertyValue& value) {
-  PropertyListError error;
-  fileSystem.addFile(path, writeBinaryPropertyList(value, error).value());
+  fileSystem.addFile(path, writeBinaryPropertyList(value).value());
 }
 
 std::optional<PropertyDictionary> FakePlatform::dictionaryAt(std::string_view path) const {
   const std::optional<std::string> bytes = fileSystem.contentsOf(path);
-  PropertyListError error;
-  const std::optional<PropertyValue> value = bytes ? readPropertyList(*bytes, error) : std::nullopt;
+  const auto value = readPropertyList(bytes.value_or(""));
   const PropertyDictionary* dictionary = value ? value->asDictionary() : nullptr;
   return dictionary != nullptr ? std::optional(*dictionary) : std::nullopt;
 }

@@ -13,8 +13,7 @@ namespace accounts {
 namespace {
 
 std::optional<PropertyDictionary> dictionaryOf(std::string_view bytes) {
-  PropertyListError error;
-  const std::optional<PropertyValue> value = readPropertyList(bytes, error);
+  const auto value = readPropertyList(bytes);
   const PropertyDictionary* dictionary = value ? value->asDictionary() : nullptr;
   return dictionary != nullptr ? std::optional(*dictionary) : std::nullopt;
 }
@@ -91,18 +90,18 @@ std::optional<PropertyDictionary> FakePropertyLists::readDictionary(std::string_
   return bytes ? dictionaryOf(*bytes) : std::nullopt;
 }
 
-Result FakePropertyLists::serializeBinary(const PropertyValue& value,
-                                          SerializedPropertyList& serialized) {
-  serialized = {};
+OrFailure<SerializedPropertyList> FakePropertyLists::serializeBinary(const PropertyValue& value) {
   if (serializationError) {
     return Failure{.text = *serializationError};
   }
   if (givesNone) {
-    return {};
+    return SerializedPropertyList();
   }
-  PropertyListError error;
-  serialized = serializer_.serialize(value, error);
-  return serialized ? Result() : Failure{.text = error.text};
+  auto serialized = serializer_.serialize(value);
+  if (!serialized) {
+    return Failure{.text = serialized.error().text};
+  }
+  return *std::move(serialized);
 }
 
 std::unique_ptr<NamedLock> FakeSharedResources::makeLock(std::string_view name) {

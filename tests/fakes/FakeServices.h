@@ -211,7 +211,7 @@ class FakePropertyLists : public PropertyLists {
   bool givesNone = false;
 
   std::optional<PropertyDictionary> readDictionary(std::string_view path) override;
-  Result serializeBinary(const PropertyValue& value, SerializedPropertyList& serialized) override;
+  OrFailure<SerializedPropertyList> serializeBinary(const PropertyValue& value) override;
 
  private:
   FakeFileSystem& fileSystem_;

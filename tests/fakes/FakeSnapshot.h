@@ -81,8 +81,7 @@ struct FakeSnapshot : DeviceSnapshot {
     state.whyNotRead.reset();
   }
   void addPropertyList(DevicePlace place, const PropertyValue& value) {
-    PropertyListError error;
-    addFile(place, writeBinaryPropertyList(value, error).value());
+    addFile(place, writeBinaryPropertyList(value).value());
   }
   /// A file whose medium fails while it is read.
   void addFailingFile(DevicePlace place) {

@@ -50,12 +50,11 @@ void FleetFixture::makeImage(int number) const {
   writeFile(root / "etc/passwd", "mobile:*:" + std::to_string(getuid()) + ":" +
                                      std::to_string(getgid()) + "::/var/mobile:/bin/sh\n");
   writeFile(root / "etc/group", "mobile:*:" + std::to_string(getgid()) + ":\n");
-  PropertyListError error;
   const PropertyDictionary account = {{"Identifier", "A" + std::to_string(number)},
                                       {"Type", "CalDAV"},
                                       {"Class", "MobileCalDAVAccount"}};
   writeFile(root / fs::path(kSettingsPath).relative_path(),
-            writeBinaryPropertyList(accountSettings(kOldVersion, {account}), error).value_or(""));
+            writeBinaryPropertyList(accountSettings(kOldVersion, {account})).value_or(""));
 }
 
 std::string FleetFixture::makeImages(int count) const {
@@ -72,8 +71,7 @@ std::int64_t FleetFixture::versionOf(int number) const {
   std::ostringstream text;
   text << std::ifstream(image(number) / fs::path(kSettingsPath).relative_path(), std::ios::binary)
               .rdbuf();
-  PropertyListError error;
-  const std::optional<PropertyValue> settings = readPropertyList(text.str(), error);
+  const auto settings = readPropertyList(text.str());
   if (!settings || settings->asDictionary() == nullptr) {
     return -1;
   }

@@ -111,10 +111,9 @@ class MigratedInMemory {
     PropertyArray accounts = root.arrayForKey(kPlistAccountsKey).value();
     tamper(accounts);
     root.set(kPlistAccountsKey, accounts);
-    PropertyListError error;
     transaction.put(
         DevicePlace::Settings,
-        Transaction::List{BinaryPropertyListSerializer().serialize(root, error), std::nullopt});
+        Transaction::List{BinaryPropertyListSerializer().serialize(root).value(), std::nullopt});
   }
 
   void migrate(Liar* liar, const std::function<void(PropertyArray&)>& tamper) {

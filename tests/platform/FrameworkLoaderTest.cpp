@@ -104,7 +104,7 @@ TEST_F(FrameworkLoaderTest, AFrameworkOfOtherHeadersIsAFailureThatSaysSo) {
   installBroken("OfNoVersion", "/Library/Old.so");
 
   EXPECT_EQ(loader_.loadFramework("/Library/Other.so").error().text,
-            "It was built against other headers: its interface has version 999, which is 3 here");
+            "It was built against other headers: its interface has version 999, which is 4 here");
   EXPECT_EQ(loader_.loadFramework("/Library/Old.so").error().text,
             "It was built against other headers: it names no version of its interface, which is 3 "
             "here");

@@ -16,9 +16,7 @@ class PropertyListsTest : public DeviceFixture {
   LinuxPropertyLists propertyLists{root};
 
   SerializedPropertyList serialize(const PropertyValue& value) {
-    SerializedPropertyList serialized;
-    EXPECT_TRUE(propertyLists.serializeBinary(value, serialized));
-    return serialized;
+    return propertyLists.serializeBinary(value).value();
   }
 };
 
@@ -111,11 +109,9 @@ TEST_F(PropertyListsTest, AValueNestedTooDeeplyIsNotSerialised) {
   for (std::size_t depth = 0; depth <= kMaximumNestingDepth; ++depth) {
     value = PropertyArray{value};
   }
-  SerializedPropertyList serialized = serialize("left over");
-  const Result result = propertyLists.serializeBinary(value, serialized);
-  ASSERT_FALSE(result);
-  EXPECT_FALSE(result.error().text.empty());
-  EXPECT_FALSE(serialized);
+  const auto serialized = propertyLists.serializeBinary(value);
+  ASSERT_FALSE(serialized);
+  EXPECT_FALSE(serialized.error().text.empty());
 }
 
 }  // namespace

@@ -33,8 +33,7 @@ std::string AccountsctlFixture::path(std::string_view name) const {
 }
 
 std::string AccountsctlFixture::write(std::string_view name, const PropertyValue& value) const {
-  PropertyListError error;
-  return writeText(name, writeBinaryPropertyList(value, error).value());
+  return writeText(name, writeBinaryPropertyList(value).value());
 }
 
 std::string AccountsctlFixture::writeText(std::string_view name, std::string_view text) const {
@@ -49,9 +48,8 @@ std::string AccountsctlFixture::readText(std::string_view name) const {
 }
 
 PropertyValue AccountsctlFixture::readValue(std::string_view name) const {
-  PropertyListError error;
-  const std::optional<PropertyValue> value = readPropertyList(readText(name), error);
-  EXPECT_TRUE(value) << error.text;
+  const auto value = readPropertyList(readText(name));
+  EXPECT_TRUE(value) << value.error().text;
   return value.value_or("unreadable");
 }
 

@@ -91,7 +91,7 @@ TEST_F(AccountsctlFramework, WhatNoDeviceLoadsIsRefusedWithTheReason) {
   const std::pair<const char*, const char*> refused[] = {
       {"WithoutEntryPoint", "RegisterClasses"},
       {"WithUnresolvedSymbol", "functionThatNobodyDefines"},
-      {"OfOtherHeaders", "its interface has version 999, which is 3 here"},
+      {"OfOtherHeaders", "its interface has version 999, which is 4 here"},
       {"OfNoVersion", "it names no version of its interface"},
   };
   for (const auto& [name, reason] : refused) {

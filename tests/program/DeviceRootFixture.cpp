@@ -66,9 +66,8 @@ void DeviceRootFixture::writeText(std::string_view devicePath, std::string_view 
 }
 
 void DeviceRootFixture::write(std::string_view devicePath, const PropertyValue& value) const {
-  PropertyListError error;
-  const std::optional<std::string> bytes = writeBinaryPropertyList(value, error);
-  ASSERT_TRUE(bytes.has_value()) << error.text;
+  const auto bytes = writeBinaryPropertyList(value);
+  ASSERT_TRUE(bytes) << bytes.error().text;
   writeText(devicePath, *bytes);
 }
 
@@ -99,10 +98,9 @@ std::string DeviceRootFixture::readText(std::string_view devicePath) const {
 }
 
 PropertyDictionary DeviceRootFixture::readDictionary(std::string_view devicePath) const {
-  PropertyListError error;
-  const std::optional<PropertyValue> value = readPropertyList(readText(devicePath), error);
+  const auto value = readPropertyList(readText(devicePath));
   if (!value || value->asDictionary() == nullptr) {
-    ADD_FAILURE() << devicePath << " holds no dictionary. " << error.text;
+    ADD_FAILURE() << devicePath << " holds no dictionary. " << (value ? "" : value.error().text);
     return {};
   }
   return *value->asDictionary();

@@ -24,15 +24,11 @@ constexpr mode_t kModes[] = {0644, 0644, 0600, 0640, 0444, 0666};
 
 /// A property list in the binary format, or now and then in XML if that can hold it.
 std::string bytesOf(Choices& choices, const PropertyValue& value) {
-  PropertyListError error;
-  std::optional<std::string> bytes;
-  if (choices.oneIn(4)) {
-    bytes = writeXMLPropertyList(value, error);
-  }
+  auto bytes = choices.oneIn(4) ? writeXMLPropertyList(value) : writeBinaryPropertyList(value);
   if (!bytes) {
-    bytes = writeBinaryPropertyList(value, error);
+    bytes = writeBinaryPropertyList(value);
   }
-  EXPECT_TRUE(bytes) << error.text;
+  EXPECT_TRUE(bytes) << bytes.error().text;
   return bytes.value_or("");
 }
 
@@ -235,8 +231,7 @@ void makeEntry(const GeneratedEntry& entry, const std::filesystem::path& root) {
 
 /// A file's value if it is a property list, otherwise its bytes.
 std::string contentsForPeople(const std::string& bytes) {
-  PropertyListError error;
-  const std::optional<PropertyValue> value = readPropertyList(bytes, error);
+  const auto value = readPropertyList(bytes);
   return value ? describe(*value) : "no property list: \"" + escapedText(bytes) + "\"";
 }
 

@@ -71,8 +71,7 @@ class LittleMemory : public DeviceRootFixture,
     if (std::get<Format>(GetParam()) == Format::Binary) {
       write(kSettingsPath, settings);
     } else {
-      PropertyListError error;
-      writeText(kSettingsPath, writeXMLPropertyList(settings, error).value());
+      writeText(kSettingsPath, writeXMLPropertyList(settings).value());
     }
   }
 

@@ -134,8 +134,7 @@ OutsideTree::OutsideTree() : directory_(makeTemporaryDirectory(Medium::Memory, "
     fs::create_directories(this->path(directory));
   }
   for (const auto& [devicePath, value] : deviceFiles()) {
-    PropertyListError error;
-    writeFile(this->path(devicePath), writeBinaryPropertyList(value, error).value_or(""));
+    writeFile(this->path(devicePath), writeBinaryPropertyList(value).value_or(""));
   }
   for (const auto& [devicePath, text] : kTextFiles) {
     writeFile(this->path(devicePath), text);

@@ -159,8 +159,7 @@ void PrintTo(const SmallFile& file, std::ostream* stream) {
 /// The largest of them that is read.
 std::string largestReadable(const SmallFile& kind, std::size_t padding) {
   const auto isRead = [&](std::size_t number) {
-    PropertyListError error;
-    return readBinaryPropertyList(kind.make(number, padding), error).has_value();
+    return readBinaryPropertyList(kind.make(number, padding)).has_value();
   };
   std::size_t read = 1;
   std::size_t refused = kind.most + 1;
@@ -272,13 +271,11 @@ class SmallResult : public DeviceRootFixture {};
 TEST_F(SmallResult, ThatCouldNotBeReadAgainIsNotWritten) {
   // In XML each text stands where it is; in the binary format all are one.
   const PropertyArray texts(std::vector<PropertyValue>(1000, std::string(1000, 't')));
-  PropertyListError error;
   const std::string settings =
       writeXMLPropertyList(accountSettings(11, {PropertyDictionary{{"Identifier", "A"},
                                                                    {"Type", "CalDAV"},
                                                                    {"Class", "CalDAVAccount"},
-                                                                   {"Texts", texts}}}),
-                           error)
+                                                                   {"Texts", texts}}}))
           .value();
   writeText(kSettingsPath, settings);
 

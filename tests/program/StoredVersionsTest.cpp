@@ -39,9 +39,8 @@ std::string textOfFile(const fs::path& path) {
 }
 
 PropertyDictionary dictionaryOfFile(const fs::path& path) {
-  PropertyListError error;
-  const std::optional<PropertyValue> value = readPropertyList(textOfFile(path), error);
-  EXPECT_TRUE(value && value->asDictionary()) << path << ": " << error.text;
+  const auto value = readPropertyList(textOfFile(path));
+  EXPECT_TRUE(value && value->asDictionary()) << path;
   return value && value->asDictionary() ? *value->asDictionary() : PropertyDictionary();
 }
 

@@ -8,29 +8,22 @@ namespace accounts {
 namespace {
 
 std::string errorOfReading(std::string_view bytes) {
-  PropertyListError error;
-  EXPECT_FALSE(readPropertyList(bytes, error));
-  return error.text;
+  const auto value = readPropertyList(bytes);
+  EXPECT_FALSE(value);
+  return value ? "" : value.error().text;
 }
 
 TEST(PropertyListFile, ABinaryFileIsRead) {
-  PropertyListError error;
-
-  EXPECT_EQ(readPropertyList(writeBinary(PropertyArray{1}), error),
-            PropertyValue(PropertyArray{1}));
+  EXPECT_EQ(readPropertyList(writeBinary(PropertyArray{1})), PropertyValue(PropertyArray{1}));
 }
 
 TEST(PropertyListFile, AnXMLFileIsRead) {
-  PropertyListError error;
-
-  EXPECT_EQ(readPropertyList(inPropertyList("<array><integer>1</integer></array>"), error),
+  EXPECT_EQ(readPropertyList(inPropertyList("<array><integer>1</integer></array>")),
             PropertyValue(PropertyArray{1}));
 }
 
 TEST(PropertyListFile, AnXMLFileMayBeginWithAByteOrderMark) {
-  PropertyListError error;
-
-  EXPECT_EQ(readPropertyList("\xEF\xBB\xBF<plist><true/></plist>", error), PropertyValue(true));
+  EXPECT_EQ(readPropertyList("\xEF\xBB\xBF<plist><true/></plist>"), PropertyValue(true));
 }
 
 TEST(PropertyListFile, AFileOfZeroBytesIsAnError) {

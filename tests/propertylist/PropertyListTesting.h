@@ -88,24 +88,21 @@ inline std::string fileWithObject(std::string_view encoded) {
 
 /// The value of a file that must be readable.
 inline PropertyValue readBinary(std::string_view bytes) {
-  PropertyListError error;
-  std::optional<PropertyValue> value = readBinaryPropertyList(bytes, error);
-  EXPECT_TRUE(value) << error.text;
-  return value ? *value : PropertyValue("unreadable");
+  auto value = readBinaryPropertyList(bytes);
+  EXPECT_TRUE(value) << value.error().text;
+  return value.value_or(PropertyValue("unreadable"));
 }
 
 /// The error of a file that must not be readable.
 inline std::string errorOfReadingBinary(std::string_view bytes) {
-  PropertyListError error;
-  const std::optional<PropertyValue> value = readBinaryPropertyList(bytes, error);
+  const auto value = readBinaryPropertyList(bytes);
   EXPECT_FALSE(value);
-  return error.text;
+  return value ? "" : value.error().text;
 }
 
 inline std::string writeBinary(const PropertyValue& value) {
-  PropertyListError error;
-  std::optional<std::string> bytes = writeBinaryPropertyList(value, error);
-  EXPECT_TRUE(bytes) << error.text;
+  auto bytes = writeBinaryPropertyList(value);
+  EXPECT_TRUE(bytes) << bytes.error().text;
   return bytes.value_or("");
 }
 
@@ -133,9 +130,8 @@ inline std::uint64_t objectCount(std::string_view file) {
 }
 
 inline std::string writeXML(const PropertyValue& value) {
-  PropertyListError error;
-  std::optional<std::string> bytes = writeXMLPropertyList(value, error);
-  EXPECT_TRUE(bytes) << error.text;
+  auto bytes = writeXMLPropertyList(value);
+  EXPECT_TRUE(bytes) << bytes.error().text;
   return bytes.value_or("");
 }
 
@@ -145,17 +141,15 @@ inline std::string inPropertyList(std::string_view content) {
 }
 
 inline PropertyValue readXML(std::string_view bytes) {
-  PropertyListError error;
-  std::optional<PropertyValue> value = readXMLPropertyList(bytes, error);
-  EXPECT_TRUE(value) << error.text;
-  return value ? *value : PropertyValue("unreadable");
+  auto value = readXMLPropertyList(bytes);
+  EXPECT_TRUE(value) << value.error().text;
+  return value.value_or(PropertyValue("unreadable"));
 }
 
 inline std::string errorOfReadingXML(std::string_view bytes) {
-  PropertyListError error;
-  const std::optional<PropertyValue> value = readXMLPropertyList(bytes, error);
+  const auto value = readXMLPropertyList(bytes);
   EXPECT_FALSE(value);
-  return error.text;
+  return value ? "" : value.error().text;
 }
 
 /// A value with every kind in it, the awkward ones of each too.

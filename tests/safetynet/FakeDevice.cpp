@@ -66,8 +66,7 @@ void FakeDevice::write(std::string_view path, std::string contents, EntryKind ki
 }
 
 void FakeDevice::writePropertyList(DevicePlace place, const PropertyValue& value) {
-  PropertyListError error;
-  write(place, writeBinaryPropertyList(value, error).value());
+  write(place, writeBinaryPropertyList(value).value());
 }
 
 std::string FakeDevice::at(std::string_view path) const {

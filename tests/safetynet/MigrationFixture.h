@@ -44,10 +44,9 @@ class MigrationTest : public testing::Test {
   Transaction& transaction() { return migration_->transaction(); }
 
   void save(const PropertyDictionary& settings) {
-    PropertyListError error;
-    transaction().put(
-        DevicePlace::Settings,
-        Transaction::List{BinaryPropertyListSerializer().serialize(settings, error), std::nullopt});
+    transaction().put(DevicePlace::Settings,
+                      Transaction::List{BinaryPropertyListSerializer().serialize(settings).value(),
+                                        std::nullopt});
     transaction().noteSave(LastSave::Written);
   }
   void remove(DevicePlace place) { transaction().put(place, Transaction::Removed{}); }

@@ -53,17 +53,16 @@ TEST_F(MigrationInMemoryTest, AMigrationThatLostNothingMayBeCommitted) {
 TEST_F(MigrationInMemoryTest, NewContentsStandInTheMemoryFileOneAfterTheOther) {
   migrate();
   transaction().makeInformationDirectory();
-  PropertyListError error;
   transaction().putInformationFile(
       "AccountMigrationInformation-1.txt",
-      BinaryPropertyListSerializer().serialize(PropertyDictionary{{"a", 1}}, error));
+      BinaryPropertyListSerializer().serialize(PropertyDictionary{{"a", 1}}).value());
 
   const Proposal proposed = proposal();
 
   EXPECT_EQ(contentsOf(proposed.changeOf(DevicePlace::Settings)),
-            writeBinaryPropertyList(settingsWith(12, {"one", "mail"}), error));
+            writeBinaryPropertyList(settingsWith(12, {"one", "mail"})));
   EXPECT_EQ(contentsOf(proposed.changeOf(DevicePlace::InformationDirectory)),
-            writeBinaryPropertyList(PropertyDictionary{{"a", 1}}, error));
+            writeBinaryPropertyList(PropertyDictionary{{"a", 1}}));
   EXPECT_EQ(proposed.informationFileName, "AccountMigrationInformation-1.txt");
   EXPECT_EQ(proposed.changeOf(DevicePlace::LegacyMail)->action, Action::Remove);
   EXPECT_TRUE(proposalFrom(bytesOf(proposed), memoryFile.size())) << "and is one that is taken";

@@ -83,11 +83,10 @@ class FakeWorker final : public Worker {
       all.emplace_back(PropertyDictionary{{"Identifier", "mail"}});
       transaction.put(DevicePlace::LegacyMail, Transaction::Removed{});
     }
-    PropertyListError error;
     const PropertyDictionary after = {{"Version", 12}, {"Accounts", PropertyArray(std::move(all))}};
     transaction.put(
         DevicePlace::Settings,
-        Transaction::List{BinaryPropertyListSerializer().serialize(after, error), std::nullopt});
+        Transaction::List{BinaryPropertyListSerializer().serialize(after).value(), std::nullopt});
     transaction.noteSave(LastSave::Written);
   }
 };
@@ -137,9 +136,8 @@ class RunTest : public testing::Test {
   }
   /// The identifiers of the accounts in the settings file, in order.
   static std::vector<std::string> accountsOn(const FakeDevice& on) {
-    PropertyListError error;
     std::vector<std::string> identifiers;
-    const auto settings = readBinaryPropertyList(on.at(DevicePlace::Settings), error);
+    const auto settings = readBinaryPropertyList(on.at(DevicePlace::Settings));
     if (!settings || settings->asDictionary() == nullptr) {
       return {"(no settings file)"};
     }

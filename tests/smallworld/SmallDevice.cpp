@@ -207,8 +207,7 @@ PropertyDictionary settings(std::size_t version, PropertyArray accounts) {
 }
 
 void put(SmallDevice& device, DevicePlace place, const PropertyValue& value) {
-  PropertyListError error;
-  device.files[place] = writeBinaryPropertyList(value, error).value();
+  device.files[place] = writeBinaryPropertyList(value).value();
   device.description.append(listed(place).name).append(" ").append(describe(value)).append("\n");
 }
 

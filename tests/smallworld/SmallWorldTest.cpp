@@ -23,9 +23,7 @@ namespace {
 
 std::optional<PropertyDictionary> dictionaryIn(const Files& files, DevicePlace place) {
   const auto file = files.find(pathOfPlace(place, "/var/mobile"));
-  PropertyListError error;
-  const auto value =
-      file != files.end() ? readPropertyList(file->second, error) : std::optional<PropertyValue>();
+  const auto value = readPropertyList(file != files.end() ? file->second : "");
   return value && value->asDictionary() != nullptr ? std::optional(*value->asDictionary())
                                                    : std::nullopt;
 }
@@ -41,8 +39,7 @@ PropertyArray accountsIn(const Files& files) {
 std::string described(const Files& files) {
   std::string text;
   for (const auto& [path, bytes] : files) {
-    PropertyListError error;
-    const auto value = readPropertyList(bytes, error);
+    const auto value = readPropertyList(bytes);
     text.append(path).append(": ").append(value ? describe(*value) : bytes).append("\n");
   }
   return text;

@@ -86,8 +86,7 @@ TEST_F(SavesInMemoryTest, TheBytesOfAChangeAreMadeWheneverTheyAreAskedFor) {
       std::get<SerializedPropertyList>(transaction.changes().at(0).contents);
   ASSERT_TRUE(save(kOld));
 
-  PropertyListError error;
-  EXPECT_EQ(bytesOf(list), writeBinaryPropertyList(kNew, error));
+  EXPECT_EQ(bytesOf(list), writeBinaryPropertyList(kNew));
   EXPECT_EQ(bytesOf(list), bytesOf(list));
 }
 

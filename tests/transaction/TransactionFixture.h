@@ -33,8 +33,7 @@ inline constexpr std::string_view kHome = "/var/mobile";
 
 /// A list of a value as it is written.
 inline SerializedPropertyList serialized(const PropertyValue& value) {
-  PropertyListError error;
-  return BinaryPropertyListSerializer().serialize(value, error);
+  return BinaryPropertyListSerializer().serialize(value).value();
 }
 
 /// A migration in memory over a snapshot that a test makes before it uses anything else.

@@ -35,8 +35,7 @@ TEST_F(TransactionPropertyListsTest, APathThatIsNotListedHoldsNothingForAMigrati
 
 TEST_F(TransactionPropertyListsTest, WhatCannotBeWrittenIsRefusedWhenItIsSerialised) {
   device.propertyLists.serializationError = "too deep";
-  SerializedPropertyList list;
-  const Result result = lists.serializeBinary(kNewList, list);
+  const auto result = lists.serializeBinary(kNewList);
   ASSERT_FALSE(result);
   EXPECT_EQ(result.error().text, "too deep");
 }

@@ -47,9 +47,7 @@ TEST_F(TransactionTest, ADictionaryIsReadAsTheSnapshotHasIt) {
 }
 
 TEST_F(TransactionTest, AFileIsReadOnce) {
-  PropertyListError error;
-  const auto bytes =
-      std::make_shared<const FakeBytes>(*writeBinaryPropertyList(kListBefore, error));
+  const auto bytes = std::make_shared<const FakeBytes>(*writeBinaryPropertyList(kListBefore));
   snapshot.addFile(DevicePlace::Settings, "");
   snapshot[DevicePlace::Settings].contents = bytes;
 

@@ -29,8 +29,7 @@ PropertyValue largeValue() {
 }
 
 SerializedPropertyList serialized(const PropertyValue& value) {
-  PropertyListError error;
-  return BinaryPropertyListSerializer().serialize(value, error);
+  return BinaryPropertyListSerializer().serialize(value).value();
 }
 
 TEST(BinaryPieces, ASmallFileIsOnePiece) {

@@ -13,9 +13,9 @@ namespace {
 using namespace std::string_literals;
 
 std::string errorOfWriting(const PropertyValue& value) {
-  PropertyListError error;
-  EXPECT_FALSE(writeBinaryPropertyList(value, error));
-  return error.text;
+  const auto bytes = writeBinaryPropertyList(value);
+  EXPECT_FALSE(bytes);
+  return bytes ? "" : bytes.error().text;
 }
 
 TEST(BinaryWriting, AFileIsLaidOutAsTheFormatSays) {

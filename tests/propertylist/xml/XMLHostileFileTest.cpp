@@ -120,11 +120,9 @@ TEST(HostileXMLFile, AnyByteChangedIsReadOrRefusedButNeverCrashes) {
     for (int change = 1; change < 256; change <<= 1) {
       std::string damaged = document;
       damaged[position] = static_cast<char>(damaged[position] ^ change);
-      PropertyListError error;
+      const auto value = readXMLPropertyList(damaged);
 
-      const bool isReadable = readXMLPropertyList(damaged, error).has_value();
-
-      EXPECT_EQ(isReadable, error.text.empty());
+      EXPECT_TRUE(value || !value.error().text.empty());
     }
   }
 }

@@ -13,9 +13,9 @@ namespace accounts {
 namespace {
 
 std::string errorOfWritingXML(const PropertyValue& value) {
-  PropertyListError error;
-  EXPECT_FALSE(writeXMLPropertyList(value, error));
-  return error.text;
+  const auto bytes = writeXMLPropertyList(value);
+  EXPECT_FALSE(bytes);
+  return bytes ? "" : bytes.error().text;
 }
 
 /// The value is written, and read as it was.
