@@ -1,7 +1,7 @@
 #pragma once
 
 #include "platform/Failure.h"
-#include "propertylist/OrError.h"
+#include "propertylist/value/OrError.h"
 
 namespace accounts {
 

@@ -2,7 +2,7 @@
 
 #include <string>
 
-#include "propertylist/OrError.h"
+#include "propertylist/value/OrError.h"
 
 namespace accounts {
 

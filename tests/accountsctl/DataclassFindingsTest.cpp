@@ -12,35 +12,36 @@ constexpr const char* kBackup = "com.quarx.Dataclass.Backup";
 class DataclassFindings : public FindingsFixture {
  protected:
   /// An Exchange account, which supports mail, contacts and calendars but no bookmarks.
-  static PropertyDictionary exchange() { return account("Exchange", "ExchangeAccount", "E"); }
+  static AccountDictionary exchange() { return anAccount("E", "Exchange", "ExchangeAccount"); }
 };
 
 TEST_F(DataclassFindings, SupportedAndProvisionedDataclassesHaveNone) {
-  EXPECT_EQ(found({with(exchange(), "Enabled Dataclasses", PropertyArray{kMail, kContacts})}),
+  EXPECT_EQ(found({exchange().with("Enabled Dataclasses", PropertyArray{kMail, kContacts})}),
             Lines{});
 }
 
 TEST_F(DataclassFindings, AnUnknownDataclassIsIgnored) {
-  EXPECT_EQ(found({with(exchange(), "Enabled Dataclasses", PropertyArray{"pigeons", kMail})}),
+  EXPECT_EQ(found({exchange().with("Enabled Dataclasses", PropertyArray{"pigeons", kMail})}),
             Lines{"1 ignored unknownDataclass"});
 }
 
 TEST_F(DataclassFindings, ADataclassThatTheTypeDoesNotSupportIsIgnored) {
-  EXPECT_EQ(found({with(exchange(), "Enabled Dataclasses", PropertyArray{kBookmarks})}),
+  EXPECT_EQ(found({exchange().with("Enabled Dataclasses", PropertyArray{kBookmarks})}),
             Lines{"1 ignored unsupportedDataclass"});
-  EXPECT_EQ(found({with(exchange(), "Provisioned Dataclasses", PropertyArray{kBookmarks})}),
+  EXPECT_EQ(found({exchange().with("Provisioned Dataclasses", PropertyArray{kBookmarks})}),
             Lines{"1 ignored unsupportedDataclass"});
 }
 
 TEST_F(DataclassFindings, AnEnabledDataclassThatIsNotProvisionedIsIgnored) {
-  EXPECT_EQ(found({with(with(exchange(), "Provisioned Dataclasses", PropertyArray{kMail}),
-                        "Enabled Dataclasses", PropertyArray{kMail, kCalendars})}),
+  EXPECT_EQ(found({exchange()
+                       .with("Provisioned Dataclasses", PropertyArray{kMail})
+                       .with("Enabled Dataclasses", PropertyArray{kMail, kCalendars})}),
             Lines{"1 ignored unprovisionedDataclass"});
 }
 
 TEST_F(DataclassFindings, ADataclassThatAProfileForbidsIsIgnored) {
-  const PropertyDictionary cloud = with(account("QuarxAccount", "ZQAccount", "Q"),
-                                        "Enabled Dataclasses", PropertyArray{kBackup});
+  const PropertyDictionary cloud = anAccount("Q", "QuarxAccount", "ZQAccount")
+                                       .with("Enabled Dataclasses", PropertyArray{kBackup});
   EXPECT_EQ(found({cloud}), Lines{});
 
   device.profileRestrictions.answers[RestrictedFeature::CloudBackup] =
@@ -50,15 +51,15 @@ TEST_F(DataclassFindings, ADataclassThatAProfileForbidsIsIgnored) {
 }
 
 TEST_F(DataclassFindings, AMemberThatIsNoTextIsIgnored) {
-  EXPECT_EQ(found({with(exchange(), "Enabled Dataclasses", PropertyArray{5, kMail})}),
+  EXPECT_EQ(found({exchange().with("Enabled Dataclasses", PropertyArray{5, kMail})}),
             Lines{"1 ignored noDataclass"});
 }
 
 TEST_F(DataclassFindings, TheListOfAChildWhoseParentHasOneIsIgnored) {
-  const PropertyDictionary child = with(mail("C"), "Enabled Dataclasses", PropertyArray{"pigeons"});
-  const PropertyDictionary parent = with(exchange(), "ChildAccounts", PropertyArray{child});
+  const PropertyDictionary child = mail("C").with("Enabled Dataclasses", PropertyArray{"pigeons"});
+  const PropertyDictionary parent = exchange().withChildren({child});
 
-  EXPECT_EQ(found({with(parent, "Enabled Dataclasses", PropertyArray{kMail})}),
+  EXPECT_EQ(found({AccountDictionary(parent).with("Enabled Dataclasses", PropertyArray{kMail})}),
             Lines{"1.1 ignored overruledDataclasses"});
   EXPECT_EQ(found({parent}), Lines{"1.1 ignored unknownDataclass"});
 }

@@ -19,16 +19,8 @@ class FindingsFixture : public testing::Test {
  protected:
   using Lines = std::vector<std::string>;
 
-  static PropertyDictionary account(std::string_view type, std::string_view accountClass,
-                                    std::string_view identifier) {
-    return {{"Type", type}, {"Class", accountClass}, {"Identifier", identifier}};
-  }
-  static PropertyDictionary mail(std::string_view identifier) {
-    return account("Mail", "IMAPAccount", identifier);
-  }
-  static PropertyDictionary without(PropertyDictionary properties, std::string_view key) {
-    properties.remove(key);
-    return properties;
+  static AccountDictionary mail(std::string_view identifier) {
+    return anAccount(identifier, "Mail", "IMAPAccount");
   }
 
   /// Findings as "PLACE EFFECT CODE".
@@ -41,8 +33,8 @@ class FindingsFixture : public testing::Test {
     return lines;
   }
   /// Those of a settings file with these accounts.
-  static Lines found(std::vector<PropertyValue> accountDictionaries) {
-    return linesOf(findingsInSettings(settings(std::move(accountDictionaries))));
+  static Lines found(PropertyArray accountDictionaries) {
+    return linesOf(findingsInSettings(accountSettings(12, std::move(accountDictionaries))));
   }
 
   FakeProcess device;

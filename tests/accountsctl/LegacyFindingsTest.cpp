@@ -5,8 +5,8 @@ namespace {
 
 using LegacyFindings = FindingsFixture;
 
-PropertyDictionary incoming(std::string_view accountClass) {
-  return {{"AccountType", accountClass}, {"uniqueId", "A"}};
+AccountDictionary incoming(std::string_view accountClass) {
+  return aMailDescription("A", accountClass);
 }
 
 TEST_F(LegacyFindings, StoresAsTheyShouldBeHaveNone) {

@@ -6,9 +6,9 @@ namespace {
 using SettingsFindings = FindingsFixture;
 
 TEST_F(SettingsFindings, AFileAsItShouldBeHasNone) {
-  EXPECT_EQ(found({mail("A"), with(account("Exchange", "ExchangeAccount", "B"), "ChildAccounts",
-                                   PropertyArray{mail("C")})}),
-            Lines{});
+  EXPECT_EQ(
+      found({mail("A"), anAccount("B", "Exchange", "ExchangeAccount").withChildren({mail("C")})}),
+      Lines{});
 }
 
 TEST_F(SettingsFindings, AMissingVersionIsNoted) {
@@ -35,8 +35,9 @@ TEST_F(SettingsFindings, AccountsThatAreNoArrayAreNoted) {
 }
 
 TEST_F(SettingsFindings, OtherKeysOfTheRootAreDropped) {
-  EXPECT_EQ(linesOf(findingsInSettings(with(settings({}), "Extra", 1))),
-            Lines{"file dropped unknownKey"});
+  EXPECT_EQ(
+      linesOf(findingsInSettings({{"Version", 12}, {"Accounts", PropertyArray()}, {"Extra", 1}})),
+      Lines{"file dropped unknownKey"});
 }
 
 TEST_F(SettingsFindings, AnElementThatIsNoDictionaryIsDropped) {
@@ -44,53 +45,52 @@ TEST_F(SettingsFindings, AnElementThatIsNoDictionaryIsDropped) {
 }
 
 TEST_F(SettingsFindings, AnUnknownTypeOrAMissingClassDropsAnAccount) {
-  EXPECT_EQ(found({account("Pigeon", "C", "A")}), Lines{"1 dropped unknownType"});
-  EXPECT_EQ(found({without(mail("A"), "Type")}), Lines{"1 dropped missingType"});
-  EXPECT_EQ(found({without(mail("A"), "Class")}), Lines{"1 dropped missingClass"});
-  EXPECT_EQ(found({with(mail("A"), "Class", "")}), Lines{"1 dropped missingClass"});
-  EXPECT_EQ(found({account("Pigeon", "", "A")}),
+  EXPECT_EQ(found({anAccount("A", "Pigeon", "C")}), Lines{"1 dropped unknownType"});
+  EXPECT_EQ(found({mail("A").without("Type")}), Lines{"1 dropped missingType"});
+  EXPECT_EQ(found({mail("A").without("Class")}), Lines{"1 dropped missingClass"});
+  EXPECT_EQ(found({mail("A").with("Class", "")}), Lines{"1 dropped missingClass"});
+  EXPECT_EQ(found({anAccount("A", "Pigeon", "")}),
             (Lines{"1 dropped unknownType", "1 dropped missingClass"}));
 }
 
 TEST_F(SettingsFindings, ChildrenOfADroppedAccountAreDroppedWithIt) {
-  EXPECT_EQ(found({with(account("Pigeon", "C", "A"), "ChildAccounts", PropertyArray{mail("B")})}),
+  EXPECT_EQ(found({anAccount("A", "Pigeon", "C").withChildren({mail("B")})}),
             (Lines{"1 dropped unknownType", "1.1 dropped orphaned"}));
 }
 
 TEST_F(SettingsFindings, AChildThatIsNoAccountIsIgnored) {
   const PropertyDictionary parent =
-      with(account("Exchange", "ExchangeAccount", "P"), "ChildAccounts",
-           PropertyArray{account("Pigeon", "C", "A"), "stray", mail("B")});
+      anAccount("P", "Exchange", "ExchangeAccount")
+          .withChildren({anAccount("A", "Pigeon", "C"), "stray", mail("B")});
 
   EXPECT_EQ(found({parent}), (Lines{"1.1 ignored unknownType", "1.2 ignored noDictionary"}));
 }
 
 TEST_F(SettingsFindings, ChildrenOfAChildAreIgnored) {
-  const PropertyDictionary child = with(mail("C"), "ChildAccounts", PropertyArray{mail("G")});
+  const PropertyDictionary child = mail("C").withChildren({mail("G")});
 
-  EXPECT_EQ(found({with(account("Exchange", "ExchangeAccount", "P"), "ChildAccounts",
-                        PropertyArray{child})}),
+  EXPECT_EQ(found({anAccount("P", "Exchange", "ExchangeAccount").withChildren({child})}),
             Lines{"1.1 ignored childrenOfChild"});
 }
 
 TEST_F(SettingsFindings, AMissingIdentifierIsRepaired) {
-  EXPECT_EQ(found({without(mail("A"), "Identifier")}), Lines{"1 repaired missingIdentifier"});
-  EXPECT_EQ(found({with(mail("A"), "Identifier", 5)}), Lines{"1 repaired missingIdentifier"});
+  EXPECT_EQ(found({mail("A").without("Identifier")}), Lines{"1 repaired missingIdentifier"});
+  EXPECT_EQ(found({mail("A").with("Identifier", 5)}), Lines{"1 repaired missingIdentifier"});
 }
 
 TEST_F(SettingsFindings, AMailAccountOfAWrongClassIsRepairedOrDropped) {
-  const PropertyDictionary wrong = account("Mail", "BrokenAccount", "A");
+  const PropertyDictionary wrong = anAccount("A", "Mail", "BrokenAccount");
 
-  EXPECT_EQ(found({with(wrong, "AccountPath", "/Library/Mail/POP-somewhere")}),
+  EXPECT_EQ(found({AccountDictionary(wrong).with("AccountPath", "/Library/Mail/POP-somewhere")}),
             Lines{"1 repaired wrongClass"});
   EXPECT_EQ(found({wrong}), Lines{"1 dropped unfixableClass"});
-  EXPECT_EQ(found({account("CalDAV", "BrokenAccount", "A")}), Lines{});
+  EXPECT_EQ(found({anAccount("A", "CalDAV", "BrokenAccount")}), Lines{});
 }
 
 TEST_F(SettingsFindings, AValueOfTheWrongKindIsIgnored) {
-  EXPECT_EQ(found({with(mail("A"), "DisplayName", 5)}), Lines{"1 ignored wrongKind"});
-  EXPECT_EQ(found({with(mail("A"), "ChildAccounts", "text")}), Lines{"1 ignored wrongKind"});
-  EXPECT_EQ(found({with(mail("A"), "Unheard of", 5)}), Lines{});
+  EXPECT_EQ(found({mail("A").with("DisplayName", 5)}), Lines{"1 ignored wrongKind"});
+  EXPECT_EQ(found({mail("A").with("ChildAccounts", "text")}), Lines{"1 ignored wrongKind"});
+  EXPECT_EQ(found({mail("A").with("Unheard of", 5)}), Lines{});
 }
 
 TEST_F(SettingsFindings, OfAccountsWithOneIdentifierTheLastIsFound) {
@@ -99,30 +99,30 @@ TEST_F(SettingsFindings, OfAccountsWithOneIdentifierTheLastIsFound) {
 }
 
 TEST_F(SettingsFindings, AChildWithTheIdentifierOfATopLevelAccountIsNotFound) {
-  EXPECT_EQ(found({mail("A"), with(account("Exchange", "ExchangeAccount", "P"), "ChildAccounts",
-                                   PropertyArray{mail("A")})}),
-            Lines{"2.1 ignored duplicateIdentifier"});
+  EXPECT_EQ(
+      found({mail("A"), anAccount("P", "Exchange", "ExchangeAccount").withChildren({mail("A")})}),
+      Lines{"2.1 ignored duplicateIdentifier"});
 }
 
 TEST_F(SettingsFindings, OfChildrenWithOneIdentifierTheLastIsFound) {
-  EXPECT_EQ(found({with(account("Exchange", "ExchangeAccount", "P"), "ChildAccounts",
-                        PropertyArray{mail("A"), mail("A")})}),
-            Lines{"1.1 ignored duplicateIdentifier"});
+  EXPECT_EQ(
+      found({anAccount("P", "Exchange", "ExchangeAccount").withChildren({mail("A"), mail("A")})}),
+      Lines{"1.1 ignored duplicateIdentifier"});
 }
 
 TEST_F(SettingsFindings, ADroppedAccountTakesNoIdentifier) {
-  EXPECT_EQ(found({mail("A"), account("Pigeon", "C", "A")}), Lines{"2 dropped unknownType"});
+  EXPECT_EQ(found({mail("A"), anAccount("A", "Pigeon", "C")}), Lines{"2 dropped unknownType"});
 }
 
 TEST_F(SettingsFindings, ManyAccountsWithOneIdentifierAreLookedAtToo) {
-  std::vector<PropertyValue> many(3000, mail("A"));
+  const PropertyArray many(std::vector<PropertyValue>(3000, mail("A")));
 
-  EXPECT_EQ(found(std::move(many)).size(), 2999U);
+  EXPECT_EQ(found(many).size(), 2999U);
 }
 
 TEST_F(SettingsFindings, AFindingNamesTheAccountAndSaysWhy) {
-  const std::vector<Finding> findings =
-      findingsInSettings(settings({with(account("Pigeon", "C", "A"), "DisplayName", "Loft")}));
+  const std::vector<Finding> findings = findingsInSettings(
+      accountSettings(12, {anAccount("A", "Pigeon", "C").with("DisplayName", "Loft")}));
 
   ASSERT_EQ(findings.size(), 1U);
   EXPECT_EQ(findings[0].title, "Pigeon 'Loft'");

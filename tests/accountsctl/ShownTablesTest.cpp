@@ -7,9 +7,9 @@
 namespace accounts {
 namespace {
 
-PropertyDictionary account(std::string_view type, std::string_view name,
-                           std::string_view identifier) {
-  return {{"Type", type}, {"Class", "C"}, {"DisplayName", name}, {"Identifier", identifier}};
+AccountDictionary account(std::string_view type, std::string_view name,
+                          std::string_view identifier) {
+  return anAccount(identifier, type, "C").with("DisplayName", name);
 }
 
 std::string shown(const PropertyValue& content, ShowOptions options = {}) {
@@ -19,7 +19,7 @@ std::string shown(const PropertyValue& content, ShowOptions options = {}) {
 TEST(KindOfFile, IsToldByItsKeys) {
   const PropertyArray list;
   const PropertyDictionary dictionary;
-  EXPECT_EQ(kindOf(settings({})), FileKind::AccountSettings);
+  EXPECT_EQ(kindOf(accountSettings(12, {})), FileKind::AccountSettings);
   EXPECT_EQ(kindOf(PropertyDictionary{{"Version", 3}}), FileKind::AccountSettings);
   EXPECT_EQ(kindOf(PropertyDictionary{{"MailAccounts", list}}), FileKind::MailStore);
   EXPECT_EQ(kindOf(PropertyDictionary{{"DeliveryAccounts", list}}), FileKind::MailStore);
@@ -42,7 +42,7 @@ TEST(ShownTables, ASettingsFileHasARowForEachAccountAndChild) {
              PropertyArray{"com.quarx.Dataclass.Mail", "com.quarx.Dataclass.Notes", "else"});
   parent.set("Username", "ada");
 
-  EXPECT_EQ(shown(settings({parent, account("CalDAV", "Days", "C")})),
+  EXPECT_EQ(shown(accountSettings(12, {parent, account("CalDAV", "Days", "C")})),
             "Account settings, version 12 (current is 12)\n"
             "2 accounts and 1 child\n"
             "       Type      Name  User  Enabled          Identifier\n"
@@ -58,13 +58,13 @@ TEST(ShownTables, ASettingsFileWithoutAVersionSaysSo) {
 }
 
 TEST(ShownTables, AnElementThatIsNoAccountIsShownAsItIs) {
-  const std::string text = shown(settings({"stray"}));
+  const std::string text = shown(accountSettings(12, {"stray"}));
 
   EXPECT_NE(text.find("1        stray"), std::string::npos) << text;
 }
 
 TEST(ShownTables, WhatStandsBesideTheAccountsIsShown) {
-  PropertyDictionary root = settings({});
+  PropertyDictionary root = accountSettings(12, {});
   root.set("Extra", PropertyDictionary{{"Inner", 5}});
 
   const std::string text = shown(root);
@@ -79,7 +79,7 @@ TEST(ShownTables, WithPropertiesEachAccountHasAllOfThem) {
   ShowOptions options;
   options.withProperties = true;
 
-  const std::string text = shown(settings({parent}), options);
+  const std::string text = shown(accountSettings(12, {parent}), options);
 
   EXPECT_NE(text.find("\n1 Exchange 'Work'\nClass        C\n"), std::string::npos) << text;
   EXPECT_NE(text.find("\n1.1 Mail 'Post'\nClass        C\n"), std::string::npos) << text;
@@ -99,9 +99,9 @@ TEST(ShownTables, ALegacyMailStoreHasATableForEachDirection) {
 }
 
 TEST(ShownTables, AMigrationInformationFileShowsEachOfItsStores) {
-  const std::string text =
-      shown(PropertyDictionary{{"OldMailAccounts", PropertyDictionary{}},
-                               {"NewAccounSettings", settings({account("Mail", "Post", "M")})}});
+  const std::string text = shown(PropertyDictionary{
+      {"OldMailAccounts", PropertyDictionary{}},
+      {"NewAccounSettings", accountSettings(12, {account("Mail", "Post", "M")})}});
 
   EXPECT_TRUE(text.starts_with("Migration information\n\nOldMailAccounts\n")) << text;
   EXPECT_NE(text.find("\n\nNewAccounSettings, version 12 (current is 12)\n1 account and"),

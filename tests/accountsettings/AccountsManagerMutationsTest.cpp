@@ -14,7 +14,7 @@ class AccountsManagerMutations : public StoreFixture {
 
 TEST_F(AccountsManagerMutations, AnInsertedAccountIsTheLastAndIsFoundWithItsChildren) {
   const Store store = storeOf({mail("A")});
-  const BasicAccountReference account = mail("B").withChildren({calDAV("c")}).record();
+  const BasicAccountReference account = recordOf(mail("B").withChildren({calDAV("c")}));
   store->insertAccount(account);
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A B");
   EXPECT_EQ(store->accountWithIdentifier("c"), account);
@@ -29,7 +29,7 @@ TEST_F(AccountsManagerMutations, AnInsertedAccountIsTheLastAndIsFoundWithItsChil
 TEST_F(AccountsManagerMutations, AnAccountWhoseIdentifierIsThereIsNotInserted) {
   const Store store = storeOf({mail("A").withChildren({calDAV("c")})});
   const BasicAccountReference present = store->accountWithIdentifier("A");
-  store->insertAccount(exchange("A").record());
+  store->insertAccount(recordOf(exchange("A")));
   EXPECT_EQ(store->allBasicAccounts(), AccountsManager::Accounts{present});
   EXPECT_EQ(store->accountWithIdentifier("A"), present);
   EXPECT_EQ(childrenOf(*store), "c");
@@ -40,13 +40,13 @@ TEST_F(AccountsManagerMutations, AnAccountWhoseIdentifierIsThereIsNotInserted) {
 
 TEST_F(AccountsManagerMutations, AnAccountWithTheIdentifierOfAChildIsInserted) {
   const Store store = storeOf({mail("A").withChildren({calDAV("c")})});
-  store->insertAccount(mail("c").record());
+  store->insertAccount(recordOf(mail("c")));
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A c");
 }
 
 TEST_F(AccountsManagerMutations, AnUpdatedAccountTakesThePlaceOfTheOneWithItsIdentifier) {
   const Store store = storeOf({mail("A").withChildren({calDAV("c")}), mail("B")});
-  const BasicAccountReference account = exchange("A").withChildren({calDAV("d")}).record();
+  const BasicAccountReference account = recordOf(exchange("A").withChildren({calDAV("d")}));
   takeLines();
   store->updateAccount(account);
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A B");
@@ -59,7 +59,7 @@ TEST_F(AccountsManagerMutations, AnUpdatedAccountTakesThePlaceOfTheOneWithItsIde
 
 TEST_F(AccountsManagerMutations, AnUpdateTakesEveryPlaceOfTheIdentifier) {
   const Store store = storeOf({mail("A"), mail("B"), mail("A")});
-  const BasicAccountReference account = exchange("A").record();
+  const BasicAccountReference account = recordOf(exchange("A"));
   store->updateAccount(account);
   EXPECT_EQ(store->allBasicAccounts()[0], account);
   EXPECT_EQ(store->allBasicAccounts()[2], account);
@@ -67,7 +67,7 @@ TEST_F(AccountsManagerMutations, AnUpdateTakesEveryPlaceOfTheIdentifier) {
 
 TEST_F(AccountsManagerMutations, AnUpdateLoadsTheChildrenOnceForEachPlaceThatItTakes) {
   const Store store = storeOf({mail("A"), mail("B"), mail("A")});
-  store->updateAccount(mail("A").withChildren({17}).record());
+  store->updateAccount(recordOf(mail("A").withChildren({17})));
   const std::string ignoring =
       R"(-[AccountsManager _loadChildrenFromAccount:] (N) "Ignoring unknown child account with )"
       R"(properties 17")";
@@ -76,7 +76,7 @@ TEST_F(AccountsManagerMutations, AnUpdateLoadsTheChildrenOnceForEachPlaceThatItT
 
 TEST_F(AccountsManagerMutations, AnUpdateOfAnAccountThatIsNotThereAddsNothing) {
   const Store store = storeOf({mail("A")});
-  store->updateAccount(mail("B").withChildren({calDAV("c")}).record());
+  store->updateAccount(recordOf(mail("B").withChildren({calDAV("c")})));
   EXPECT_EQ(identifiersOf(store->allBasicSyncableAccounts()), "A");
   EXPECT_EQ(store->accountWithIdentifier("B"), nullptr);
 }
@@ -101,7 +101,7 @@ TEST_F(AccountsManagerMutations, AnAccountOfTheStoresOwnListCanBeDeleted) {
 
 TEST_F(AccountsManagerMutations, AnAccountIsDeletedByIdentifierAndNotByIdentity) {
   const Store store = storeOf({mail("A"), mail("B")});
-  store->deleteAccount(exchange("A").record());
+  store->deleteAccount(recordOf(exchange("A")));
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "B");
 }
 
@@ -117,7 +117,7 @@ TEST_F(AccountsManagerMutations,
 
 TEST_F(AccountsManagerMutations, DeletingAnAccountThatIsNotThereChangesNothing) {
   const Store store = storeOf({mail("A").withChildren({calDAV("c")})});
-  store->deleteAccount(mail("B").record());
+  store->deleteAccount(recordOf(mail("B")));
   EXPECT_EQ(identifiersOf(store->allBasicSyncableAccounts()), "A c");
 }
 
@@ -132,7 +132,7 @@ TEST_F(AccountsManagerMutations, DeletingAnUnknownIdentifierLogsThatThereIsNoAcc
 
 TEST_F(AccountsManagerMutations, AReplacingAccountTakesThePlaceButIsNotFoundByItsIdentifier) {
   const Store store = storeOf({mail("A"), mail("B").withChildren({calDAV("c")}), mail("C")});
-  const BasicAccountReference replacement = exchange("Q").withChildren({calDAV("d")}).record();
+  const BasicAccountReference replacement = recordOf(exchange("Q").withChildren({calDAV("d")}));
   store->replaceAccount_withAccount(store->accountWithIdentifier("B"), replacement);
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A Q C");
   EXPECT_EQ(store->accountWithIdentifier("Q"), nullptr);
@@ -144,14 +144,14 @@ TEST_F(AccountsManagerMutations, AReplacingAccountTakesThePlaceButIsNotFoundByIt
 
 TEST_F(AccountsManagerMutations, AnInsertionDoesNotSeeAReplacingAccount) {
   const Store store = storeOf({mail("A")});
-  store->replaceAccount_withAccount(store->accountWithIdentifier("A"), exchange("Q").record());
-  store->insertAccount(mail("Q").record());
+  store->replaceAccount_withAccount(store->accountWithIdentifier("A"), recordOf(exchange("Q")));
+  store->insertAccount(recordOf(mail("Q")));
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "Q Q");
 }
 
 TEST_F(AccountsManagerMutations, AReplacingAccountIsFoundAfterTheStoreIsSavedAndLoadedAgain) {
   const Store store = storeFromFileOf({mail("A")});
-  store->replaceAccount_withAccount(store->accountWithIdentifier("A"), exchange("Q").record());
+  store->replaceAccount_withAccount(store->accountWithIdentifier("A"), recordOf(exchange("Q")));
   store->saveAllAccounts();
   const Store loaded = AccountsManager::initInsideOfMigration();
   EXPECT_NE(loaded->accountWithIdentifier("Q"), nullptr);
@@ -159,13 +159,13 @@ TEST_F(AccountsManagerMutations, AReplacingAccountIsFoundAfterTheStoreIsSavedAnd
 
 TEST_F(AccountsManagerMutations, AnAccountOfTheStoresOwnListCanBeReplaced) {
   const Store store = storeOf({mail("A").withChildren({calDAV("c")})});
-  store->replaceAccount_withAccount(store->allBasicAccounts().front(), mail("Q").record());
+  store->replaceAccount_withAccount(store->allBasicAccounts().front(), recordOf(mail("Q")));
   EXPECT_EQ(identifiersOf(store->allBasicSyncableAccounts()), "Q");
 }
 
 TEST_F(AccountsManagerMutations, ReplacingAnAccountThatIsNotInTheStoreIsAProgrammingError) {
   const Store store = storeOf({mail("A")});
-  EXPECT_DEATH(store->replaceAccount_withAccount(mail("A").record(), mail("B").record()),
+  EXPECT_DEATH(store->replaceAccount_withAccount(recordOf(mail("A")), recordOf(mail("B"))),
                R"(-\[AccountsManager replaceAccount:withAccount:\], AccountsManager: )"
                "The account to replace is not in the store");
 }
@@ -173,7 +173,7 @@ TEST_F(AccountsManagerMutations, ReplacingAnAccountThatIsNotInTheStoreIsAProgram
 TEST_F(AccountsManagerMutations, AnAddedChildIsTheLastOfItsParentAndIsIndexed) {
   const Store store = storeOf({mail("A").withChildren({calDAV("c")})});
   const BasicAccountReference parent = store->accountWithIdentifier("A");
-  store->addChild_toAccount(calDAV("d").record(), parent);
+  store->addChild_toAccount(recordOf(calDAV("d")), parent);
   EXPECT_EQ(parent->properties(),
             PropertyDictionary(mail("A").withChildren({calDAV("c"), calDAV("d")})));
   EXPECT_EQ(childrenOf(*store), "c d");
@@ -184,14 +184,14 @@ TEST_F(AccountsManagerMutations, TheFirstChildMakesAListInThePlaceOfAnAbsentOne)
   for (const AccountDictionary& parent :
        {mail("A"), mail("A").with(kAccountChildAccounts, "no list")}) {
     const Store store = storeOf({parent});
-    store->addChild_toAccount(calDAV("c").record(), store->accountWithIdentifier("A"));
+    store->addChild_toAccount(recordOf(calDAV("c")), store->accountWithIdentifier("A"));
     EXPECT_EQ(propertiesOf(*store, "A"), PropertyDictionary(mail("A").withChildren({calDAV("c")})));
   }
 }
 
 TEST_F(AccountsManagerMutations, AChildThatIsAddedTwiceIsStoredTwice) {
   const Store store = storeOf({mail("A").withChildren({calDAV("c")})});
-  store->addChild_toAccount(calDAV("c").record(), store->accountWithIdentifier("A"));
+  store->addChild_toAccount(recordOf(calDAV("c")), store->accountWithIdentifier("A"));
   EXPECT_EQ(propertiesOf(*store, "A"),
             PropertyDictionary(mail("A").withChildren({calDAV("c"), calDAV("c")})));
   EXPECT_EQ(childrenOf(*store), "c");
@@ -243,10 +243,10 @@ TEST_F(AccountsManagerMutations, AChildWithoutAnIdentifierCannotBeRemovedByTheOn
 TEST_F(AccountsManagerMutations, NothingReachesTheFileBeforeASave) {
   const Store store = storeFromFileOf({mail("A"), mail("B")});
   device.journal.clear();
-  store->insertAccount(mail("C").record());
-  store->updateAccount(exchange("A").record());
+  store->insertAccount(recordOf(mail("C")));
+  store->updateAccount(recordOf(exchange("A")));
   store->deleteAccountWithIdentifier("B");
-  store->addChild_toAccount(calDAV("c").record(), store->accountWithIdentifier("A"));
+  store->addChild_toAccount(recordOf(calDAV("c")), store->accountWithIdentifier("A"));
   store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, {});
   EXPECT_EQ(device.journal, std::vector<std::string>{});
 }

@@ -38,7 +38,7 @@ TEST_F(AccountsManagerQueries, AnUnknownIdentifierFindsNothing) {
 TEST_F(AccountsManagerQueries, TheListOfAccountsIsTheStoresOwn) {
   const Store store = storeOf({mail("A")});
   const AccountsManager::Accounts& accounts = store->allBasicAccounts();
-  store->insertAccount(mail("B").record());
+  store->insertAccount(recordOf(mail("B")));
   EXPECT_EQ(identifiersOf(accounts), "A B");
   EXPECT_EQ(&store->allBasicAccounts(), &accounts);
 }
@@ -115,7 +115,7 @@ TEST_F(AccountsManagerQueries, AChildWithoutASyncIdentifierFollowsItsParents) {
   const BasicAccountReference child = store->allBasicSyncableAccounts().back();
   store->deleteAccountWithIdentifier("B");
   ASSERT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("u")), "none");
-  child->setParentAccount(syncing(mail("elsewhere"), "u").record());
+  child->setParentAccount(recordOf(syncing(mail("elsewhere"), "u")));
   EXPECT_EQ(store->syncableAccountWithSyncIdentifier("u"), child);
 }
 
@@ -124,7 +124,7 @@ TEST_F(AccountsManagerQueries, AnAccountThatLeftTheStoreIsNoLongerFoundByItsSync
   ASSERT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("s")), "A");
   store->deleteAccountWithIdentifier("A");
   EXPECT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("s")), "B");
-  store->insertAccount(syncing(mail("C"), "u").record());
+  store->insertAccount(recordOf(syncing(mail("C"), "u")));
   EXPECT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("u")), "C");
 }
 
@@ -132,7 +132,7 @@ TEST_F(AccountsManagerQueries, AReplacingAccountIsFoundByItsSyncIdentifier) {
   const Store store = storeOf({syncing(mail("A"), "s")});
   ASSERT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("s")), "A");
   store->replaceAccountsWithTypes_withAccounts({kMailAccountType},
-                                               {syncing(mail("B"), "t").record()});
+                                               {recordOf(syncing(mail("B"), "t"))});
   EXPECT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("t")), "B");
   EXPECT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("s")), "none");
 }
@@ -145,7 +145,7 @@ TEST_F(AccountsManagerQueries, AfterAReplacementTheFirstOfSeveralAccountsIsStill
 
 TEST_F(AccountsManagerQueries, AChildThatIsAddedIsFoundByItsSyncIdentifierFromThenOn) {
   const Store store = storeOf({mail("A")});
-  const BasicAccountReference child = syncing(calDAV("c"), "s").record();
+  const BasicAccountReference child = recordOf(syncing(calDAV("c"), "s"));
   ASSERT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("s")), "none");
   store->addChild_toAccount(child, store->accountWithIdentifier("A"));
   EXPECT_EQ(identifierOf(store->syncableAccountWithSyncIdentifier("s")), "c");

@@ -130,9 +130,9 @@ class World {
         continue;
       }
       const bool isChild = below(3) != 0;
-      result.push_back((isChild ? calDAV(childIdentifier()) : account()).record());
+      result.push_back(recordOf((isChild ? calDAV(childIdentifier()) : account())));
       if (isChild) {
-        result.back()->setParentAccount(mail(topLevelIdentifier()).record());
+        result.back()->setParentAccount(recordOf(mail(topLevelIdentifier())));
       }
     }
     return result;
@@ -153,9 +153,9 @@ class World {
   std::string childIdentifier() { return std::string(1, "xyzA"[below(4)]); }
   AccountDictionary account() {
     const std::string identifier = topLevelIdentifier();
-    std::vector<PropertyValue> children;
+    PropertyArray children;
     for (std::size_t count = below(4); count > 0; --count) {
-      children.push_back(calDAV(childIdentifier()));
+      children.append(calDAV(childIdentifier()));
     }
     const AccountDictionary result = below(2) == 0 ? mail(identifier) : exchange(identifier);
     return children.empty() ? result : result.withChildren(children);

@@ -9,8 +9,8 @@ class AccountsManagerReplacement : public StoreFixture {
   /// A record of a child account whose parent has an identifier.
   static BasicAccountReference childOf(std::string_view parentIdentifier,
                                        const AccountDictionary& child) {
-    BasicAccountReference record = child.record();
-    record->setParentAccount(mail(parentIdentifier).record());
+    BasicAccountReference record = recordOf(child);
+    record->setParentAccount(recordOf(mail(parentIdentifier)));
     return record;
   }
   /// The identifiers of the children in the properties of a top-level account.
@@ -24,7 +24,7 @@ class AccountsManagerReplacement : public StoreFixture {
 TEST_F(AccountsManagerReplacement,
        AnAccountOfTheTypeWithAnotherIdentifierLeavesAndTheNewOneIsTheLast) {
   const Store store = storeOf({mail("A"), onMyDevice("B"), exchange("E")});
-  const BasicAccountReference account = onMyDevice("new").record();
+  const BasicAccountReference account = recordOf(onMyDevice("new"));
   store->replaceAccountsWithTypes_withAccounts({kOnMyDeviceAccountType}, {account});
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A E new");
   EXPECT_EQ(store->accountWithIdentifier("new"), account);
@@ -37,7 +37,7 @@ TEST_F(AccountsManagerReplacement,
 
 TEST_F(AccountsManagerReplacement, AnAccountWithTheSameIdentifierKeepsItsPlace) {
   const Store store = storeOf({mail("A"), onMyDevice("B"), exchange("E")});
-  const BasicAccountReference account = onMyDevice("B").record();
+  const BasicAccountReference account = recordOf(onMyDevice("B"));
   store->replaceAccountsWithTypes_withAccounts({kOnMyDeviceAccountType}, {account});
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A B E");
   EXPECT_EQ(store->allBasicAccounts()[1], account);
@@ -46,7 +46,7 @@ TEST_F(AccountsManagerReplacement, AnAccountWithTheSameIdentifierKeepsItsPlace) 
 
 TEST_F(AccountsManagerReplacement, AnAccountOfAnotherTypeIsReplacedByIdentifierToo) {
   const Store store = storeOf({exchange("A"), mail("B")});
-  store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, {mail("A").record()});
+  store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, {recordOf(mail("A"))});
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A");
   EXPECT_EQ(store->allBasicAccounts().front()->type(), Text(kMailAccountType));
 }
@@ -71,7 +71,7 @@ TEST_F(AccountsManagerReplacement, WithoutTypesAndAccountsNothingChanges) {
 TEST_F(AccountsManagerReplacement, NewAccountsAreAppendedInTheirOwnOrder) {
   const Store store = storeOf({exchange("E"), mail("B")});
   store->replaceAccountsWithTypes_withAccounts(
-      {kMailAccountType}, {mail("Z").record(), mail("B").record(), mail("Y").record()});
+      {kMailAccountType}, {recordOf(mail("Z")), recordOf(mail("B")), recordOf(mail("Y"))});
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "E B Z Y");
 }
 
@@ -84,8 +84,8 @@ TEST_F(AccountsManagerReplacement, TheStoresOwnListCanBeGivenBack) {
 TEST_F(AccountsManagerReplacement,
        OfTwoNewAccountsWithOneIdentifierTheLaterTakesThePlaceAndTheOtherIsAppended) {
   const Store store = storeOf({mail("A"), mail("B")});
-  const BasicAccountReference first = mail("A").record();
-  const BasicAccountReference second = exchange("A").record();
+  const BasicAccountReference first = recordOf(mail("A"));
+  const BasicAccountReference second = recordOf(exchange("A"));
   store->replaceAccountsWithTypes_withAccounts({}, {first, second});
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A B A");
   EXPECT_EQ(store->allBasicAccounts().front(), second);
@@ -96,7 +96,7 @@ TEST_F(AccountsManagerReplacement,
 TEST_F(AccountsManagerReplacement,
        EveryPlaceOfAnIdentifierIsTakenAndTheNewAccountIsNotAppendedAgain) {
   const Store store = storeOf({mail("A"), mail("B"), exchange("A")});
-  const BasicAccountReference account = mail("A").record();
+  const BasicAccountReference account = recordOf(mail("A"));
   store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, {account});
   EXPECT_EQ(store->allBasicAccounts(), (AccountsManager::Accounts{account, account}));
 }
@@ -110,14 +110,14 @@ TEST_F(AccountsManagerReplacement, OfKeptAccountsWithOneIdentifierTheFirstIsFoun
 TEST_F(AccountsManagerReplacement, AReplacedAccountsChildrenAreThoseOfTheNewOne) {
   const Store store = storeOf({mail("A").withChildren({calDAV("c"), calDAV("d")})});
   store->replaceAccountsWithTypes_withAccounts(
-      {kMailAccountType}, {mail("A").withChildren({calDAV("d"), calDAV("e")}).record()});
+      {kMailAccountType}, {recordOf(mail("A").withChildren({calDAV("d"), calDAV("e")}))});
   EXPECT_EQ(childrenOf(*store), "d e");
   EXPECT_EQ(store->accountWithIdentifier("c"), nullptr);
 }
 
 TEST_F(AccountsManagerReplacement, AnAccountThatReplaceAccountPutInIsFoundFromThenOn) {
   const Store store = storeOf({mail("A")});
-  store->replaceAccount_withAccount(store->accountWithIdentifier("A"), mail("Q").record());
+  store->replaceAccount_withAccount(store->accountWithIdentifier("A"), recordOf(mail("Q")));
   store->replaceAccountsWithTypes_withAccounts({kExchangeAccountType}, {});
   EXPECT_EQ(store->accountWithIdentifier("Q"), store->allBasicAccounts().front());
 }
@@ -151,7 +151,7 @@ TEST_F(AccountsManagerReplacement, AChildLeavesTheRecordThatTookItsOldParentsPla
   const Store store = storeOf({mail("A"), exchange("B")});
   store->replaceAccountsWithTypes_withAccounts(
       {kMailAccountType},
-      {mail("A").withChildren({calDAV("c")}).record(), childOf("B", calDAV("c"))});
+      {recordOf(mail("A").withChildren({calDAV("c")})), childOf("B", calDAV("c"))});
   EXPECT_EQ(storedChildren(*store, "A"), "");
   EXPECT_EQ(storedChildren(*store, "B"), "c");
 }
@@ -167,8 +167,8 @@ TEST_F(AccountsManagerReplacement, OfTwoNewChildrenWithOneIdentifierTheLaterStay
 
 TEST_F(AccountsManagerReplacement, AParentMayBeAmongTheNewAccountsBeforeItsChild) {
   const Store store = storeOf({mail("A").withChildren({calDAV("c")})});
-  store->replaceAccountsWithTypes_withAccounts({},
-                                               {exchange("N").record(), childOf("N", calDAV("c"))});
+  store->replaceAccountsWithTypes_withAccounts(
+      {}, {recordOf(exchange("N")), childOf("N", calDAV("c"))});
   EXPECT_EQ(storedChildren(*store, "A"), "");
   EXPECT_EQ(storedChildren(*store, "N"), "c");
   EXPECT_EQ(identifiersOf({store->accountWithIdentifier("c")}), "N");
@@ -218,16 +218,16 @@ std::string ignoringLine(std::string_view child) {
 TEST_F(AccountsManagerReplacement, AnAccountThatTakesSeveralPlacesHasItsChildrenLoadedInEach) {
   const Store store = storeOf({mail("A"), mail("B"), mail("A"), mail("A")});
   store->replaceAccountsWithTypes_withAccounts(
-      {}, {mail("A").withChildren({17}).record(), mail("B").withChildren({18}).record()});
+      {}, {recordOf(mail("A").withChildren({17})), recordOf(mail("B").withChildren({18}))});
   EXPECT_EQ(takeLines(), (Lines{replacingLine, ignoringLine("17"), ignoringLine("17"),
                                 ignoringLine("18"), ignoringLine("17")}));
 }
 
 TEST_F(AccountsManagerReplacement, AnAccountThatIsAppendedTwiceHasItsChildrenLoadedTwice) {
   const Store store = storeOf({mail("A")});
-  const BasicAccountReference twice = mail("B").withChildren({17}).record();
+  const BasicAccountReference twice = recordOf(mail("B").withChildren({17}));
   store->replaceAccountsWithTypes_withAccounts(
-      {}, {twice, mail("C").withChildren({18}).record(), twice});
+      {}, {twice, recordOf(mail("C").withChildren({18})), twice});
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A B C B");
   EXPECT_EQ(takeLines(),
             (Lines{replacingLine, ignoringLine("17"), ignoringLine("18"), ignoringLine("17")}));
@@ -277,7 +277,7 @@ TEST_F(AccountsManagerReplacement, AccountsAreFoundUnderTheIdentifierPropertyNot
   ASSERT_NE(device->identifier(), Text("stored"));
   store->insertAccount(device);
 
-  const BasicAccountReference successor = onMyDevice("stored").record();
+  const BasicAccountReference successor = recordOf(onMyDevice("stored"));
   store->replaceAccountsWithTypes_withAccounts({}, {successor});
 
   EXPECT_EQ(store->allBasicAccounts().back(), successor);

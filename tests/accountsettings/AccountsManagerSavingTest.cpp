@@ -51,7 +51,7 @@ TEST_F(AccountsManagerSaving, AKeyThatTheDiskDeletedAndMemoryLeftAloneStaysDelet
 
 TEST_F(AccountsManagerSaving, AnAccountThatIsNewInMemoryIsWrittenAsItIs) {
   const Store store = storeFromFileOf({mail("A")});
-  store->insertAccount(mail("B").with("Username", "somebody").record());
+  store->insertAccount(recordOf(mail("B").with("Username", "somebody")));
   store->saveAllAccounts();
   EXPECT_EQ(settingsAccount(1), PropertyDictionary(mail("B").with("Username", "somebody")));
 }
@@ -87,7 +87,7 @@ TEST_F(AccountsManagerSaving, AnAccountThatIsAChildOnDiskIsMergedSoWithTheChanne
 
 TEST_F(AccountsManagerSaving, WithoutAFileEveryAccountIsWrittenFromMemory) {
   const Store store = AccountsManager::initInsideOfMigration();
-  store->insertAccount(mail("A").record());
+  store->insertAccount(recordOf(mail("A")));
   store->saveAllAccounts();
   EXPECT_EQ(identifiersOf(settingsAccounts()), "A");
 }
@@ -119,7 +119,7 @@ TEST_F(AccountsManagerSaving, TheFileIsABinaryPropertyListOfTheMobileUser) {
 
 TEST_F(AccountsManagerSaving, TheAccountsAreWrittenInTheOrderOfTheStore) {
   const Store store = storeFromFileOf({mail("C"), mail("A"), mail("B")});
-  store->replaceAccount_withAccount(store->accountWithIdentifier("A"), exchange("Q").record());
+  store->replaceAccount_withAccount(store->accountWithIdentifier("A"), recordOf(exchange("Q")));
   store->saveAllAccounts();
   EXPECT_EQ(identifiersOf(settingsAccounts()), "C Q B");
 }
@@ -190,7 +190,7 @@ TEST_F(AccountsManagerSaving, TheBaselineStaysAsItWasWhenNotificationsAreSkipped
   const Store store = storeFromFileOf({mail("A")});
   AccountsManager::_setShouldSkipNotifications(true);
   change(*store, "A", "Username", "new");
-  store->insertAccount(mail("B").record());
+  store->insertAccount(recordOf(mail("B")));
   store->saveAllAccounts();
   EXPECT_EQ(*store->_originalAccounts().find("A"), PropertyDictionary(mail("A")));
   EXPECT_FALSE(store->_originalAccounts().contains("B"));

@@ -69,7 +69,8 @@ TEST_F(AccountsManagerScale, EveryAccountIsReplacedOneByOne) {
     const Store store = largeStore(count);
     const AccountsManager::Accounts accounts = store->allBasicAccounts();
     for (const BasicAccountReference& account : accounts) {
-      const BasicAccountReference parent = exchange(account->identifier()->string() + "Q").record();
+      const BasicAccountReference parent =
+          recordOf(exchange(account->identifier()->string() + "Q"));
       store->replaceAccount_withAccount(account, parent);
       account->setParentAccount(parent);
       store->addChild_toAccount(account, parent);
@@ -83,7 +84,7 @@ TEST_F(AccountsManagerScale, EveryAccountIsUpdatedAndFoundOneByOne) {
   expectInProportion([](std::size_t count) {
     const Store store = largeStore(count);
     for (std::size_t number = 0; number < count; ++number) {
-      const BasicAccountReference account = exchange(name("A", number)).record();
+      const BasicAccountReference account = recordOf(exchange(name("A", number)));
       store->updateAccount(account);
       ASSERT_EQ(store->accountWithIdentifier(name("A", number)), account);
     }
@@ -118,7 +119,7 @@ TEST_F(AccountsManagerScale, EveryAccountIsReplacedAtOnce) {
     AccountsManager::Accounts accounts;
     for (std::size_t number = 0; number < count; ++number) {
       accounts.push_back(
-          exchange(name("A", number)).withChildren({calDAV(name("d", number))}).record());
+          recordOf(exchange(name("A", number)).withChildren({calDAV(name("d", number))})));
     }
     store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, accounts);
     EXPECT_EQ(store->allBasicAccounts(), accounts);
@@ -130,7 +131,7 @@ TEST_F(AccountsManagerScale, OneNewAccountTakesManyPlaces) {
   expectInProportion([](std::size_t count) {
     const Store store = storeOf(std::vector<PropertyValue>(count, mail("A")));
     store->replaceAccountsWithTypes_withAccounts({},
-                                                 {mail("A").withChildren({calDAV("c")}).record()});
+                                                 {recordOf(mail("A").withChildren({calDAV("c")}))});
     EXPECT_EQ(store->count(), count);
     EXPECT_EQ(childrenOf(*store), "c");
   });

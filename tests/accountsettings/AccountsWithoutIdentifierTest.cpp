@@ -17,8 +17,8 @@ class AccountsWithoutIdentifier : public StoreFixture {
 TEST_F(AccountsWithoutIdentifier, AreInsertedEachTime) {
   const Store store = storeOf({mail("A")});
 
-  store->insertAccount(nameless(exchange("")).record());
-  store->insertAccount(nameless(exchange("")).record());
+  store->insertAccount(recordOf(nameless(exchange(""))));
+  store->insertAccount(recordOf(nameless(exchange(""))));
 
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A - -");
 }
@@ -26,7 +26,7 @@ TEST_F(AccountsWithoutIdentifier, AreInsertedEachTime) {
 TEST_F(AccountsWithoutIdentifier, UpdateNothing) {
   const Store store = storeOf({mail("A"), nameless(mail(""))});
 
-  store->updateAccount(nameless(exchange("")).record());
+  store->updateAccount(recordOf(nameless(exchange(""))));
 
   EXPECT_EQ(store->countOfBasicAccountsWithTypes({kExchangeAccountType}), 0U);
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A -");
@@ -35,7 +35,7 @@ TEST_F(AccountsWithoutIdentifier, UpdateNothing) {
 TEST_F(AccountsWithoutIdentifier, AreReplacedByAnother) {
   const Store store = storeOf({mail("A"), nameless(mail(""))});
 
-  store->replaceAccount_withAccount(store->allBasicAccounts().at(1), mail("B").record());
+  store->replaceAccount_withAccount(store->allBasicAccounts().at(1), recordOf(mail("B")));
 
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "A B");
 }
@@ -43,7 +43,7 @@ TEST_F(AccountsWithoutIdentifier, AreReplacedByAnother) {
 TEST_F(AccountsWithoutIdentifier, AreReplacedWithTheAccountsOfTheirType) {
   const Store store = storeOf({nameless(mail("")), nameless(exchange("")), mail("A")});
 
-  store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, {mail("B").record()});
+  store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, {recordOf(mail("B"))});
 
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "- B");
   EXPECT_EQ(store->allBasicAccounts().front()->type(), kExchangeAccountType);
@@ -53,15 +53,15 @@ TEST_F(AccountsWithoutIdentifier, AmongTheReplacementsAreAppended) {
   const Store store = storeOf({mail("A"), exchange("E")});
 
   store->replaceAccountsWithTypes_withAccounts(
-      {kMailAccountType}, {nameless(mail("")).record(), nameless(mail("")).record()});
+      {kMailAccountType}, {recordOf(nameless(mail(""))), recordOf(nameless(mail("")))});
 
   EXPECT_EQ(identifiersOf(store->allBasicAccounts()), "E - -");
 }
 
 TEST_F(AccountsWithoutIdentifier, KeepTheirChildrenWhenAnotherParentGetsOne) {
   const Store store = storeOf({exchange("E")});
-  const BasicAccountReference parent = nameless(mail("")).withChildren({calDAV("c")}).record();
-  const BasicAccountReference child = calDAV("c").record();
+  const BasicAccountReference parent = recordOf(nameless(mail("")).withChildren({calDAV("c")}));
+  const BasicAccountReference child = recordOf(calDAV("c"));
   child->setParentAccount(store->accountWithIdentifier("E"));
 
   store->replaceAccountsWithTypes_withAccounts({kMailAccountType}, {parent, child});
@@ -83,7 +83,7 @@ TEST_F(AccountsWithoutIdentifier, AreSavedFromMemoryAlone) {
 
 TEST_F(AccountsWithoutIdentifier, AreSavedThoughTheFixerCannotKeepThem) {
   const Store store = storeOf({mail("A")});
-  store->insertAccount(nameless(mailThatCannotBeFixed("")).record());
+  store->insertAccount(recordOf(nameless(mailThatCannotBeFixed(""))));
 
   store->saveAllAccounts();
 

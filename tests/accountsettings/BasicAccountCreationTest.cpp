@@ -9,19 +9,12 @@ using Lines = std::vector<std::string>;
 
 constexpr const char* kFirstUUID = "00000000-0000-0000-0000-000000000001";
 
-const PropertyDictionary complete = {
-    {kAccountType, "Mail"}, {kAccountClass, "IMAPAccount"}, {kAccountIdentifier, "mail-1"}};
-
-PropertyDictionary completeWithout(std::string_view key) {
-  PropertyDictionary properties = complete;
-  properties.remove(key);
-  return properties;
-}
+const AccountDictionary complete = anAccount("mail-1", "Mail", "IMAPAccount");
 
 TEST(BasicAccountCreation, ACompleteDictionaryBecomesTheRecordAsItIs) {
   FakeProcess device;
   const BasicAccountReference account = BasicAccount::initWithProperties(complete);
-  EXPECT_EQ(account->properties(), complete);
+  EXPECT_EQ(account->properties(), PropertyDictionary(complete));
   EXPECT_EQ(account->parentAccount(), nullptr);
 }
 
@@ -34,7 +27,7 @@ TEST(BasicAccountCreation, ADictionaryWithAnIdentifierGetsNoSyncIdentifier) {
 
 TEST(BasicAccountCreation, ADictionaryWithoutIdentifierGetsAFreshOneForSyncingToo) {
   FakeProcess device;
-  const auto account = BasicAccount::initWithProperties(completeWithout(kAccountIdentifier));
+  const auto account = BasicAccount::initWithProperties(complete.without(kAccountIdentifier));
   EXPECT_EQ(account->identifier(), kFirstUUID);
   EXPECT_EQ(account->syncStoreIdentifier(), kFirstUUID);
 }
@@ -42,34 +35,34 @@ TEST(BasicAccountCreation, ADictionaryWithoutIdentifierGetsAFreshOneForSyncingTo
 TEST(BasicAccountCreation, AnExistingSyncIdentifierIsKeptBesideAFreshIdentifier) {
   FakeProcess device;
   const auto account = BasicAccount::initWithProperties(
-      with(completeWithout(kAccountIdentifier), {{kAccountSyncIdentifier, "sync-1"}}));
+      complete.without(kAccountIdentifier).with(kAccountSyncIdentifier, "sync-1"));
   EXPECT_EQ(account->identifier(), kFirstUUID);
   EXPECT_EQ(account->syncStoreIdentifier(), "sync-1");
 }
 
 TEST(BasicAccountCreation, AnIdentifierThatIsNoTextIsReplaced) {
   FakeProcess device;
-  const auto account = BasicAccount::initWithProperties(with(complete, {{kAccountIdentifier, 17}}));
+  const auto account = BasicAccount::initWithProperties(complete.with(kAccountIdentifier, 17));
   EXPECT_EQ(account->identifier(), kFirstUUID);
 }
 
 TEST(BasicAccountCreation, AnEmptyIdentifierIsKept) {
   FakeProcess device;
-  const auto account = BasicAccount::initWithProperties(with(complete, {{kAccountIdentifier, ""}}));
+  const auto account = BasicAccount::initWithProperties(complete.with(kAccountIdentifier, ""));
   EXPECT_EQ(account->identifier(), "");
 }
 
 TEST(BasicAccountCreation, WithoutAUUIDTheRecordHasNoIdentifier) {
   FakeProcess device;
   device.uuidGenerator.canGenerate = false;
-  const auto account = BasicAccount::initWithProperties(completeWithout(kAccountIdentifier));
+  const auto account = BasicAccount::initWithProperties(complete.without(kAccountIdentifier));
   EXPECT_EQ(account->identifier(), std::nullopt);
-  EXPECT_EQ(account->properties(), completeWithout(kAccountIdentifier));
+  EXPECT_EQ(account->properties(), PropertyDictionary(complete.without(kAccountIdentifier)));
 }
 
 TEST(BasicAccountCreation, TheSnapshotIsTheDictionaryAsGiven) {
   FakeProcess device;
-  const PropertyDictionary given = completeWithout(kAccountIdentifier);
+  const PropertyDictionary given = complete.without(kAccountIdentifier);
   const auto account = BasicAccount::initWithProperties(given);
   EXPECT_EQ(account->originalProperties(), given);
 }
@@ -78,33 +71,33 @@ TEST(BasicAccountCreation, ALaterChangeLeavesTheSnapshot) {
   FakeProcess device;
   const auto account = BasicAccount::initWithProperties(complete);
   account->setDisplayName("Home");
-  EXPECT_EQ(account->originalProperties(), complete);
+  EXPECT_EQ(account->originalProperties(), PropertyDictionary(complete));
 }
 
 TEST(BasicAccountCreation, MakingARecordChangesNoIdentifierOfAnother) {
   FakeProcess device;
-  BasicAccount::initWithProperties(completeWithout(kAccountIdentifier));
+  BasicAccount::initWithProperties(complete.without(kAccountIdentifier));
   EXPECT_EQ(device.process.identifierChanges, 0U);
 }
 
 TEST(BasicAccountCreation, AnUnknownTypeIsRejectedAndNamed) {
   FakeProcess device;
-  EXPECT_EQ(BasicAccount::initWithProperties(with(complete, {{kAccountType, "X"}})), nullptr);
+  EXPECT_EQ(BasicAccount::initWithProperties(complete.with(kAccountType, "X")), nullptr);
   EXPECT_EQ(device.logSystem.channel.linesWithoutNumbers(),
             Lines{"-[BasicAccount initWithProperties:] (N) \"Invalid account type: X\""});
 }
 
 TEST(BasicAccountCreation, AMissingTypeIsRejectedAsAnAbsentOne) {
   FakeProcess device;
-  EXPECT_EQ(BasicAccount::initWithProperties(completeWithout(kAccountType)), nullptr);
+  EXPECT_EQ(BasicAccount::initWithProperties(complete.without(kAccountType)), nullptr);
   EXPECT_EQ(device.logSystem.channel.linesWithoutNumbers(),
             Lines{"-[BasicAccount initWithProperties:] (N) \"Invalid account type: (null)\""});
 }
 
 TEST(BasicAccountCreation, AClassThatIsMissingEmptyOrNoTextIsRejected) {
-  for (const PropertyDictionary& properties :
-       {completeWithout(kAccountClass), with(complete, {{kAccountClass, ""}}),
-        with(complete, {{kAccountClass, 1}})}) {
+  for (const AccountDictionary& properties :
+       {complete.without(kAccountClass), complete.with(kAccountClass, ""),
+        complete.with(kAccountClass, 1)}) {
     FakeProcess device;
     EXPECT_EQ(BasicAccount::initWithProperties(properties), nullptr);
     EXPECT_EQ(device.logSystem.channel.linesWithoutNumbers(),

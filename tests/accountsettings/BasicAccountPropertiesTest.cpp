@@ -7,7 +7,8 @@ namespace {
 
 BasicAccountReference childOf(const BasicAccountReference& parent,
                               const PropertyDictionary& further = {}) {
-  BasicAccountReference child = mailAccount(with({{kAccountIdentifier, "child-1"}}, further));
+  BasicAccountReference child = mailAccount(
+      AccountDictionary(PropertyDictionary{{kAccountIdentifier, "child-1"}}).with(further));
   child->setParentAccount(parent);
   return child;
 }

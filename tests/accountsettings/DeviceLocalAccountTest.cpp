@@ -33,9 +33,10 @@ TEST(DeviceLocalAccount, StoredIdentifiersAndDisplayNameAreIgnored) {
   FakeProcess device;
   translate(device, "ON_MY_DEVICE_TYPE_HANDRA", "On My Handra");
   const BasicAccountReference account = DeviceLocalAccount::accountWithProperties(
-      with(DeviceLocalAccount::basicAccountProperties(), {{kAccountIdentifier, "other"},
-                                                          {kAccountSyncIdentifier, "other"},
-                                                          {kAccountDisplayName, "other"}}));
+      AccountDictionary(DeviceLocalAccount::basicAccountProperties())
+          .with({{kAccountIdentifier, "other"},
+                 {kAccountSyncIdentifier, "other"},
+                 {kAccountDisplayName, "other"}}));
   EXPECT_EQ(account->identifier(), "DeviceLocalAccount");
   EXPECT_EQ(account->syncStoreIdentifier(), "DeviceLocalAccount");
   EXPECT_EQ(account->displayName(), "On My Handra");
@@ -49,7 +50,8 @@ TEST(DeviceLocalAccount, ItRejectsWhatEveryRecordRejects) {
 TEST(DeviceLocalAccount, AnAccountRecordOfItsTypeIsNoDeviceLocalAccount) {
   FakeProcess device;
   const auto account = BasicAccount::initWithProperties(
-      with(DeviceLocalAccount::basicAccountProperties(), {{kAccountIdentifier, "other"}}));
+      AccountDictionary(DeviceLocalAccount::basicAccountProperties())
+          .with(kAccountIdentifier, "other"));
   EXPECT_EQ(account->identifier(), "other");
 }
 

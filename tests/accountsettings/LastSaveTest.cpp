@@ -47,7 +47,7 @@ TEST_F(LastSaveTest, TheSameContentThatSomebodyElseWroteIsAnother) {
 
 TEST_F(LastSaveTest, AnotherIdentifierOrNumberOfAccountsInMemoryEndsIt) {
   const PropertyArray written = save({mail("A"), mail("B")});
-  const BasicAccountReference added = mail("C").record();
+  const BasicAccountReference added = recordOf(mail("C"));
   memory.append(added);
   EXPECT_FALSE(isThere(written));
   memory.removeLast("C");
@@ -71,12 +71,12 @@ TEST_F(LastSaveTest, WhatAStoreWouldWriteALineAboutIsLoaded) {
 TEST_F(LastSaveTest, WhatAStoreWouldAddAnIdentifierToIsLoaded) {
   EXPECT_FALSE(
       isThere(save({exchange("P").withChildren({mail("A").without(kAccountIdentifier)})})));
-  memory.assign({mail("A").record()});
+  memory.assign({recordOf(mail("A"))});
   EXPECT_FALSE(isThere(note({PropertyDictionary(mail("A").without(kAccountIdentifier))})));
 }
 
 TEST_F(LastSaveTest, WhatTheDiskContributedIsLoadedIfTheFixersWouldChangeOrDropIt) {
-  memory.assign({mail("A").record()});
+  memory.assign({recordOf(mail("A"))});
   EXPECT_TRUE(isThere(note({PropertyDictionary(mail("A").with("Username", "disk"))})));
   EXPECT_FALSE(isThere(note({PropertyDictionary(mailThatCanBeFixed("A"))})));
   EXPECT_FALSE(isThere(note({PropertyDictionary(mailThatCannotBeFixed("A"))})));
@@ -84,7 +84,7 @@ TEST_F(LastSaveTest, WhatTheDiskContributedIsLoadedIfTheFixersWouldChangeOrDropI
 
 TEST_F(LastSaveTest, WhatIsChangedBetweenTwoSavesIsLookedAtAgain) {
   const PropertyDictionary kept = mail("A");
-  memory.assign({mail("A").record(), exchange("P").record()});
+  memory.assign({recordOf(mail("A")), recordOf(exchange("P"))});
   EXPECT_TRUE(isThere(note({kept, PropertyDictionary(exchange("P"))})));
   EXPECT_FALSE(
       isThere(note({kept, PropertyDictionary(exchange("P").withChildren({"no account"}))})));

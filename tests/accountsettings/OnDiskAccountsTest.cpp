@@ -122,7 +122,7 @@ TEST_F(OnDiskAccountsTest, WhateverWasSavedTheAnswersAreThoseOfAStoreMadeFromThe
       }
     }
     if (below(8) == 0) {
-      memory.append(mail(identifier()).record());
+      memory.append(recordOf(mail(identifier())));
     }
     if (below(8) == 0) {
       memory.removeLast(identifier());

@@ -12,7 +12,7 @@ class OrderedAccountsTest : public StoreFixture {
  protected:
   /// Appends an account with an identifier and returns its record.
   BasicAccountReference append(std::string_view identifier) {
-    list.append(mail(identifier).record());
+    list.append(recordOf(mail(identifier)));
     return list.accounts().back();
   }
   [[nodiscard]] std::string identifiers() const { return identifiersOf(list.accounts()); }
@@ -30,7 +30,7 @@ TEST_F(OrderedAccountsTest, AccountsAreListedInTheOrderInWhichTheyWereAppended) 
 TEST_F(OrderedAccountsTest, AReplacedAccountLeavesItsPlaceToTheNewOne) {
   append("A");
   append("B");
-  const BasicAccountReference replacement = mail("A").record();
+  const BasicAccountReference replacement = recordOf(mail("A"));
   EXPECT_EQ(list.replaceAll("A", replacement), 1u);
   EXPECT_EQ(identifiers(), "A B");
   EXPECT_EQ(list.accounts().front(), replacement);
@@ -40,7 +40,7 @@ TEST_F(OrderedAccountsTest, EveryPlaceOfAnIdentifierIsReplaced) {
   append("A");
   append("B");
   append("A");
-  const BasicAccountReference replacement = mail("A").record();
+  const BasicAccountReference replacement = recordOf(mail("A"));
   EXPECT_EQ(list.replaceAll("A", replacement), 2u);
   EXPECT_EQ(list.accounts()[0], replacement);
   EXPECT_EQ(list.accounts()[2], replacement);
@@ -48,27 +48,27 @@ TEST_F(OrderedAccountsTest, EveryPlaceOfAnIdentifierIsReplaced) {
 
 TEST_F(OrderedAccountsTest, ReplacingAnUnknownIdentifierChangesNothing) {
   append("A");
-  EXPECT_EQ(list.replaceAll("B", mail("B").record()), 0u);
+  EXPECT_EQ(list.replaceAll("B", recordOf(mail("B"))), 0u);
   EXPECT_EQ(identifiers(), "A");
 }
 
 TEST_F(OrderedAccountsTest, ARecordIsReplacedInItsFirstPlaceOnly) {
   const BasicAccountReference account = append("A");
   list.append(account);
-  EXPECT_TRUE(list.replaceFirst(account, mail("Q").record()));
+  EXPECT_TRUE(list.replaceFirst(account, recordOf(mail("Q"))));
   EXPECT_EQ(identifiers(), "Q A");
 }
 
 TEST_F(OrderedAccountsTest, ARecordIsReplacedByIdentityAndNotByIdentifier) {
   append("A");
   const BasicAccountReference second = append("A");
-  EXPECT_TRUE(list.replaceFirst(second, mail("Q").record()));
+  EXPECT_TRUE(list.replaceFirst(second, recordOf(mail("Q"))));
   EXPECT_EQ(identifiers(), "A Q");
 }
 
 TEST_F(OrderedAccountsTest, AReplacementIsFoundUnderItsOwnIdentifier) {
   const BasicAccountReference account = append("A");
-  list.replaceFirst(account, mail("Q").record());
+  list.replaceFirst(account, recordOf(mail("Q")));
   EXPECT_EQ(list.removeLast("A"), nullptr);
   EXPECT_NE(list.removeLast("Q"), nullptr);
   EXPECT_EQ(list.size(), 0u);
@@ -76,7 +76,7 @@ TEST_F(OrderedAccountsTest, AReplacementIsFoundUnderItsOwnIdentifier) {
 
 TEST_F(OrderedAccountsTest, ARecordThatIsNotThereCannotBeReplaced) {
   append("A");
-  EXPECT_FALSE(list.replaceFirst(mail("A").record(), mail("Q").record()));
+  EXPECT_FALSE(list.replaceFirst(recordOf(mail("A")), recordOf(mail("Q"))));
   EXPECT_EQ(identifiers(), "A");
 }
 
@@ -121,7 +121,7 @@ TEST_F(OrderedAccountsTest, AnAccountWithoutAnIdentifierStaysInItsPlace) {
 
 TEST_F(OrderedAccountsTest, AssigningPutsOtherAccountsInThePlaceOfAll) {
   append("A");
-  list.assign({mail("B").record(), mail("C").record()});
+  list.assign({recordOf(mail("B")), recordOf(mail("C"))});
   EXPECT_EQ(list.removeLast("A"), nullptr);
   EXPECT_NE(list.removeLast("B"), nullptr);
   EXPECT_EQ(identifiers(), "C");
@@ -131,8 +131,8 @@ TEST_F(OrderedAccountsTest, AssignedAccountsAreFoundInTheirOwnPlaces) {
   append("A");
   append("B");
   list.removeLast("nothing, but the list is indexed now");
-  list.assign({mail("B").record(), mail("C").record(), mail("A").record()});
-  const BasicAccountReference replacement = mail("Q").record();
+  list.assign({recordOf(mail("B")), recordOf(mail("C")), recordOf(mail("A"))});
+  const BasicAccountReference replacement = recordOf(mail("Q"));
   EXPECT_EQ(list.replaceAll("A", replacement), 1u);
   EXPECT_EQ(identifiers(), "B C Q");
   EXPECT_EQ(list.replaceAll("A", replacement), 0u);
@@ -181,7 +181,7 @@ TEST_F(OrderedAccountsTest, AnySequenceOfOperationsGivesWhatPlainWalksGive) {
   const std::vector<std::string> names = {"A", "B", "C", "D", "E", "F"};
   std::vector<BasicAccountReference> records;
   for (std::size_t count = 0; count < 12; ++count) {
-    records.push_back(mail(names[count % names.size()]).record());
+    records.push_back(recordOf(mail(names[count % names.size()])));
   }
   PlainList plain;
   for (int step = 0; step < 5000; ++step) {

@@ -12,61 +12,33 @@
 
 #include "accountsettings/AccountsManager.h"
 #include "tests/fakes/FakePlatform.h"
+#include "tests/fakes/StoreContents.h"
 
 namespace accounts {
 
-/// An account dictionary in the making, such as mail("A").with("Username", "somebody").
-class AccountDictionary {
- public:
-  AccountDictionary(std::string_view type, std::string_view accountClass,
-                    std::string_view identifier)
-      : properties_{{kAccountType, type},
-                    {kAccountClass, accountClass},
-                    {kAccountIdentifier, identifier}} {}
-
-  [[nodiscard]] AccountDictionary with(std::string_view key, PropertyValue value) const {
-    AccountDictionary changed = *this;
-    changed.properties_.set(key, std::move(value));
-    return changed;
-  }
-  [[nodiscard]] AccountDictionary without(std::string_view key) const {
-    AccountDictionary changed = *this;
-    changed.properties_.remove(key);
-    return changed;
-  }
-  [[nodiscard]] AccountDictionary withChildren(std::vector<PropertyValue> children) const {
-    return with(kAccountChildAccounts, PropertyArray(std::move(children)));
-  }
-
-  operator PropertyDictionary() const { return properties_; }
-  operator PropertyValue() const { return properties_; }
-  /// A record made from the dictionary.
-  [[nodiscard]] BasicAccountReference record() const {
-    return BasicAccount::initWithProperties(properties_);
-  }
-
- private:
-  PropertyDictionary properties_;
-};
+/// A record made from a dictionary.
+inline BasicAccountReference recordOf(const PropertyDictionary& account) {
+  return BasicAccount::initWithProperties(account);
+}
 
 inline AccountDictionary mail(std::string_view identifier) {
-  return {kMailAccountType, "IMAPAccount", identifier};
+  return anAccount(identifier, kMailAccountType, "IMAPAccount");
 }
 inline AccountDictionary exchange(std::string_view identifier) {
-  return {kExchangeAccountType, "MobileExchangeAccount", identifier};
+  return anAccount(identifier, kExchangeAccountType, "MobileExchangeAccount");
 }
 inline AccountDictionary calDAV(std::string_view identifier) {
-  return {kCalDAVAccountType, "MobileCalDAVAccount", identifier};
+  return anAccount(identifier, kCalDAVAccountType, "MobileCalDAVAccount");
 }
 inline AccountDictionary onMyDevice(std::string_view identifier) {
-  return {kOnMyDeviceAccountType, "DeviceLocalAccount", identifier};
+  return anAccount(identifier, kOnMyDeviceAccountType, "DeviceLocalAccount");
 }
 inline AccountDictionary ofUnknownType(std::string_view identifier) {
-  return {"Carrier Pigeon", "PigeonAccount", identifier};
+  return anAccount(identifier, "Carrier Pigeon", "PigeonAccount");
 }
 /// A mail account whose class the mail fixer cannot work out.
 inline AccountDictionary mailThatCannotBeFixed(std::string_view identifier) {
-  return {kMailAccountType, "BrokenAccount", identifier};
+  return anAccount(identifier, kMailAccountType, "BrokenAccount");
 }
 /// A mail account whose class the mail fixer works out.
 inline AccountDictionary mailThatCanBeFixed(std::string_view identifier) {

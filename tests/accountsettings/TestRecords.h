@@ -7,6 +7,7 @@
 #include "accountsettings/BasicAccount.h"
 #include "propertylist/value/Description.h"
 #include "tests/fakes/FakePlatform.h"
+#include "tests/fakes/StoreContents.h"
 
 namespace accounts {
 
@@ -36,29 +37,17 @@ inline std::string described(const std::optional<PropertyValue>& value) {
   return description;
 }
 
-/// An account dictionary with further entries; of two entries with one key the later one holds.
-inline PropertyDictionary with(PropertyDictionary properties, const PropertyDictionary& further) {
-  for (const auto& [key, value] : further) {
-    properties.set(key, value);
-  }
-  return properties;
-}
-
 /// A mail account with the identifier "mail-1" and further properties.
 inline BasicAccountReference mailAccount(const PropertyDictionary& further = {}) {
-  return BasicAccount::initWithProperties(with({{kAccountType, kMailAccountType},
-                                                {kAccountClass, "IMAPAccount"},
-                                                {kAccountIdentifier, "mail-1"}},
-                                               further));
+  return BasicAccount::initWithProperties(
+      anAccount("mail-1", kMailAccountType, "IMAPAccount").with(further));
 }
 
 /// A primary cloud account, whose type supports nearly all dataclasses, with the identifier
 /// "cloud-1" and further properties.
 inline BasicAccountReference cloudAccount(const PropertyDictionary& further = {}) {
-  return BasicAccount::initWithProperties(with({{kAccountType, kQuarxAccountType},
-                                                {kAccountClass, "ZQAccount"},
-                                                {kAccountIdentifier, "cloud-1"}},
-                                               further));
+  return BasicAccount::initWithProperties(
+      anAccount("cloud-1", kQuarxAccountType, "ZQAccount").with(further));
 }
 
 /// Makes an account-types configuration with a single type, whose properties these are, the one of

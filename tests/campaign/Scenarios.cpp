@@ -7,6 +7,7 @@
 #include "propertylist/binary/BinaryPropertyList.h"
 #include "tests/campaign/Run.h"
 #include "tests/campaign/Scenario.h"
+#include "tests/fakes/StoreContents.h"
 #include "vocabulary/AccountVocabulary.h"
 
 namespace accounts {
@@ -84,44 +85,34 @@ class ScenarioBuilder {
   Scenario scenario_;
 };
 
-PropertyDictionary account(std::string_view identifier, std::string_view type,
-                           std::string_view accountClass) {
-  return {{kAccountIdentifier, identifier},
-          {kAccountType, type},
-          {kAccountClass, accountClass},
-          {kAccountDisplayName, identifier},
-          {kAccountUsername, "anna"}};
+AccountDictionary account(std::string_view identifier, std::string_view type,
+                          std::string_view accountClass) {
+  return anAccount(identifier, type, accountClass)
+      .with(kAccountDisplayName, identifier)
+      .with(kAccountUsername, "anna");
 }
 
 PropertyDictionary settings(PropertyValue version) {
-  return {
-      {kPlistVersionKey, std::move(version)},
-      {kPlistAccountsKey, PropertyArray{account("CALDAV-1", kCalDAVAccountType, "CalDAVAccount"),
-                                        account("IMAP-1", kMailAccountType, "IMAPAccount"),
-                                        account("EX-1", kExchangeAccountType, "ASAccount")}}};
+  return accountSettings(std::move(version),
+                         {account("CALDAV-1", kCalDAVAccountType, "CalDAVAccount"),
+                          account("IMAP-1", kMailAccountType, "IMAPAccount"),
+                          account("EX-1", kExchangeAccountType, "ASAccount")});
 }
 
 PropertyDictionary legacyMail() {
-  return {{"MailAccounts", PropertyArray{PropertyDictionary{{"AccountType", "IMAPAccount"},
-                                                            {"uniqueId", "OLD-IMAP"},
-                                                            {"Username", "anna"}},
-                                         PropertyDictionary{{"AccountType", "GmailAccount"},
-                                                            {"uniqueId", "OLD-GMAIL"},
-                                                            {"Username", "anna@gmail.com"}}}},
-          {"DeliveryAccounts", PropertyArray{PropertyDictionary{{"AccountType", "SMTPAccount"},
-                                                                {"uniqueId", "OLD-SMTP"}}}}};
+  return mailStore(
+      {aMailDescription("OLD-IMAP", "IMAPAccount").with(kAccountUsername, "anna"),
+       aMailDescription("OLD-GMAIL", "GmailAccount").with(kAccountUsername, "anna@gmail.com")},
+      {aMailDescription("OLD-SMTP", "SMTPAccount")});
 }
 
 PropertyDictionary legacyExchange() {
-  return {{"DAAccountsKey",
-           PropertyArray{PropertyDictionary{{"DAAccountConfigurationClass", "ASAccount"},
-                                            {"DAAccountConfigurationAccountID", "OLD-EX"},
-                                            {"DAAccountDescription", "Work"}}}}};
+  return exchangeStore({anExchangeDescription("OLD-EX").with(kLegacyExchangeDisplayName, "Work")});
 }
 
 /// A legacy store with one description that cannot be converted.
 PropertyDictionary brokenExchange() {
-  return {{"DAAccountsKey", PropertyArray{PropertyDictionary{{"DAAccountDescription", "Work"}}}}};
+  return exchangeStore({PropertyDictionary{{kLegacyExchangeDisplayName, "Work"}}});
 }
 
 std::string original(std::string_view path) {

@@ -8,27 +8,28 @@ namespace {
 using testing::ElementsAre;
 using testing::IsEmpty;
 
-PropertyDictionary hosted(std::string_view identifier) {
-  return anAccount(identifier, kVelmoraAccountType, kVelmoraAccountClass);
+AccountDictionary hosted(std::string_view identifier) {
+  return accountWithHost(identifier, kVelmoraAccountType, kVelmoraAccountClass);
 }
 
 TEST(Fates, AnAccountThatNoRuleTouchesIsKept) {
   const MigratedInMemory migrated(
-      {.settings = settings(12, {anAccount("A", kLDAPAccountType, "LDAPAccount")})});
+      {.settings = accountSettings(12, {accountWithHost("A", kLDAPAccountType, "LDAPAccount")})});
   EXPECT_THAT(migrated.fates(), ElementsAre("Accounts[0] kept"));
 }
 
 TEST(Fates, AnAccountWithoutAnIdentifierIsGivenAFreshOneAndIsChanged) {
   const MigratedInMemory migrated(
-      {.settings = settings(
-           12, {without(anAccount("A", kLDAPAccountType, "LDAPAccount"), kAccountIdentifier)})});
+      {.settings = accountSettings(
+           12,
+           {accountWithHost("A", kLDAPAccountType, "LDAPAccount").without(kAccountIdentifier)})});
   EXPECT_THAT(migrated.fates(), ElementsAre("Accounts[0] changed"));
 }
 
 TEST(Fates, AnAccountWithAUniqueIdIsRenamed) {
   const MigratedInMemory migrated(
-      {.settings = settings(1, {with(anAccount("A", kMailAccountType, kIMAPAccountClass),
-                                     kLegacyMailIdentifier, "B")})});
+      {.settings = accountSettings(1, {accountWithHost("A", kMailAccountType, kIMAPAccountClass)
+                                           .with(kLegacyMailIdentifier, "B")})});
   EXPECT_THAT(migrated.fates(), ElementsAre("Accounts[0] renamed"));
   EXPECT_THAT(migrated.losses(), IsEmpty());
 }
@@ -44,15 +45,15 @@ TEST(Fates, DescriptionsAreConverted) {
 
 TEST(Fates, DescriptionsWithoutIdentifiersAreConverted) {
   const MigratedInMemory migrated(
-      {.mail = mailStore({without(mailDescription("A", kIMAPAccountClass), kLegacyMailIdentifier)}),
-       .exchange = exchangeStore({without(exchangeDescription("C"), kLegacyExchangeIdentifier)})});
+      {.mail = mailStore({mailDescription("A", kIMAPAccountClass).without(kLegacyMailIdentifier)}),
+       .exchange = exchangeStore({exchangeDescription("C").without(kLegacyExchangeIdentifier)})});
   EXPECT_THAT(migrated.losses(), IsEmpty());
 }
 
 TEST(Fates, AHostedAccountMovesBelowAParentWithItsChildrenAtTheParentsSide) {
-  const PropertyDictionary child = anAccount("K", kCalDAVAccountType, "CalDAVAccount");
+  const PropertyDictionary child = accountWithHost("K", kCalDAVAccountType, "CalDAVAccount");
   const MigratedInMemory migrated(
-      {.settings = settings(6, {with(hosted("A"), kAccountChildAccounts, PropertyArray{child})})});
+      {.settings = accountSettings(6, {hosted("A").withChildren({child})})});
   EXPECT_THAT(migrated.fates(), ElementsAre("Accounts[0] movedBelow",
                                             "Accounts[0].ChildAccounts[0] movedToOtherParent"));
   EXPECT_EQ(migrated.ledger().entries[0].now, std::vector{LedgerPlace({0, 1})});
@@ -62,36 +63,37 @@ TEST(Fates, AHostedAccountMovesBelowAParentWithItsChildrenAtTheParentsSide) {
 
 TEST(Fates, AHostedChildWithoutAnIdentifierIsGivenOneWhereAStepTakesItsNameOff) {
   const PropertyDictionary child =
-      without(with(hosted("A"), kAccountDisplayName, "Velmora"), kAccountIdentifier);
-  const PropertyDictionary cloud = with(anAccount("Q", kQuarxAccountType, kCloudAccountClass),
-                                        kAccountChildAccounts, PropertyArray{child});
-  EXPECT_THAT(MigratedInMemory({.settings = settings(7, {cloud})}).fates(),
+      hosted("A").with(kAccountDisplayName, "Velmora").without(kAccountIdentifier);
+  const PropertyDictionary cloud =
+      accountWithHost("Q", kQuarxAccountType, kCloudAccountClass).withChildren({child});
+  EXPECT_THAT(MigratedInMemory({.settings = accountSettings(7, {cloud})}).fates(),
               ElementsAre("Accounts[0] changed", "Accounts[0].ChildAccounts[0] changed"));
 }
 
 TEST(Fates, ACalendarAccountIsJoinedIntoItsMailAccount) {
   const PropertyDictionary gmail =
-      with(anAccount("G", kMailAccountType, kGmailAccountClass), kAccountUsername, "jo");
-  const PropertyDictionary calendars = with(
-      with(anAccount("K", kCalDAVAccountType, kCalDAVAccountClass), "CalDAVPrincipalConfiguration",
-           PropertyDictionary{{"Login_Key", "jo"}, {"CalDAV_Server_Key", "www.google.com"}}),
-      "CalDAVAccountConfiguration",
-      PropertyDictionary{{"CalDAV_PrincipalPath_Key", "/calendar/dav/jo/user"}});
-  const MigratedInMemory migrated({.settings = settings(4, {gmail, calendars})});
+      accountWithHost("G", kMailAccountType, kGmailAccountClass).with(kAccountUsername, "jo");
+  const PropertyDictionary calendars =
+      accountWithHost("K", kCalDAVAccountType, kCalDAVAccountClass)
+          .with("CalDAVPrincipalConfiguration",
+                PropertyDictionary{{"Login_Key", "jo"}, {"CalDAV_Server_Key", "www.google.com"}})
+          .with("CalDAVAccountConfiguration",
+                PropertyDictionary{{"CalDAV_PrincipalPath_Key", "/calendar/dav/jo/user"}});
+  const MigratedInMemory migrated({.settings = accountSettings(4, {gmail, calendars})});
   EXPECT_THAT(migrated.fates(), ElementsAre("Accounts[0] changed", "Accounts[1] joined"));
 }
 
 TEST(Fates, TheOnDeviceAccountIsMadeAnew) {
   const MigratedInMemory migrated(
-      {.settings = settings(
-           2, {anAccount("DeviceLocalAccount", kOnMyDeviceAccountType, "DeviceLocalAccount")})});
+      {.settings = accountSettings(2, {accountWithHost("DeviceLocalAccount", kOnMyDeviceAccountType,
+                                                       "DeviceLocalAccount")})});
   EXPECT_THAT(migrated.fates(), ElementsAre("Accounts[0] rebuilt"));
 }
 
 TEST(Fates, WhatAnEarlierRunCarriedOverIsFoundByIdentifierChildrenIncluded) {
   const MigratedInMemory migrated(
-      {.settings = settings(12, {with(anAccount("Q", kQuarxAccountType, "X"), kAccountChildAccounts,
-                                      PropertyArray{hosted("A")})}),
+      {.settings = accountSettings(
+           12, {accountWithHost("Q", kQuarxAccountType, "X").withChildren({hosted("A")})}),
        .mail = mailStore({mailDescription("A", kVelmoraAccountClass)}),
        .hasSentinel = true});
   EXPECT_THAT(migrated.fates(),
@@ -101,10 +103,10 @@ TEST(Fates, WhatAnEarlierRunCarriedOverIsFoundByIdentifierChildrenIncluded) {
 
 TEST(Fates, WhatAnEarlierRunCarriedOverWithoutAnIdentifierIsFoundByItsValues) {
   const PropertyDictionary account =
-      with(anAccount("fresh", kMailAccountType, kIMAPAccountClass), "Password", "of A");
+      accountWithHost("fresh", kMailAccountType, kIMAPAccountClass).with("Password", "of A");
   const MigratedInMemory migrated(
-      {.settings = settings(12, {without(account, "Hostname")}),
-       .mail = mailStore({without(mailDescription("A", kIMAPAccountClass), kLegacyMailIdentifier)}),
+      {.settings = accountSettings(12, {AccountDictionary(account).without("Hostname")}),
+       .mail = mailStore({mailDescription("A", kIMAPAccountClass).without(kLegacyMailIdentifier)}),
        .hasSentinel = true});
   EXPECT_THAT(migrated.losses(), IsEmpty());
 }
@@ -119,7 +121,7 @@ TEST(DeviceFacts, SayWhetherTheDeviceHasTheOldestProcessor) {
 }
 
 TEST(Fates, OtherContentsAreListedAsLeftBehind) {
-  PropertyDictionary file = settings(12, {});
+  PropertyDictionary file = accountSettings(12, {});
   file.set("Other", 1);
   const MigratedInMemory migrated({.settings = file});
   EXPECT_THAT(migrated.losses(), IsEmpty());

@@ -44,11 +44,21 @@ TEST(GeneratedLedgers, OfOrdinaryDevicesNothingIsSaidToBeLost) {
 using Damage = PropertyValue (*)(const PropertyDictionary& account);
 const std::array<Damage, 6> kDamages = {
     [](const PropertyDictionary&) -> PropertyValue { return "no dictionary"; },
-    [](const PropertyDictionary& each) -> PropertyValue { return with(each, kAccountType, "No"); },
-    [](const PropertyDictionary& each) -> PropertyValue { return without(each, kAccountType); },
-    [](const PropertyDictionary& each) -> PropertyValue { return with(each, kAccountType, 5); },
-    [](const PropertyDictionary& each) -> PropertyValue { return without(each, kAccountClass); },
-    [](const PropertyDictionary& each) -> PropertyValue { return with(each, kAccountClass, ""); },
+    [](const PropertyDictionary& each) -> PropertyValue {
+      return AccountDictionary(each).with(kAccountType, "No");
+    },
+    [](const PropertyDictionary& each) -> PropertyValue {
+      return AccountDictionary(each).without(kAccountType);
+    },
+    [](const PropertyDictionary& each) -> PropertyValue {
+      return AccountDictionary(each).with(kAccountType, 5);
+    },
+    [](const PropertyDictionary& each) -> PropertyValue {
+      return AccountDictionary(each).without(kAccountClass);
+    },
+    [](const PropertyDictionary& each) -> PropertyValue {
+      return AccountDictionary(each).with(kAccountClass, "");
+    },
 };
 
 /// A device with damage, and the accounts that are lost by it.
@@ -90,7 +100,7 @@ void damageStore(OrdinaryDevice& choices, PropertyDictionary& store,
     return;
   }
   const auto index = choices.below(static_cast<unsigned>(descriptions.size()));
-  descriptions.replace(index, without(*descriptions.at(index).asDictionary(), classKey));
+  descriptions.replace(index, AccountDictionary(descriptions.at(index)).without(classKey));
   store.set(last, descriptions);
   for (const std::string_view array : arrays) {
     for (std::size_t each = 0; each < store.arrayForKey(array)->size(); ++each) {

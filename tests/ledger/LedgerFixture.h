@@ -49,6 +49,23 @@ class Liar : public MigrationObserver {
   }
 };
 
+/// An account with a value that it can lose.
+inline AccountDictionary accountWithHost(std::string_view identifier, std::string_view type,
+                                         std::string_view accountClass) {
+  return anAccount(identifier, type, accountClass)
+      .with("Hostname", std::string(identifier) + ".example");
+}
+/// A legacy description whose values are its own.
+inline AccountDictionary mailDescription(std::string_view identifier,
+                                         std::string_view accountClass) {
+  return aMailDescription(identifier, accountClass)
+      .with(kLegacyMailDisplayName, "Name of " + std::string(identifier))
+      .with("Password", "of " + std::string(identifier));
+}
+inline AccountDictionary exchangeDescription(std::string_view identifier) {
+  return anExchangeDescription(identifier).with("Password", "of " + std::string(identifier));
+}
+
 /// The files of a device before a migration.
 struct DeviceFiles {
   std::optional<PropertyDictionary> settings = {};

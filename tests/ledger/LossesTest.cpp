@@ -15,33 +15,34 @@ using testing::UnorderedElementsAre;
 
 const std::string kOfSettings = " of " + std::string(kSettingsPath) + ": ";
 
-PropertyDictionary calDAV(std::string_view identifier) {
-  return anAccount(identifier, kCalDAVAccountType, "CalDAVAccount");
+AccountDictionary calDAV(std::string_view identifier) {
+  return accountWithHost(identifier, kCalDAVAccountType, "CalDAVAccount");
 }
-PropertyDictionary mail(std::string_view identifier) {
-  return anAccount(identifier, kMailAccountType, kIMAPAccountClass);
+AccountDictionary mail(std::string_view identifier) {
+  return accountWithHost(identifier, kMailAccountType, kIMAPAccountClass);
 }
 
 TEST(Losses, AnAccountOfAnUnknownType) {
   const MigratedInMemory migrated(
-      {.settings = settings(12, {anAccount("A", "Unknown", "X"), calDAV("B")})});
+      {.settings = accountSettings(12, {accountWithHost("A", "Unknown", "X"), calDAV("B")})});
   EXPECT_THAT(migrated.losses(),
               ElementsAre("Accounts[0] (identifier A)" + kOfSettings + "its type is unknown"));
   EXPECT_THAT(migrated.fates(), ElementsAre("Accounts[0] notCarriedOver", "Accounts[1] kept"));
 }
 
 TEST(Losses, AnAccountWithoutATypeOrWithOneThatIsNoText) {
-  const MigratedInMemory migrated({.settings = settings(12, {without(calDAV("A"), kAccountType),
-                                                             with(calDAV("B"), kAccountType, 7)})});
+  const MigratedInMemory migrated(
+      {.settings = accountSettings(
+           12, {calDAV("A").without(kAccountType), calDAV("B").with(kAccountType, 7)})});
   EXPECT_THAT(migrated.losses(),
               ElementsAre(EndsWith(": it has no type"), EndsWith(": it has no type")));
 }
 
 TEST(Losses, AnAccountWithoutAClassOrWithOneThatIsEmptyOrNoText) {
   const MigratedInMemory migrated(
-      {.settings =
-           settings(12, {without(calDAV("A"), kAccountClass), with(calDAV("B"), kAccountClass, ""),
-                         with(calDAV("C"), kAccountClass, 7)})});
+      {.settings = accountSettings(
+           12, {calDAV("A").without(kAccountClass), calDAV("B").with(kAccountClass, ""),
+                calDAV("C").with(kAccountClass, 7)})});
   EXPECT_THAT(migrated.losses(),
               ElementsAre(EndsWith(": it has no class"), EndsWith(": it has no class"),
                           EndsWith(": it has no class")));
@@ -49,13 +50,13 @@ TEST(Losses, AnAccountWithoutAClassOrWithOneThatIsEmptyOrNoText) {
 
 TEST(Losses, AMailAccountWhoseClassNothingTells) {
   const MigratedInMemory migrated(
-      {.settings = settings(12, {anAccount("A", kMailAccountType, "Odd")})});
+      {.settings = accountSettings(12, {accountWithHost("A", kMailAccountType, "Odd")})});
   EXPECT_THAT(migrated.losses(),
               ElementsAre(EndsWith("nothing tells the class of the mail account")));
 }
 
 TEST(Losses, AnElementThatIsNoDictionary) {
-  const MigratedInMemory migrated({.settings = settings(12, {"text", calDAV("B")})});
+  const MigratedInMemory migrated({.settings = accountSettings(12, {"text", calDAV("B")})});
   EXPECT_THAT(migrated.losses(), ElementsAre("Accounts[0]" + kOfSettings + "it is no dictionary"));
 }
 
@@ -68,19 +69,19 @@ TEST(Losses, AccountsThatAreNoArray) {
 
 TEST(Losses, TheChildrenOfAnAccountThatIsDropped) {
   const MigratedInMemory migrated(
-      {.settings = settings(12, {with(anAccount("A", "Unknown", "X"), kAccountChildAccounts,
-                                      PropertyArray{calDAV("C")})})});
+      {.settings = accountSettings(
+           12, {accountWithHost("A", "Unknown", "X").withChildren({calDAV("C")})})});
   EXPECT_THAT(migrated.losses(), ElementsAre(EndsWith(": its type is unknown"),
                                              "Accounts[0].ChildAccounts[0] (identifier C)" +
                                                  kOfSettings + "its parent was not carried over"));
 }
 
 TEST(Losses, AllButTheLastOfSeveralWithOneIdentifier) {
-  std::vector<PropertyValue> accounts;
+  PropertyArray accounts;
   for (const char* host : {"a", "b", "c"}) {
-    accounts.emplace_back(with(calDAV("D"), "Hostname", host));
+    accounts.append(calDAV("D").with("Hostname", host));
   }
-  const MigratedInMemory migrated({.settings = settings(12, accounts)});
+  const MigratedInMemory migrated({.settings = accountSettings(12, accounts)});
   EXPECT_THAT(migrated.lost(), ElementsAre("Accounts[0]", "Accounts[1]"));
   EXPECT_THAT(migrated.losses(),
               Contains(EndsWith(": its \"Hostname\" gave way to another value; another account has "
@@ -90,7 +91,8 @@ TEST(Losses, AllButTheLastOfSeveralWithOneIdentifier) {
 
 TEST(Losses, AccountsOfSettingsBesideAnEmptyMailStore) {
   const MigratedInMemory migrated(
-      {.settings = settings(12, {mail("A"), calDAV("B"), anAccount("C", kSMTPAccountType, "X")}),
+      {.settings = accountSettings(
+           12, {mail("A"), calDAV("B"), accountWithHost("C", kSMTPAccountType, "X")}),
        .mail = mailStore({})});
   EXPECT_THAT(migrated.lost(), ElementsAre("Accounts[0]", "Accounts[2]"));
   EXPECT_THAT(migrated.losses(), Contains(HasSubstr("all accounts of its type gave way to others "
@@ -100,7 +102,7 @@ TEST(Losses, AccountsOfSettingsBesideAnEmptyMailStore) {
 
 TEST(Losses, AccountsOfSettingsBesideAnEmptyExchangeStore) {
   const MigratedInMemory migrated(
-      {.settings = settings(12, {anAccount("A", kExchangeAccountType, "X")}),
+      {.settings = accountSettings(12, {accountWithHost("A", kExchangeAccountType, "X")}),
        .exchange = exchangeStore({})});
   EXPECT_THAT(migrated.lost(), ElementsAre("Accounts[0]"));
 }
@@ -108,7 +110,7 @@ TEST(Losses, AccountsOfSettingsBesideAnEmptyExchangeStore) {
 TEST(Losses, OneOfTwoDescriptionsWithOneIdentifierInAStore) {
   const MigratedInMemory migrated(
       {.mail = mailStore({mailDescription("A", kIMAPAccountClass),
-                          with(mailDescription("A", kIMAPAccountClass), "Password", "x")})});
+                          mailDescription("A", kIMAPAccountClass).with("Password", "x")})});
   EXPECT_THAT(migrated.losses(),
               ElementsAre("MailAccounts[1] \"Name of A\" (identifier A) of " +
                           std::string(kLegacyMailPath) +
@@ -123,15 +125,15 @@ TEST(Losses, OneIdentifierInBothStores) {
 }
 
 TEST(Losses, ADescriptionWhoseIdentifierIsInTheSettingsFile) {
-  const MigratedInMemory migrated({.settings = settings(12, {calDAV("A")}),
+  const MigratedInMemory migrated({.settings = accountSettings(12, {calDAV("A")}),
                                    .mail = mailStore({mailDescription("A", kIMAPAccountClass)})});
   EXPECT_THAT(migrated.lost(), Contains("MailAccounts[0]"));
 }
 
 TEST(Losses, ADescriptionWhoseIdentifierIsThatOfAChild) {
   const MigratedInMemory migrated(
-      {.settings = settings(12, {with(anAccount("Q", kQuarxAccountType, kCloudAccountClass),
-                                      kAccountChildAccounts, PropertyArray{calDAV("A")})}),
+      {.settings = accountSettings(12, {accountWithHost("Q", kQuarxAccountType, kCloudAccountClass)
+                                            .withChildren({calDAV("A")})}),
        .mail = mailStore({mailDescription("A", kIMAPAccountClass)})});
   EXPECT_THAT(migrated.lost(), Contains("MailAccounts[0]"));
 }
@@ -148,7 +150,7 @@ TEST(Losses, AnAccountArrayOfAStoreThatIsNoArray) {
 TEST(Losses, ADescriptionThatTheConversionRefusesWithAllOthersOfItsStore) {
   const MigratedInMemory migrated(
       {.mail = mailStore({mailDescription("A", kIMAPAccountClass),
-                          without(mailDescription("B", ""), kLegacyMailClass)},
+                          mailDescription("B", "").without(kLegacyMailClass)},
                          {mailDescription("C", kSMTPAccountClass)})});
   EXPECT_THAT(migrated.lost(),
               UnorderedElementsAre("DeliveryAccounts[0]", "MailAccounts[0]", "MailAccounts[1]"));
@@ -158,9 +160,9 @@ TEST(Losses, ADescriptionThatTheConversionRefusesWithAllOthersOfItsStore) {
 
 TEST(Losses, AKeyOfADescriptionThatAnotherKeyReplaces) {
   const MigratedInMemory migrated(
-      {.mail = mailStore(
-           {with(mailDescription("A", kIMAPAccountClass), kAccountClass, "Odd"),
-            with(mailDescription("B", kIMAPAccountClass), kAccountIdentifier, "other")})});
+      {.mail =
+           mailStore({mailDescription("A", kIMAPAccountClass).with(kAccountClass, "Odd"),
+                      mailDescription("B", kIMAPAccountClass).with(kAccountIdentifier, "other")})});
   EXPECT_THAT(migrated.losses(),
               ElementsAre(EndsWith("its \"Class\" gave way to the value under \"AccountType\""),
                           EndsWith("its \"Identifier\" gave way to the value under \"uniqueId\"")));
@@ -174,19 +176,20 @@ TEST(Losses, AnOutgoingDescriptionOfAMailClassIsConvertedAndRemovedAgain) {
 
 TEST(Losses, TheChildOfACalendarAccountThatIsJoined) {
   const PropertyDictionary gmail =
-      with(anAccount("G", kMailAccountType, kGmailAccountClass), kAccountUsername, "jo");
-  PropertyDictionary calendars = with(
-      with(anAccount("K", kCalDAVAccountType, kCalDAVAccountClass), "CalDAVPrincipalConfiguration",
-           PropertyDictionary{{"Login_Key", "jo"}, {"CalDAV_Server_Key", "www.google.com"}}),
-      "CalDAVAccountConfiguration",
-      PropertyDictionary{{"CalDAV_PrincipalPath_Key", "/calendar/dav/jo/user"}});
+      accountWithHost("G", kMailAccountType, kGmailAccountClass).with(kAccountUsername, "jo");
+  PropertyDictionary calendars =
+      accountWithHost("K", kCalDAVAccountType, kCalDAVAccountClass)
+          .with("CalDAVPrincipalConfiguration",
+                PropertyDictionary{{"Login_Key", "jo"}, {"CalDAV_Server_Key", "www.google.com"}})
+          .with("CalDAVAccountConfiguration",
+                PropertyDictionary{{"CalDAV_PrincipalPath_Key", "/calendar/dav/jo/user"}});
   calendars.set(kAccountChildAccounts, PropertyArray{calDAV("C")});
-  EXPECT_THAT(MigratedInMemory({.settings = settings(4, {gmail, calendars})}).losses(),
+  EXPECT_THAT(MigratedInMemory({.settings = accountSettings(4, {gmail, calendars})}).losses(),
               ElementsAre(EndsWith(": its parent was joined into another account")));
 }
 
 TEST(Losses, ADescriptionThatAnEarlierRunDidNotCarryOver) {
-  const MigratedInMemory migrated({.settings = settings(12, {calDAV("B")}),
+  const MigratedInMemory migrated({.settings = accountSettings(12, {calDAV("B")}),
                                    .mail = mailStore({mailDescription("A", kIMAPAccountClass)}),
                                    .hasSentinel = true});
   EXPECT_THAT(migrated.losses(), ElementsAre(HasSubstr("it is not in the settings file")));

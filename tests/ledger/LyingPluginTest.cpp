@@ -12,10 +12,10 @@ using testing::EndsWith;
 using testing::HasSubstr;
 using testing::IsEmpty;
 
-PropertyDictionary ldap(std::string_view identifier) {
-  return anAccount(identifier, kLDAPAccountType, "LDAPAccount");
+AccountDictionary ldap(std::string_view identifier) {
+  return accountWithHost(identifier, kLDAPAccountType, "LDAPAccount");
 }
-const DeviceFiles kTwoAccounts = {.settings = settings(12, {ldap("A"), ldap("B")})};
+const DeviceFiles kTwoAccounts = {.settings = accountSettings(12, {ldap("A"), ldap("B")})};
 
 /// Says another fate of every account that it is told of.
 class OtherFates final : public Liar {
@@ -73,10 +73,10 @@ TEST(LyingPlugin, AnAccountThatIsSaidToComeFromAPlaceThatTheFileHasNotIsNamed) {
 
 TEST(LyingPlugin, ARefusalThatIsNotToldIsALossAllTheSame) {
   OtherFates liar([](AccountEvent& event) { event.account.number = 5; });
-  EXPECT_THAT(
-      MigratedInMemory({.settings = settings(12, {with(ldap("A"), kAccountType, "No")})}, &liar)
-          .losses(),
-      ElementsAre(EndsWith("nothing says what became of it")));
+  EXPECT_THAT(MigratedInMemory(
+                  {.settings = accountSettings(12, {ldap("A").with(kAccountType, "No")})}, &liar)
+                  .losses(),
+              ElementsAre(EndsWith("nothing says what became of it")));
 }
 
 TEST(LyingPlugin, AnAccountIsNotJoinedIntoOneWithoutCalendars) {
@@ -85,8 +85,8 @@ TEST(LyingPlugin, AnAccountIsNotJoinedIntoOneWithoutCalendars) {
     event.other = {AccountOrigin::Kind::Settings, 1};
   });
   EXPECT_THAT(
-      MigratedInMemory({.settings = settings(4, {with(ldap("A"), kAccountType, "No"), ldap("B")})},
-                       &liar)
+      MigratedInMemory(
+          {.settings = accountSettings(4, {ldap("A").with(kAccountType, "No"), ldap("B")})}, &liar)
           .losses(),
       ElementsAre(EndsWith("it was deleted, and the account that it was joined into has no "
                            "calendars")));
@@ -98,8 +98,8 @@ TEST(LyingPlugin, AnAccountIsNotBelowAParentThatHasItNot) {
     event.other = {AccountOrigin::Kind::Settings, 1};
   });
   EXPECT_THAT(
-      MigratedInMemory({.settings = settings(12, {with(ldap("A"), kAccountType, "No"), ldap("B")})},
-                       &liar)
+      MigratedInMemory(
+          {.settings = accountSettings(12, {ldap("A").with(kAccountType, "No"), ldap("B")})}, &liar)
           .losses(),
       ElementsAre(EndsWith("it is not below the parent account that was made from it")));
 }
@@ -110,8 +110,8 @@ TEST(LyingPlugin, AnAccountIsNotMadeAnewAsOneWithOtherValues) {
     event.other = {AccountOrigin::Kind::Settings, 1};
   });
   EXPECT_THAT(
-      MigratedInMemory({.settings = settings(12, {with(ldap("A"), kAccountType, "No"), ldap("B")})},
-                       &liar)
+      MigratedInMemory(
+          {.settings = accountSettings(12, {ldap("A").with(kAccountType, "No"), ldap("B")})}, &liar)
           .losses(),
       ElementsAre(HasSubstr(": another account with its identifier took its place: its \"")));
 }
@@ -121,9 +121,10 @@ TEST(LyingPlugin, AnAccountIsComparedWithTheLastOfThoseThatTookItsPlace) {
     event.fate = ToldFate::Overwritten;
     event.other = {AccountOrigin::Kind::Settings, event.account.number + 1};
   });
-  const PropertyDictionary refused = with(ldap("A"), kAccountType, "No");
+  const PropertyDictionary refused = ldap("A").with(kAccountType, "No");
   EXPECT_THAT(
-      MigratedInMemory({.settings = settings(12, {refused, refused, ldap("A")})}, &liar).losses(),
+      MigratedInMemory({.settings = accountSettings(12, {refused, refused, ldap("A")})}, &liar)
+          .losses(),
       ElementsAre(EndsWith("took its place: its \"Type\" gave way to another value"),
                   EndsWith("took its place: its \"Type\" gave way to another value")));
 }
@@ -133,20 +134,21 @@ TEST(LyingPlugin, AnAccountWhoseParentIsNowhereIsLost) {
     event.fate = ToldFate::MovedBelow;
     event.other = {AccountOrigin::Kind::Settings, 77};
   });
-  EXPECT_THAT(
-      MigratedInMemory({.settings = settings(12, {with(ldap("A"), kAccountType, "No")})}, &liar)
-          .losses(),
-      ElementsAre(EndsWith("the parent account that it was moved below is gone")));
+  EXPECT_THAT(MigratedInMemory(
+                  {.settings = accountSettings(12, {ldap("A").with(kAccountType, "No")})}, &liar)
+                  .losses(),
+              ElementsAre(EndsWith("the parent account that it was moved below is gone")));
 }
 
 TEST(LyingPlugin, AValueThatAnAccountGivesToItsParentMustBeThere) {
   const PropertyDictionary hosted =
-      with(anAccount("A", kVelmoraAccountType, kVelmoraAccountClass),
-           kCalendarsAccountSubscribedCalendars, PropertyArray{"a calendar"});
+      accountWithHost("A", kVelmoraAccountType, kVelmoraAccountClass)
+          .with(kCalendarsAccountSubscribedCalendars, PropertyArray{"a calendar"});
   const MigratedInMemory migrated(
-      {.settings = settings(6, {hosted})}, nullptr, [](PropertyArray& accounts) {
-        accounts.replace(0, with(*accounts.at(0).asDictionary(),
-                                 kCalendarsAccountSubscribedCalendars, PropertyArray{"another"}));
+      {.settings = accountSettings(6, {hosted})}, nullptr, [](PropertyArray& accounts) {
+        accounts.replace(0,
+                         AccountDictionary(accounts.at(0))
+                             .with(kCalendarsAccountSubscribedCalendars, PropertyArray{"another"}));
       });
   EXPECT_THAT(migrated.losses(),
               ElementsAre(EndsWith("its \"" + std::string(kCalendarsAccountSubscribedCalendars) +
@@ -158,22 +160,23 @@ TEST(LyingPlugin, AccountsThatAreSaidToOverwriteEachOtherInACircleAreLost) {
     event.fate = ToldFate::Overwritten;
     event.other = {AccountOrigin::Kind::Settings, 1 - event.account.number};
   });
-  const PropertyDictionary refused = with(ldap("A"), kAccountType, "No");
-  EXPECT_THAT(MigratedInMemory({.settings = settings(12, {refused, refused})}, &liar).losses(),
-              ElementsAre(EndsWith(": another account with its identifier took its place"),
-                          EndsWith(": another account with its identifier took its place")));
+  const PropertyDictionary refused = ldap("A").with(kAccountType, "No");
+  EXPECT_THAT(
+      MigratedInMemory({.settings = accountSettings(12, {refused, refused})}, &liar).losses(),
+      ElementsAre(EndsWith(": another account with its identifier took its place"),
+                  EndsWith(": another account with its identifier took its place")));
 }
 
 TEST(LyingPlugin, AValueThatIsGoneIsALoss) {
   const MigratedInMemory migrated(kTwoAccounts, nullptr, [](PropertyArray& accounts) {
-    accounts.replace(0, without(*accounts.at(0).asDictionary(), "Hostname"));
+    accounts.replace(0, AccountDictionary(accounts.at(0)).without("Hostname"));
   });
   EXPECT_THAT(migrated.losses(), ElementsAre(EndsWith("its \"Hostname\" is gone")));
 }
 
 TEST(LyingPlugin, AnotherValueIsALoss) {
   const MigratedInMemory migrated(kTwoAccounts, nullptr, [](PropertyArray& accounts) {
-    accounts.replace(1, with(*accounts.at(1).asDictionary(), "Hostname", "other"));
+    accounts.replace(1, AccountDictionary(accounts.at(1)).with("Hostname", "other"));
   });
   EXPECT_THAT(migrated.losses(),
               ElementsAre(EndsWith("its \"Hostname\" gave way to another value")));
@@ -181,29 +184,32 @@ TEST(LyingPlugin, AnotherValueIsALoss) {
 
 TEST(LyingPlugin, AValueThatNobodyGaveIsALoss) {
   const MigratedInMemory migrated(kTwoAccounts, nullptr, [](PropertyArray& accounts) {
-    accounts.replace(1, with(*accounts.at(1).asDictionary(), "New", 1));
+    accounts.replace(1, AccountDictionary(accounts.at(1)).with("New", 1));
   });
   EXPECT_THAT(migrated.losses(), ElementsAre(EndsWith("it has a \"New\" that it did not have")));
 }
 
 TEST(LyingPlugin, AKeyOfAStepMayDifferOnlyWhereTheStepRan) {
   const auto tamper = [](PropertyArray& accounts) {
-    accounts.replace(0, with(*accounts.at(0).asDictionary(), kAccountEnabledDataclasses,
-                             PropertyArray{kAccountDataclassMail}));
+    accounts.replace(0,
+                     AccountDictionary(accounts.at(0))
+                         .with(kAccountEnabledDataclasses, PropertyArray{kAccountDataclassMail}));
   };
   EXPECT_THAT(MigratedInMemory(kTwoAccounts, nullptr, tamper).lost(), ElementsAre("Accounts[0]"));
-  EXPECT_THAT(MigratedInMemory({.settings = settings(9, {ldap("A")})}, nullptr, tamper).lost(),
-              IsEmpty());
+  EXPECT_THAT(
+      MigratedInMemory({.settings = accountSettings(9, {ldap("A")})}, nullptr, tamper).lost(),
+      IsEmpty());
 }
 
 TEST(LyingPlugin, AKeyOfAStepMayDifferOnlyInAccountsOfItsTypeOrClass) {
   const auto tamper = [](PropertyArray& accounts) {
-    accounts.replace(0, with(*accounts.at(0).asDictionary(), "status", 7));
+    accounts.replace(0, AccountDictionary(accounts.at(0)).with("status", 7));
   };
-  const PropertyDictionary cloud = anAccount("Q", kQuarxAccountType, kCloudAccountClass);
-  EXPECT_THAT(MigratedInMemory({.settings = settings(9, {ldap("A")})}, nullptr, tamper).lost(),
-              ElementsAre("Accounts[0]"));
-  EXPECT_THAT(MigratedInMemory({.settings = settings(9, {cloud})}, nullptr, tamper).lost(),
+  const PropertyDictionary cloud = accountWithHost("Q", kQuarxAccountType, kCloudAccountClass);
+  EXPECT_THAT(
+      MigratedInMemory({.settings = accountSettings(9, {ldap("A")})}, nullptr, tamper).lost(),
+      ElementsAre("Accounts[0]"));
+  EXPECT_THAT(MigratedInMemory({.settings = accountSettings(9, {cloud})}, nullptr, tamper).lost(),
               IsEmpty());
 }
 
@@ -213,8 +219,9 @@ TEST(LyingPlugin, WhatAConversionSetsMayNotDifferWhereNoDescriptionTookAPlace) {
     accounts[0] = accounts[1];
   });
   const MigratedInMemory migrated(
-      {.settings = settings(12, {ldap("A"), ldap("A")})}, &liar, [](PropertyArray& accounts) {
-        accounts.replace(0, with(*accounts.at(0).asDictionary(), kAccountSyncIdentifier, "x"));
+      {.settings = accountSettings(12, {ldap("A"), ldap("A")})}, &liar,
+      [](PropertyArray& accounts) {
+        accounts.replace(0, AccountDictionary(accounts.at(0)).with(kAccountSyncIdentifier, "x"));
       });
   EXPECT_THAT(migrated.lost(), ElementsAre("Accounts[0]", "Accounts[1]"));
 }
@@ -231,7 +238,7 @@ struct Tampered {
 TEST(LyingPlugin, AKeyThatAConversionSetsMayDifferWhereItDoesAlone) {
   const auto mail = [](std::string_view accountClass) {
     return DeviceFiles{
-        .mail = mailStore({with(mailDescription("A", accountClass), kAccountUsername, "jo@x")})};
+        .mail = mailStore({mailDescription("A", accountClass).with(kAccountUsername, "jo@x")})};
   };
   const DeviceFiles exchange = {.exchange = exchangeStore({exchangeDescription("A")})};
   for (const Tampered& each : {
@@ -262,15 +269,15 @@ TEST(LyingPlugin, AKeyThatAConversionSetsMayDifferWhereItDoesAlone) {
 }
 
 TEST(LyingPlugin, AKeyOfAChildMayDifferWhereAStepTouchesChildrenAlone) {
-  const PropertyDictionary hosted =
-      with(anAccount("K", kVelmoraAccountType, kVelmoraAccountClass), kAccountDisplayName, "name");
-  const PropertyDictionary other = with(ldap("K"), kAccountDisplayName, "name");
-  const PropertyDictionary nameless = without(hosted, kAccountIdentifier);
+  const PropertyDictionary hosted = accountWithHost("K", kVelmoraAccountType, kVelmoraAccountClass)
+                                        .with(kAccountDisplayName, "name");
+  const PropertyDictionary other = ldap("K").with(kAccountDisplayName, "name");
+  const PropertyDictionary nameless = AccountDictionary(hosted).without(kAccountIdentifier);
   const auto below = [](const PropertyDictionary& parent, const PropertyDictionary& child) {
-    return DeviceFiles{
-        .settings = settings(7, {with(parent, kAccountChildAccounts, PropertyArray{child})})};
+    return DeviceFiles{.settings =
+                           accountSettings(7, {AccountDictionary(parent).withChildren({child})})};
   };
-  const PropertyDictionary cloud = anAccount("Q", kQuarxAccountType, kCloudAccountClass);
+  const PropertyDictionary cloud = accountWithHost("Q", kQuarxAccountType, kCloudAccountClass);
   for (const Tampered& each : {
            Tampered{"the name of a hosted child", below(cloud, hosted), kAccountDisplayName, "x",
                     false},
@@ -284,9 +291,8 @@ TEST(LyingPlugin, AKeyOfAChildMayDifferWhereAStepTouchesChildrenAlone) {
     const MigratedInMemory migrated(each.files, nullptr, [&](PropertyArray& accounts) {
       const PropertyDictionary& parent = *accounts.at(0).asDictionary();
       const PropertyArray children = parent.arrayForKey(kAccountChildAccounts).value();
-      accounts.replace(
-          0, with(parent, kAccountChildAccounts,
-                  PropertyArray{with(*children.at(0).asDictionary(), each.key, each.value)}));
+      accounts.replace(0, AccountDictionary(parent).withChildren(
+                              {AccountDictionary(children.at(0)).with(each.key, each.value)}));
     });
     EXPECT_EQ(!migrated.lost().empty(), each.isLoss) << each.what;
   }
@@ -294,24 +300,23 @@ TEST(LyingPlugin, AKeyOfAChildMayDifferWhereAStepTouchesChildrenAlone) {
 
 TEST(LyingPlugin, AValueOfAnAccountThatWasMovedMustBeBelowItsParent) {
   const MigratedInMemory migrated(
-      {.settings = settings(6, {anAccount("A", kVelmoraAccountType, kVelmoraAccountClass)})},
+      {.settings =
+           accountSettings(6, {accountWithHost("A", kVelmoraAccountType, kVelmoraAccountClass)})},
       nullptr, [](PropertyArray& accounts) {
         const PropertyDictionary& parent = *accounts.at(0).asDictionary();
         const PropertyArray children = parent.arrayForKey(kAccountChildAccounts).value();
-        accounts.replace(0,
-                         with(parent, kAccountChildAccounts,
-                              PropertyArray{without(*children.at(0).asDictionary(), "Hostname")}));
+        accounts.replace(0, AccountDictionary(parent).withChildren(
+                                {AccountDictionary(children.at(0)).without("Hostname")}));
       });
   EXPECT_THAT(migrated.losses(), ElementsAre(EndsWith(": its \"Hostname\" is gone")));
 }
 
 TEST(LyingPlugin, AChildThatIsGoneIsALoss) {
-  const PropertyDictionary parent = with(anAccount("Q", kQuarxAccountType, kCloudAccountClass),
-                                         kAccountChildAccounts, PropertyArray{ldap("K")});
+  const PropertyDictionary parent =
+      accountWithHost("Q", kQuarxAccountType, kCloudAccountClass).withChildren({ldap("K")});
   const MigratedInMemory migrated(
-      {.settings = settings(12, {parent})}, nullptr, [](PropertyArray& accounts) {
-        accounts.replace(
-            0, with(*accounts.at(0).asDictionary(), kAccountChildAccounts, PropertyArray()));
+      {.settings = accountSettings(12, {parent})}, nullptr, [](PropertyArray& accounts) {
+        accounts.replace(0, AccountDictionary(accounts.at(0)).withChildren({}));
       });
   EXPECT_THAT(migrated.losses(),
               ElementsAre(EndsWith("it is not among the children of its parent any more")));
@@ -320,9 +325,9 @@ TEST(LyingPlugin, AChildThatIsGoneIsALoss) {
 /// What is lost of an account with the child K where the plug-in leaves another dictionary for it.
 std::vector<std::string> lossesWhereAParentBecomes(
     const std::function<PropertyDictionary(const PropertyDictionary&)>& changed) {
-  const PropertyDictionary parent = with(anAccount("Q", kQuarxAccountType, kCloudAccountClass),
-                                         kAccountChildAccounts, PropertyArray{ldap("K")});
-  return MigratedInMemory({.settings = settings(12, {parent})}, nullptr,
+  const PropertyDictionary parent =
+      accountWithHost("Q", kQuarxAccountType, kCloudAccountClass).withChildren({ldap("K")});
+  return MigratedInMemory({.settings = accountSettings(12, {parent})}, nullptr,
                           [&](PropertyArray& accounts) {
                             accounts.replace(0, changed(*accounts.at(0).asDictionary()));
                           })
@@ -330,39 +335,39 @@ std::vector<std::string> lossesWhereAParentBecomes(
 }
 
 TEST(LyingPlugin, AValueOfAParentThatIsGoneIsALossWhateverItsChildrenAre) {
-  EXPECT_THAT(lossesWhereAParentBecomes(
-                  [](const PropertyDictionary& parent) { return without(parent, "Hostname"); }),
+  EXPECT_THAT(lossesWhereAParentBecomes([](const PropertyDictionary& parent) {
+                return AccountDictionary(parent).without("Hostname");
+              }),
               ElementsAre(EndsWith(": its \"Hostname\" is gone")));
 }
 
 TEST(LyingPlugin, AValueOfAChildThatIsGoneIsALoss) {
   EXPECT_THAT(lossesWhereAParentBecomes([](const PropertyDictionary& parent) {
-                return with(parent, kAccountChildAccounts,
-                            PropertyArray{without(ldap("K"), "Hostname")});
+                return AccountDictionary(parent).withChildren({ldap("K").without("Hostname")});
               }),
               ElementsAre(EndsWith(": its \"Hostname\" is gone")));
 }
 
 TEST(LyingPlugin, SomethingElseInAChildsPlaceIsALoss) {
   EXPECT_THAT(lossesWhereAParentBecomes([](const PropertyDictionary& parent) {
-                return with(parent, kAccountChildAccounts, PropertyArray{"no account"});
+                return AccountDictionary(parent).withChildren({"no account"});
               }),
               ElementsAre(EndsWith(": something else stands in its place")));
 }
 
 TEST(LyingPlugin, AChildThatNobodyGaveIsALossOfItsParent) {
   EXPECT_THAT(lossesWhereAParentBecomes([](const PropertyDictionary& parent) {
-                return with(parent, kAccountChildAccounts, PropertyArray{ldap("K"), ldap("L")});
+                return AccountDictionary(parent).withChildren({ldap("K"), ldap("L")});
               }),
               ElementsAre(EndsWith(": it has children that it did not have")));
 }
 
 TEST(LyingPlugin, AnIdentifierThatAChildHasTooIsNamedWithWhatIsGone) {
-  const PropertyDictionary parent = with(anAccount("Q", kQuarxAccountType, kCloudAccountClass),
-                                         kAccountChildAccounts, PropertyArray{ldap("A")});
+  const PropertyDictionary parent =
+      accountWithHost("Q", kQuarxAccountType, kCloudAccountClass).withChildren({ldap("A")});
   const MigratedInMemory migrated(
-      {.settings = settings(12, {ldap("A"), parent})}, nullptr, [](PropertyArray& accounts) {
-        accounts.replace(0, without(*accounts.at(0).asDictionary(), "Hostname"));
+      {.settings = accountSettings(12, {ldap("A"), parent})}, nullptr, [](PropertyArray& accounts) {
+        accounts.replace(0, AccountDictionary(accounts.at(0)).without("Hostname"));
       });
   EXPECT_THAT(migrated.losses(), ElementsAre(EndsWith(": its \"Hostname\" is gone; another account "
                                                       "has its identifier")));
@@ -370,7 +375,8 @@ TEST(LyingPlugin, AnIdentifierThatAChildHasTooIsNamedWithWhatIsGone) {
 
 TEST(LyingPlugin, ARefusalWithoutAReasonIsALossAllTheSame) {
   OtherFates withoutReason([](AccountEvent& event) { event.reason = {}; });
-  const MigratedInMemory migrated({.settings = settings(12, {"no account"})}, &withoutReason);
+  const MigratedInMemory migrated({.settings = accountSettings(12, {"no account"})},
+                                  &withoutReason);
   EXPECT_THAT(migrated.losses(), ElementsAre(EndsWith(": it was refused")));
 }
 

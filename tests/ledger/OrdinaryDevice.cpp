@@ -9,37 +9,37 @@ DeviceFiles OrdinaryDevice::make() {
   const bool hasMailStore = chance(40);
   const bool hasExchangeStore = chance(30);
   if (chance(90)) {
-    std::vector<PropertyValue> accounts;
+    PropertyArray accounts;
     for (unsigned count = below(7); count > 0; --count) {
-      accounts.emplace_back(account(hasMailStore, hasExchangeStore));
+      accounts.append(account(hasMailStore, hasExchangeStore));
     }
     if (chance(50)) {
-      accounts.emplace_back(filled({{kAccountIdentifier, "DeviceLocalAccount"},
-                                    {kAccountType, kOnMyDeviceAccountType},
-                                    {kAccountClass, "DeviceLocalAccount"},
-                                    {kAccountEnabledDataclasses, dataclasses()}}));
+      accounts.append(filled({{kAccountIdentifier, "DeviceLocalAccount"},
+                              {kAccountType, kOnMyDeviceAccountType},
+                              {kAccountClass, "DeviceLocalAccount"},
+                              {kAccountEnabledDataclasses, dataclasses()}}));
     }
-    files.settings = settings(static_cast<int>(below(13)), std::move(accounts));
+    files.settings = accountSettings(static_cast<int>(below(13)), std::move(accounts));
   }
   if (hasMailStore) {
     constexpr std::array kIncoming = {
         kIMAPAccountClass,  kPOPAccountClass,     kAOLAccountClass,    kGmailAccountClass,
         kYahooAccountClass, kVelmoraAccountClass, kMarrowAccountClass, kTolvaneIMAPAccountClass};
     constexpr std::array kOutgoing = {kSMTPAccountClass, kDeliveryAccountClass};
-    std::vector<PropertyValue> in;
-    std::vector<PropertyValue> out;
+    PropertyArray in;
+    PropertyArray out;
     for (unsigned count = below(3); count > 0; --count) {
-      in.emplace_back(description(kLegacyMailIdentifier, kLegacyMailClass,
-                                  kIncoming[below(kIncoming.size())], kLegacyMailDisplayName));
+      in.append(description(kLegacyMailIdentifier, kLegacyMailClass,
+                            kIncoming[below(kIncoming.size())], kLegacyMailDisplayName));
     }
     for (unsigned count = below(3); count > 0; --count) {
-      out.emplace_back(description(kLegacyMailIdentifier, chance(80) ? kLegacyMailClass : "",
-                                   kOutgoing[below(kOutgoing.size())], kLegacyMailDisplayName));
+      out.append(description(kLegacyMailIdentifier, chance(80) ? kLegacyMailClass : "",
+                             kOutgoing[below(kOutgoing.size())], kLegacyMailDisplayName));
     }
     files.mail = mailStore(std::move(in), std::move(out));
   }
   if (hasExchangeStore) {
-    std::vector<PropertyValue> descriptions;
+    PropertyArray descriptions;
     for (unsigned count = below(3); count > 0; --count) {
       PropertyDictionary each = description(kLegacyExchangeIdentifier, kLegacyExchangeClass,
                                             "ASAccount", kLegacyExchangeDisplayName);
@@ -48,7 +48,7 @@ DeviceFiles OrdinaryDevice::make() {
           each.set(key, chance(50));
         }
       }
-      descriptions.emplace_back(std::move(each));
+      descriptions.append(std::move(each));
     }
     files.exchange = exchangeStore(std::move(descriptions));
   }
@@ -93,9 +93,9 @@ PropertyDictionary OrdinaryDevice::account(bool mailStore, bool exchangeStore) {
   }
   // A calendar account that is joined into its mail account takes its children along.
   if (shape.accountClass != kCalDAVAccountClass && chance(15)) {
-    std::vector<PropertyValue> children;
+    PropertyArray children;
     for (unsigned count = below(3); count > 0; --count) {
-      children.emplace_back(
+      children.append(
           filled({{kAccountIdentifier, freshText()},
                   {kAccountType, chance(50) ? kVelmoraAccountType : kCalDAVAccountType},
                   {kAccountClass, chance(50) ? kVelmoraAccountClass : kCalDAVAccountClass}}));

@@ -7,9 +7,9 @@ namespace {
 
 class CloudProvisioningStepTest : public StepTest {
  protected:
-  static AccountBuilder cloudAccount() { return anAccount("Z", kQuarxAccountType, "ZQAccount"); }
-  void runStepOn(std::initializer_list<AccountBuilder> accounts) {
-    openStoreWith(accounts);
+  static AccountDictionary cloudAccount() { return anAccount("Z", kQuarxAccountType, "ZQAccount"); }
+  void runStepOn(PropertyArray accounts) {
+    openStoreWith(std::move(accounts));
     EXPECT_TRUE(migrator._migrateAccountsFrom9A334(*store));
   }
   std::optional<TextList> storedProvisioned(std::size_t position) {
@@ -23,7 +23,7 @@ const std::string statusLine =
     "AccountsDataMigrator: Found Velmora mail as Stratix child account, setting status to 1";
 const std::string provisioningLine = "AccountsDataMigrator: Enabling provisioning for dataclass ";
 
-AccountBuilder hostedChild() {
+AccountDictionary hostedChild() {
   return anAccount("V", kVelmoraAccountType, "VelmoraAccount");
 }
 
@@ -43,7 +43,7 @@ TEST_F(CloudProvisioningStepTest, UbiquityAloneIsReasonEnough) {
 }
 
 TEST_F(CloudProvisioningStepTest, ThePrimaryAccountKeepsThem) {
-  const AccountBuilder primary =
+  const AccountDictionary primary =
       cloudAccount()
           .with("primaryAccount", true)
           .enabledFor({kAccountDataclassUbiquity, kAccountDataclassKeyValue});
@@ -55,7 +55,7 @@ TEST_F(CloudProvisioningStepTest, ThePrimaryAccountKeepsThem) {
 }
 
 TEST_F(CloudProvisioningStepTest, ASecondaryAccountWithoutThemIsLeft) {
-  const AccountBuilder secondary = cloudAccount().enabledFor({kAccountDataclassMail});
+  const AccountDictionary secondary = cloudAccount().enabledFor({kAccountDataclassMail});
 
   runStepOn({secondary});
 
@@ -110,9 +110,9 @@ TEST_F(CloudProvisioningStepTest, ACalendarChildProvisionsCalendars) {
 }
 
 TEST_F(CloudProvisioningStepTest, WhatIsProvisionedAlreadyIsLeft) {
-  const AccountBuilder before = cloudAccount()
-                                    .provisionedFor({kAccountDataclassCalendars, "unknown"})
-                                    .withChildren({calendarChild()});
+  const AccountDictionary before = cloudAccount()
+                                       .provisionedFor({kAccountDataclassCalendars, "unknown"})
+                                       .withChildren({calendarChild()});
 
   runStepOn({before});
 
@@ -121,7 +121,7 @@ TEST_F(CloudProvisioningStepTest, WhatIsProvisionedAlreadyIsLeft) {
 }
 
 TEST_F(CloudProvisioningStepTest, WithoutChildrenNothingIsProvisioned) {
-  const AccountBuilder before = cloudAccount().provisionedFor({});
+  const AccountDictionary before = cloudAccount().provisionedFor({});
 
   runStepOn({before});
 
@@ -129,10 +129,10 @@ TEST_F(CloudProvisioningStepTest, WithoutChildrenNothingIsProvisioned) {
 }
 
 TEST_F(CloudProvisioningStepTest, AnotherClassIsNotProvisioned) {
-  const AccountBuilder before = anAccount("Q", kQuarxAccountType, "VelmoraAccount")
-                                    .with("status", 2)
-                                    .provisionedFor({})
-                                    .withChildren({calendarChild(), hostedChild()});
+  const AccountDictionary before = anAccount("Q", kQuarxAccountType, "VelmoraAccount")
+                                       .with("status", 2)
+                                       .provisionedFor({})
+                                       .withChildren({calendarChild(), hostedChild()});
 
   runStepOn({before});
 
@@ -140,10 +140,10 @@ TEST_F(CloudProvisioningStepTest, AnotherClassIsNotProvisioned) {
 }
 
 TEST_F(CloudProvisioningStepTest, AccountsOfOtherTypesAreLeft) {
-  const AccountBuilder before = anAccount("E", kExchangeAccountType, "ZQAccount")
-                                    .with("status", 2)
-                                    .provisionedFor({})
-                                    .withChildren({calendarChild(), hostedChild()});
+  const AccountDictionary before = anAccount("E", kExchangeAccountType, "ZQAccount")
+                                       .with("status", 2)
+                                       .provisionedFor({})
+                                       .withChildren({calendarChild(), hostedChild()});
 
   runStepOn({before});
 

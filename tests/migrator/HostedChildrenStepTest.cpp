@@ -7,24 +7,24 @@ namespace {
 
 class HostedChildrenStepTest : public StepTest {
  protected:
-  static AccountBuilder cloudAccount() { return anAccount("Z", kQuarxAccountType, "ZQAccount"); }
-  PropertyArray childrenAfterTheStep(const AccountBuilder& builder) {
+  static AccountDictionary cloudAccount() { return anAccount("Z", kQuarxAccountType, "ZQAccount"); }
+  PropertyArray childrenAfterTheStep(const AccountDictionary& builder) {
     openStoreWith({builder});
     EXPECT_TRUE(migrator._migrateAccountsFrom8C136(*store));
     return children(0);
   }
-  std::optional<TextList> enabledAfterTheStep(const AccountBuilder& builder) {
+  std::optional<TextList> enabledAfterTheStep(const AccountDictionary& builder) {
     childrenAfterTheStep(builder);
     return texts(account(0).enabledDataclasses());
   }
 };
 
-AccountBuilder hostedChild(std::string_view identifier) {
+AccountDictionary hostedChild(std::string_view identifier) {
   return anAccount(identifier, kVelmoraAccountType, "VelmoraAccount");
 }
 
 TEST_F(HostedChildrenStepTest, OnlyHostedServiceChildrenLoseTheirDisplayNames) {
-  const AccountBuilder calendar = calendarChild().with(kAccountDisplayName, "Calendar");
+  const AccountDictionary calendar = calendarChild().with(kAccountDisplayName, "Calendar");
 
   EXPECT_EQ(
       childrenAfterTheStep(cloudAccount().withChildren(
@@ -35,7 +35,7 @@ TEST_F(HostedChildrenStepTest, OnlyHostedServiceChildrenLoseTheirDisplayNames) {
 }
 
 TEST_F(HostedChildrenStepTest, ChildrenOfAnotherClassesAccountAreLeft) {
-  const AccountBuilder child = hostedChild("V").with(kAccountDisplayName, "Mail");
+  const AccountDictionary child = hostedChild("V").with(kAccountDisplayName, "Mail");
 
   EXPECT_EQ(childrenAfterTheStep(
                 anAccount("Q", kQuarxAccountType, "VelmoraAccount").withChildren({child})),
@@ -43,7 +43,7 @@ TEST_F(HostedChildrenStepTest, ChildrenOfAnotherClassesAccountAreLeft) {
 }
 
 TEST_F(HostedChildrenStepTest, EqualChildrenAllLoseTheirDisplayNames) {
-  const AccountBuilder child = hostedChild("V").with(kAccountDisplayName, "Mail");
+  const AccountDictionary child = hostedChild("V").with(kAccountDisplayName, "Mail");
 
   EXPECT_EQ(childrenAfterTheStep(cloudAccount().withChildren({child, hostedChild("V"), child})),
             (PropertyArray{hostedChild("V"), hostedChild("V"), hostedChild("V")}));
@@ -60,13 +60,13 @@ TEST_F(HostedChildrenStepTest, ARenamedChildCarriesTheIdentifierThatItLacked) {
 }
 
 TEST_F(HostedChildrenStepTest, AChildWithoutADisplayNameIsNotTouched) {
-  const AccountBuilder child = hostedChild("").without(kAccountIdentifier);
+  const AccountDictionary child = hostedChild("").without(kAccountIdentifier);
 
   EXPECT_EQ(childrenAfterTheStep(cloudAccount().withChildren({child})), PropertyArray{child});
 }
 
 TEST_F(HostedChildrenStepTest, ChildrenThatMakeNoRecordAreLeft) {
-  const AccountBuilder unknownType =
+  const AccountDictionary unknownType =
       anAccount("X", "Unknown", "VelmoraAccount").with(kAccountDisplayName, "Mail");
 
   EXPECT_EQ(childrenAfterTheStep(cloudAccount().with(
@@ -75,7 +75,7 @@ TEST_F(HostedChildrenStepTest, ChildrenThatMakeNoRecordAreLeft) {
 }
 
 TEST_F(HostedChildrenStepTest, ADisplayNameThatIsNoTextIsLeft) {
-  const AccountBuilder child = hostedChild("V").with(kAccountDisplayName, 5);
+  const AccountDictionary child = hostedChild("V").with(kAccountDisplayName, 5);
 
   EXPECT_EQ(childrenAfterTheStep(cloudAccount().withChildren({child})), PropertyArray{child});
 }

@@ -7,8 +7,10 @@ namespace {
 
 class HostedNotesStepTest : public StepTest {
  protected:
-  static AccountBuilder hosted() { return anAccount("V", kVelmoraAccountType, "VelmoraAccount"); }
-  std::optional<TextList> storedAfterTheStep(const AccountBuilder& builder) {
+  static AccountDictionary hosted() {
+    return anAccount("V", kVelmoraAccountType, "VelmoraAccount");
+  }
+  std::optional<TextList> storedAfterTheStep(const AccountDictionary& builder) {
     openStoreWith({builder});
     EXPECT_TRUE(migrator._migrateAccountsFrom7A241(*store));
     return storedEnabled(0);

@@ -7,9 +7,11 @@ namespace {
 
 class HostedParentStepTest : public StepTest {
  protected:
-  static AccountBuilder hosted() { return anAccount("V", kVelmoraAccountType, "VelmoraAccount"); }
+  static AccountDictionary hosted() {
+    return anAccount("V", kVelmoraAccountType, "VelmoraAccount");
+  }
   void runStep() { EXPECT_TRUE(migrator._migrateAccountsFrom8B117(*store)); }
-  void runStepOn(const AccountBuilder& builder) {
+  void runStepOn(const AccountDictionary& builder) {
     openStoreWith({builder});
     runStep();
   }
@@ -20,8 +22,8 @@ class HostedParentStepTest : public StepTest {
   }
 };
 
-const AccountBuilder calendarChild = anAccount("K1", kCalDAVAccountType, "MobileCalDAVAccount");
-const AccountBuilder contactsChild = anAccount("K2", kCardDAVAccountType, "CardDAVAccount");
+const AccountDictionary calendarChild = anAccount("K1", kCalDAVAccountType, "MobileCalDAVAccount");
+const AccountDictionary contactsChild = anAccount("K2", kCardDAVAccountType, "CardDAVAccount");
 
 TEST_F(HostedParentStepTest, AnActiveAccountWithChildrenBecomesTheChildOfAParent) {
   runStepOn(hosted()
@@ -195,7 +197,7 @@ TEST_F(HostedParentStepTest, ParentsTakeThePlacesOfTheirAccounts) {
 }
 
 TEST_F(HostedParentStepTest, WithoutAHostedServiceAccountTheStoreIsSavedUnchanged) {
-  const AccountBuilder other =
+  const AccountDictionary other =
       anAccount("Z", kQuarxAccountType, "ZQAccount").with("IsActive", true);
 
   runStepOn(other);
@@ -207,7 +209,7 @@ TEST_F(HostedParentStepTest, WithoutAHostedServiceAccountTheStoreIsSavedUnchange
 TEST_F(HostedParentStepTest, AParentTypeUnknownToTheConfigurationLeavesTheAccount) {
   device.bundleResources.replaced["AccountTypesProperties"] =
       PropertyDictionary{{kVelmoraAccountType, PropertyDictionary()}};
-  const AccountBuilder old = hosted().enabledFor({kAccountDataclassMail});
+  const AccountDictionary old = hosted().enabledFor({kAccountDataclassMail});
 
   runStepOn(old);
 

@@ -8,7 +8,7 @@ namespace {
 class IdentifiersStepTest : public StepTest {
  protected:
   /// What becomes of an account when it is the only one of the store.
-  PropertyDictionary upgraded(const AccountBuilder& builder) {
+  PropertyDictionary upgraded(const AccountDictionary& builder) {
     openStoreWith({builder});
     EXPECT_TRUE(migrator._migrateAccountsFrom7A150(*store));
     return account(0).properties();
@@ -62,7 +62,7 @@ TEST_F(IdentifiersStepTest, AnOutgoingAccountGetsNoSyncIdentifier) {
 }
 
 TEST_F(IdentifiersStepTest, AccountsOfOtherTypesAreLeft) {
-  const AccountBuilder calDAV =
+  const AccountDictionary calDAV =
       anAccount("X", kCalDAVAccountType, "MobileCalDAVAccount").with("uniqueId", "Y");
 
   EXPECT_EQ(upgraded(calDAV), PropertyDictionary(calDAV));

@@ -16,6 +16,7 @@
 #include "migrator/AccountsDataMigrator.h"
 #include "propertylist/value/Description.h"
 #include "tests/fakes/FakePlatform.h"
+#include "tests/fakes/StoreContents.h"
 
 namespace accounts {
 
@@ -58,48 +59,8 @@ inline std::optional<TextList> dataclasses(std::initializer_list<std::string_vie
   return TextList(names.begin(), names.end());
 }
 
-/// An account dictionary in one line: `anAccount("A", kMailAccountType, "IMAPAccount")`.
-class AccountBuilder {
- public:
-  explicit AccountBuilder(PropertyDictionary properties) : properties_(std::move(properties)) {}
-
-  AccountBuilder& with(std::string_view key, PropertyValue value) {
-    properties_.set(key, std::move(value));
-    return *this;
-  }
-  AccountBuilder& without(std::string_view key) {
-    properties_.remove(key);
-    return *this;
-  }
-  AccountBuilder& enabledFor(std::initializer_list<std::string_view> names) {
-    return with(kAccountEnabledDataclasses, listOf(names));
-  }
-  AccountBuilder& provisionedFor(std::initializer_list<std::string_view> names) {
-    return with(kAccountProvisionedDataclasses, listOf(names));
-  }
-  AccountBuilder& withChildren(std::initializer_list<AccountBuilder> children) {
-    return with(kAccountChildAccounts,
-                PropertyArray(std::vector<PropertyValue>(children.begin(), children.end())));
-  }
-
-  operator PropertyDictionary() const { return properties_; }
-  operator PropertyValue() const { return properties_; }
-
- private:
-  static PropertyArray listOf(std::initializer_list<std::string_view> names) {
-    return PropertyArray(std::vector<PropertyValue>(names.begin(), names.end()));
-  }
-  PropertyDictionary properties_;
-};
-
-inline AccountBuilder anAccount(std::string_view identifier, std::string_view type,
-                                std::string_view accountClass) {
-  return AccountBuilder(
-      {{kAccountIdentifier, identifier}, {kAccountType, type}, {kAccountClass, accountClass}});
-}
-
 /// A calendar account as a cloud account has it for a child.
-inline AccountBuilder calendarChild() {
+inline AccountDictionary calendarChild() {
   return anAccount("K", kCalDAVAccountType, "MobileCalDAVAccount");
 }
 
@@ -110,17 +71,12 @@ class MigratorTest : public testing::Test {
   MigratorTest() { device.consoleLog.alsoStandardError = false; }
 
   /// Puts accounts into the store, in order; no file is involved.
-  void openStoreWith(std::initializer_list<AccountBuilder> accounts) {
-    store = AccountsManager::initWithAccounsInfoArray(
-        PropertyArray(std::vector<PropertyValue>(accounts.begin(), accounts.end())));
+  void openStoreWith(PropertyArray accounts) {
+    store = AccountsManager::initWithAccounsInfoArray(std::move(accounts));
   }
   /// Writes an account settings file.
-  void addSettingsFile(PropertyValue version, std::initializer_list<AccountBuilder> accounts) {
-    device.addPropertyList(
-        kSettingsPath,
-        PropertyDictionary{{kPlistVersionKey, std::move(version)},
-                           {kPlistAccountsKey, PropertyArray(std::vector<PropertyValue>(
-                                                   accounts.begin(), accounts.end()))}});
+  void addSettingsFile(PropertyValue version, PropertyArray accounts) {
+    device.addPropertyList(kSettingsPath, accountSettings(std::move(version), std::move(accounts)));
   }
   void setMigrationInformationPreference(PropertyValue value) {
     device.preferenceDomain.values.insert_or_assign(

@@ -7,11 +7,11 @@ namespace {
 
 class PrimaryCloudAccountStepTest : public StepTest {
  protected:
-  static AccountBuilder cloudAccount(std::string_view identifier, std::int64_t status) {
+  static AccountDictionary cloudAccount(std::string_view identifier, std::int64_t status) {
     return anAccount(identifier, kQuarxAccountType, "ZQAccount").with("status", status);
   }
-  void runStepOn(std::initializer_list<AccountBuilder> accounts) {
-    openStoreWith(accounts);
+  void runStepOn(PropertyArray accounts) {
+    openStoreWith(std::move(accounts));
     EXPECT_TRUE(migrator._migrateAccountsFrom9A182(*store));
   }
   bool isPrimary(std::size_t position) {
@@ -77,7 +77,7 @@ TEST_F(PrimaryCloudAccountStepTest, AnotherClassKeepsReminders) {
 }
 
 TEST_F(PrimaryCloudAccountStepTest, AnAccountOfStatus2WithChildrenRevertsToStatus1AndNothingElse) {
-  const AccountBuilder before =
+  const AccountDictionary before =
       cloudAccount("Z", 2)
           .with(kAccountDisplayName, "Velmora")
           .with(kAccountTypeString, "Velmora")
@@ -86,7 +86,7 @@ TEST_F(PrimaryCloudAccountStepTest, AnAccountOfStatus2WithChildrenRevertsToStatu
 
   runStepOn({before});
 
-  EXPECT_EQ(account(0).properties(), AccountBuilder(before).with("status", 1));
+  EXPECT_EQ(account(0).properties(), AccountDictionary(before).with("status", 1));
   EXPECT_EQ(console(), (Lines{foundLine, revertingLine}));
 }
 

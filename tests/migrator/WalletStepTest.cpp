@@ -7,11 +7,11 @@ namespace {
 
 class WalletStepTest : public StepTest {
  protected:
-  static AccountBuilder primaryAccount() {
+  static AccountDictionary primaryAccount() {
     return anAccount("Z", kQuarxAccountType, "ZQAccount").with("primaryAccount", true);
   }
-  void runStepOn(std::initializer_list<AccountBuilder> accounts) {
-    openStoreWith(accounts);
+  void runStepOn(PropertyArray accounts) {
+    openStoreWith(std::move(accounts));
     EXPECT_TRUE(migrator._migrateAccountsFrom9B176(*store));
   }
   std::optional<TextList> storedProvisioned() {
@@ -62,9 +62,9 @@ TEST_F(WalletStepTest, AWalletThatIsProvisionedIsOnlyEnabled) {
 }
 
 TEST_F(WalletStepTest, WithoutCloudDocumentsTheWalletIsNeitherProvisionedNorEnabled) {
-  const AccountBuilder before = primaryAccount()
-                                    .provisionedFor({kAccountDataclassMail})
-                                    .enabledFor({kAccountDataclassUbiquity});
+  const AccountDictionary before = primaryAccount()
+                                       .provisionedFor({kAccountDataclassMail})
+                                       .enabledFor({kAccountDataclassUbiquity});
 
   runStepOn({before});
 
@@ -73,10 +73,10 @@ TEST_F(WalletStepTest, WithoutCloudDocumentsTheWalletIsNeitherProvisionedNorEnab
 }
 
 TEST_F(WalletStepTest, ASecondaryAccountIsLeft) {
-  const AccountBuilder before = primaryAccount()
-                                    .with("primaryAccount", false)
-                                    .provisionedFor({kAccountDataclassUbiquity})
-                                    .enabledFor({kAccountDataclassUbiquity});
+  const AccountDictionary before = primaryAccount()
+                                       .with("primaryAccount", false)
+                                       .provisionedFor({kAccountDataclassUbiquity})
+                                       .enabledFor({kAccountDataclassUbiquity});
 
   runStepOn({before});
 

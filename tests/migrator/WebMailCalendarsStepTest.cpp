@@ -20,24 +20,24 @@ class WebMailCalendarsStepTest : public StepTest {
     }
     return result;
   }
-  std::optional<TextList> enabledAfterTheStep(const AccountBuilder& builder) {
+  std::optional<TextList> enabledAfterTheStep(const AccountDictionary& builder) {
     openStoreWith({builder});
     runStep();
     return texts(account(0).enabledDataclasses());
   }
 };
 
-AccountBuilder gmail(std::string_view identifier, std::string_view username) {
+AccountDictionary gmail(std::string_view identifier, std::string_view username) {
   return anAccount(identifier, kMailAccountType, "GmailAccount").with(kAccountUsername, username);
 }
-AccountBuilder calDAV(std::string_view identifier, std::string_view server, std::string_view login,
-                      std::string_view path) {
+AccountDictionary calDAV(std::string_view identifier, std::string_view server,
+                         std::string_view login, std::string_view path) {
   return anAccount(identifier, kCalDAVAccountType, "MobileCalDAVAccount")
       .with("CalDAVPrincipalConfiguration",
             PropertyDictionary{{"CalDAV_Server_Key", server}, {"Login_Key", login}})
       .with("CalDAVAccountConfiguration", PropertyDictionary{{"CalDAV_PrincipalPath_Key", path}});
 }
-AccountBuilder googleCalendar(std::string_view identifier, std::string_view username) {
+AccountDictionary googleCalendar(std::string_view identifier, std::string_view username) {
   return calDAV(identifier, "www.google.com", username,
                 "/calendar/dav/" + std::string(username) + "/user");
 }

@@ -103,11 +103,11 @@ TEST_F(FrameworkLoaderTest, AFrameworkOfOtherHeadersIsAFailureThatSaysSo) {
   installBroken("OfOtherHeaders", "/Library/Other.so");
   installBroken("OfNoVersion", "/Library/Old.so");
 
+  const std::string here = ", which is " + std::to_string(kInterfaceVersion) + " here";
   EXPECT_EQ(loader_.loadFramework("/Library/Other.so").error().text,
-            "It was built against other headers: its interface has version 999, which is 4 here");
+            "It was built against other headers: its interface has version 999" + here);
   EXPECT_EQ(loader_.loadFramework("/Library/Old.so").error().text,
-            "It was built against other headers: it names no version of its interface, which is 3 "
-            "here");
+            "It was built against other headers: it names no version of its interface" + here);
 }
 
 TEST_F(FrameworkLoaderTest, AnUnknownClassIsNone) {

@@ -127,10 +127,6 @@ ProgramResult DeviceRootFixture::migrate(const std::vector<std::string>& argumen
   return runProgram(migrationCall(arguments));
 }
 
-PropertyDictionary accountSettings(int version, PropertyArray accounts) {
-  return {{"Version", version}, {"Accounts", std::move(accounts)}};
-}
-
 nlohmann::json onlyObject(const ProgramResult& result) {
   EXPECT_EQ(result.outputLines().size(), 1U) << result.output;
   EXPECT_TRUE(result.output.ends_with("}\n")) << result.output;

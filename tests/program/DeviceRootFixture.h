@@ -11,6 +11,7 @@
 #include <vector>
 
 #include "propertylist/value/PropertyValue.h"
+#include "tests/fakes/StoreContents.h"
 #include "tests/program/RunProgram.h"
 
 namespace accounts {
@@ -80,9 +81,6 @@ class DeviceRootFixture : public testing::Test {
 
   std::filesystem::path directory_;
 };
-
-/// An account settings file's contents.
-PropertyDictionary accountSettings(int version, PropertyArray accounts = {});
 
 /// The one object that standard output holds, on one line; a failure of the test when it holds
 /// anything else.

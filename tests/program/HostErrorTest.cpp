@@ -141,7 +141,7 @@ TEST_F(HostError, APluginWithoutAnEntryPointCannotBeLoaded) {
 TEST_F(HostError, APluginOfOtherHeadersIsNotCalled) {
   expectUntouched({"--plugin", OTHER_HEADERS_BUNDLE}, kMissingInput,
                   "AccountsDataMigrator.so: It was built against other headers: its interface has "
-                  "version 999, which is 3 here");
+                  "version 999, which is ");
 }
 
 TEST_F(HostError, AChannelThatCannotBeCreatedIsNamed) {

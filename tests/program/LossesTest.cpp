@@ -17,12 +17,12 @@ namespace {
 using testing::ElementsAreArray;
 using testing::HasSubstr;
 
-PropertyDictionary calendars(std::string_view identifier) {
+AccountDictionary calendars(std::string_view identifier) {
   return anAccount(identifier, "CalDAV", "CalDAVAccount");
 }
-PropertyDictionary description(std::string_view identifier,
-                               std::string_view accountClass = "IMAPAccount") {
-  return {{"uniqueId", identifier}, {"AccountType", accountClass}, {"Password", identifier}};
+AccountDictionary description(std::string_view identifier,
+                              std::string_view accountClass = "IMAPAccount") {
+  return aMailDescription(identifier, accountClass).with("Password", identifier);
 }
 
 struct Loss {
@@ -49,7 +49,7 @@ std::vector<Loss> losses() {
   return {
       {"TwoDescriptionsOfOneIdentifier",
        {},
-       mailStore({description("A"), with(description("A"), "Password", "x")}),
+       mailStore({description("A"), description("A").with("Password", "x")}),
        {},
        {"MailAccounts[1] (identifier A)" + ofMail + "its \"Password\" gave way to another value" +
         shared}},
@@ -61,14 +61,14 @@ std::vector<Loss> losses() {
         "another account with its identifier took its place: it has a \"Password\" that it did not "
         "have"}},
       {"AnIdentifierOfTheSettingsFile",
-       accounts::settings({calendars("A")}),
+       accountSettings(12, {calendars("A")}),
        mailStore({description("A")}),
        {},
        {"MailAccounts[0] (identifier A)" + ofMail + "its \"Class\" gave way to another value" +
         shared}},
       {"AnIdentifierOfAChild",
-       accounts::settings({with(anAccount("Q", "QuarxAccount", "ZQAccount"), "ChildAccounts",
-                                PropertyArray{calendars("A")})}),
+       accountSettings(
+           12, {anAccount("Q", "QuarxAccount", "ZQAccount").withChildren({calendars("A")})}),
        mailStore({description("A")}),
        {},
        {"MailAccounts[0] (identifier A)" + ofMail}},
@@ -80,7 +80,7 @@ std::vector<Loss> losses() {
         " holds accounts in an unknown form: its \"MailAccounts\" is no array"}},
       {"ARefusedDescription",
        {},
-       mailStore({description("A"), without(description("B"), "AccountType")},
+       mailStore({description("A"), description("B").without("AccountType")},
                  {description("C", "SMTPAccount")}),
        {},
        {"DeliveryAccounts[0] (identifier C)" + ofMail + "another account of its store was refused",
@@ -88,27 +88,27 @@ std::vector<Loss> losses() {
         "MailAccounts[1] (identifier B)" + ofMail + "it has no class"}},
       {"AKeyThatAnotherKeyReplaces",
        {},
-       mailStore({with(description("A"), "Class", "Odd")}),
+       mailStore({description("A").with("Class", "Odd")}),
        {},
        {"MailAccounts[0] (identifier A)" + ofMail +
         "its \"Class\" gave way to the value under \"AccountType\""}},
       {"AnEmptyMailStore",
-       accounts::settings(
-           {anAccount("A", "Mail", "IMAPAccount"), anAccount("B", "SMTP", "SMTPAccount")}),
+       accountSettings(
+           12, {anAccount("A", "Mail", "IMAPAccount"), anAccount("B", "SMTP", "SMTPAccount")}),
        mailStore({}),
        {},
        {"Accounts[0] (identifier A)" + ofSettings + replaced + "_migrateMailAccounts:)",
         "Accounts[1] (identifier B)" + ofSettings + replaced + "_migrateMailAccounts:)"}},
       {"AnEmptyExchangeStore",
-       accounts::settings({anAccount("A", "Exchange", "ASAccount")}),
+       accountSettings(12, {anAccount("A", "Exchange", "ASAccount")}),
        {},
        exchangeStore({}),
        {"Accounts[0] (identifier A)" + ofSettings + replaced + "_migrateDAAccounts:)"}},
       {"AccountsThatAreRefused",
-       accounts::settings({anAccount("A", "Unknown", "X"), without(calendars("B"), "Type"),
-                           with(calendars("C"), "Type", 5), without(calendars("D"), "Class"),
-                           with(calendars("E"), "Class", ""), with(calendars("F"), "Class", 5),
-                           anAccount("G", "Mail", "Odd"), "no dictionary"}),
+       accountSettings(12, {anAccount("A", "Unknown", "X"), calendars("B").without("Type"),
+                            calendars("C").with("Type", 5), calendars("D").without("Class"),
+                            calendars("E").with("Class", ""), calendars("F").with("Class", 5),
+                            anAccount("G", "Mail", "Odd"), "no dictionary"}),
        {},
        {},
        {"Accounts[0] (identifier A)" + ofSettings + "its type is unknown",
@@ -126,17 +126,16 @@ std::vector<Loss> losses() {
        {std::string(kSettingsPath) +
         " holds accounts in an unknown form: its \"Accounts\" is no array"}},
       {"ChildrenOfADroppedAccount",
-       accounts::settings(
-           {with(anAccount("A", "Unknown", "X"), "ChildAccounts", PropertyArray{calendars("K")})}),
+       accountSettings(12, {anAccount("A", "Unknown", "X").withChildren({calendars("K")})}),
        {},
        {},
        {"Accounts[0] (identifier A)" + ofSettings + "its type is unknown",
         "Accounts[0].ChildAccounts[0] (identifier K)" + ofSettings +
             "its parent was not carried over"}},
       {"TheFirstOfThreeOfOneIdentifier",
-       accounts::settings({with(calendars("A"), "Hostname", "1"),
-                           with(calendars("A"), "Hostname", "2"),
-                           with(calendars("A"), "Hostname", "3")}),
+       accountSettings(12,
+                       {calendars("A").with("Hostname", "1"), calendars("A").with("Hostname", "2"),
+                        calendars("A").with("Hostname", "3")}),
        {},
        {},
        {"Accounts[0] (identifier A)" + ofSettings + "its \"Hostname\" gave way to another value" +

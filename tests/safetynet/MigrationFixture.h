@@ -10,6 +10,7 @@
 #include "propertylist/binary/BinaryPropertyListSerializer.h"
 #include "safetynet/MigrationInMemory.h"
 #include "tests/fakes/FakeSnapshot.h"
+#include "tests/fakes/StoreContents.h"
 
 namespace accounts {
 
@@ -25,13 +26,13 @@ inline PropertyArray accountsNamed(std::string_view key,
 /// A settings file with one account for each identifier, and legacy stores with the same.
 inline PropertyDictionary settingsWith(int version,
                                        const std::vector<std::string>& identifiers = {}) {
-  return {{"Version", version}, {"Accounts", accountsNamed("Identifier", identifiers)}};
+  return accountSettings(version, accountsNamed(kAccountIdentifier, identifiers));
 }
 inline PropertyDictionary mailStoreWith(const std::vector<std::string>& identifiers) {
-  return {{"MailAccounts", accountsNamed("uniqueId", identifiers)}};
+  return mailStore(accountsNamed(kLegacyMailIdentifier, identifiers));
 }
 inline PropertyDictionary exchangeStoreWith(const std::vector<std::string>& identifiers) {
-  return {{"DAAccountsKey", accountsNamed("DAAccountConfigurationAccountID", identifiers)}};
+  return exchangeStore(accountsNamed(kLegacyExchangeIdentifier, identifiers));
 }
 
 /// A migration in memory over a snapshot that a test makes, and what a plug-in does in it.

@@ -8,6 +8,7 @@
 #include "propertylist/binary/BinaryPropertyList.h"
 #include "propertylist/value/Description.h"
 #include "propertylist/value/PropertyValue.h"
+#include "tests/fakes/StoreContents.h"
 #include "vocabulary/AccountClasses.h"
 #include "vocabulary/AccountVocabulary.h"
 #include "vocabulary/LegacyStoreKeys.h"
@@ -81,10 +82,9 @@ const std::vector<Deviation>& deviations() {
       kAccountDataclassMail,      kAccountDataclassCalendars, kAccountDataclassReminders,
       kAccountDataclassBookmarks, kAccountDataclassNotes,     kAccountDataclassUbiquity,
       kAccountDataclassKeyValue,  kAccountDataclassShoebox,   kAccountDataclassDeviceLocator};
-  static const PropertyDictionary child = {{kAccountIdentifier, "child"},
-                                           {kAccountType, kVelmoraAccountType},
-                                           {kAccountClass, kVelmoraAccountClass},
-                                           {kAccountDisplayName, "Velmora"}};
+  static const PropertyDictionary child =
+      anAccount("child", kVelmoraAccountType, kVelmoraAccountClass)
+          .with(kAccountDisplayName, "Velmora");
   static const std::vector<Deviation> list = {
       {"", {}},
       {kAccountIdentifier, {}},
@@ -165,20 +165,16 @@ PropertyDictionary withDeviation(PropertyDictionary account, std::size_t which) 
   return with(std::move(account), deviations()[which]);
 }
 
-PropertyDictionary account(std::string_view identifier, const Kind& kind) {
-  return {{kAccountIdentifier, identifier},
-          {kAccountType, kind.type},
-          {kAccountClass, kind.accountClass},
-          {kAccountUsername, "anna"},
-          {kAccountEnabledDataclasses, PropertyArray{kAccountDataclassMail, kAccountDataclassNotes,
-                                                     kAccountDataclassCalendars}}};
+AccountDictionary account(std::string_view identifier, const Kind& kind) {
+  return anAccount(identifier, kind.type, kind.accountClass)
+      .with(kAccountUsername, "anna")
+      .enabledFor({kAccountDataclassMail, kAccountDataclassNotes, kAccountDataclassCalendars});
 }
 /// The calendar half of the web-mail accounts above.
 PropertyDictionary calendars(std::string_view identifier) {
-  PropertyDictionary made = account(identifier, {kCalDAVAccountType, kCalDAVAccountClass});
-  made.set("CalDAVPrincipalConfiguration", principal("www.google.com", "anna"));
-  made.set("CalDAVAccountConfiguration", principalPath("/calendar/dav/anna/user"));
-  return made;
+  return account(identifier, {kCalDAVAccountType, kCalDAVAccountClass})
+      .with("CalDAVPrincipalConfiguration", principal("www.google.com", "anna"))
+      .with("CalDAVAccountConfiguration", principalPath("/calendar/dav/anna/user"));
 }
 /// 0 for no child.
 PropertyDictionary withChild(PropertyDictionary parent, std::size_t which,
@@ -324,16 +320,13 @@ const std::vector<Deviation>& descriptionDeviations() {
   return list;
 }
 PropertyDictionary mailDescription(std::size_t kind, std::size_t deviation) {
-  return with({{kLegacyMailIdentifier, "mail"},
-               {kLegacyMailClass, kKinds[kind].accountClass},
-               {kLegacyMailDisplayName, "Mail"},
-               {kAccountUsername, "anna"}},
+  return with(aMailDescription("mail", kKinds[kind].accountClass)
+                  .with(kLegacyMailDisplayName, "Mail")
+                  .with(kAccountUsername, "anna"),
               descriptionDeviations()[deviation]);
 }
 PropertyDictionary exchangeDescription(std::size_t deviation) {
-  return with({{kLegacyExchangeIdentifier, "exchange"},
-               {kLegacyExchangeClass, "ASAccount"},
-               {kLegacyExchangeDisplayName, "Exchange"}},
+  return with(anExchangeDescription("exchange").with(kLegacyExchangeDisplayName, "Exchange"),
               descriptionDeviations()[deviation]);
 }
 
