@@ -55,7 +55,7 @@ void readBinary(benchmark::State& state) {
     auto value = readBinaryPropertyList(file);
     benchmark::DoNotOptimize(value);
     state.PauseTiming();
-    value = PropertyValue();
+    *value = false;
     state.ResumeTiming();
   }
   countBytes(state, binaryFile().size());
@@ -113,7 +113,7 @@ void readXML(benchmark::State& state) {
     auto value = readXMLPropertyList(file);
     benchmark::DoNotOptimize(value);
     state.PauseTiming();
-    value = PropertyValue();
+    *value = false;
     state.ResumeTiming();
   }
   countBytes(state, xmlFile().size());
