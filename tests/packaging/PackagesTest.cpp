@@ -43,6 +43,18 @@ TEST_F(InstalledPackages, HoldTheNoticesOfTheLibrariesThatAreCompiledIn) {
   }
 }
 
+TEST_F(InstalledPackages, HoldDirectoriesThatAllMayReadWhateverTheMaskOfWhoeverBuildsThem) {
+  for (const char* const package : {"accounts-migration", "accounts-migration-dev"}) {
+    const ProgramResult contents =
+        succeed({.program = "dpkg-deb", .arguments = {"--contents", packageFile(package)}});
+    for (const std::string& line : contents.outputLines()) {
+      EXPECT_TRUE(line.starts_with("drwxr-xr-x ") || line.starts_with("-rw-r--r-- ") ||
+                  line.starts_with("-rwxr-xr-x "))
+          << line;
+    }
+  }
+}
+
 TEST_F(InstalledPackages, LackNothingThatDebianAsksForButALicence) {
   const ProgramResult result = runProgram(
       {.program = "lintian",

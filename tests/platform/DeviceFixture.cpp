@@ -3,6 +3,7 @@
 #include <linux/filter.h>
 #include <linux/seccomp.h>
 #include <sys/prctl.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -43,6 +44,8 @@ void makeRemovable(const fs::path& directory) {
 }  // namespace
 
 DeviceFixture::DeviceFixture() {
+  // What a test makes is for others to read, whoever runs it.
+  ::umask(022);
   std::string name = (fs::temp_directory_path() / "platform-test-XXXXXX").string();
   require(::mkdtemp(name.data()) != nullptr, "a temporary directory");
   base_ = name;

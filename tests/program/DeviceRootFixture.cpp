@@ -1,5 +1,6 @@
 #include "tests/program/DeviceRootFixture.h"
 
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -32,6 +33,8 @@ fs::path makeTemporaryDirectory(Medium medium, const std::string& name) {
 
 DeviceRootFixture::DeviceRootFixture(Medium medium)
     : directory_(makeTemporaryDirectory(medium, "device-root")) {
+  // What a test makes is for others to read, whoever runs it.
+  umask(022);
   for (const char* directory :
        {"/tmp", "/etc", "/var/mobile/Library/Preferences", "/var/mobile/Library/Mail",
         "/var/mobile/Library/Logs/CrashReporter"}) {

@@ -73,6 +73,8 @@ void becomeProgram(const ProgramCall& call, int output, int errors) {
   dup2(errors, STDERR_FILENO);
   // What whoever started the tests left open is none of the program's.
   close_range(STDERR_FILENO + 1, ~0U, CLOSE_RANGE_CLOEXEC);
+  // That of whoever runs the tests may not be installed.
+  setenv("LC_ALL", "C.UTF-8", 1);
   for (const auto& [name, value] : call.environment) {
     setenv(name.c_str(), value.c_str(), 1);
   }
