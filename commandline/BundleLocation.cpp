@@ -1,5 +1,7 @@
 #include "commandline/BundleLocation.h"
 
+#include <sys/auxv.h>
+
 #include <system_error>
 
 namespace accounts {
@@ -13,8 +15,15 @@ constexpr const char* kResourcesDirectory = "Resources";
 }  // namespace
 
 std::filesystem::path bundleOfProgram() {
-  std::error_code error;
-  return bundleOfProgramIn(std::filesystem::read_symlink("/proc/self/exe", error).parent_path());
+  std::error_code unknown;
+  std::filesystem::path program = std::filesystem::read_symlink("/proc/self/exe", unknown);
+  if (unknown) {
+    // Where images are made there is not always a /proc; the program's name as it was started is
+    // left.
+    const auto* const name = reinterpret_cast<const char*>(::getauxval(AT_EXECFN));
+    program = std::filesystem::canonical(name != nullptr ? name : "", unknown);
+  }
+  return bundleOfProgramIn(program.parent_path());
 }
 
 std::filesystem::path bundleOfProgramIn(const std::filesystem::path& directory) {

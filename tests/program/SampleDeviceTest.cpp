@@ -1,7 +1,11 @@
+#include <unistd.h>
+
 #include <algorithm>
 #include <optional>
 
+#include "tests/fakes/Sanitizers.h"
 #include "tests/program/DeviceRootFixture.h"
+#include "tests/program/Programs.h"
 
 namespace accounts {
 namespace {
@@ -45,6 +49,26 @@ TEST_F(SampleDevice, IsMigratedToACurrentBinarySettingsFile) {
   EXPECT_EQ(result.exitStatus, 0) << result.errors;
   EXPECT_EQ(onlyObject(result)["result"], true);
   EXPECT_TRUE(readText(kSettingsPath).starts_with("bplist00"));
+  EXPECT_EQ(readDictionary(kSettingsPath).find("Version")->integerValue(), 12);
+}
+
+TEST_F(SampleDevice, IsMigratedWhereNoProcIsMounted) {
+  if (kWithSanitizers) {
+    GTEST_SKIP() << "Sanitizers look into /proc.";
+  }
+  constexpr int kCannotUnmount = 99;
+
+  const ProgramResult result =
+      runProgram({.program = "unshare",
+                  .arguments = {"-m", "sh", "-c",
+                                "umount -l /proc && ! test -e /proc/self || exit 99\n"
+                                "\"$0\" run --root \"$1\"",
+                                migrationHost(), root()}});
+
+  if (getuid() != 0 || result.exitStatus == kCannotUnmount) {
+    GTEST_SKIP() << "This system lets the test unmount nothing.";
+  }
+  EXPECT_EQ(result.exitStatus, 0) << result.errors;
   EXPECT_EQ(readDictionary(kSettingsPath).find("Version")->integerValue(), 12);
 }
 
