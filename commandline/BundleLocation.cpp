@@ -2,6 +2,7 @@
 
 #include <sys/auxv.h>
 
+#include <bit>
 #include <system_error>
 
 namespace accounts {
@@ -20,7 +21,7 @@ std::filesystem::path bundleOfProgram() {
   if (unknown) {
     // Where images are made there is not always a /proc; the program's name as it was started is
     // left.
-    const auto* const name = reinterpret_cast<const char*>(::getauxval(AT_EXECFN));
+    const auto* const name = std::bit_cast<const char*>(::getauxval(AT_EXECFN));
     program = std::filesystem::canonical(name != nullptr ? name : "", unknown);
   }
   return bundleOfProgramIn(program.parent_path());
