@@ -213,13 +213,14 @@ class Reader {
     return true;
   }
 
-  /// Adds the next child to a container and returns it in its place.
-  static const PropertyValue& add(Container& container, const Object& object, PropertyValue value) {
+  /// Adds the next child, made of `source`, to a container and returns it in its place.
+  template <class Source>
+  static const PropertyValue& add(Container& container, const Object& object, Source&& source) {
     container.expandedCount += object.expandedCount;
     container.containerCount += object.containerCount;
     container.height = std::max(container.height, static_cast<std::uint32_t>(object.height) + 1);
-    return container.hasValues ? container.values.append(std::move(value))
-                               : container.elements.append(std::move(value));
+    return container.hasValues ? container.values.append(std::forward<Source>(source))
+                               : container.elements.append(std::forward<Source>(source));
   }
 
   static void notePlace(Object& object, const PropertyValue& place) {

@@ -15,9 +15,11 @@ class OrderedValues {
   OrderedValues() = default;
   explicit OrderedValues(PropertyKeys keys);
 
-  /// Adds the next key's value, not more of them than there are keys, and returns it in its place.
-  const PropertyValue& append(PropertyValue value) {
-    return values_.run()->append(std::move(value));
+  /// Adds the next key's value, made in its place of what is given, and returns it. There must not
+  /// be more of them than keys.
+  template <class Source>
+  const PropertyValue& append(Source&& source) {
+    return values_.run()->append(std::forward<Source>(source));
   }
   /// The dictionary, once each key has its value.
   [[nodiscard]] PropertyDictionary take() { return std::move(values_); }

@@ -49,7 +49,6 @@ class PropertyArray {
 
  private:
   friend class SharedNode<PropertyArray>;
-  friend class PropertyContent;
   using Run = SharedRun<PropertyValue>;
   [[nodiscard]] Run* run() const { return static_cast<Run*>(node_.get()); }
   static void destroyNode(SharedNodeBase* node);

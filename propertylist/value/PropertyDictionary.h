@@ -61,7 +61,6 @@ class PropertyDictionary {
 
  private:
   friend class SharedNode<PropertyDictionary>;
-  friend class PropertyContent;
   friend class OrderedValues;
   struct Head : SharedNodeBase {
     PropertyKeys keys;

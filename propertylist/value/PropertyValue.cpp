@@ -3,6 +3,7 @@
 #include <bit>
 #include <limits>
 #include <string>
+#include <type_traits>
 
 namespace accounts {
 
@@ -73,24 +74,6 @@ bool textMeansTrue(std::string_view text) {
 
 }  // namespace
 
-// Copying and moving rely on it.
-static_assert(sizeof(PropertyDictionary) == sizeof(SharedNodeBase*));
-static_assert(sizeof(PropertyArray) == sizeof(SharedNodeBase*));
-static_assert(sizeof(Text) == sizeof(SharedNodeBase*));
-static_assert(sizeof(PropertyData) == sizeof(SharedNodeBase*));
-static_assert(sizeof(PropertyContent) == 2 * sizeof(std::uint64_t));
-
-void PropertyContent::destroyNode() {
-  switch (form_) {
-    case Form::Dictionary:
-      return PropertyDictionary::destroyNode(node_);
-    case Form::Array:
-      return PropertyArray::destroyNode(node_);
-    default:
-      return SharedBytes::destroyNode(node_);
-  }
-}
-
 std::optional<std::int64_t> PropertyValue::integerValue() const {
   if (const std::int64_t* integer = asSigned()) {
     return *integer;
@@ -130,35 +113,19 @@ std::optional<bool> PropertyValue::booleanValue() const {
 }
 
 bool operator==(const PropertyValue& left, const PropertyValue& right) {
-  using Form = PropertyContent::Form;
-  const PropertyContent& content = left.content_;
-  const PropertyContent& other = right.content_;
-  if (content.form() != other.form()) {
-    return false;
-  }
-  switch (content.form()) {
-    case Form::Dictionary:
-      return content.dictionary == other.dictionary;
-    case Form::Array:
-      return content.array == other.array;
-    case Form::Text:
-      return content.text == other.text;
-    case Form::Data:
-      return content.data.bytes.isSameAs(other.data.bytes) ||
-             content.data.bytes.view() == other.data.bytes.view();
-    case Form::Boolean:
-      return content.boolean == other.boolean;
-    case Form::Real:
-      return std::bit_cast<std::uint64_t>(content.real) == std::bit_cast<std::uint64_t>(other.real);
-    case Form::Date:
-      return std::bit_cast<std::uint64_t>(content.date.secondsSinceReferenceDate) ==
-             std::bit_cast<std::uint64_t>(other.date.secondsSinceReferenceDate);
-    case Form::Signed:
-      return content.signedInteger == other.signedInteger;
-    case Form::LargeUnsigned:
-      return content.unsignedInteger == other.unsignedInteger;
-  }
-  return false;
+  return left.content_.index() == right.content_.index() &&
+         std::visit(
+             [&right](const auto& content) {
+               using Content = std::remove_cvref_t<decltype(content)>;
+               const Content& other = *std::get_if<Content>(&right.content_);
+               if constexpr (std::same_as<Content, double>) {
+                 return std::bit_cast<std::uint64_t>(content) ==
+                        std::bit_cast<std::uint64_t>(other);
+               } else {
+                 return content == other;
+               }
+             },
+             left.content_);
 }
 
 }  // namespace accounts

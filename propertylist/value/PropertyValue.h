@@ -8,9 +8,9 @@
 #include <string>
 #include <string_view>
 #include <utility>
+#include <variant>
 
 #include "propertylist/value/PropertyArray.h"
-#include "propertylist/value/PropertyContent.h"
 #include "propertylist/value/PropertyDictionary.h"
 #include "propertylist/value/PropertyScalars.h"
 #include "propertylist/value/Text.h"
@@ -39,59 +39,50 @@ class PropertyValue {
   PropertyValue(PropertyDictionary dictionary) : content_(std::move(dictionary)) {}
   PropertyValue(PropertyArray array) : content_(std::move(array)) {}
   PropertyValue(Text text) : content_(std::move(text)) {}
-  PropertyValue(std::string_view text) : content_(Text(text)) {}
-  PropertyValue(const std::string& text) : content_(Text(text)) {}
-  PropertyValue(const char* text) : content_(Text(text)) {}
+  PropertyValue(std::string_view text) : content_(std::in_place_type<Text>, text) {}
+  PropertyValue(const std::string& text) : content_(std::in_place_type<Text>, text) {}
+  PropertyValue(const char* text) : content_(std::in_place_type<Text>, text) {}
   PropertyValue(PropertyDate date) : content_(date) {}
   PropertyValue(PropertyData data) : content_(std::move(data)) {}
   // A template, so that no pointer becomes a boolean by an implicit conversion.
   template <std::same_as<bool> Boolean>
-  PropertyValue(Boolean boolean) : content_(boolean) {}
+  PropertyValue(Boolean boolean) : content_(std::in_place_type<bool>, boolean) {}
   template <std::signed_integral Signed>
-  PropertyValue(Signed integer) : content_(std::int64_t{integer}) {}
+  PropertyValue(Signed integer) : content_(std::in_place_type<std::int64_t>, integer) {}
   template <std::unsigned_integral Unsigned>
   requires(!std::same_as<Unsigned, bool>) PropertyValue(Unsigned integer)
       : content_(contentOf(integer)) {}
   template <std::floating_point Real>
-  PropertyValue(Real real) : content_(static_cast<double>(real)) {}
+  PropertyValue(Real real) : content_(std::in_place_type<double>, real) {}
 
   [[nodiscard]] PropertyKind kind() const {
+    // In the order of the content's types.
     constexpr PropertyKind kKinds[] = {
         PropertyKind::Dictionary, PropertyKind::Array,   PropertyKind::String,
         PropertyKind::Data,       PropertyKind::Integer, PropertyKind::Integer,
         PropertyKind::Real,       PropertyKind::Boolean, PropertyKind::Date};
-    return kKinds[static_cast<std::size_t>(content_.form())];
+    return kKinds[content_.index()];
   }
 
   /// The content as one kind; null or none when the value is of another.
   [[nodiscard]] const PropertyDictionary* asDictionary() const {
-    return content_.form() == Form::Dictionary ? &content_.dictionary : nullptr;
+    return std::get_if<PropertyDictionary>(&content_);
   }
   [[nodiscard]] const PropertyArray* asArray() const {
-    return content_.form() == Form::Array ? &content_.array : nullptr;
+    return std::get_if<PropertyArray>(&content_);
   }
-  [[nodiscard]] const Text* asText() const {
-    return content_.form() == Form::Text ? &content_.text : nullptr;
-  }
-  [[nodiscard]] const PropertyData* asData() const {
-    return content_.form() == Form::Data ? &content_.data : nullptr;
-  }
-  [[nodiscard]] const PropertyDate* asDate() const {
-    return content_.form() == Form::Date ? &content_.date : nullptr;
-  }
-  [[nodiscard]] const double* asReal() const {
-    return content_.form() == Form::Real ? &content_.real : nullptr;
-  }
-  [[nodiscard]] const bool* asBoolean() const {
-    return content_.form() == Form::Boolean ? &content_.boolean : nullptr;
-  }
+  [[nodiscard]] const Text* asText() const { return std::get_if<Text>(&content_); }
+  [[nodiscard]] const PropertyData* asData() const { return std::get_if<PropertyData>(&content_); }
+  [[nodiscard]] const PropertyDate* asDate() const { return std::get_if<PropertyDate>(&content_); }
+  [[nodiscard]] const double* asReal() const { return std::get_if<double>(&content_); }
+  [[nodiscard]] const bool* asBoolean() const { return std::get_if<bool>(&content_); }
   /// An integer from -2^63 to 2^63-1; null for any other value, a larger integer included.
   [[nodiscard]] const std::int64_t* asSigned() const {
-    return content_.form() == Form::Signed ? &content_.signedInteger : nullptr;
+    return std::get_if<std::int64_t>(&content_);
   }
   /// An integer from 2^63 to 2^64-1; null for any other value, a smaller integer included.
   [[nodiscard]] const std::uint64_t* asLargeUnsigned() const {
-    return content_.form() == Form::LargeUnsigned ? &content_.unsignedInteger : nullptr;
+    return std::get_if<std::uint64_t>(&content_);
   }
 
   /// The value read as an integer: the integer part of a number (held to the range of 64 signed
@@ -107,16 +98,18 @@ class PropertyValue {
   friend bool operator==(const PropertyValue& left, const PropertyValue& right);
 
  private:
-  using Form = PropertyContent::Form;
+  using Content = std::variant<PropertyDictionary, PropertyArray, Text, PropertyData, std::int64_t,
+                               std::uint64_t, double, bool, PropertyDate>;
+  // Most of what a migration keeps in memory are values.
+  static_assert(sizeof(Content) == 2 * sizeof(std::uint64_t));
 
   // Integers that fit are always held signed, so that equal numbers have one form.
-  static PropertyContent contentOf(std::uint64_t integer) {
+  static Content contentOf(std::uint64_t integer) {
     constexpr std::uint64_t kTwoToThe63 = std::uint64_t{1} << 63;
-    return integer < kTwoToThe63 ? PropertyContent(static_cast<std::int64_t>(integer))
-                                 : PropertyContent(integer);
+    return integer < kTwoToThe63 ? Content(static_cast<std::int64_t>(integer)) : Content(integer);
   }
 
-  PropertyContent content_;
+  Content content_;
 };
 
 /// A value with the key that it is to have in a dictionary.

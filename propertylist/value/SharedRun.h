@@ -35,9 +35,10 @@ class alignas(std::uint64_t) SharedRun : public Head {
   [[nodiscard]] Element* begin() { return reinterpret_cast<Element*>(this + 1); }
   [[nodiscard]] Element* end() { return begin() + size_; }
 
-  /// Adds an element at the end. There must be room.
-  Element& append(Element element) {
-    Element* const place = new (end()) Element(std::move(element));
+  /// Adds an element at the end, made in its place of what is given. There must be room.
+  template <class Source>
+  Element& append(Source&& source) {
+    Element* const place = new (end()) Element(std::forward<Source>(source));
     ++size_;
     return *place;
   }

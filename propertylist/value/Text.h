@@ -28,7 +28,6 @@ class SharedBytes {
 
  private:
   friend class SharedNode<SharedBytes>;
-  friend class PropertyContent;
   /// Followed by its bytes.
   class Node : public SharedNodeBase {
    public:
