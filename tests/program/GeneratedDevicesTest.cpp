@@ -271,7 +271,7 @@ std::uint64_t numberFrom(const char* variable, std::uint64_t otherwise) {
 
 constexpr std::uint64_t kShards = 20;
 // With sanitizers a program takes many times as long to start.
-constexpr std::uint64_t kDevices = kWithSanitizers ? 100 : 2000;
+constexpr std::uint64_t kDevices = kWithSanitizers ? 100 : 1000;
 
 /// Every device of one shard of them.
 class GeneratedDevices : public testing::TestWithParam<std::uint64_t> {};
