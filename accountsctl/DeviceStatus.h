@@ -41,7 +41,8 @@ struct DeviceStatus {
   }
 };
 
-/// What earlier runs left on a device. Changes nothing, and decodes nothing.
+/// What earlier runs left on a device. Changes nothing, and decodes nothing. An error when it
+/// cannot be told which files are kept.
 OrFailure<DeviceStatus> leftoversOn(LinuxPlatform& platform);
 
 /// Completes that with what a snapshot of the device holds.

@@ -17,7 +17,7 @@ namespace accounts {
 std::string bytesOf(const RunConclusion& conclusion);
 std::optional<RunConclusion> conclusionFrom(std::string_view bytes);
 
-/// Whether a report was written, as bytes, and back.
+/// Whether a report was written, as bytes, and back. Bytes that say nothing stand for success.
 std::string bytesOfWriting(const OrProgramError<void>& written);
 OrProgramError<void> writingFrom(std::string_view bytes);
 

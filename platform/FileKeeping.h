@@ -15,11 +15,12 @@ class FileKeeping {
  public:
   virtual ~FileKeeping() = default;
 
-  /// What stands at a path, a symbolic link there not followed.
+  /// What stands at a path, a symbolic link there not followed. An error when that cannot be told.
   virtual OrFailure<EntryKind> kindOfEntry(std::string_view path) = 0;
-  /// The names in a directory, sorted bytewise.
+  /// The names in a directory, sorted bytewise. An error when it is missing or cannot be read.
   virtual OrFailure<std::vector<std::string>> directoryEntries(std::string_view path) = 0;
-  /// The bytes of a regular file, links followed; more than `most` are not read.
+  /// The bytes of a regular file, links followed. An error when it is missing, is no such file, has
+  /// more than `most` or cannot be read.
   virtual OrFailure<std::string> shortContents(std::string_view path, std::size_t most) = 0;
 
   /// As with FileSystem.

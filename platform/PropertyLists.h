@@ -20,7 +20,8 @@ class PropertyLists {
   virtual std::optional<PropertyDictionary> readDictionary(std::string_view path) = 0;
 
   /// Makes of a value what is written in the binary format; its bytes are made when it is. An
-  /// error for a value that no reader would take back (PropertyListLimits.h).
+  /// error for a value that no reader would take back (PropertyListLimits.h); a save takes none
+  /// without an error for a failure, too.
   virtual OrFailure<SerializedPropertyList> serializeBinary(const PropertyValue& value) = 0;
 };
 

@@ -49,14 +49,17 @@ class KeptFolders {
   KeptFolders(FileKeeping& files, DevicePlaces& places) : files_(files), places_(places) {}
 
   /// The paths of all folders that were kept for a migration, or for a restoration, oldest first.
+  /// An error when they cannot be looked at, which is not the same as none.
   [[nodiscard]] OrFailure<std::vector<std::string>> keptFor(KeptFor purpose) const;
-  /// Whether there is a folder of kept files with this name, of either purpose.
+  /// Whether there is a folder of kept files with this name, of either purpose. An error when that
+  /// cannot be told.
   [[nodiscard]] OrFailure<bool> contains(std::string_view name) const;
   /// The path of the folder with a name.
   [[nodiscard]] static std::string pathOf(std::string_view name);
   /// Where a folder has what stood at a place.
   [[nodiscard]] static std::string pathIn(std::string_view folder, DevicePlace place);
-  /// What a folder says of itself; none when its list is missing or is no such list.
+  /// What a folder says of itself; none when its list is missing or is no such list. An error when
+  /// it cannot be read at the moment.
   [[nodiscard]] OrFailure<std::optional<KeptList>> listOf(std::string_view folder) const;
 
   /// Gives what stands at places second names in a new folder, durably, and writes the folder's

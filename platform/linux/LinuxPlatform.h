@@ -64,11 +64,14 @@ struct LinuxPlatformError {
 /// changes nothing beneath the root.
 class LinuxPlatform {
  public:
+  /// An error when an option cannot be used, an input is missing or malformed, or the log cannot be
+  /// made; nothing is changed beneath the root.
   static OrError<std::unique_ptr<LinuxPlatform>, LinuxPlatformError> create(
       const LinuxPlatformOptions& options);
   ~LinuxPlatform();
 
-  /// Looks into the device description, which was read when this was made; it may be malformed.
+  /// Looks into the device description, which was read when this was made. An error, with the
+  /// description of before, when it is malformed.
   Result decodeDescription();
 
   /// Opens and reads what else the plug-in may ask for outside the root: the bundle's resources and

@@ -44,7 +44,6 @@ enum class Kind : std::uint8_t {
 
 inline constexpr std::uint8_t kMarkerOfFalse = 0x08;
 inline constexpr std::uint8_t kMarkerOfTrue = 0x09;
-inline constexpr std::uint8_t kMarkerOfDate = 0x33;
 /// The low four bits that say that the length follows as an integer object of its own.
 inline constexpr std::uint8_t kLengthFollows = 0xF;
 /// Reals and integers: the low four bits are the size's binary logarithm.

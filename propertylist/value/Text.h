@@ -2,7 +2,6 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <functional>
 #include <string>
 #include <string_view>
 
@@ -75,15 +74,6 @@ class Text {
 
  private:
   SharedBytes bytes_;
-};
-
-/// Hash for containers keyed by Text that are looked up by any kind of text; pair it with
-/// `std::equal_to<>`.
-struct TextHash {
-  using is_transparent = void;
-  std::size_t operator()(std::string_view text) const {
-    return std::hash<std::string_view>()(text);
-  }
 };
 
 }  // namespace accounts
